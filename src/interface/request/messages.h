@@ -1,0 +1,33 @@
+// The one way in which the library tells the user something: the request's message file.
+#pragma once
+
+#include "support/text.h"
+
+#include <string_view>
+
+namespace ingester {
+
+/// Writes `text` as it is to the message file, which the first message makes.
+/// Where the file can't be made the text is lost: there is nobody left to tell.
+void Report_Message(std::string_view text);
+
+/// Report `format` with its one "%s" (any precision), "%li" or "%g"-like mark filled in.
+void Report_Message_Text(const char* format, const char* text);
+void Report_Message_Long(const char* format, long value);
+void Report_Message_Real(const char* format, double value);
+
+/// Reports, and is false: `return Fail("...")` where a fault is seen.
+bool Fail(std::string_view text);
+template <class... Arguments> bool Fail(const char* format, Arguments... arguments)
+{
+    Report_Message(Format_Text(format, arguments...));
+    return false;
+}
+
+/// Ends the request's messages: closes the file, behind the mark the host looks for.
+void Close_Message_File();
+
+/// Forgets the message file of an earlier request and removes the one that `<temp><stem>.ERR` names.
+void Start_Message_File();
+
+}  // namespace ingester

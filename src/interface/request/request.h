@@ -1,0 +1,124 @@
+// The globals of one request: what the call asked for, as every floor may read it.
+#pragma once
+
+#include "interface/request/settings.h"
+#include "support/fixed_text.h"
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace ingester {
+
+/// How the result is joined with an existing output.
+enum class Add_Modes : std::int32_t { none = 0, append = 1, concatenate = 2, merge = 3 };
+
+/// Column limit of outputs without one of their own.
+constexpr std::int32_t Default_Max_Columns = 50000;
+
+/// Widths of the strings that a host hands over.
+constexpr std::size_t Long_Name_Width = 1120;
+constexpr std::size_t Short_Name_Width = 280;
+
+/// Everything a request sets. A fresh value is assigned at the start of each, so nothing lingers.
+struct Request_Globals {
+    // From the pass file.
+    Fixed_Text<Short_Name_Width> Worksheet_Name;
+    Fixed_Text<Short_Name_Width> Cell_Range;
+    Fixed_Text<Long_Name_Width> Secondary_File;
+    Add_Modes Add_Mode = Add_Modes::none;
+    bool Subset_Columns = false;
+    bool Subset_Rows = false;
+    std::vector<std::string> Subset_Names;        ///< names, or column numbers as text
+    std::int32_t Subset_Name_Count = 0;
+    bool Subset_By_Number = false;                ///< the list holds numbers, not variables' names
+    std::vector<std::int32_t> Subset_Row_Flags;   ///< one per input row: 0 drops it
+    std::int32_t Subset_Row_Count = 0;
+    Fixed_Text<60> Scratch_Stem;
+
+    // What the stages find out.
+    Fixed_Text<Long_Name_Width> Current_File_Name;  ///< the file messages speak of
+    Fixed_Text<Long_Name_Width> Source_Url;         ///< where a fetched input came from
+    Fixed_Text<Short_Name_Width> Source_Base_Name;  ///< input name without folder and extension
+    Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
+    bool Sheet_Name_Was_Exact = false;
+    std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
+    std::int32_t Max_Columns = Default_Max_Columns;
+    bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone
+
+    // Input options.
+    bool Qtl_Request = false;
+    bool Qtl_Map_Given = false;
+    Fixed_Text<Short_Name_Width> Qtl_Map_File;
+    Fixed_Text<80> Missing_Input_Text = "*";
+    Fixed_Text<60> Return_Delete_Marker;
+    std::int32_t Fixed_Lines = -1;
+    bool Keep_Probe_Statistics = true;
+    std::int32_t Lines_Per_Record = 1;
+    std::int32_t First_Column = 0;
+    std::int32_t Last_Column = 2147483647;
+    bool Print_Summary = false;
+    std::array<double, 3> Instat_Missing_Codes{};
+    std::int32_t Instat_Missing_Code_Count = 0;
+    bool Use_Title_Row = false;
+    bool Title_Row_Absolute = false;
+    std::int32_t Title_Row = 0;
+    bool Keep_Long_Labels = false;
+    bool Keep_Empty_Columns = false;
+    bool Log_Book = false;
+    std::int32_t Log_Book_Range = 0;
+    bool No_Names = false;
+    bool Names_Given = false;
+    std::int32_t Names_Row = 0;
+    bool Transpose = false;
+    bool Transpose_Names = true;
+    std::int32_t Text_Number_Mode = 3;
+    bool Reverse_Labels = false;
+    bool Use_Var_File = false;
+    Fixed_Text<Long_Name_Width> Var_File_Name;
+    bool List_Sheets_Only = false;
+    Fixed_Text<80> Start_Text;
+    Fixed_Text<80> End_Text;
+    Fixed_Text<20> Custom_Separators;
+    Fixed_Text<60> Pointer_Name;
+    Fixed_Text<Short_Name_Width> Date_Base_Text;
+
+    // Output options.
+    Fixed_Text<90> Missing_Text = "*";
+    bool Write_Via_Temp = true;
+    bool No_Return = false;
+    bool Add_To_Output = false;
+    Fixed_Text<Short_Name_Width> Output_Sheet_Name;
+    bool End_With_Break = false;
+    bool Keep_As_Columns = true;
+    bool Use_Formats = false;
+    bool Fixed_Number_Text = false;
+    bool Table_Grid = false;
+    bool Packed_Csv_Output = false;
+    bool Allow_HTML = false;
+    bool Excel_Dates_As_Text = false;
+    std::int32_t Table_Justify = 0;
+    bool Log_Book_Output = false;
+    std::int32_t Log_Book_Lines = 0;
+    bool Output_Matrix = false;
+    Fixed_Text<60> Output_Matrix_Name;
+    bool Omit_Header = false;
+    bool Replace_Book_Data = false;
+    bool Write_Var_List = false;
+    bool Quiet_Read = false;
+    bool Replace_Sheet_Asked = false;
+    bool R_Text_Output = false;
+    bool No_Name_Marks = false;
+    std::int32_t Script_Version = 3;
+    bool Table_Look = false;
+    bool R_Dot_Names = false;
+    bool Excel_97 = false;
+    bool CSV_Output = false;
+
+    Settings settings;
+};
+
+extern Request_Globals request;
+
+}  // namespace ingester

@@ -1,0 +1,42 @@
+// The host's identifiers: every Column's name passes through here.
+#pragma once
+
+#include "model/sheet.h"
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace ingester {
+
+/// `name` as the host accepts it: letters, digits, "_" and "%", at most 60, with a repaired bracket
+/// suffix. An empty name becomes an automatic one. Left alone while the request keeps names as they
+/// stand (cut at 60 then).
+[[nodiscard]] std::string Make_Valid_Name(std::string_view name);
+
+/// The automatic name of column `number`, as "C1"; below 1, of the next number.
+[[nodiscard]] std::string Default_Column_Name(std::int32_t number);
+
+/// Cuts a name to `limit` characters, keeping a bracket suffix whole where it fits.
+[[nodiscard]] std::string Shorten_Bracket_Name(std::string_view name, std::size_t limit);
+
+/// The text of a quoted suffix that the last `Make_Valid_Name` replaced by a number, up to 80.
+void Remember_Bracket_Text(std::string_view text);
+
+/// Adds that text to `extra`, behind one blank when there is something, and forgets it.
+void Use_Bracket_Text(Column& column);
+
+/// Where the bracketed suffix of `name` begins: at "[" when it ends with "]", else its size.
+[[nodiscard]] std::size_t Bracket_Start(std::string_view name);
+
+/// Starts the counters of bracket numbers anew.
+void Reset_Name_Counters();
+
+/// Names must differ in their first 32 characters: later ones of a clash get a number, and their
+/// old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
+void Make_Column_Names_Unique(Sheet* sheet);
+
+/// `name` without its marks: ":D", ":T", ":E", ":" and a digit, and one "!", "#" or "$" at the end.
+[[nodiscard]] std::string Strip_Name_Mark(std::string_view name);
+
+}  // namespace ingester
