@@ -18,9 +18,9 @@ void Report_Message_Real(const char* format, double value);
 
 /// Reports, and is false: `return Fail("...")` where a fault is seen.
 bool Fail(std::string_view text);
-template <class... Arguments> bool Fail(const char* format, Arguments... arguments)
+template <class First, class... Rest> bool Fail(const char* format, First first, Rest... rest)
 {
-    Report_Message(Format_Text(format, arguments...));
+    Report_Message(Format_Text(format, first, rest...));
     return false;
 }
 

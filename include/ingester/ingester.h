@@ -1,0 +1,71 @@
+/*
+ * The call interface of libingester, for C (C99) and C++.
+ *
+ * A host leaves a request in the temporary folder (TMPDIR, else TMP, else TEMP, else /tmp), calls
+ * INGESTER, and reads the answer from the same folder. With <pid> the number of the calling process:
+ *
+ *   IG<pid>.inp   the request ("pass file"), written by the host, deleted by the library
+ *   IG<pid>.out   the result: a 32-bit status and a 32-bit 0
+ *   IG<pid>.ERR   messages for the user; absent when there are none, else closed by a line ":"
+ *
+ * A pass file is little-endian: a double, the number of arguments (2 to 6); then as many text
+ * records of a 32-bit 0, a 32-bit length and that many bytes: the input file, the output file, the
+ * worksheet, the cell range, a secondary file and a subset file. Names of files may carry slash
+ * options, so their folders are written with backslashes.
+ *
+ * One call at a time in a process; calls may follow each other.
+ */
+#ifndef INGESTER_INGESTER_H
+#define INGESTER_INGESTER_H
+
+#include <stdint.h>
+
+#if defined(__GNUC__)
+#define INGESTER_EXPORT __attribute__((visibility("default")))
+#else
+#define INGESTER_EXPORT
+#endif
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* The status that a result file begins with. */
+enum ingester_status {
+    INGESTER_SUCCESS = 0,
+    INGESTER_NO_REQUEST = 1,          /* the pass file was not found, or is faulty */
+    INGESTER_INPUT_UNREADABLE = 2,    /* the input can't be opened, or is empty */
+    INGESTER_INPUT_UNKNOWN = 3,       /* no known file type */
+    INGESTER_NO_DATA = 4,             /* data could not be read, or all of it is empty */
+    INGESTER_NOT_IMPORTED = 5,        /* no data imported; an operation on them failed */
+    INGESTER_OUTPUT_FAILED = 6,       /* the output could not be written */
+    INGESTER_NO_ROWS = 7,             /* success, with zero rows */
+    INGESTER_INEXACT_SHEET = 8,       /* no data after an inexact sheet match; adding failed */
+    INGESTER_CLIPBOARD_FAILED = 9,
+    INGESTER_RENAME_FAILED = 10,      /* the finished output could not take its name */
+    INGESTER_ZIP_UNSUPPORTED = 11,
+    INGESTER_NOTHING_SELECTED = 13,   /* no columns or rows selected */
+    INGESTER_QTL_FAILED = 14,
+    INGESTER_QTL_OPTIONS = 16,
+    INGESTER_DOWNLOAD_FAILED = 19
+};
+
+/*
+ * Runs one request. Both names are arrays of characters with their lengths, without terminators,
+ * with native separators or backslashes; a length of 0 means none.
+ *
+ *   pass_name    of the host's carrier file, used only when IG<pid>.inp does not exist: a small file
+ *                whose head holds a request id, so that the names above become IG<ID>.tmp,
+ *                IG<ID>.out and IG<ID>.ERR with the id in upper-case hexadecimal
+ *   result_name  replaces the name of the result file
+ *
+ * Always returns 0: success or failure is in the result file.
+ */
+INGESTER_EXPORT int32_t INGESTER(const char* pass_name, const char* result_name, int32_t pass_name_length,
+                                 int32_t result_name_length);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif

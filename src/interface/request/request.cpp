@@ -1,0 +1,12 @@
+#include "interface/request/request.h"
+
+namespace ingester {
+
+Request_Globals request;
+
+Settings& Get_Settings()
+{
+    return request.settings;
+}
+
+}  // namespace ingester

@@ -1,0 +1,57 @@
+// Names of files and folders, and what the system says of them.
+//
+// Request strings carry backslashes; only this floor turns them into native paths.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace ingester {
+
+/// `name` with native separators.
+[[nodiscard]] std::string Native_Path(std::string_view name);
+
+/// `name` with backslashes, as requests carry it.
+[[nodiscard]] std::string Request_Path(std::string_view native);
+
+/// The temporary folder (TMPDIR, TMP, TEMP, else /tmp), with backslashes and one at its end.
+[[nodiscard]] std::string Get_Temp_Folder();
+
+/// This process's number, above 0.
+[[nodiscard]] long Process_Id();
+
+[[nodiscard]] bool File_Exists(std::string_view name);
+[[nodiscard]] bool Folder_Exists(std::string_view name);
+
+/// Both names lead to the same existing file.
+[[nodiscard]] bool Same_File(std::string_view a, std::string_view b);
+
+/// False when it could not be deleted; a file that isn't there counts as deleted.
+bool Delete_File(std::string_view name);
+
+/// Puts `from` in the place of `to` in one step; both on one file system.
+[[nodiscard]] bool Replace_File(std::string_view from, std::string_view to);
+
+/// The folder part of a request name, with its last separator; empty when there is none.
+[[nodiscard]] std::string_view Folder_Of(std::string_view name);
+
+/// The part behind the last separator.
+[[nodiscard]] std::string_view File_Part_Of(std::string_view name);
+
+/// Where the extension begins: at the last "." of the file part, else the size of `name`.
+[[nodiscard]] std::size_t Extension_Start(std::string_view name);
+
+/// `name` with its extension replaced, or added.
+[[nodiscard]] std::string With_Extension(std::string_view name, std::string_view extension);
+
+/// The hour, minute, second, month (1 to 12), day and year of now, in local time.
+struct Local_Time {
+    int hour, minute, second, month, day, year;
+};
+[[nodiscard]] Local_Time Local_Time_Now();
+
+/// Asks the system to back a large, fresh allocation by large pages, where it can.
+void Advise_Large_Pages(void* memory, std::size_t bytes);
+
+}  // namespace ingester

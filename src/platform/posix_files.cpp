@@ -1,0 +1,252 @@
+#include "platform/files.h"
+
+#include "platform/folders.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace ingester {
+
+namespace {
+
+constexpr std::size_t Input_Buffer_Size = 1 << 16;
+constexpr std::size_t Output_Buffer_Size = 1 << 20;
+constexpr std::size_t Greatest_System_Request = 1 << 30;  // the kernel takes no more at once
+
+}  // namespace
+
+Input_File::Input_File(std::span<const std::byte> bytes, std::string_view name) : name_(name), memory_(bytes) {}
+
+Input_File::~Input_File()
+{
+    Close();
+}
+
+bool Input_File::Open(std::string_view name)
+{
+    Close();
+    name_ = name;
+    position_ = read_so_far_ = 0;
+    buffer_next_ = buffer_end_ = 0;
+    failed_ = false;
+    descriptor_ = ::open(Native_Path(name).c_str(), O_RDONLY | O_CLOEXEC);
+    struct stat facts;
+    if (descriptor_ >= 0 && (::fstat(descriptor_, &facts) != 0 || S_ISDIR(facts.st_mode)))
+        Close();
+    return descriptor_ >= 0;
+}
+
+std::int64_t Input_File::Size() const
+{
+    if (descriptor_ < 0)
+        return static_cast<std::int64_t>(memory_.size());
+    struct stat facts;
+    return ::fstat(descriptor_, &facts) == 0 && S_ISREG(facts.st_mode) ? facts.st_size : 0;
+}
+
+bool Input_File::Seek(std::int64_t position)
+{
+    if (position < 0)
+        return false;
+    if (descriptor_ >= 0) {
+        if (::lseek(descriptor_, position, SEEK_SET) != position)
+            return false;
+        read_so_far_ = position;
+        buffer_next_ = buffer_end_ = 0;
+    } else if (position > static_cast<std::int64_t>(memory_.size())) {
+        return false;
+    }
+    position_ = position;
+    return true;
+}
+
+std::size_t Input_File::Read_Directly(void* target, std::size_t count)
+{
+    auto* at = static_cast<char*>(target);
+    std::size_t done = 0;
+    while (done < count) {
+        const ::ssize_t got = ::read(descriptor_, at + done, std::min(count - done, Greatest_System_Request));
+        if (got > 0)
+            done += static_cast<std::size_t>(got);
+        else if (got == 0)
+            break;
+        else if (errno != EINTR) {
+            failed_ = true;
+            break;
+        }
+    }
+    read_so_far_ += static_cast<std::int64_t>(done);
+    return done;
+}
+
+bool Input_File::Fill_Buffer()
+{
+    buffer_.resize(Input_Buffer_Size);
+    buffer_next_ = 0;
+    buffer_end_ = Read_Directly(buffer_.data(), buffer_.size());
+    return buffer_end_ > 0;
+}
+
+std::size_t Input_File::Read(void* target, std::size_t count)
+{
+    std::size_t done = 0;
+    if (descriptor_ < 0) {
+        const auto left = memory_.size() - static_cast<std::size_t>(position_);
+        done = std::min(count, left);
+        if (done > 0)
+            std::memcpy(target, memory_.data() + position_, done);
+    } else {
+        auto* at = static_cast<std::byte*>(target);
+        while (done < count) {
+            const std::size_t held = std::min(count - done, buffer_end_ - buffer_next_);
+            if (held > 0) {
+                std::memcpy(at + done, buffer_.data() + buffer_next_, held);
+                buffer_next_ += held;
+                done += held;
+            } else if (count - done >= Input_Buffer_Size) {
+                done += Read_Directly(at + done, count - done);
+                break;
+            } else if (!Fill_Buffer()) {
+                break;
+            }
+        }
+    }
+    position_ += static_cast<std::int64_t>(done);
+    return done;
+}
+
+int Input_File::Peek()
+{
+    if (descriptor_ < 0)
+        return static_cast<std::size_t>(position_) < memory_.size()
+                   ? std::to_integer<int>(memory_[static_cast<std::size_t>(position_)])
+                   : -1;
+    if (buffer_next_ == buffer_end_ && !Fill_Buffer())
+        return -1;
+    return std::to_integer<int>(buffer_[buffer_next_]);
+}
+
+bool Input_File::Read_Line(std::string& line, std::size_t limit)
+{
+    line.clear();
+    int c = Peek();
+    if (c < 0)
+        return false;
+    const auto step = [this] {
+        ++position_;
+        if (descriptor_ >= 0)
+            ++buffer_next_;
+        return Peek();
+    };
+    while (c >= 0 && c != '\n' && c != '\r' && line.size() < limit) {
+        line.push_back(static_cast<char>(c));
+        c = step();
+    }
+    if (c == '\r' && step() != '\n')
+        return true;
+    if (c == '\r' || c == '\n')
+        static_cast<void>(step());
+    return true;
+}
+
+bool Input_File::Close()
+{
+    if (descriptor_ >= 0)
+        ::close(descriptor_);
+    descriptor_ = -1;
+    memory_ = {};
+    return !failed_;
+}
+
+Output_File::~Output_File()
+{
+    if (descriptor_ >= 0 && owned_)
+        ::close(descriptor_);
+}
+
+bool Output_File::Start(int descriptor)
+{
+    descriptor_ = descriptor;
+    owned_ = true;
+    failed_ = descriptor < 0;
+    used_ = 0;
+    if (!failed_ && buffer_ == nullptr)
+        buffer_ = std::make_unique_for_overwrite<char[]>(Output_Buffer_Size);
+    return !failed_;
+}
+
+bool Output_File::Open(std::string_view name)
+{
+    return Start(::open(Native_Path(name).c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
+}
+
+bool Output_File::Open_Scratch(std::string_view name)
+{
+    const std::string path = Native_Path(name);
+    ::unlink(path.c_str());
+    return Start(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600));
+}
+
+void Output_File::Open_Standard_Output()
+{
+    static_cast<void>(Start(STDOUT_FILENO));
+    owned_ = false;
+}
+
+void Output_File::Write_Directly(const char* bytes, std::size_t count)
+{
+    while (count > 0 && !failed_) {
+        const ::ssize_t put = ::write(descriptor_, bytes, std::min(count, Greatest_System_Request));
+        if (put >= 0) {
+            bytes += put;
+            count -= static_cast<std::size_t>(put);
+        } else if (errno != EINTR) {
+            failed_ = true;
+        }
+    }
+}
+
+void Output_File::Flush()
+{
+    Write_Directly(buffer_.get(), used_);
+    used_ = 0;
+}
+
+void Output_File::Write(const void* bytes, std::size_t count)
+{
+    if (descriptor_ < 0) {
+        failed_ = true;
+        return;
+    }
+    if (count > Output_Buffer_Size - used_)
+        Flush();
+    if (count > Output_Buffer_Size) {
+        Write_Directly(static_cast<const char*>(bytes), count);
+        return;
+    }
+    std::memcpy(buffer_.get() + used_, bytes, count);
+    used_ += count;
+}
+
+bool Output_File::Close()
+{
+    if (descriptor_ < 0)
+        return false;
+    Flush();
+    if (owned_ && ::close(descriptor_) != 0)
+        failed_ = true;
+    descriptor_ = -1;
+    return !failed_;
+}
+
+Scratch_File::~Scratch_File()
+{
+    Delete_File(name_);
+}
+
+}  // namespace ingester

@@ -1,0 +1,144 @@
+#include "platform/folders.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <ctime>
+
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace ingester {
+
+namespace {
+
+constexpr char Native_Separator = '/';
+constexpr char Request_Separator = '\\';
+
+bool Is_Separator(char c)
+{
+    return c == Native_Separator || c == Request_Separator;
+}
+
+std::string With_Separator(std::string_view name, char separator)
+{
+    std::string text(name);
+    std::replace_if(text.begin(), text.end(), Is_Separator, separator);
+    return text;
+}
+
+bool Look_At(std::string_view name, struct stat& facts)
+{
+    return ::stat(Native_Path(name).c_str(), &facts) == 0;
+}
+
+}  // namespace
+
+std::string Native_Path(std::string_view name)
+{
+    return With_Separator(name, Native_Separator);
+}
+
+std::string Request_Path(std::string_view native)
+{
+    return With_Separator(native, Request_Separator);
+}
+
+std::string Get_Temp_Folder()
+{
+    for (const char* variable : {"TMPDIR", "TMP", "TEMP"}) {
+        const char* const folder = std::getenv(variable);
+        if (folder == nullptr || *folder == '\0')
+            continue;
+        std::string name = Request_Path(folder);
+        if (name.back() != Request_Separator)
+            name += Request_Separator;
+        return name;
+    }
+    return "\\tmp\\";
+}
+
+long Process_Id()
+{
+    return static_cast<long>(::getpid());
+}
+
+bool File_Exists(std::string_view name)
+{
+    struct stat facts;
+    return Look_At(name, facts) && !S_ISDIR(facts.st_mode);
+}
+
+bool Folder_Exists(std::string_view name)
+{
+    struct stat facts;
+    return Look_At(name, facts) && S_ISDIR(facts.st_mode);
+}
+
+bool Same_File(std::string_view a, std::string_view b)
+{
+    struct stat facts_a;
+    struct stat facts_b;
+    return Look_At(a, facts_a) && Look_At(b, facts_b) && facts_a.st_dev == facts_b.st_dev
+           && facts_a.st_ino == facts_b.st_ino;
+}
+
+bool Delete_File(std::string_view name)
+{
+    return ::unlink(Native_Path(name).c_str()) == 0 || !File_Exists(name);
+}
+
+bool Replace_File(std::string_view from, std::string_view to)
+{
+    return ::rename(Native_Path(from).c_str(), Native_Path(to).c_str()) == 0;
+}
+
+std::string_view Folder_Of(std::string_view name)
+{
+    return name.substr(0, name.size() - File_Part_Of(name).size());
+}
+
+std::string_view File_Part_Of(std::string_view name)
+{
+    const std::size_t last = name.find_last_of("\\/");
+    return last == std::string_view::npos ? name : name.substr(last + 1);
+}
+
+std::size_t Extension_Start(std::string_view name)
+{
+    const std::string_view file = File_Part_Of(name);
+    const std::size_t dot = file.rfind('.');
+    return dot == std::string_view::npos ? name.size() : name.size() - file.size() + dot;
+}
+
+std::string With_Extension(std::string_view name, std::string_view extension)
+{
+    return std::string(name.substr(0, Extension_Start(name))).append(extension);
+}
+
+Local_Time Local_Time_Now()
+{
+    const std::time_t now = std::time(nullptr);
+    std::tm parts{};
+    ::localtime_r(&now, &parts);
+    return {parts.tm_hour, parts.tm_min, parts.tm_sec, parts.tm_mon + 1, parts.tm_mday, parts.tm_year + 1900};
+}
+
+void Advise_Large_Pages(void* memory, std::size_t bytes)
+{
+#ifdef MADV_HUGEPAGE
+    constexpr std::size_t large_page = std::size_t{2} << 20;
+    constexpr std::size_t page = 4096;
+    if (bytes < 2 * large_page)
+        return;
+    const auto address = reinterpret_cast<std::uintptr_t>(memory);
+    const std::uintptr_t first = (address + page - 1) / page * page;
+    const std::uintptr_t last = (address + bytes) / page * page;
+    ::madvise(reinterpret_cast<void*>(first), last - first, MADV_HUGEPAGE);  // advice: refusal is no fault
+#else
+    static_cast<void>(memory);
+    static_cast<void>(bytes);
+#endif
+}
+
+}  // namespace ingester
