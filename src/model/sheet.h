@@ -26,9 +26,6 @@ constexpr std::size_t Extra_Width = 80;
 constexpr std::size_t Text_Cell_Width = 90;
 constexpr std::size_t Long_Text_Width = 10000;
 
-/// `Add_Sheet_Comment` keeps at most this much.
-constexpr std::size_t Greatest_Title_Bytes = 1 << 20;
-
 enum Sheet_Type : std::int32_t {
     vector_sheet = 1,
     matrix_sheet = 2,
@@ -235,6 +232,9 @@ bool Delete_Empty_Columns(Sheet* sheet);
 /// Frees the cells of a list: kind 90 the level values, 91 the labels, all others the cells.
 void Free_Cell_Nodes(Column* column, std::int32_t kind);
 
+/// Names the columns of a Matrix or Symmetric Matrix by their place, as they are without labels.
+void Number_Matrix_Columns(Sheet* sheet);
+
 void Mark_Column_Changed(Column* column, bool clear_saved);
 
 // --- Rows and cells ----------------------------------------------------------------------------
@@ -258,13 +258,16 @@ std::int32_t Find_Empty_Columns(Sheet* sheet, bool also_rows);
 /// Keeps `text` in a text-like cell, cut at what the column's type holds, and widens `nlevels`.
 void Set_Text(Column& column, Cell_Node& cell, std::string_view text);
 
-/// Appends a list of nodes, made of kind 90 or 91, to a Factor; texts are the caller's to set.
+/// Replace a Factor's list by one of `count` nodes, missing values or empty labels.
 bool Make_Level_Values(Column& column, std::int32_t count);
 bool Make_Labels(Column& column, std::int32_t count);
 
-/// What a cell of row `index` (from 0) of a Matrix-like column stands beside: a Symmetric Matrix
-/// column holds the cells from the diagonal down, so its first cell is of row `index - 1`.
+/// The row (from 0) of a column's first cell: 0, but on the diagonal in a Symmetric Matrix, whose
+/// columns hold the cells from there down.
 [[nodiscard]] std::int32_t First_Row_Of(const Column& column);
+
+/// How many cells a column of `type` has in a Sheet that it would join as its last one.
+[[nodiscard]] std::int32_t Cells_For_Rows(const Column& column, std::int32_t rows);
 
 // --- Facts -------------------------------------------------------------------------------------
 

@@ -27,7 +27,9 @@ public:
         if (text.empty())
             return Empty();
         text = text.substr(0, greatest_length);
-        const char*& remembered = recent_[Slot_Of(text)];
+        if (recent_ == nullptr)
+            recent_ = std::make_unique<Recent_Texts>();
+        const char*& remembered = (*recent_)[Slot_Of(text)];
         if (remembered != nullptr && View(remembered) == text)
             return remembered;
         remembered = Append(text);
@@ -76,7 +78,8 @@ private:
 
     void Add_Chunk(std::size_t needed);
 
-    std::array<const char*, 64> recent_{};
+    using Recent_Texts = std::array<const char*, 64>;
+    std::unique_ptr<Recent_Texts> recent_;  // made by the first text: most columns hold numbers
     std::vector<std::unique_ptr<char[]>> chunks_;
     char* free_ = nullptr;
     std::size_t room_ = 0;

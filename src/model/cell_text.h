@@ -1,0 +1,25 @@
+// The one way in which text enters a cell.
+#pragma once
+
+#include "model/sheet.h"
+
+#include <string_view>
+
+namespace ingester {
+
+/// Whether `text` means "missing": nothing does while `Missing_Input_Text` is empty; otherwise
+/// blanks do, and that text in any case.
+[[nodiscard]] bool Is_Missing_Text(std::string_view text);
+
+/// Puts `text` into a cell by its column's type: text is kept up to the cell's width, a Factor takes
+/// the level that the text names, anything else the number that it is, or the missing value.
+void Set_Cell_From_Text(Column& column, Cell_Node& cell, std::string_view text);
+
+/// The same by row number, from 0. False where there is no such cell.
+bool Set_Cell_From_Text(Column* column, std::int32_t row, std::string_view text);
+
+/// The number a numeric cell takes from `text`: plain decimal, with a "*" behind it allowed; out of
+/// range or anything else is `missing`. At most `Greatest_Number`.
+[[nodiscard]] double Cell_Number(std::string_view text, double missing);
+
+}  // namespace ingester

@@ -1,0 +1,105 @@
+#include "model/cells.h"
+
+#include "interface/request/messages.h"
+#include "model/sheet.h"
+#include "platform/folders.h"
+
+#include <algorithm>
+
+namespace ingester {
+
+void* Alloc_Zeroed(std::size_t bytes)
+{
+    void* const memory = std::calloc(std::max<std::size_t>(bytes, 1), 1);
+    if (memory == nullptr)
+        Report_Message("Error: Not enough memory to read data.\n");
+    else
+        Advise_Large_Pages(memory, bytes);
+    return memory;
+}
+
+void* Realloc_Checked(void* pointer, std::size_t bytes)
+{
+    void* const memory = std::realloc(pointer, std::max<std::size_t>(bytes, 1));
+    if (memory == nullptr)
+        Report_Message("Error: Not enough memory to read data.\n");
+    return memory;
+}
+
+namespace {
+
+/// Links the nodes of one block, behind `last` if there is one; `set` fills a node's payload.
+template <class Node, class Set>
+void Link_Block(Node* nodes, std::size_t count, Node*& first, Node*& last, Set set)
+{
+    Node* previous = last;
+    if (previous != nullptr)
+        previous->next = nodes;
+    else
+        first = nodes;
+    for (std::size_t i = 0; i < count; ++i) {
+        nodes[i].prev = previous;
+        nodes[i].next = &nodes[i + 1];
+        set(nodes[i]);
+        previous = &nodes[i];
+    }
+    previous->next = nullptr;
+    last = previous;
+}
+
+/// Makes `count` linked nodes in blocks of at most `per_block`.
+template <class Node, class Set>
+std::size_t Alloc_Nodes(std::int64_t count, std::size_t per_block, Node*& first, Node*& last, Block_Table& blocks,
+                        Set set)
+{
+    first = nullptr;
+    last = nullptr;
+    if (count < 1)
+        return 0;
+    for (auto left = static_cast<std::size_t>(count); left > 0;) {
+        const std::size_t size = std::min(left, per_block);
+        void* const block = std::malloc(size * sizeof(Node));
+        if (block == nullptr) {
+            Report_Message("Ingester out of memory.\n");
+            return 0;
+        }
+        blocks.emplace_back(block);
+        Advise_Large_Pages(block, size * sizeof(Node));
+        Link_Block(static_cast<Node*>(block), size, first, last, set);
+        left -= size;
+    }
+    return blocks.size();
+}
+
+/// What a fresh cell of `kind` holds.
+Cell_Value Blank_Value(std::int32_t kind)
+{
+    Cell_Value value;
+    if (kind == long_text_column || kind == unbuffered_text_column)
+        value.text = nullptr;
+    else if (Is_Text_Like(kind) || kind == label_nodes)
+        value.text = Text_Arena::Empty();
+    else
+        value.number = Missing_Value;
+    return value;
+}
+
+}  // namespace
+
+std::size_t Alloc_Cell_Nodes(std::int32_t kind, std::int64_t count, Cell_Node*& first, Cell_Node*& last,
+                             Block_Table& blocks)
+{
+    const Cell_Value blank = Blank_Value(kind);
+    return Alloc_Nodes(count, Cell_Nodes_Per_Block, first, last, blocks,
+                       [blank](Cell_Node& node) { node.value = blank; });
+}
+
+std::size_t Alloc_Row_Nodes(std::int64_t count, Row_Node*& first, Row_Node*& last, Block_Table& blocks)
+{
+    return Alloc_Nodes(count, Row_Nodes_Per_Block, first, last, blocks, [](Row_Node& node) {
+        node.restricted = 0;
+        node.empty = 0;
+    });
+}
+
+}  // namespace ingester

@@ -1,0 +1,529 @@
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/list.h"
+#include "model/names.h"
+#include "model/sheet.h"
+#include "support/number_text.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <cmath>
+#include <memory>
+#include <string>
+#include <utility>
+
+namespace ingester {
+
+namespace {
+
+/// Characters of a name by which the host tells columns apart.
+constexpr std::size_t Telling_Width = 32;
+
+bool Holds_Labels(std::int32_t type)
+{
+    return type == matrix_column || type == symmetric_matrix_column || type == table_column
+           || type == table_margin_column;
+}
+
+/// `name['text']` split into the stem and the text.
+bool Split_Quoted_Suffix(std::string_view name, std::string_view& stem, std::string_view& text)
+{
+    const std::size_t open = name.find("['");
+    if (open == std::string_view::npos || !name.ends_with("']") || open + 4 > name.size())
+        return false;
+    stem = name.substr(0, open);
+    text = name.substr(open + 2, name.size() - open - 4);
+    return true;
+}
+
+std::int32_t Count_Stem(const Sheet& sheet, std::string_view stem)
+{
+    std::int32_t count = 0;
+    for (const Column* column = sheet.first_column; column != nullptr; column = column->next) {
+        const std::string_view name = column->name;
+        if (Equal_Ignoring_Case(name.substr(0, Bracket_Start(name)), stem))
+            ++count;
+    }
+    return count;
+}
+
+/// An element of a pointer with a quoted suffix gets the next number of its stem instead.
+std::string Number_Quoted_Suffix(const Sheet& sheet, Column& column, std::string_view name)
+{
+    std::string_view stem;
+    std::string_view text;
+    if ((sheet.type != vector_sheet && sheet.type != scalar_sheet) || sheet.settings.bracket_names != 0
+        || !Split_Quoted_Suffix(name, stem, text))
+        return std::string(name);
+    column.extra = text;
+    return Format_Text("%.*s[%li]", static_cast<int>(stem.size()), stem.data(),
+                       static_cast<long>(Count_Stem(sheet, stem)) + 1);
+}
+
+void Name_Column(const Sheet& sheet, Column& column, std::string_view name)
+{
+    std::string wanted = Number_Quoted_Suffix(sheet, column, name);
+    const bool table_factor = column.type == factor_column && sheet.type == table_sheet;
+    if (table_factor && (wanted.starts_with("vclass['classification'][")
+                         || wanted.starts_with("*['classification'][")))
+        wanted = Default_Column_Name(0);
+    else if (!Holds_Labels(column.type) && column.type != row_column)
+        wanted = Make_Valid_Name(wanted);
+    column.name = wanted;
+    Use_Bracket_Text(column);
+}
+
+void Set_Column_Defaults(const Sheet& sheet, Column& column)
+{
+    column.date_format = sheet.settings.date_format;
+    column.date_form = sheet.settings.date_form;
+    column.range_low = column.range_high = sheet.missing_value;
+    if (Is_Text_Like(column.type))
+        column.format = general_format;
+    if (column.type == row_column) {
+        column.format = fixed_format;
+        column.decimals = 0;
+    }
+}
+
+bool Is_Units(std::int32_t type)
+{
+    return type == units_text_column || type == units_variate_column;
+}
+
+bool Is_Leading(const Sheet& sheet, std::int32_t type)
+{
+    return type == row_column || Is_Units(type) || (type == factor_column && sheet.type == table_sheet);
+}
+
+void Renumber_Columns(Sheet& sheet)
+{
+    std::int32_t index = 0;
+    for (Column* column = sheet.first_column; column != nullptr; column = column->next)
+        column->index = index++;
+    sheet.cursor_column_index = -1;
+}
+
+/// Counts a Column in or out of its Sheet.
+void Count_Column(Sheet& sheet, const Column& column, std::int32_t by)
+{
+    if (column.type != row_column)
+        sheet.column_count += by;
+    if (Is_Leading(sheet, column.type))
+        sheet.leading_columns += by;
+}
+
+void Place_New_Column(Sheet& sheet, Column& column)
+{
+    Count_Column(sheet, column, 1);
+    if (Is_Units(column.type)) {
+        Link_Before(sheet.first_column, sheet.last_column, sheet.first_column->next, &column, &column);
+        Renumber_Columns(sheet);
+        return;
+    }
+    column.index = sheet.last_column == nullptr ? 0 : sheet.last_column->index + 1;
+    Link_Before(sheet.first_column, sheet.last_column, static_cast<Column*>(nullptr), &column, &column);
+}
+
+}  // namespace
+
+Column* New_Column(Sheet* sheet, std::int32_t type, std::string_view name, std::int32_t text_width)
+{
+    if (sheet == nullptr || (type != row_column && sheet->column_count >= request.Max_Columns))
+        return nullptr;
+    auto owner = std::make_unique<Column>();
+    Column& column = *owner;
+    column.type = type;
+    column.sheet = sheet;
+    column.text_cell_width = text_width;
+    Set_Column_Defaults(*sheet, column);
+    Name_Column(*sheet, column, name);
+    Place_New_Column(*sheet, *owner.release());
+    return &column;
+}
+
+std::int32_t First_Row_Of(const Column& column)
+{
+    return column.type == symmetric_matrix_column ? column.index - column.sheet->leading_columns : 0;
+}
+
+std::int32_t Cells_For_Rows(const Column& column, std::int32_t rows)
+{
+    return column.type == symmetric_matrix_column ? std::max(rows - First_Row_Of(column), 0) : rows;
+}
+
+Column* New_Data_Column(Sheet* sheet, std::int32_t type, std::string_view name, std::int32_t length)
+{
+    const bool without_buffers = type == unbuffered_text_column;
+    Column* const column = New_Column(sheet, without_buffers ? text_column : type, name);
+    if (column == nullptr)
+        return nullptr;
+    column->length = length;
+    column->width = 6;
+    if (Is_Text_Like(column->type)) {
+        column->decimals = 0;
+        column->width = static_cast<std::int32_t>(column->name.size()) + 2;
+    } else if (column->type == factor_column) {
+        column->nlevels = 2;
+    }
+    if (length < 1)
+        return column;
+    if (Alloc_Cell_Nodes(type, length, column->first_cell, column->last_cell, column->blocks) == 0) {
+        Delete_Column(column, false);
+        return nullptr;
+    }
+    if (!Is_Text_Like(column->type) && sheet->missing_value != Missing_Value)
+        for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
+            cell->value.number = sheet->missing_value;
+    return column;
+}
+
+namespace {
+
+const Level_Node* Find_Label(const Column& column, std::string_view text, bool ignore_case, double& level)
+{
+    level = 1.0;
+    for (const Level_Node* node = column.labels; node != nullptr; node = node->next, level += 1.0)
+        if (ignore_case ? Equal_Ignoring_Case(node->Text(), text) : node->Text() == text)
+            return node;
+    return nullptr;
+}
+
+double Nearest_Level(const Column& column, double value)
+{
+    double nearest = 1.0;
+    double distance = HUGE_VAL;
+    double level = 1.0;
+    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next, level += 1.0) {
+        const double away = std::fabs(node->value.number - value);
+        if (away < distance) {
+            distance = away;
+            nearest = level;
+        }
+    }
+    return nearest;
+}
+
+/// The number that starts `text`, or `missing` for "*", nothing, or one out of range.
+double Fill_Number(std::string_view text, double missing)
+{
+    text = Trim_Copy(text);
+    const Parsed_Number parsed = Parse_Number(text.data(), text.data() + text.size());
+    return parsed.status == Number_Status::good ? parsed.value : missing;
+}
+
+/// The level that `text` selects: by label, by nearest level value, or by rounding.
+double Fill_Level(const Column& column, std::string_view text)
+{
+    const double missing = column.sheet->missing_value;
+    double level;
+    if (column.nlevels < 1)
+        return missing;
+    if (column.factor_kind == factor_with_labels)
+        return Find_Label(column, text, false, level) != nullptr || Find_Label(column, text, true, level) != nullptr
+                   ? level
+                   : missing;
+    const double value = Fill_Number(text, missing);
+    if (!(value > missing))
+        return missing;
+    if (column.factor_kind == factor_with_levels)
+        return Nearest_Level(column, value);
+    return std::clamp(std::floor(value + 0.5), 1.0, static_cast<double>(column.nlevels));
+}
+
+}  // namespace
+
+bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::int32_t nlevels, std::string_view text)
+{
+    if (column == nullptr || column->first_cell != nullptr)
+        return false;
+    if (type == scalar_column && length != 1)
+        return Fail("Internal Spreadsheet Error: Requested Scalar type with length <> 1.\n");
+    column->type = type;
+    column->length = length;
+    if (type == factor_column)
+        column->nlevels = nlevels;
+    if (length < 1)
+        return true;
+    if (Alloc_Cell_Nodes(type, length, column->first_cell, column->last_cell, column->blocks) == 0)
+        return false;
+    if (Is_Text_Like(type)) {
+        for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
+            Set_Text(*column, *cell, text);
+        return true;
+    }
+    const double value = type == factor_column ? Fill_Level(*column, text) : Fill_Number(text, column->sheet->missing_value);
+    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
+        cell->value.number = value;
+    return true;
+}
+
+namespace {
+
+/// The type that a Column asked for as `wanted` gets in this Sheet; false when it may not be added.
+bool Overrule_Type(const Sheet& sheet, std::int32_t wanted, std::int32_t position, std::int32_t& type)
+{
+    type = wanted;
+    switch (sheet.type) {
+    case vector_sheet:
+        return Is_Units(wanted) || wanted == factor_column || wanted == text_column || wanted == variate_column
+               || wanted == long_text_column;
+    case matrix_sheet:
+        type = Is_Units(wanted) ? wanted : matrix_column;
+        return true;
+    case symmetric_matrix_sheet:
+        type = Is_Units(wanted) ? wanted : symmetric_matrix_column;
+        return true;
+    case diagonal_matrix_sheet:
+        type = Is_Units(wanted) ? wanted : diagonal_matrix_column;
+        return true;
+    case table_sheet:
+        type = wanted == factor_column && position == 1 ? factor_column : table_column;
+        return true;
+    case scalar_sheet:
+        return wanted == scalar_column;
+    default:
+        return false;
+    }
+}
+
+std::int32_t Level_Value_Width(double value)
+{
+    constexpr std::int32_t exponent_width = 12;
+    const double size = std::fabs(value);
+    if (size == 0.0)
+        return 1;
+    if (size <= 1e-10 || size >= 1e10)
+        return exponent_width;
+    return static_cast<std::int32_t>(std::max(std::trunc(std::log10(size)), 0.0)) + 1;
+}
+
+bool Copy_Levels(Column& column, const Column_Request& wanted)
+{
+    column.nlevels = wanted.nlevels;
+    if (wanted.level_values_count > 0 && wanted.level_values != nullptr) {
+        if (!Make_Level_Values(column, wanted.level_values_count))
+            return false;
+        const Level_Node* from = wanted.level_values;
+        for (Level_Node* to = column.level_values; to != nullptr && from != nullptr; to = to->next, from = from->next) {
+            to->value = from->value;
+            column.width = std::max(column.width, Level_Value_Width(to->value.number));
+        }
+        column.factor_kind = factor_with_levels;
+    }
+    if (wanted.label_count > 0 && wanted.labels != nullptr) {
+        if (!Make_Labels(column, wanted.label_count))
+            return false;
+        const Level_Node* from = wanted.labels;
+        for (Level_Node* to = column.labels; to != nullptr && from != nullptr; to = to->next, from = from->next) {
+            to->value.text = column.texts.Store(from->Text());
+            column.width = std::max(column.width, static_cast<std::int32_t>(to->Text().size()));
+        }
+        column.label_width = column.width;
+        column.factor_kind = factor_with_labels;
+    }
+    return true;
+}
+
+/// The column after which, in list order, a Column added at `position` has to stand.
+std::int32_t Target_Index(const Sheet& sheet, std::int32_t position, bool insert_after)
+{
+    const std::int32_t first = 1;
+    return std::clamp(insert_after ? position + 1 : position, first, sheet.column_count);
+}
+
+}  // namespace
+
+Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t position, bool insert_after)
+{
+    if (sheet == nullptr || sheet->read_only != 0)
+        return nullptr;
+    std::int32_t type;
+    if (!Overrule_Type(*sheet, wanted.type, position, type)) {
+        Report_Message("You cannot add a column of that type to this spreadsheet.\n");
+        return nullptr;
+    }
+    Column* const column = New_Column(sheet, type, wanted.name);
+    if (column == nullptr)
+        return nullptr;
+    const bool units = Is_Units(type);
+    if (!units && (position <= sheet->column_count - 1 || insert_after))
+        Move_Column(sheet, column->index, Target_Index(*sheet, position, insert_after));
+    column->decimals = wanted.decimals;
+    column->width = 6;
+    if (sheet->type == symmetric_matrix_sheet && !units)
+        Insert_Rows(sheet, First_Row_Of(*column), 1, false);
+    if ((type == factor_column && !Copy_Levels(*column, wanted))
+        || !Fill_Column(column, type, Cells_For_Rows(*column, sheet->row_count), wanted.nlevels, wanted.fill)) {
+        Delete_Column(column, false);
+        return nullptr;
+    }
+    if (sheet->label_state == 0)
+        Number_Matrix_Columns(sheet);
+    return column;
+}
+
+namespace {
+
+/// A name as the host tells it from others: 32 characters, with a bracketed suffix beyond them.
+std::string Telling_Part(std::string_view name)
+{
+    name = Trim_Copy(name);
+    const std::size_t bracket = Bracket_Start(name);
+    std::string part(name.substr(0, Telling_Width));
+    if (bracket >= Telling_Width && bracket < name.size())
+        part.append(name.substr(bracket));
+    return part;
+}
+
+}  // namespace
+
+Column* Find_Column(const Sheet* sheet, std::string_view name)
+{
+    if (sheet == nullptr)
+        return nullptr;
+    const std::string wanted = Telling_Part(name);
+    for (Column* column = sheet->first_column; column != nullptr; column = column->next)
+        if (column->type != row_column && Telling_Part(column->name) == wanted)
+            return column;
+    return nullptr;
+}
+
+bool Unlink_Column(Column* column)
+{
+    if (column == nullptr || column->sheet == nullptr || column->type == row_column)
+        return false;
+    Sheet& sheet = *column->sheet;
+    Unlink(sheet.first_column, sheet.last_column, column);
+    Count_Column(sheet, *column, -1);
+    Renumber_Columns(sheet);
+    return true;
+}
+
+bool Insert_Column_At(Sheet* sheet, Column* column, std::int32_t index)
+{
+    if (sheet == nullptr || column == nullptr || index < 1 || index > sheet->column_count + 1)
+        return false;
+    Column* const before = index > sheet->column_count ? nullptr : Column_At(sheet, index);
+    Link_Before(sheet->first_column, sheet->last_column, before, column, column);
+    column->sheet = sheet;
+    Count_Column(*sheet, *column, 1);
+    Renumber_Columns(*sheet);
+    return true;
+}
+
+bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to)
+{
+    if (sheet == nullptr || sheet->read_only != 0 || from < 1 || to < 1 || to > sheet->column_count)
+        return false;
+    Column* const column = Column_At(sheet, from);
+    return Unlink_Column(column) && Insert_Column_At(sheet, column, to);
+}
+
+void Number_Matrix_Columns(Sheet* sheet)
+{
+    for (Column* column = sheet->first_column; column != nullptr; column = column->next)
+        if (column->type == matrix_column || column->type == symmetric_matrix_column)
+            column->name = std::to_string(column->index - sheet->leading_columns + 1);
+}
+
+bool Delete_Column(Column* column, bool keep_square)
+{
+    if (column == nullptr || column->sheet == nullptr)
+        return false;
+    Sheet* const sheet = column->sheet;
+    const std::int32_t row = First_Row_Of(*column);
+    const bool symmetric = column->type == symmetric_matrix_column;
+    if (!Unlink_Column(column))
+        return false;
+    delete column;
+    if (symmetric && keep_square)
+        Delete_Row(sheet, row, false);
+    if (sheet->label_state == 0)
+        Number_Matrix_Columns(sheet);
+    return true;
+}
+
+bool Delete_Empty_Columns(Sheet* sheet)
+{
+    if (sheet == nullptr)
+        return false;
+    if (sheet->type == table_sheet && sheet->table_ways >= 2 && sheet->has_table_data == 0)
+        return true;
+    if (Find_Empty_Columns(sheet, true) == 0)
+        return true;
+    for (Column* column = sheet->last_column; column != nullptr && column->type != row_column;) {
+        Column* const empty = std::exchange(column, column->prev);
+        if (empty->all_empty == 0 || empty->protected_column != 0)
+            continue;
+        if (empty->type == symmetric_matrix_column) {
+            Delete_Column(empty, true);
+            continue;
+        }
+        // Without the renumbering of `Delete_Column`: a wide sheet may lose thousands.
+        Unlink(sheet->first_column, sheet->last_column, empty);
+        Count_Column(*sheet, *empty, -1);
+        delete empty;
+    }
+    Renumber_Columns(*sheet);
+    if (sheet->label_state == 0)
+        Number_Matrix_Columns(sheet);
+    return true;
+}
+
+void Free_Cell_Nodes(Column* column, std::int32_t kind)
+{
+    if (column == nullptr)
+        return;
+    if (kind == level_value_nodes) {
+        column->level_blocks.clear();
+        column->level_values = nullptr;
+        column->level_values_count = 0;
+    } else if (kind == label_nodes) {
+        column->label_blocks.clear();
+        column->labels = nullptr;
+        column->label_count = 0;
+    } else {
+        column->blocks.clear();
+        column->first_cell = column->last_cell = column->cursor_node = nullptr;
+        column->cursor_index = -1;
+        column->length = 0;
+        if (column->labels == nullptr)
+            column->texts = Text_Arena{};
+    }
+}
+
+bool Make_Level_Values(Column& column, std::int32_t count)
+{
+    Free_Cell_Nodes(&column, level_value_nodes);
+    Level_Node* last;
+    if (Alloc_Cell_Nodes(level_value_nodes, count, column.level_values, last, column.level_blocks) == 0)
+        return false;
+    column.level_values_count = count;
+    return true;
+}
+
+bool Make_Labels(Column& column, std::int32_t count)
+{
+    Free_Cell_Nodes(&column, label_nodes);
+    Level_Node* last;
+    if (Alloc_Cell_Nodes(label_nodes, count, column.labels, last, column.label_blocks) == 0)
+        return false;
+    column.label_count = count;
+    return true;
+}
+
+void Mark_Column_Changed(Column* column, bool clear_saved)
+{
+    if (column == nullptr)
+        return;
+    column->modified = 1;
+    column->changed_display = 0;
+    if (column->sheet == nullptr)
+        return;
+    column->sheet->modified = 1;
+    if (clear_saved)
+        column->sheet->saved = 0;
+}
+
+}  // namespace ingester

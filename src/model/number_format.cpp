@@ -1,0 +1,65 @@
+#include "model/number_format.h"
+
+#include "support/number_text.h"
+
+#include <algorithm>
+#include <cmath>
+
+namespace ingester {
+
+namespace {
+
+constexpr int Default_Digits = 6;  // of "%g", "%e" and "%f"
+constexpr int Most_Digits = 17;
+constexpr int Most_Decimals = 40;
+
+/// "%.{decimals}g" where the digits in front of the point leave room for it, else "%g".
+char* Print_Significant(char* target, double value, std::int32_t decimals)
+{
+    const double size = std::fabs(value);
+    if (size >= 1e-12 && size <= 1e12 && std::fabs(std::trunc(std::log10(size)) + 1.0) < decimals)
+        return Print_General(target, value, std::clamp(decimals, 1, Most_Digits));
+    return Print_General(target, value, Default_Digits);
+}
+
+}  // namespace
+
+char* Format_Number(char* target, double value, std::int32_t format, std::int32_t decimals, double missing)
+{
+    if (!(value > missing)) {
+        *target = '*';
+        return target + 1;
+    }
+    decimals = std::min(decimals, Most_Decimals);
+    switch (format) {
+    case significant_digits_format:
+        return Print_Significant(target, value, decimals);
+    case exponent_format:
+        return Print_Exponent(target, value, decimals < 1 ? Default_Digits : decimals);
+    case fixed_format:
+        return Print_Fixed(target, value, decimals < 0 ? Default_Digits : decimals);
+    default:
+        return Print_General(target, value, Default_Digits);
+    }
+}
+
+char* Format_Cell_Number(char* target, const Column& column, double value)
+{
+    return Format_Number(target, value, column.format, column.decimals, column.sheet->missing_value);
+}
+
+std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target)
+{
+    const Level_Node* node = column.factor_kind == factor_with_labels   ? column.labels
+                             : column.factor_kind == factor_with_levels ? column.level_values
+                                                                        : nullptr;
+    for (std::int32_t i = 1; i < level && node != nullptr; ++i)
+        node = node->next;
+    if (node != nullptr && column.factor_kind == factor_with_labels)
+        return node->Text();
+    char* const end = node != nullptr ? Format_Cell_Number(target, column, node->value.number)
+                                      : Print_Integer(target, level);
+    return {target, static_cast<std::size_t>(end - target)};
+}
+
+}  // namespace ingester

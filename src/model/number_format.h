@@ -1,0 +1,22 @@
+// Numbers printed by a Column's format code.
+#pragma once
+
+#include "model/sheet.h"
+
+#include <cstdint>
+#include <string_view>
+
+namespace ingester {
+
+/// Prints `value` by a format code and its decimals; a value not above `missing` prints "*".
+/// `target` has `Number_Text_Room`. Returns the end of the text.
+char* Format_Number(char* target, double value, std::int32_t format, std::int32_t decimals, double missing);
+
+/// The printed form of a present number of `column`, or "*".
+char* Format_Cell_Number(char* target, const Column& column, double value);
+
+/// What cell `level` of a Factor prints as: its label, level value or number. Valid until `target`
+/// (of `Number_Text_Room`) changes. `level` is from 1.
+[[nodiscard]] std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target);
+
+}  // namespace ingester

@@ -1,0 +1,260 @@
+#include "interface/request/messages.h"
+#include "model/list.h"
+#include "model/sheet.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace ingester {
+
+namespace {
+
+bool Insertion_Fits(std::int32_t count)
+{
+    if (count > Greatest_Insertion)
+        return Fail("Too many rows to insert.\nAt most 33 million rows can be added at one time.\n");
+    return count >= 1;
+}
+
+}  // namespace
+
+void Set_Text(Column& column, Cell_Node& cell, std::string_view text)
+{
+    text = text.substr(0, column.type == long_text_column ? Long_Text_Width : Text_Cell_Width);
+    cell.value.text = column.texts.Store(text);
+    column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(text.size()));
+}
+
+bool Insert_Cells(Column* column, std::int32_t position, std::int32_t count)
+{
+    if (column == nullptr || position < 0 || !Insertion_Fits(count))
+        return false;
+    Cell_Node* const before = position < column->length ? Cell_At(column, position) : nullptr;
+    Cell_Node* first;
+    Cell_Node* last;
+    if (Alloc_Cell_Nodes(column->type, count, first, last, column->blocks) == 0)
+        return false;
+    if (!Is_Text_Like(column->type))
+        for (Cell_Node* cell = first; cell != nullptr; cell = cell->next)
+            cell->value.number = column->sheet->missing_value;
+    Link_Before(column->first_cell, column->last_cell, before, first, last);
+    column->length += count;
+    column->cursor_index = -1;
+    return true;
+}
+
+bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count)
+{
+    if (sheet == nullptr || position < 0 || !Insertion_Fits(count))
+        return false;
+    Row_Node* const before = position < sheet->row_count ? Row_At(sheet, position) : nullptr;
+    Row_Node* first;
+    Row_Node* last;
+    if (Alloc_Row_Nodes(count, first, last, sheet->row_blocks) == 0)
+        return false;
+    Link_Before(sheet->first_row, sheet->last_row, before, first, last);
+    sheet->row_count += count;
+    sheet->cursor_row_index = -1;
+    return true;
+}
+
+namespace {
+
+/// Row numbers always run 1..N, so the `Row` column grows at its end, wherever the rows came in.
+bool Lengthen_Row_Numbers(Sheet& sheet, std::int32_t count)
+{
+    Column& numbers = *sheet.first_column;
+    const std::int32_t old_length = numbers.length;
+    if (!Insert_Cells(&numbers, old_length, count))
+        return false;
+    double number = sheet.row_count;
+    for (std::int32_t i = 0; i < count; ++i, number -= 1.0)
+        Cell_At(&numbers, numbers.length - 1 - i)->value.number = number;
+    return true;
+}
+
+/// On a Symmetric Matrix new rows bring new columns, which start on the diagonal.
+bool Insert_Square_Columns(Sheet& sheet, std::int32_t position, std::int32_t count)
+{
+    for (std::int32_t i = 0; i < count; ++i) {
+        Column* const column = New_Column(&sheet, symmetric_matrix_column, "");
+        if (column == nullptr
+            || !Move_Column(&sheet, column->index,
+                            std::min(sheet.leading_columns + position + i, sheet.column_count))
+            || !Fill_Column(column, symmetric_matrix_column, Cells_For_Rows(*column, sheet.row_count), 0, ""))
+            return false;
+    }
+    if (sheet.label_state == 0)
+        Number_Matrix_Columns(&sheet);
+    return true;
+}
+
+}  // namespace
+
+bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool keep_square)
+{
+    if (sheet == nullptr || position < 0 || !Insertion_Fits(count))
+        return false;
+    position = std::min(position, sheet->row_count);
+    if (!Insert_Row_Nodes(sheet, position, count) || !Lengthen_Row_Numbers(*sheet, count))
+        return false;
+    for (Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
+        const std::int32_t first_row = First_Row_Of(*column);
+        // A column that begins below the new rows only moves down with its diagonal.
+        if (column->type == symmetric_matrix_column && first_row >= position)
+            continue;
+        if (!Insert_Cells(column, position - first_row, count))
+            return false;
+    }
+    if (keep_square && sheet->type == symmetric_matrix_sheet)
+        return Insert_Square_Columns(*sheet, position, count);
+    return true;
+}
+
+bool Remove_Cell(Column* column, std::int32_t index)
+{
+    Cell_Node* const cell = Cell_At(column, index);
+    if (cell == nullptr)
+        return false;
+    // The neighbour keeps the remembered position, so that a sweep of removals stays linear.
+    column->cursor_node = cell->next != nullptr ? cell->next : cell->prev;
+    column->cursor_index = cell->next != nullptr ? index : index - 1;
+    Unlink(column->first_cell, column->last_cell, cell);
+    --column->length;
+    return true;
+}
+
+namespace {
+
+void Remove_Row_Node(Sheet& sheet, std::int32_t index)
+{
+    Row_Node* const row = Row_At(&sheet, index);
+    if (row->restricted != 0)
+        --sheet.restricted_rows;
+    sheet.cursor_row = row->next != nullptr ? row->next : row->prev;
+    sheet.cursor_row_index = row->next != nullptr ? index : index - 1;
+    Unlink(sheet.first_row, sheet.last_row, row);
+    --sheet.row_count;
+}
+
+}  // namespace
+
+bool Delete_Row(Sheet* sheet, std::int32_t index, bool keep_square)
+{
+    if (sheet == nullptr || sheet->type == scalar_sheet || sheet->row_count <= 1 || index < 0
+        || index >= sheet->row_count)
+        return false;
+    if (keep_square && sheet->type == symmetric_matrix_sheet)
+        return Delete_Column(Column_At(sheet, sheet->leading_columns + index), true);
+    Remove_Row_Node(*sheet, index);
+    Remove_Cell(sheet->first_column, sheet->first_column->length - 1);
+    for (Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
+        const std::int32_t first_row = First_Row_Of(*column);
+        if (index >= first_row && column->length > sheet->row_count - first_row)
+            Remove_Cell(column, index - first_row);
+    }
+    sheet->current_row = std::min(sheet->current_row, sheet->row_count - 1);
+    sheet->top_row = std::min(sheet->top_row, sheet->row_count - 1);
+    return true;
+}
+
+bool Cell_Is_Present(const Column& column, const Cell_Node& cell)
+{
+    if (Is_Text_Like(column.type))
+        return !cell.Text().empty();
+    return column.type == factor_column ? cell.value.number >= 1.0 : Is_Present(*column.sheet, cell.value.number);
+}
+
+namespace {
+
+/// Clears `empty` on the rows where `column` holds data; returns how many it cleared.
+std::int32_t Clear_Filled_Rows(const Column& column, Row_Node* row)
+{
+    std::int32_t cleared = 0;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr && row != nullptr;
+         cell = cell->next, row = row->next)
+        if (row->empty != 0 && Cell_Is_Present(column, *cell)) {
+            row->empty = 0;
+            ++cleared;
+        }
+    return cleared;
+}
+
+void Find_Column_Empty(Column& column)
+{
+    column.all_empty = 1;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
+        if (Cell_Is_Present(column, *cell)) {
+            column.all_empty = 0;
+            return;
+        }
+}
+
+/// Marks rows, and returns how many are empty.
+std::int32_t Mark_Empty_Rows(Sheet& sheet)
+{
+    for (Row_Node* row = sheet.first_row; row != nullptr; row = row->next)
+        row->empty = 1;
+    std::int32_t empty = sheet.row_count;
+    for (Column* column = sheet.first_column->next; column != nullptr && empty > 0; column = column->next) {
+        Row_Node* const row = First_Row_Of(*column) == 0 ? sheet.first_row : Row_At(&sheet, First_Row_Of(*column));
+        empty -= Clear_Filled_Rows(*column, row);
+    }
+    return empty;
+}
+
+/// On a Symmetric Matrix row and column i are two halves of one thing: empty only together.
+void Pair_Rows_With_Columns(Sheet& sheet)
+{
+    Row_Node* row = sheet.first_row;
+    for (Column* column = sheet.first_column; column != nullptr && row != nullptr; column = column->next) {
+        if (column->type != symmetric_matrix_column)
+            continue;
+        const bool both = row->empty != 0 && column->all_empty != 0;
+        row->empty = both ? 1 : 0;
+        column->all_empty = both ? 1 : 0;
+        row = row->next;
+    }
+}
+
+void Mark_All_Empty(Sheet& sheet, bool paired)
+{
+    Mark_Empty_Rows(sheet);
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        Find_Column_Empty(*column);
+    if (paired)
+        Pair_Rows_With_Columns(sheet);
+}
+
+}  // namespace
+
+std::int32_t Find_Empty_Rows(Sheet* sheet, bool also_columns)
+{
+    if (sheet == nullptr)
+        return 0;
+    if (!also_columns || sheet->type != symmetric_matrix_sheet)
+        return Mark_Empty_Rows(*sheet);
+    Mark_All_Empty(*sheet, true);
+    std::int32_t empty = 0;
+    for (const Row_Node* row = sheet->first_row; row != nullptr; row = row->next)
+        empty += row->empty;
+    return empty;
+}
+
+std::int32_t Find_Empty_Columns(Sheet* sheet, bool also_rows)
+{
+    if (sheet == nullptr)
+        return 0;
+    if (also_rows && sheet->type == symmetric_matrix_sheet)
+        Mark_All_Empty(*sheet, true);
+    else
+        for (Column* column = sheet->first_column->next; column != nullptr; column = column->next)
+            Find_Column_Empty(*column);
+    std::int32_t empty = 0;
+    for (const Column* column = sheet->first_column->next; column != nullptr; column = column->next)
+        empty += column->all_empty;
+    return empty;
+}
+
+}  // namespace ingester

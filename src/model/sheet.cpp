@@ -1,0 +1,134 @@
+#include "model/sheet.h"
+
+#include "interface/request/request.h"
+#include "model/list.h"
+#include "model/names.h"
+
+#include <memory>
+#include <utility>
+#include <vector>
+
+namespace ingester {
+
+Sheet* Current_Sheet = nullptr;
+
+namespace {
+
+/// Every Sheet of the request.
+std::vector<std::unique_ptr<Sheet>> sheets;
+
+/// Row numbers get wider columns as they grow: below 1001, below 10001, and from then on.
+std::int32_t Row_Number_Width(std::int32_t rows)
+{
+    return rows < 1001 ? 4 : rows < 10001 ? 5 : 6;
+}
+
+}  // namespace
+
+Sheet::~Sheet()
+{
+    for (Column* column = first_column; column != nullptr;)
+        delete std::exchange(column, column->next);
+}
+
+void Init_Library()
+{
+    request.settings = Settings{};
+    Reset_Name_Counters();
+}
+
+void Free_Sheets()
+{
+    sheets.clear();
+    Current_Sheet = nullptr;
+}
+
+Settings Copy_Settings()
+{
+    return Get_Settings();
+}
+
+Sheet* New_Sheet()
+{
+    sheets.push_back(std::make_unique<Sheet>());
+    Sheet* const sheet = sheets.back().get();
+    sheet->settings = Copy_Settings();
+    New_Column(sheet, row_column, "Row");
+    Current_Sheet = sheet;
+    return sheet;
+}
+
+Sheet* New_Sheet_With_Rows(std::int32_t rows)
+{
+    Sheet* const earlier = Current_Sheet;
+    Sheet* const sheet = New_Sheet();
+    sheet->row_count = rows;
+    if (rows >= 1 && !Setup_Rows(sheet)) {
+        sheets.pop_back();
+        Current_Sheet = earlier;
+        return nullptr;
+    }
+    return sheet;
+}
+
+bool Setup_Rows(Sheet* sheet)
+{
+    if (sheet == nullptr || sheet->row_count < 1)
+        return false;
+    const std::int32_t rows = sheet->row_count;
+    Column& numbers = *sheet->first_column;
+    if (Alloc_Row_Nodes(rows, sheet->first_row, sheet->last_row, sheet->row_blocks) == 0
+        || Alloc_Cell_Nodes(row_column, rows, numbers.first_cell, numbers.last_cell, numbers.blocks) == 0)
+        return false;
+    numbers.length = rows;
+    numbers.width = Row_Number_Width(rows);
+    double number = 0.0;
+    for (Cell_Node* cell = numbers.first_cell; cell != nullptr; cell = cell->next)
+        cell->value.number = ++number;
+    return true;
+}
+
+Column* Column_At(Sheet* sheet, std::int32_t index)
+{
+    if (sheet == nullptr)
+        return nullptr;
+    return Walk_To(sheet->first_column, sheet->last_column, sheet->cursor_column, sheet->cursor_column_index,
+                   sheet->column_count + 1, index);
+}
+
+Row_Node* Row_At(Sheet* sheet, std::int32_t index)
+{
+    if (sheet == nullptr)
+        return nullptr;
+    return Walk_To(sheet->first_row, sheet->last_row, sheet->cursor_row, sheet->cursor_row_index,
+                   sheet->row_count, index);
+}
+
+Cell_Node* Cell_At(Column* column, std::int32_t index)
+{
+    if (column == nullptr)
+        return nullptr;
+    return Walk_To(column->first_cell, column->last_cell, column->cursor_node, column->cursor_index,
+                   column->length, index);
+}
+
+void Add_Sheet_Comment(Sheet* sheet, std::string_view text)
+{
+    if (sheet == nullptr)
+        return;
+    while (!text.empty()) {
+        const std::size_t end = text.find('\n');
+        const std::string_view line = text.substr(0, end);
+        for (const char c : line)
+            if (static_cast<unsigned char>(c) >= 32 && c != 127)
+                sheet->title_lines += c;
+        sheet->title_lines += '\0';
+        ++sheet->title_line_count;
+        if (end == std::string_view::npos)
+            break;
+        text.remove_prefix(end + 1);
+    }
+    sheet->title_bytes = static_cast<std::int32_t>(sheet->title_lines.size());
+}
+
+}  // namespace ingester
