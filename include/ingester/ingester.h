@@ -33,18 +33,18 @@ extern "C" {
 /* The status that a result file begins with. */
 enum ingester_status {
     INGESTER_SUCCESS = 0,
-    INGESTER_NO_REQUEST = 1,          /* the pass file was not found, or is faulty */
-    INGESTER_INPUT_UNREADABLE = 2,    /* the input can't be opened, or is empty */
-    INGESTER_INPUT_UNKNOWN = 3,       /* no known file type */
-    INGESTER_NO_DATA = 4,             /* data could not be read, or all of it is empty */
-    INGESTER_NOT_IMPORTED = 5,        /* no data imported; an operation on them failed */
-    INGESTER_OUTPUT_FAILED = 6,       /* the output could not be written */
-    INGESTER_NO_ROWS = 7,             /* success, with zero rows */
-    INGESTER_INEXACT_SHEET = 8,       /* no data after an inexact sheet match; adding failed */
+    INGESTER_NO_REQUEST = 1,       /* the pass file was not found, or is faulty */
+    INGESTER_INPUT_UNREADABLE = 2, /* the input can't be opened, or is empty */
+    INGESTER_INPUT_UNKNOWN = 3,    /* no known file type */
+    INGESTER_NO_DATA = 4,          /* data could not be read, or all of it is empty */
+    INGESTER_NOT_IMPORTED = 5,     /* no data imported; an operation on them failed */
+    INGESTER_OUTPUT_FAILED = 6,    /* the output could not be written */
+    INGESTER_NO_ROWS = 7,          /* success, with zero rows */
+    INGESTER_INEXACT_SHEET = 8,    /* no data after an inexact sheet match; adding failed */
     INGESTER_CLIPBOARD_FAILED = 9,
-    INGESTER_RENAME_FAILED = 10,      /* the finished output could not take its name */
+    INGESTER_RENAME_FAILED = 10, /* the finished output could not take its name */
     INGESTER_ZIP_UNSUPPORTED = 11,
-    INGESTER_NOTHING_SELECTED = 13,   /* no columns or rows selected */
+    INGESTER_NOTHING_SELECTED = 13, /* no columns or rows selected */
     INGESTER_QTL_FAILED = 14,
     INGESTER_QTL_OPTIONS = 16,
     INGESTER_DOWNLOAD_FAILED = 19

@@ -5,9 +5,9 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <cmath>
 
-namespace ingester {
+namespace ingester
+{
 
 bool Is_Missing_Text(std::string_view text)
 {
@@ -28,16 +28,15 @@ double Cell_Number(std::string_view text, double missing)
     return std::min(parsed.value, Greatest_Number);
 }
 
-namespace {
+namespace
+{
 
 /// The tests by which a text finds a label, tried in this order over all labels.
 constexpr bool (*Label_Tests[])(std::string_view label, std::string_view text) = {
     [](std::string_view label, std::string_view text) { return label == text; },
     [](std::string_view label, std::string_view text) { return Equal_Ignoring_Case(label, text); },
-    [](std::string_view label, std::string_view text) { return !label.empty() && text.starts_with(label); },
-    [](std::string_view label, std::string_view text) {
-        return !label.empty() && Starts_Ignoring_Case(text, label);
-    },
+    [](std::string_view label, std::string_view text) { return label.starts_with(text); },
+    [](std::string_view label, std::string_view text) { return Starts_Ignoring_Case(label, text); },
 };
 
 /// The label that shares the longest start with the text, when it is the longest by itself; else 0.
@@ -73,22 +72,6 @@ std::int32_t Label_Of_Text(const Column& column, std::string_view text)
     return Longest_Common_Start(column, text);
 }
 
-std::int32_t Nearest_Level_Value(const Column& column, double value)
-{
-    std::int32_t nearest = 0;
-    std::int32_t level = 0;
-    double distance = HUGE_VAL;
-    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next) {
-        ++level;
-        const double away = std::fabs(node->value.number - value);
-        if (away < distance) {
-            distance = away;
-            nearest = level;
-        }
-    }
-    return nearest;
-}
-
 /// The level of a Factor with labels or level values that `text` names; missing when there is none.
 double Level_Of_Text(const Column& column, std::string_view text)
 {
@@ -98,7 +81,7 @@ double Level_Of_Text(const Column& column, std::string_view text)
         level = text.empty() ? 0 : Label_Of_Text(column, text);
     } else {
         const double value = Cell_Number(text, missing);
-        level = value > missing ? Nearest_Level_Value(column, value) : 0;
+        level = value > missing ? Nearest_Level(column, value) : 0;
     }
     return level > 0 ? level : missing;
 }

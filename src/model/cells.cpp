@@ -6,7 +6,8 @@
 
 #include <algorithm>
 
-namespace ingester {
+namespace ingester
+{
 
 void* Alloc_Zeroed(std::size_t bytes)
 {
@@ -26,7 +27,8 @@ void* Realloc_Checked(void* pointer, std::size_t bytes)
     return memory;
 }
 
-namespace {
+namespace
+{
 
 /// Links the nodes of one block, behind `last` if there is one; `set` fills a node's payload.
 template <class Node, class Set>
@@ -48,9 +50,9 @@ void Link_Block(Node* nodes, std::size_t count, Node*& first, Node*& last, Set s
 }
 
 /// Makes `count` linked nodes in blocks of at most `per_block`.
-template <class Node, class Set>
-std::size_t Alloc_Nodes(std::int64_t count, std::size_t per_block, Node*& first, Node*& last, Block_Table& blocks,
-                        Set set)
+template <class Node, class Set> std::size_t Alloc_Nodes(std::int64_t count, std::size_t per_block,
+                                                         Node*& first, Node*& last, Block_Table& blocks,
+                                                         Set set)
 {
     first = nullptr;
     last = nullptr;

@@ -12,9 +12,11 @@
 #include <string>
 #include <utility>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace {
+namespace
+{
 
 /// Characters of a name by which the host tells columns apart.
 constexpr std::size_t Telling_Width = 32;
@@ -64,8 +66,8 @@ void Name_Column(const Sheet& sheet, Column& column, std::string_view name)
 {
     std::string wanted = Number_Quoted_Suffix(sheet, column, name);
     const bool table_factor = column.type == factor_column && sheet.type == table_sheet;
-    if (table_factor && (wanted.starts_with("vclass['classification'][")
-                         || wanted.starts_with("*['classification'][")))
+    if (table_factor
+        && (wanted.starts_with("vclass['classification'][") || wanted.starts_with("*['classification'][")))
         wanted = Default_Column_Name(0);
     else if (!Holds_Labels(column.type) && column.type != row_column)
         wanted = Make_Valid_Name(wanted);
@@ -178,7 +180,8 @@ Column* New_Data_Column(Sheet* sheet, std::int32_t type, std::string_view name, 
     return column;
 }
 
-namespace {
+namespace
+{
 
 const Level_Node* Find_Label(const Column& column, std::string_view text, bool ignore_case, double& level)
 {
@@ -187,21 +190,6 @@ const Level_Node* Find_Label(const Column& column, std::string_view text, bool i
         if (ignore_case ? Equal_Ignoring_Case(node->Text(), text) : node->Text() == text)
             return node;
     return nullptr;
-}
-
-double Nearest_Level(const Column& column, double value)
-{
-    double nearest = 1.0;
-    double distance = HUGE_VAL;
-    double level = 1.0;
-    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next, level += 1.0) {
-        const double away = std::fabs(node->value.number - value);
-        if (away < distance) {
-            distance = away;
-            nearest = level;
-        }
-    }
-    return nearest;
 }
 
 /// The number that starts `text`, or `missing` for "*", nothing, or one out of range.
@@ -220,7 +208,8 @@ double Fill_Level(const Column& column, std::string_view text)
     if (column.nlevels < 1)
         return missing;
     if (column.factor_kind == factor_with_labels)
-        return Find_Label(column, text, false, level) != nullptr || Find_Label(column, text, true, level) != nullptr
+        return Find_Label(column, text, false, level) != nullptr
+                       || Find_Label(column, text, true, level) != nullptr
                    ? level
                    : missing;
     const double value = Fill_Number(text, missing);
@@ -233,7 +222,8 @@ double Fill_Level(const Column& column, std::string_view text)
 
 }  // namespace
 
-bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::int32_t nlevels, std::string_view text)
+bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::int32_t nlevels,
+                 std::string_view text)
 {
     if (column == nullptr || column->first_cell != nullptr)
         return false;
@@ -252,13 +242,15 @@ bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::in
             Set_Text(*column, *cell, text);
         return true;
     }
-    const double value = type == factor_column ? Fill_Level(*column, text) : Fill_Number(text, column->sheet->missing_value);
+    const double value =
+        type == factor_column ? Fill_Level(*column, text) : Fill_Number(text, column->sheet->missing_value);
     for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
         cell->value.number = value;
     return true;
 }
 
-namespace {
+namespace
+{
 
 /// The type that a Column asked for as `wanted` gets in this Sheet; false when it may not be added.
 bool Overrule_Type(const Sheet& sheet, std::int32_t wanted, std::int32_t position, std::int32_t& type)
@@ -266,8 +258,8 @@ bool Overrule_Type(const Sheet& sheet, std::int32_t wanted, std::int32_t positio
     type = wanted;
     switch (sheet.type) {
     case vector_sheet:
-        return Is_Units(wanted) || wanted == factor_column || wanted == text_column || wanted == variate_column
-               || wanted == long_text_column;
+        return Is_Units(wanted) || wanted == factor_column || wanted == text_column
+               || wanted == variate_column || wanted == long_text_column;
     case matrix_sheet:
         type = Is_Units(wanted) ? wanted : matrix_column;
         return true;
@@ -305,7 +297,8 @@ bool Copy_Levels(Column& column, const Column_Request& wanted)
         if (!Make_Level_Values(column, wanted.level_values_count))
             return false;
         const Level_Node* from = wanted.level_values;
-        for (Level_Node* to = column.level_values; to != nullptr && from != nullptr; to = to->next, from = from->next) {
+        for (Level_Node* to = column.level_values; to != nullptr && from != nullptr;
+             to = to->next, from = from->next) {
             to->value = from->value;
             column.width = std::max(column.width, Level_Value_Width(to->value.number));
         }
@@ -315,7 +308,8 @@ bool Copy_Levels(Column& column, const Column_Request& wanted)
         if (!Make_Labels(column, wanted.label_count))
             return false;
         const Level_Node* from = wanted.labels;
-        for (Level_Node* to = column.labels; to != nullptr && from != nullptr; to = to->next, from = from->next) {
+        for (Level_Node* to = column.labels; to != nullptr && from != nullptr;
+             to = to->next, from = from->next) {
             to->value.text = column.texts.Store(from->Text());
             column.width = std::max(column.width, static_cast<std::int32_t>(to->Text().size()));
         }
@@ -354,7 +348,8 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
     if (sheet->type == symmetric_matrix_sheet && !units)
         Insert_Rows(sheet, First_Row_Of(*column), 1, false);
     if ((type == factor_column && !Copy_Levels(*column, wanted))
-        || !Fill_Column(column, type, Cells_For_Rows(*column, sheet->row_count), wanted.nlevels, wanted.fill)) {
+        || !Fill_Column(column, type, Cells_For_Rows(*column, sheet->row_count), wanted.nlevels,
+                        wanted.fill)) {
         Delete_Column(column, false);
         return nullptr;
     }
@@ -363,7 +358,8 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
     return column;
 }
 
-namespace {
+namespace
+{
 
 /// A name as the host tells it from others: 32 characters, with a bracketed suffix beyond them.
 std::string Telling_Part(std::string_view name)

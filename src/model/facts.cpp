@@ -8,9 +8,11 @@
 #include <cmath>
 #include <vector>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace {
+namespace
+{
 
 struct Type_Name {
     std::int32_t type;
@@ -81,7 +83,24 @@ double Factor_Level_Value(const Column& column, std::int32_t level)
     return node == nullptr || column.level_values_count < level ? level : node->value.number;
 }
 
-namespace {
+std::int32_t Nearest_Level(const Column& column, double value)
+{
+    std::int32_t nearest = 0;
+    std::int32_t level = 0;
+    double distance = HUGE_VAL;
+    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next) {
+        ++level;
+        const double away = std::fabs(node->value.number - value);
+        if (away < distance) {
+            distance = away;
+            nearest = level;
+        }
+    }
+    return nearest;
+}
+
+namespace
+{
 
 std::int32_t Widest_Text(const Cell_Node* node)
 {
@@ -132,7 +151,8 @@ void Compute_Column_Width(Column* column)
     column->width = std::max(widest, name_width) + 1;
 }
 
-namespace {
+namespace
+{
 
 /// The values of a Factor's levels as a table: lists are no place for look-ups cell by cell.
 std::vector<double> Level_Table(const Column& column)
@@ -175,7 +195,8 @@ bool Column_Statistics(const Column* column, Column_Summary& summary)
     return true;
 }
 
-namespace {
+namespace
+{
 
 struct Distinct_Count {
     std::int64_t present = 0;

@@ -3,13 +3,13 @@
 
 #include <cstdint>
 
-namespace ingester {
+namespace ingester
+{
 
 /// Walks to node `index` (from 0) of `count`, from the nearest of head, tail and the remembered
 /// position, and remembers it. Null for an index out of range.
-template <class Node>
-Node* Walk_To(Node* first, Node* last, Node*& cursor, std::int32_t& cursor_index, std::int32_t count,
-              std::int32_t index)
+template <class Node> Node* Walk_To(Node* first, Node* last, Node*& cursor, std::int32_t& cursor_index,
+                                    std::int32_t count, std::int32_t index)
 {
     if (index < 0 || index >= count)
         return nullptr;

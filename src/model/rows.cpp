@@ -6,9 +6,11 @@
 #include <algorithm>
 #include <utility>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace {
+namespace
+{
 
 bool Insertion_Fits(std::int32_t count)
 {
@@ -59,7 +61,8 @@ bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count)
     return true;
 }
 
-namespace {
+namespace
+{
 
 /// Row numbers always run 1..N, so the `Row` column grows at its end, wherever the rows came in.
 bool Lengthen_Row_Numbers(Sheet& sheet, std::int32_t count)
@@ -125,7 +128,8 @@ bool Remove_Cell(Column* column, std::int32_t index)
     return true;
 }
 
-namespace {
+namespace
+{
 
 void Remove_Row_Node(Sheet& sheet, std::int32_t index)
 {
@@ -163,10 +167,12 @@ bool Cell_Is_Present(const Column& column, const Cell_Node& cell)
 {
     if (Is_Text_Like(column.type))
         return !cell.Text().empty();
-    return column.type == factor_column ? cell.value.number >= 1.0 : Is_Present(*column.sheet, cell.value.number);
+    return column.type == factor_column ? cell.value.number >= 1.0
+                                        : Is_Present(*column.sheet, cell.value.number);
 }
 
-namespace {
+namespace
+{
 
 /// Clears `empty` on the rows where `column` holds data; returns how many it cleared.
 std::int32_t Clear_Filled_Rows(const Column& column, Row_Node* row)
@@ -198,7 +204,8 @@ std::int32_t Mark_Empty_Rows(Sheet& sheet)
         row->empty = 1;
     std::int32_t empty = sheet.row_count;
     for (Column* column = sheet.first_column->next; column != nullptr && empty > 0; column = column->next) {
-        Row_Node* const row = First_Row_Of(*column) == 0 ? sheet.first_row : Row_At(&sheet, First_Row_Of(*column));
+        Row_Node* const row =
+            First_Row_Of(*column) == 0 ? sheet.first_row : Row_At(&sheet, First_Row_Of(*column));
         empty -= Clear_Filled_Rows(*column, row);
     }
     return empty;

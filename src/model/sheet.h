@@ -12,7 +12,8 @@
 #include <string>
 #include <string_view>
 
-namespace ingester {
+namespace ingester
+{
 
 /// The number that means "missing" (bits FFAC7B1F3CAC7433). A number is present when it is greater
 /// than its Sheet's `missing_value`, which starts as this.
@@ -81,31 +82,31 @@ struct Column {
     std::int32_t type = variate_column;
     Sheet* sheet = nullptr;
     Fixed_Text<Name_Width> name;
-    Fixed_Text<Extra_Width> extra;       ///< the long description
-    Block_Table blocks;                  ///< owns the cells
-    Text_Arena texts;                    ///< owns the texts of cells and labels
+    Fixed_Text<Extra_Width> extra;  ///< the long description
+    Block_Table blocks;             ///< owns the cells
+    Text_Arena texts;               ///< owns the texts of cells and labels
     std::int32_t changed_display = 0;
-    std::int32_t index = 0;              ///< 0 for the `Row` column, then 1, 2, ...
-    std::int32_t length = 0;             ///< number of cells
-    std::int32_t decimals = -1;          ///< -1: not set
-    std::int32_t width = 0;              ///< display width, see `Compute_Column_Width`
+    std::int32_t index = 0;      ///< 0 for the `Row` column, then 1, 2, ...
+    std::int32_t length = 0;     ///< number of cells
+    std::int32_t decimals = -1;  ///< -1: not set
+    std::int32_t width = 0;      ///< display width, see `Compute_Column_Width`
     std::int32_t text_cell_width = Text_Cell_Width;
-    std::int32_t cursor_index = -1;      ///< remembered position of `Cell_At`, -1: none
-    double table_margin_value = 0;       ///< type 8: what stands for the margin
+    std::int32_t cursor_index = -1;  ///< remembered position of `Cell_At`, -1: none
+    double table_margin_value = 0;   ///< type 8: what stands for the margin
     double range_low = 0;
     double range_high = 0;
     std::int32_t format = significant_digits_format;
     std::int32_t justify = default_side;
-    std::int16_t range_selected = 0;     ///< a writer keeps marked columns only
+    std::int16_t range_selected = 0;  ///< a writer keeps marked columns only
     std::int16_t modified = 0;
     std::int16_t all_empty = 1;
-    std::int16_t protected_column = 0;   ///< neither deleted as empty nor converted
-    std::int16_t date_form = 0;          ///< 0 spreadsheet serials, 1 day count
+    std::int16_t protected_column = 0;  ///< neither deleted as empty nor converted
+    std::int16_t date_form = 0;         ///< 0 spreadsheet serials, 1 day count
     std::int32_t date_format = 1;
     Cell_Node* first_cell = nullptr;
     Cell_Node* last_cell = nullptr;
     Cell_Node* cursor_node = nullptr;
-    std::int32_t nlevels = 0;            ///< levels of a Factor; greatest width of a text-like column
+    std::int32_t nlevels = 0;  ///< levels of a Factor; greatest width of a text-like column
     std::int32_t level_values_count = 0;
     std::int32_t label_count = 0;
     std::int32_t label_width = 0;
@@ -124,9 +125,9 @@ struct Sheet {
     Row_Node* first_row = nullptr;
     Row_Node* last_row = nullptr;
     Row_Node* cursor_row = nullptr;
-    std::int32_t label_state = 0;        ///< 0 named by position, 1 and 2 real labels, -1 from a Matrix
+    std::int32_t label_state = 0;  ///< 0 named by position, 1 and 2 real labels, -1 from a Matrix
     Settings settings;
-    std::string title_lines;             ///< title and comment lines, a NUL behind each
+    std::string title_lines;  ///< title and comment lines, a NUL behind each
     std::int32_t title_line_count = 0;
     std::int32_t title_bytes = 0;
     Fixed_Text<Name_Width> structure_name;
@@ -135,10 +136,10 @@ struct Sheet {
     Fixed_Text<280> source_file;
     Fixed_Text<Text_Cell_Width> margin_label = "Margin";
     std::int32_t format_version = 0;
-    std::int32_t column_count = 0;       ///< without the `Row` column
+    std::int32_t column_count = 0;  ///< without the `Row` column
     std::int32_t row_count = 0;
     std::int32_t restricted_rows = 0;
-    std::int32_t leading_columns = 0;    ///< columns at the head that are not data
+    std::int32_t leading_columns = 0;  ///< columns at the head that are not data
     std::int32_t current_column = 0;
     std::int32_t current_row = 0;
     std::int32_t top_row = 0;
@@ -149,7 +150,7 @@ struct Sheet {
     std::int16_t modified = 0;
     std::int16_t saved = 0;
     std::int16_t has_margins = 0;
-    std::int16_t has_table_data = 0;     ///< a Table whose body was given, so empty columns may go
+    std::int16_t has_table_data = 0;  ///< a Table whose body was given, so empty columns may go
     std::int16_t read_only = 0;
     double missing_value = Missing_Value;
     Fixed_Text<32> sheet_name;
@@ -288,6 +289,9 @@ bool Make_Labels(Column& column, std::int32_t count);
 
 /// The value of level `level` (from 1): its level value, or the number itself.
 [[nodiscard]] double Factor_Level_Value(const Column& column, std::int32_t level);
+
+/// The level (from 1) whose value is nearest to `value`; 0 without level values.
+[[nodiscard]] std::int32_t Nearest_Level(const Column& column, double value);
 
 /// Sets `width` (and `nlevels` of text, `label_width` of labels) from what the cells print as.
 void Compute_Column_Width(Column* column);

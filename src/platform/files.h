@@ -11,10 +11,12 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester {
+namespace ingester
+{
 
 /// A file open for reading, or bytes in memory that stand for one.
-class Input_File {
+class Input_File
+{
 public:
     Input_File() = default;
     /// Reads from `bytes`, which must outlive it.
@@ -63,8 +65,8 @@ private:
     std::string name_;
     int descriptor_ = -1;
     std::span<const std::byte> memory_;
-    std::int64_t position_ = 0;      ///< of the caller
-    std::int64_t read_so_far_ = 0;   ///< of the system
+    std::int64_t position_ = 0;     ///< of the caller
+    std::int64_t read_so_far_ = 0;  ///< of the system
     bool failed_ = false;
     std::vector<std::byte> buffer_;
     std::size_t buffer_next_ = 0;
@@ -72,7 +74,8 @@ private:
 };
 
 /// A file being written through one large buffer. Unless `Close` said true it may be incomplete.
-class Output_File {
+class Output_File
+{
 public:
     Output_File() = default;
     Output_File(const Output_File&) = delete;
@@ -116,7 +119,8 @@ private:
 };
 
 /// Deletes the named file when it goes out of sight.
-class Scratch_File {
+class Scratch_File
+{
 public:
     explicit Scratch_File(std::string name) : name_(std::move(name)) {}
     Scratch_File(const Scratch_File&) = delete;

@@ -10,9 +10,11 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace {
+namespace
+{
 
 constexpr std::size_t Input_Buffer_Size = 1 << 16;
 constexpr std::size_t Output_Buffer_Size = 1 << 20;
@@ -20,7 +22,9 @@ constexpr std::size_t Greatest_System_Request = 1 << 30;  // the kernel takes no
 
 }  // namespace
 
-Input_File::Input_File(std::span<const std::byte> bytes, std::string_view name) : name_(name), memory_(bytes) {}
+Input_File::Input_File(std::span<const std::byte> bytes, std::string_view name) : name_(name), memory_(bytes)
+{
+}
 
 Input_File::~Input_File()
 {

@@ -8,9 +8,11 @@
 #include <span>
 #include <type_traits>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace detail {
+namespace detail
+{
 
 template <std::size_t Size> struct Word_Of_Size;
 template <> struct Word_Of_Size<1> {
@@ -50,8 +52,7 @@ template <class T, std::endian order = std::endian::little>
 }
 
 /// Puts `value` into `bytes` in `order`.
-template <class T, std::endian order = std::endian::little>
-inline void Put_Number(void* bytes, T value)
+template <class T, std::endian order = std::endian::little> inline void Put_Number(void* bytes, T value)
 {
     auto word = std::bit_cast<typename detail::Word_Of_Size<sizeof(T)>::type>(value);
     if constexpr (order != std::endian::native)

@@ -1,6 +1,7 @@
 #include "support/progress.h"
 
-namespace ingester {
+namespace ingester
+{
 
 Progress_Hook progress_hook = nullptr;
 

@@ -4,7 +4,8 @@
 #include <cstdio>
 #include <limits>
 
-namespace ingester {
+namespace ingester
+{
 
 long Leading_Integer(std::string_view text)
 {

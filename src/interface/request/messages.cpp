@@ -7,9 +7,11 @@
 #include <memory>
 #include <string>
 
-namespace ingester {
+namespace ingester
+{
 
-namespace {
+namespace
+{
 
 /// The open message file; null before the first message and after the last.
 std::unique_ptr<Output_File> message_file;

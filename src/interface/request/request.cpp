@@ -1,6 +1,7 @@
 #include "interface/request/request.h"
 
-namespace ingester {
+namespace ingester
+{
 
 Request_Globals request;
 

@@ -9,13 +9,17 @@
 #include <string>
 #include <vector>
 
-namespace ingester {
+namespace ingester
+{
 
 /// How the result is joined with an existing output.
 enum class Add_Modes : std::int32_t { none = 0, append = 1, concatenate = 2, merge = 3 };
 
 /// Column limit of outputs without one of their own.
 constexpr std::int32_t Default_Max_Columns = 50000;
+
+/// Among the missing codes: what is missing already.
+constexpr double Star_Code = -1e307;
 
 /// Widths of the strings that a host hands over.
 constexpr std::size_t Long_Name_Width = 1120;
@@ -30,10 +34,10 @@ struct Request_Globals {
     Add_Modes Add_Mode = Add_Modes::none;
     bool Subset_Columns = false;
     bool Subset_Rows = false;
-    std::vector<std::string> Subset_Names;        ///< names, or column numbers as text
+    std::vector<std::string> Subset_Names;  ///< names, or column numbers as text
     std::int32_t Subset_Name_Count = 0;
-    bool Subset_By_Number = false;                ///< the list holds numbers, not variables' names
-    std::vector<std::int32_t> Subset_Row_Flags;   ///< one per input row: 0 drops it
+    bool Subset_By_Number = false;               ///< the list holds numbers, not variables' names
+    std::vector<std::int32_t> Subset_Row_Flags;  ///< one per input row: 0 drops it
     std::int32_t Subset_Row_Count = 0;
     Fixed_Text<60> Scratch_Stem;
 
@@ -45,7 +49,7 @@ struct Request_Globals {
     bool Sheet_Name_Was_Exact = false;
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int32_t Max_Columns = Default_Max_Columns;
-    bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone
+    bool Names_Kept_As_They_Stand = false;  ///< `Make_Valid_Name` leaves names alone
 
     // Input options.
     bool Qtl_Request = false;
@@ -59,7 +63,7 @@ struct Request_Globals {
     std::int32_t First_Column = 0;
     std::int32_t Last_Column = 2147483647;
     bool Print_Summary = false;
-    std::array<double, 3> Instat_Missing_Codes{};
+    std::array<double, 3> Instat_Missing_Codes{};  ///< `Star_Code` for "*"
     std::int32_t Instat_Missing_Code_Count = 0;
     bool Use_Title_Row = false;
     bool Title_Row_Absolute = false;
@@ -115,6 +119,14 @@ struct Request_Globals {
     bool R_Dot_Names = false;
     bool Excel_97 = false;
     bool CSV_Output = false;
+    Fixed_Text<Short_Name_Width> Merge_Sheet_Name;
+    bool Keep_Sorted = true;
+    Fixed_Text<60> Merge_Key;
+    Fixed_Text<60> Merge_With;
+    bool Unique_Rows = false;
+    bool Source_Key_Given = false;
+    std::int32_t Merge_Key_Count = 0;
+    std::int32_t Merge_Fill = 2;
 
     Settings settings;
 };

@@ -1,0 +1,171 @@
+// The exported functions: a request's files are found, read, answered and cleared away.
+#include "ingester/ingester.h"
+
+#include "interface/pass_file.h"
+#include "interface/process_request.h"
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/sheet.h"
+#include "platform/folders.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <new>
+#include <string>
+
+namespace ingester
+{
+
+namespace
+{
+
+/// The files of one call.
+struct Call_Files {
+    std::string pass;
+    std::string result;
+    std::string stem;
+};
+
+/// A name as a host hands it over: an array of characters without a terminator.
+std::string_view Argument_Name(const char* name, std::int32_t length)
+{
+    if (name == nullptr || length <= 0)
+        return {};
+    const std::string_view text(name, static_cast<std::size_t>(length));
+    return text.substr(0, text.find('\0'));
+}
+
+/// A host doubles the backslashes of its carrier file's name.
+std::string Carrier_Name(std::string_view text)
+{
+    constexpr std::size_t greatest_length = 577;
+    std::string name;
+    text = text.substr(0, greatest_length);
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        name += text[i];
+        if (text.substr(i, 2) == "\\\\")
+            ++i;
+    }
+    return name;
+}
+
+/// Names by the process, or by the request id in the host's carrier file.
+Call_Files Find_Call_Files(const std::string& carrier)
+{
+    const std::string temp = Get_Temp_Folder();
+    const long pid = Process_Id();
+    const Call_Files by_process = {temp + Format_Text("IG%li.inp", pid), temp + Format_Text("IG%li.out", pid),
+                                   Format_Text("IG%li", pid)};
+    if (File_Exists(by_process.pass))
+        return by_process;
+    if (const auto id = static_cast<unsigned long>(Read_Carrier_Id(carrier)); id > 0)
+        return {temp + Format_Text("IG%lX.tmp", id), temp + Format_Text("IG%lX.out", id),
+                Format_Text("IG%lX", id)};
+    return {temp + "ingester.inp", temp + "ingester.out", "TxtToNum"};
+}
+
+/// A number in place of a sheet's name, as "3".
+bool Is_Positive_Number(std::string_view text)
+{
+    return !text.empty() && std::all_of(text.begin(), text.end(), Is_Digit) && Leading_Integer(text) > 0;
+}
+
+/// Whether the sheet that was read isn't the one that was asked for.
+bool Another_Sheet_Was_Used()
+{
+    std::string_view wanted = request.Worksheet_Name;
+    const std::string_view used = request.Used_Sheet_Name;
+    if (wanted.empty() || used.empty() || request.Sheet_Name_Was_Exact)
+        return false;
+    const bool prefixed = wanted.size() >= 2 && wanted[1] == ':' && (wanted[0] == 'S' || wanted[0] == 'R');
+    if (prefixed)
+        return !Equal_Ignoring_Case(wanted.substr(2), used);
+    return Is_Positive_Number(wanted) && !Equal_Ignoring_Case(wanted, used);
+}
+
+/// What the user has to know of the sheet, and what that makes of the status.
+Request_Status Check_Sheet_Name(Request_Status status)
+{
+    if (!Another_Sheet_Was_Used())
+        return status;
+    Fail("\n***** Warning: An inexact match for the SHEET name occurred. *****\n"
+         "Data from %s was used when %s was specified.\n"
+         "Note: A closest match algorithm is used and case is ignored.\n",
+         request.Used_Sheet_Name.c_str(), request.Worksheet_Name.c_str());
+    return status == Request_Status::not_imported ? Request_Status::inexact_sheet : status;
+}
+
+/// One call of INGESTER, step by step.
+class Ingester_Call
+{
+public:
+    explicit Ingester_Call(Call_Files files) : files_(std::move(files)) {}
+
+    /// False when no answer may be given.
+    [[nodiscard]] bool Run()
+    {
+        if (!Take_Request())
+            return !asked_.secondary_failed;
+        status_ = Process_Request(asked_.infile, asked_.outfile, rows_);
+        if (status_ == Request_Status::success && rows_ == 0)
+            status_ = Request_Status::no_rows;
+        return true;
+    }
+
+    [[nodiscard]] Request_Status Status() const { return status_; }
+
+private:
+    bool Take_Request()
+    {
+        Input_File file;
+        if (!file.Open(files_.pass))
+            return Fail("Pass file %s not found./n", files_.pass.c_str());
+        if (!Read_Pass_File(file, asked_))
+            return false;
+        file.Close();
+        if (!asked_.secondary_scratch.empty())
+            Delete_File(asked_.secondary_scratch);
+        Delete_File(files_.pass);
+        return true;
+    }
+
+    Call_Files files_;
+    Pass_Request asked_;
+    std::int32_t rows_ = 0;
+    Request_Status status_ = Request_Status::no_request;
+};
+
+/// Runs the call with nothing thrown past it: lack of memory is a fault like any other.
+bool Run_Call(const Call_Files& files, Request_Status& status)
+{
+    bool answer = true;
+    try {
+        Start_Request(files.stem);
+        Ingester_Call call(files);
+        answer = call.Run();
+        status = Check_Sheet_Name(call.Status());
+    } catch (const std::bad_alloc&) {
+        Free_Sheets();  // room for the words
+        Report_Message("Error: Not enough memory to read data.\n");
+        status = Request_Status::no_data;
+    }
+    Close_Message_File();
+    return answer;
+}
+
+}  // namespace
+
+}  // namespace ingester
+
+std::int32_t INGESTER(const char* pass_name, const char* result_name, std::int32_t pass_name_length,
+                      std::int32_t result_name_length)
+{
+    using namespace ingester;
+    Call_Files files = Find_Call_Files(Carrier_Name(Argument_Name(pass_name, pass_name_length)));
+    if (const std::string_view name = Argument_Name(result_name, result_name_length); !name.empty())
+        files.result = name;
+    Request_Status status = Request_Status::no_request;
+    if (Run_Call(files, status))
+        Write_Result_File(files.result, status);
+    return 0;
+}

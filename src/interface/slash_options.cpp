@@ -1,0 +1,495 @@
+#include "interface/slash_options.h"
+
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "support/number_text.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <cstdint>
+
+namespace ingester
+{
+
+namespace
+{
+
+using Taken = std::size_t;  // the end of an option in its string
+
+/// A value and where it ends.
+struct Option_Value {
+    std::string_view text;
+    Taken end;
+};
+
+Option_Value Up_To(std::string_view text, std::size_t at, std::string_view ends)
+{
+    const std::size_t end = std::min(text.find_first_of(ends, at), text.size());
+    return {text.substr(at, end - at), end};
+}
+
+bool Stands_At(std::string_view text, std::size_t at, std::string_view characters)
+{
+    return at < text.size() && characters.find(text[at]) != std::string_view::npos;
+}
+
+/// From a quote to the same quote, or to the end; else bare, up to one of `ends`.
+Option_Value Quoted_Or_Bare(std::string_view text, std::size_t at, std::string_view quotes,
+                            std::string_view ends)
+{
+    if (!Stands_At(text, at, quotes))
+        return Up_To(text, at, ends);
+    const std::size_t close = text.find(text[at], at + 1);
+    if (close == std::string_view::npos)
+        return {text.substr(at + 1), text.size()};
+    return {text.substr(at + 1, close - at - 1), close + 1};
+}
+
+std::size_t Behind_Equals(std::string_view text, std::size_t at)
+{
+    return Stands_At(text, at, "=") ? at + 1 : at;
+}
+
+constexpr std::string_view Quotes = "\"'";
+constexpr std::string_view Quotes_And_Backquote = "\"'`";
+constexpr std::string_view Option_Start = "/";
+constexpr std::string_view Name_End = "/ ";
+
+template <auto Member, auto Value> Taken Set(std::string_view, std::size_t at)
+{
+    request.*Member = Value;
+    return at;
+}
+
+template <auto Member, auto Value> Taken Set_Setting(std::string_view, std::size_t at)
+{
+    Get_Settings().*Member = Value;
+    return at;
+}
+
+/// A quoted or bare value into a text; `optional_equals` takes the "=" that the key lacks.
+template <auto Member, bool optional_equals = false> Taken Take_Text(std::string_view text, std::size_t at)
+{
+    const auto quotes = optional_equals ? Quotes_And_Backquote : Quotes;
+    const Option_Value value =
+        Quoted_Or_Bare(text, optional_equals ? Behind_Equals(text, at) : at, quotes, Option_Start);
+    request.*Member = value.text;
+    return value.end;
+}
+
+/// A quoted value, or a bare name.
+template <auto Member> Taken Take_Name(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Quoted_Or_Bare(text, at, Quotes, Name_End);
+    request.*Member = value.text;
+    return value.end;
+}
+
+template <auto Member> Taken Take_Number(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Up_To(text, at, Option_Start);
+    request.*Member =
+        static_cast<std::int32_t>(std::clamp(Leading_Integer(value.text), -2147483648L, 2147483647L));
+    return value.end;
+}
+
+/// Digits at `at`, as a number; `at` moves behind them. Nothing for none.
+bool Take_Digits(std::string_view text, std::size_t& at, std::int32_t& number)
+{
+    const std::size_t start = at;
+    while (at < text.size() && Is_Digit(text[at]))
+        ++at;
+    if (at > start)
+        number =
+            static_cast<std::int32_t>(std::min(Leading_Integer(text.substr(start, at - start)), 2147483647L));
+    return at > start;
+}
+
+/// "=n" behind a key that may stand alone.
+template <auto Flag, auto Number> Taken Take_Flag_And_Number(std::string_view text, std::size_t at)
+{
+    request.*Flag = true;
+    at = Behind_Equals(text, at);
+    Take_Digits(text, at, request.*Number);
+    return at;
+}
+
+// --- Input -------------------------------------------------------------------------------------
+
+Taken Take_Map_File(std::string_view text, std::size_t at)
+{
+    request.Qtl_Map_Given = true;
+    if (!Stands_At(text, at, "="))
+        return at;
+    const Option_Value value = Quoted_Or_Bare(text, at + 1, Quotes, Option_Start);
+    request.Qtl_Map_File = value.text;
+    return value.end;
+}
+
+Taken Take_Delete_Marker(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Up_To(text, at, Option_Start);
+    if (const long number = Leading_Integer(value.text); number > 0)
+        request.Return_Delete_Marker = Format_Text("T%liD", number);
+    return value.end;
+}
+
+Taken Take_Fixed_Lines(std::string_view text, std::size_t at)
+{
+    constexpr std::size_t most_digits = 10;
+    std::size_t end = at;
+    Take_Digits(text.substr(0, std::min(text.size(), at + most_digits)), end, request.Fixed_Lines);
+    return end;
+}
+
+Taken Take_Lines_Per_Record(std::string_view text, std::size_t at)
+{
+    if (!Stands_At(text, at, "="))
+        return at;
+    const Option_Value value = Up_To(text, at + 1, Option_Start);
+    const long lines = Leading_Integer(value.text);
+    if (lines < 1)
+        Report_Message_Long("CSV number of lines per record (%li) is invalid.\n", lines);
+    request.Lines_Per_Record = static_cast<std::int32_t>(std::clamp(lines, 1L, 2147483647L));
+    return value.end;
+}
+
+/// "first:last"; an end left out stays as it was.
+Taken Take_Column_Range(std::string_view text, std::size_t at)
+{
+    constexpr std::size_t most_characters = 100;
+    const Option_Value value = Up_To(text, Behind_Equals(text, at), Option_Start);
+    const std::string_view range = value.text.substr(0, most_characters);
+    const std::size_t colon = range.find(':');
+    std::size_t digits = std::min(range.find_first_of("0123456789"), range.size());
+    if (digits < colon)
+        Take_Digits(range, digits, request.First_Column);
+    if (colon != std::string_view::npos) {
+        digits = std::min(range.find_first_of("0123456789", colon), range.size());
+        Take_Digits(range, digits, request.Last_Column);
+    }
+    return value.end;
+}
+
+/// Up to three codes with commas between them: numbers, or "*".
+Taken Take_Missing_Codes(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Up_To(text, Behind_Equals(text, at), Option_Start);
+    std::string_view rest = value.text;
+    auto& codes = request.Instat_Missing_Codes;
+    auto& count = request.Instat_Missing_Code_Count;
+    for (count = 0; !rest.empty() && count < static_cast<std::int32_t>(codes.size()); ++count) {
+        const std::size_t comma = std::min(rest.find(','), rest.size());
+        double number;
+        if (!Whole_Number_Text(Trim_Copy(rest.substr(0, comma)), number))
+            number = Star_Code;
+        codes[static_cast<std::size_t>(count)] = number;
+        rest.remove_prefix(std::min(comma + 1, rest.size()));
+    }
+    return value.end;
+}
+
+Taken Take_Title_Row(std::string_view text, std::size_t at)
+{
+    request.Use_Title_Row = true;
+    at = Behind_Equals(text, at);
+    if (Stands_At(text, at, "$")) {
+        request.Title_Row_Absolute = true;
+        ++at;
+    }
+    Take_Digits(text, at, request.Title_Row);
+    return at;
+}
+
+template <auto Member> Taken Take_Prefix(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Up_To(text, Behind_Equals(text, at), Option_Start);
+    Get_Settings().*Member = value.text;
+    return value.end;
+}
+
+Taken Take_Column_Prefix(std::string_view text, std::size_t at)
+{
+    Get_Settings().prefix_given = true;
+    return Take_Prefix<&Settings::column_prefix>(text, at);
+}
+
+Taken Take_Transpose(std::string_view text, std::size_t at)
+{
+    request.Transpose = true;
+    const std::size_t mark = Behind_Equals(text, at);
+    if (!Stands_At(text, mark, "N"))
+        return mark;
+    request.Transpose_Names = false;
+    return mark + 1;
+}
+
+/// One digit, at most 4.
+Taken Take_Text_Number_Mode(std::string_view text, std::size_t at)
+{
+    const std::size_t digit = Behind_Equals(text, at);
+    if (!Stands_At(text, digit, "0123456789"))
+        return digit;
+    request.Text_Number_Mode = std::min(text[digit] - '0', 4);
+    return digit + 1;
+}
+
+Taken Take_Rest_As_Pointer(std::string_view text, std::size_t at)
+{
+    request.Pointer_Name = Trim_Copy(text.substr(at));
+    return text.size();
+}
+
+using R = Request_Globals;
+
+constexpr Slash_Option Input_Table[] = {
+    {"/rqtl", Set<&R::Qtl_Request, true>, "genotype files may be read"},
+    {"/map", Take_Map_File, "map file of a genotype file"},
+    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing"},
+    {"/g=", Take_Delete_Marker, "version number in the host's scratch names"},
+    {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column"},
+    {"/a", Set<&R::Keep_Probe_Statistics, false>, "leave out statistics of microarray probes"},
+    {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks"},
+    {"/csv", Take_Lines_Per_Record, "lines that make one record of a text"},
+    {"/c", Take_Column_Range, "columns to keep, first:last"},
+    {"/db", Set<&R::Print_Summary, true>, "print a summary of the columns"},
+    {"/m", Take_Missing_Codes, "up to three numbers that mean missing"},
+    {"/d", Take_Title_Row, "row of column descriptions in a grid"},
+    {"/f", Set<&R::Keep_Long_Labels, true>, "keep long factor labels"},
+    {"/h", Take_Prefix<&Settings::header_prefix>, "prefix of a name made from a number"},
+    {"/o", Take_Column_Prefix, "prefix of automatic column names"},
+    {"/k", Set<&R::Keep_Empty_Columns, true>, "keep empty columns"},
+    {"/l", Take_Flag_And_Number<&R::Log_Book, &R::Log_Book_Range>, "the grid is a log book"},
+    {"/n", Set<&R::No_Names, true>, "there is no row of names"},
+    {"/#", Set_Setting<&Settings::bracket_names, 0>, "keep quoted suffixes of names as text"},
+    {"/y", Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>, "there is a row of names"},
+    {"/tr", Take_Transpose, "transpose; N: without names"},
+    {"/t", Take_Text_Number_Mode, "how texts become numbers, 0 to 4"},
+    {"/i", Set_Setting<&Settings::ignore_value_case, 1>, "labels differ in more than case"},
+    {"/r", Set<&R::Reverse_Labels, true>, "swap values and labels"},
+    {"/u", Set_Setting<&Settings::auto_factors, 0>, "factor levels stay in the order of the data"},
+    {"/v", Set<&R::Use_Var_File, true>, "rename and retype columns by a list file"},
+    {"/w", Set<&R::List_Sheets_Only, true>, "only list the sheets"},
+    {"/s", Take_Text<&R::Start_Text, true>, "data begin at the line that starts so"},
+    {"/e", Take_Text<&R::End_Text, true>, "data end before the line that starts so"},
+    {"/z=", Take_Text<&R::Custom_Separators>, "separators of fields"},
+    {"/p=", Take_Rest_As_Pointer, "name of a pointer to the columns"},
+};
+
+// --- Output ------------------------------------------------------------------------------------
+
+Taken Take_Missing_Text(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Quoted_Or_Bare(text, at, "'", Option_Start);
+    request.Missing_Text = value.text;
+    return value.end;
+}
+
+Taken Take_Add(std::string_view text, std::size_t at)
+{
+    request.Add_To_Output = true;
+    return Take_Name<&R::Output_Sheet_Name>(text, Behind_Equals(text, at));
+}
+
+/// The same name, when "/a" gave none.
+Taken Take_Sheet_Name(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Quoted_Or_Bare(text, at, Quotes, Name_End);
+    if (request.Output_Sheet_Name.empty())
+        request.Output_Sheet_Name = value.text;
+    return value.end;
+}
+
+Taken Take_Replace(std::string_view text, std::size_t at)
+{
+    request.Add_To_Output = true;
+    request.Replace_Sheet_Asked = true;
+    return Take_Name<&R::Output_Sheet_Name>(text, Behind_Equals(text, at));
+}
+
+template <std::int32_t justify> Taken Take_Justify(std::string_view, std::size_t at)
+{
+    request.Table_Justify = justify;
+    return at;
+}
+
+Taken Take_Packed(std::string_view, std::size_t at)
+{
+    request.Packed_Csv_Output = true;
+    request.Allow_HTML = true;
+    return at;
+}
+
+Taken Take_Log_Book_Lines(std::string_view text, std::size_t at)
+{
+    request.Log_Book_Output = true;
+    return Take_Number<&R::Log_Book_Lines>(text, at);
+}
+
+Taken Take_Matrix(std::string_view text, std::size_t at)
+{
+    request.Output_Matrix = true;
+    if (!Stands_At(text, at, "="))
+        return at;
+    const Option_Value value = Up_To(text, at + 1, Option_Start);
+    request.Output_Matrix_Name = Trim_Copy(value.text);
+    return value.end;
+}
+
+Taken Take_No_Header(std::string_view, std::size_t at)
+{
+    Get_Settings().csv_title = 0;
+    request.Omit_Header = true;
+    return at;
+}
+
+Taken Take_Script_Version(std::string_view text, std::size_t at)
+{
+    const Taken end = Take_Number<&R::Script_Version>(text, at);
+    request.Script_Version = std::clamp(request.Script_Version, 1, 3);
+    return end;
+}
+
+/// Bare keys end at "/", blank or ",".
+std::string_view Take_Key(std::string_view text, std::size_t& at)
+{
+    const Option_Value value = Quoted_Or_Bare(text, at, Quotes, "/ ,");
+    at = value.end;
+    return value.text;
+}
+
+Taken Take_Append(std::string_view text, std::size_t at)
+{
+    request.Add_Mode = Add_Modes::append;
+    at = Behind_Equals(text, at);
+    if (Stands_At(text, at, "N")) {
+        request.Keep_Sorted = false;
+        ++at;
+    }
+    if (!Stands_At(text, at, ","))
+        return at;
+    request.Merge_Key = Take_Key(text, ++at);
+    if (Stands_At(text, at, ","))
+        request.Merge_With = Take_Key(text, ++at);
+    return at;
+}
+
+Taken Take_Concatenate(std::string_view text, std::size_t at)
+{
+    request.Add_Mode = Add_Modes::concatenate;
+    if (!Stands_At(text, at, "U"))
+        return at;
+    request.Unique_Rows = true;
+    return at + 1;
+}
+
+Taken Take_Source_Key(std::string_view text, std::size_t at)
+{
+    request.Add_Mode = Add_Modes::concatenate;
+    request.Source_Key_Given = true;
+    request.Merge_Key = Take_Key(text, at);
+    if (Stands_At(text, at, ","))
+        request.Merge_With = Take_Key(text, ++at);
+    return at;
+}
+
+Taken Take_Merge(std::string_view text, std::size_t at)
+{
+    request.Add_Mode = Add_Modes::merge;
+    at = Behind_Equals(text, at);
+    if (Stands_At(text, at, "0123456789"))
+        request.Merge_Key_Count = text[at++] - '0';
+    if (Stands_At(text, at, "U")) {
+        request.Unique_Rows = true;
+        ++at;
+    }
+    if (Stands_At(text, at, "NM")) {
+        const bool first = (text[at++] == 'N') != request.Unique_Rows;
+        request.Merge_Fill = first ? 0 : 1;
+    }
+    return at;
+}
+
+Taken Take_No_Effect(std::string_view, std::size_t at)
+{
+    return at;
+}
+
+constexpr Slash_Option Output_Table[] = {
+    {"/mv=", Take_Missing_Text, "how a missing value prints"},
+    {"/av", Set<&R::Write_Via_Temp, false>, "write over an existing output directly"},
+    {"/*", Set<&R::No_Return, true>, "no RETURN in the script"},
+    {"/a", Take_Add, "add the sheet to an existing book, under this name"},
+    {"/x=", Take_Sheet_Name, "name of the sheet"},
+    {"/b", Set<&R::End_With_Break, true>, "the script ends with ENDBREAK"},
+    {"/c", Set<&R::Keep_As_Columns, false>, "images and sound in one piece"},
+    {"/d", Set<&R::Use_Formats, true>, "numbers print by their columns' formats"},
+    {"/e", Set_Setting<&Settings::delete_empty_rows, 0>, "keep empty rows"},
+    {"/f", Set<&R::Fixed_Number_Text, true>, "decimals are found from the data"},
+    {"/g", Set<&R::Table_Grid, true>, "grid lines in tables of pages"},
+    {"/h", Take_Packed, "comma text without padding"},
+    {"/i", Set<&R::Excel_Dates_As_Text, true>, "dates as text in workbooks"},
+    {"/jl", Take_Justify<0>, "tables of pages at the left"},
+    {"/jr", Take_Justify<1>, "tables of pages at the right"},
+    {"/jc", Take_Justify<2>, "tables of pages in the middle"},
+    {"/l=", Take_Log_Book_Lines, "lines of a log book"},
+    {"/m", Take_Matrix, "a table of numbers goes out as a Matrix"},
+    {"/n", Take_No_Header, "no line of names"},
+    {"/o", Set<&R::Replace_Book_Data, true>, "replace the data of a sheet in a book"},
+    {"/p", Set<&R::Write_Var_List, true>, "write a list of the columns beside the output"},
+    {"/q", Set<&R::Quiet_Read, true>, "the script reads without printing"},
+    {"/r", Take_Replace, "replace the sheet of this name"},
+    {"/s", Take_No_Effect, "no effect"},
+    {"/-", Set_Setting<&Settings::csv_quote_text, 0>, "texts without quotes"},
+    {"/t", Set<&R::R_Text_Output, true>, "R data in their text form"},
+    {"/u", Set<&R::No_Name_Marks, true>, "no type marks behind names"},
+    {"/v=", Take_Script_Version, "version of the script language"},
+    {"/w", Set<&R::Table_Look, true>, "workbooks with a table's look"},
+    {"/z", Set_Setting<&Settings::csv_title, 0>, "no title line in fixed-width text"},
+    {"/.", Set<&R::R_Dot_Names, true>, "no effect"},
+    {"/7", Set<&R::Excel_97, true>, "workbooks of the 1997 form"},
+    {"/!=", Take_Name<&R::Merge_Sheet_Name>, "sheet of the output that is updated"},
+    {"/@", Take_Append, "append to the existing output; N: unsorted; then the keys"},
+    {"/&", Take_Concatenate, "put columns behind those of the existing output; U: replace equal names"},
+    {"/^", Take_Source_Key, "the same, with a column that names the source"},
+    {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M"},
+};
+
+/// A key that another begins with must be searched behind it, or it would cut the other short.
+template <std::size_t Count> constexpr bool No_Key_Hides_A_Later_One(const Slash_Option (&options)[Count])
+{
+    for (std::size_t early = 0; early < Count; ++early)
+        for (std::size_t late = early + 1; late < Count; ++late)
+            if (options[late].key.starts_with(options[early].key))
+                return false;
+    return true;
+}
+
+static_assert(No_Key_Hides_A_Later_One(Input_Table));
+static_assert(No_Key_Hides_A_Later_One(Output_Table));
+
+}  // namespace
+
+std::span<const Slash_Option> Input_Options()
+{
+    return Input_Table;
+}
+
+std::span<const Slash_Option> Output_Options()
+{
+    return Output_Table;
+}
+
+void Cut_Options(std::span<const Slash_Option> options, std::string& text)
+{
+    for (const Slash_Option& option : options) {
+        const std::size_t start = text.find(option.key);
+        if (start == std::string::npos)
+            continue;
+        const std::size_t end = option.take(text, start + option.key.size());
+        text.erase(start, end - start);
+    }
+    text = std::string(Trim_Copy(text));
+}
+
+}  // namespace ingester

@@ -1,0 +1,62 @@
+#include "interface/subset_lists.h"
+
+#include "interface/request/request.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "support/text.h"
+
+#include <string>
+
+namespace ingester
+{
+
+namespace
+{
+
+constexpr std::size_t List_Line_Width = 1000;
+constexpr std::size_t Count_Line_Width = 100;
+
+/// The count that a list begins with; the lines that are really there decide in the end.
+long Read_List_Count(Input_File& file)
+{
+    std::string line;
+    return file.Read_Line(line, Count_Line_Width) ? Leading_Integer(line) : 0;
+}
+
+}  // namespace
+
+bool Read_Column_Subset(std::string_view name)
+{
+    Input_File file;
+    if (name.empty() || !file.Open(name))
+        return false;
+    const long count = Read_List_Count(file);
+    std::string line;
+    const bool has_kind = file.Read_Line(line, Count_Line_Width);
+    request.Subset_By_Number = !(has_kind && !line.empty() && To_Upper(line.front()) == 'V');
+    request.Subset_Names.clear();
+    for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
+        request.Subset_Names.emplace_back(Trim_Copy(line));
+    request.Subset_Name_Count = static_cast<std::int32_t>(request.Subset_Names.size());
+    file.Close();
+    Delete_File(name);
+    return true;
+}
+
+bool Read_Row_Subset(std::string_view name)
+{
+    Input_File file;
+    if (name.empty() || !file.Open(name))
+        return false;
+    const long count = Read_List_Count(file);
+    std::string line;
+    request.Subset_Row_Flags.clear();
+    for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
+        request.Subset_Row_Flags.push_back(Leading_Integer(line) != 0 ? 1 : 0);
+    request.Subset_Row_Count = static_cast<std::int32_t>(request.Subset_Row_Flags.size());
+    file.Close();
+    Delete_File(name);
+    return true;
+}
+
+}  // namespace ingester

@@ -1,0 +1,80 @@
+// The two line services: one line read as a column, and lines joined by their number of fields.
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/names.h"
+#include "spreadsheet/text/text.h"
+#include "spreadsheet/text/text_format.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <string>
+
+namespace ingester
+{
+
+bool Read_Text_Lines(const char* file_name)
+{
+    Input_File file;
+    if (file.Open(file_name))
+        return Read_Text_Lines(file);
+    Report_Message_Text("Data file %.100s not found.\n", file_name);
+    return Fail("Could not read data file %.200s.\n", file_name);
+}
+
+bool Read_Text_Lines(Input_File& file)
+{
+    std::string line;
+    for (std::int32_t skipped = 0; skipped < request.Fixed_Lines; ++skipped)
+        if (!file.Read_Line(line, Greatest_Line))
+            break;
+    if (!file.Read_Line(line, Greatest_Line))
+        return Fail("Could not read data file %.200s.\n", file.Name().c_str());
+    const char separator =
+        request.Custom_Separators.empty() ? '\t' : request.Custom_Separators.view().front();
+    const auto fields = std::count(line.begin(), line.end(), separator) + 1;
+    Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(fields));
+    Column* const column =
+        New_Data_Column(sheet, text_column, Default_Column_Name(1), static_cast<std::int32_t>(fields));
+    if (column == nullptr)
+        return false;
+    std::string_view rest = line;
+    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
+        const std::size_t end = std::min(rest.find(separator), rest.size());
+        Set_Text(*column, *cell, Trim_Copy(rest.substr(0, end), Text_Cell_Width));
+        rest.remove_prefix(std::min(end + 1, rest.size()));
+    }
+    return file.Close();
+}
+
+bool Reflow_Lines_By_Fields(const char* input, const char* output, std::int32_t fields_per_record)
+{
+    constexpr std::size_t longest_line = 65535;
+    Input_File from;
+    if (!from.Open(input))
+        return Fail("CSV data file %.100s not found.\n", input);
+    Output_File to;
+    if (!to.Open(output))
+        return Fail("CSV data file %.100s could not be opened.\n", output);
+    std::string line;
+    std::int64_t commas = 0;
+    bool record_open = false;
+    bool ends_with_comma = true;
+    while (from.Read_Line(line, longest_line)) {
+        const std::int64_t more = std::count(line.begin(), line.end(), ',');
+        commas += more;
+        if (record_open && commas >= fields_per_record) {
+            to.Write("\n");
+            commas = more;
+        } else if (!ends_with_comma && !line.empty()) {
+            to.Write(",");  // the last field of one line and the first of the next stay apart
+        }
+        to.Write(line);
+        record_open = true;
+        ends_with_comma = line.empty() || line.back() == ',';
+    }
+    if (record_open)
+        to.Write("\n");
+    return to.Close() && from.Close();
+}
+
+}  // namespace ingester

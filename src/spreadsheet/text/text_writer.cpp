@@ -1,0 +1,401 @@
+// A Sheet as text: tabs, commas, or columns of fixed width.
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/number_format.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "spreadsheet/text/text.h"
+#include "support/number_text.h"
+#include "support/progress.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <cstring>
+#include <string>
+#include <vector>
+
+namespace ingester
+{
+
+namespace
+{
+
+constexpr int General_Digits = 15;  // a double holds so many decimal digits
+constexpr std::size_t Greatest_Written_Line = 65535;
+constexpr std::string_view Line_End = "\r\n";
+
+enum class Layout : std::uint8_t { tabs, commas, fixed };
+
+struct Text_Layout {
+    Layout layout;
+    bool padded;     ///< fields fill their column's width
+    bool quoted;     ///< texts stand in quotes
+    char separator;  ///< between fields, and where a line that is too long is broken
+};
+
+Text_Layout Layout_Of_Request(bool tab_mode)
+{
+    if (tab_mode)
+        return {Layout::tabs, false, false, '\t'};
+    if (request.CSV_Output)
+        return {Layout::commas, !request.Packed_Csv_Output, Get_Settings().csv_quote_text != 0, ','};
+    return {Layout::fixed, true, false, ' '};
+}
+
+enum class Cell_Kind : std::uint8_t { number, formatted_number, text, factor };
+
+/// A column on its way out.
+struct Column_Writing {
+    const Column* column;
+    Cell_Kind kind;
+    bool left;               ///< which side of its width a field stands at
+    std::int32_t first_row;  ///< no cells above (Symmetric Matrix)
+    std::int32_t width = 0;
+    const Cell_Node* cell = nullptr;       ///< of the row being written
+    std::vector<std::string> levels = {};  ///< of a Factor, as they print
+};
+
+/// A line under way; fields are printed straight into it.
+class Line_Buffer
+{
+public:
+    /// Room for `count` more characters.
+    char* Reserve(std::size_t count)
+    {
+        if (bytes_.size() - used_ < count)
+            bytes_.resize(std::max(bytes_.size() * 2, used_ + count));
+        return bytes_.data() + used_;
+    }
+    void Advance_To(const char* end) { used_ = static_cast<std::size_t>(end - bytes_.data()); }
+    void Put(char c)
+    {
+        *Reserve(1) = c;
+        ++used_;
+    }
+    void Put(std::string_view text)
+    {
+        std::memcpy(Reserve(text.size()), text.data(), text.size());
+        used_ += text.size();
+    }
+    [[nodiscard]] std::size_t Size() const { return used_; }
+    [[nodiscard]] std::string_view View() const { return {bytes_.data(), used_}; }
+    void Clear() { used_ = 0; }
+
+    /// Widens the field that began at `start` to `width`, on its far or on its near side.
+    void Pad(std::size_t start, std::int32_t width, bool left)
+    {
+        const std::size_t size = used_ - start;
+        if (size >= static_cast<std::size_t>(width))
+            return;
+        const std::size_t blanks = static_cast<std::size_t>(width) - size;
+        Reserve(blanks);
+        char* const field = bytes_.data() + start;
+        if (!left)
+            std::memmove(field + blanks, field, size);
+        std::memset(left ? field + size : field, ' ', blanks);
+        used_ += blanks;
+    }
+
+private:
+    std::vector<char> bytes_ = std::vector<char>(1 << 16);
+    std::size_t used_ = 0;
+};
+
+Cell_Kind Kind_Of(const Column& column)
+{
+    if (Is_Text_Like(column.type))
+        return Cell_Kind::text;
+    if (column.type == factor_column)
+        return Cell_Kind::factor;
+    return request.Use_Formats || column.format == date_format_mark ? Cell_Kind::formatted_number
+                                                                    : Cell_Kind::number;
+}
+
+std::vector<std::string> Printed_Levels(const Column& column)
+{
+    std::vector<std::string> levels;
+    char text[Number_Text_Room];
+    const Level_Node* label = column.factor_kind == factor_with_labels ? column.labels : nullptr;
+    const Level_Node* value = column.factor_kind == factor_with_levels ? column.level_values : nullptr;
+    for (std::int32_t level = 1; level <= column.nlevels; ++level) {
+        if (label != nullptr) {
+            levels.emplace_back(label->Text());
+            label = label->next;
+        } else if (value != nullptr) {
+            levels.emplace_back(text, Format_Cell_Number(text, column, value->value.number));
+            value = value->next;
+        } else {
+            levels.emplace_back(text, Print_Integer(text, level));
+        }
+    }
+    if (column.sheet->type == table_sheet && column.sheet->has_margins != 0)
+        levels.emplace_back(column.sheet->margin_label);
+    return levels;
+}
+
+/// The mark behind a name by which a reader knows the column's type again.
+std::string_view Name_Mark(const Column& column)
+{
+    if (request.No_Name_Marks)
+        return "";
+    return column.type == factor_column ? "!" : column.format == date_format_mark ? ":D" : "";
+}
+
+class Text_Table_Writer
+{
+public:
+    Text_Table_Writer(Sheet& sheet, const Text_Layout& layout, Output_File& file)
+        : sheet_(sheet), layout_(layout), file_(file)
+    {
+        for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+            Start_Column(*column);
+    }
+
+    void Write_Title(std::string_view name);
+    void Write_Names();
+    void Write_Rows();
+
+private:
+    void Start_Column(const Column& column);
+    std::int32_t Measured_Width(Column_Writing& state);
+    void Put_Cell(const Column_Writing& state, const Cell_Node& cell);
+    void Put_Factor(const Column_Writing& state, double value);
+    void Put_Text(std::string_view text);
+    [[nodiscard]] bool Needs_Quotes(std::string_view text) const;
+    void Put_Quoted(std::string_view text);
+    void Put_Field(Column_Writing& state, std::int32_t row);
+    void Write_Line();
+
+    Sheet& sheet_;
+    Text_Layout layout_;
+    Output_File& file_;
+    std::vector<Column_Writing> columns_;
+    Line_Buffer line_;
+    long broken_lines_ = 0;
+};
+
+void Text_Table_Writer::Start_Column(const Column& column)
+{
+    const Cell_Kind kind = Kind_Of(column);
+    const bool left = column.justify == default_side ? kind == Cell_Kind::text : column.justify == left_side;
+    columns_.push_back({&column, kind, left, First_Row_Of(column)});
+    Column_Writing& state = columns_.back();
+    state.cell = column.first_cell;
+    if (kind == Cell_Kind::factor)
+        state.levels = Printed_Levels(column);
+    if (layout_.padded)
+        state.width = Measured_Width(state);
+}
+
+/// The widest printed cell, or the name with its mark, and 1.
+std::int32_t Text_Table_Writer::Measured_Width(Column_Writing& state)
+{
+    const Column& column = *state.column;
+    std::size_t widest = column.name.size() + Name_Mark(column).size();
+    line_.Clear();
+    if (state.kind == Cell_Kind::factor) {
+        for (const std::string& level : state.levels)
+            widest = std::max(
+                widest, level.size() + (layout_.quoted && column.factor_kind == factor_with_labels ? 2 : 0));
+    } else {
+        for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
+            Put_Cell(state, *cell);
+            widest = std::max(widest, line_.Size());
+            line_.Clear();
+        }
+    }
+    return static_cast<std::int32_t>(widest) + 1;
+}
+
+bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
+{
+    if (layout_.layout == Layout::fixed)
+        return false;
+    const bool starts_quoted = text.front() == '"' || text.front() == '\'';
+    return layout_.quoted || starts_quoted || text.find(layout_.separator) != std::string_view::npos
+           || text.find_first_of("\r\n") != std::string_view::npos;
+}
+
+void Text_Table_Writer::Put_Quoted(std::string_view text)
+{
+    line_.Put('"');
+    for (std::size_t quote; (quote = text.find('"')) != std::string_view::npos;
+         text.remove_prefix(quote + 1)) {
+        line_.Put(text.substr(0, quote + 1));
+        line_.Put('"');
+    }
+    line_.Put(text);
+    line_.Put('"');
+}
+
+void Text_Table_Writer::Put_Text(std::string_view text)
+{
+    if (text.empty())
+        return;
+    if (Needs_Quotes(text))
+        Put_Quoted(text);
+    else
+        line_.Put(text);
+}
+
+void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
+{
+    const bool labelled = state.column->factor_kind == factor_with_labels;
+    if (!(value >= 1.0) || value >= static_cast<double>(state.levels.size()) + 1.0) {
+        line_.Put(labelled ? std::string_view(" ") : request.Missing_Text.view());
+        return;
+    }
+    const std::string& level = state.levels[static_cast<std::size_t>(value) - 1];
+    if (labelled)
+        Put_Text(level);
+    else
+        line_.Put(level);
+}
+
+inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
+{
+    const double value = cell.value.number;
+    switch (state.kind) {
+    case Cell_Kind::number:
+        if (!(value > sheet_.missing_value))
+            line_.Put(request.Missing_Text.view());
+        else
+            line_.Advance_To(Print_General(line_.Reserve(Number_Text_Room), value, General_Digits));
+        break;
+    case Cell_Kind::formatted_number:
+        if (!(value > sheet_.missing_value))
+            line_.Put(request.Missing_Text.view());
+        else
+            line_.Advance_To(Format_Cell_Number(line_.Reserve(Number_Text_Room), *state.column, value));
+        break;
+    case Cell_Kind::text:
+        Put_Text(cell.Text());
+        break;
+    case Cell_Kind::factor:
+        Put_Factor(state, value);
+        break;
+    }
+}
+
+inline void Text_Table_Writer::Put_Field(Column_Writing& state, std::int32_t row)
+{
+    const std::size_t start = line_.Size();
+    // In fixed width every field begins with its separating blank, whichever side it stands at.
+    if (layout_.layout == Layout::fixed && state.left)
+        line_.Put(' ');
+    if (row >= state.first_row && state.cell != nullptr) {
+        Put_Cell(state, *state.cell);
+        state.cell = state.cell->next;
+    }
+    if (layout_.padded)
+        line_.Pad(start, state.width, state.left);
+}
+
+/// Breaks a line that is too long behind the last separator in reach.
+void Text_Table_Writer::Write_Line()
+{
+    std::string_view line = line_.View();
+    if (line.size() > Greatest_Written_Line)
+        ++broken_lines_;
+    while (line.size() > Greatest_Written_Line) {
+        const std::size_t found = line.substr(0, Greatest_Written_Line).rfind(layout_.separator);
+        const std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+        file_.Write(line.substr(0, taken));
+        file_.Write(Line_End);
+        line.remove_prefix(taken);
+    }
+    file_.Write(line);
+    file_.Write(Line_End);
+    line_.Clear();
+}
+
+void Text_Table_Writer::Write_Title(std::string_view name)
+{
+    const Local_Time now = Local_Time_Now();
+    line_.Clear();
+    line_.Put('"');
+    line_.Put(name);
+    line_.Put(Format_Text(" (Created by Ingester: %02d:%02d:%02d %02d/%02d/%02d)", now.hour, now.minute,
+                          now.second, now.month, now.day, now.year % 100));
+    line_.Put('"');
+    Write_Line();
+}
+
+void Text_Table_Writer::Write_Names()
+{
+    line_.Clear();
+    for (const Column_Writing& state : columns_) {
+        const std::size_t start = line_.Size();
+        if (start > 0 && layout_.layout != Layout::fixed)
+            line_.Put(layout_.separator);
+        const std::string name = std::string(state.column->name).append(Name_Mark(*state.column));
+        const bool left = state.column->justify == left_side;
+        if (layout_.layout == Layout::fixed) {
+            if (left)
+                line_.Put(' ');
+            line_.Put(name);
+            line_.Pad(start, state.width, left);
+        } else if (name.find_first_of(",\t\"\r\n") != std::string::npos) {
+            Put_Quoted(name);
+        } else {
+            line_.Put(name);
+        }
+    }
+    Write_Line();
+}
+
+void Text_Table_Writer::Write_Rows()
+{
+    constexpr std::int32_t progress_step = 1 << 14;
+    line_.Clear();
+    for (std::int32_t row = 0; row < sheet_.row_count && !file_.Failed(); ++row) {
+        bool first = true;
+        for (Column_Writing& state : columns_) {
+            if (!first && layout_.layout != Layout::fixed)
+                line_.Put(layout_.separator);
+            first = false;
+            Put_Field(state, row);
+        }
+        Write_Line();
+        if (row % progress_step == 0)
+            Show_Progress("Writing", row, sheet_.row_count);
+    }
+    if (broken_lines_ > 0)
+        Report_Message_Long("Warning: %li lines were too long and have been broken.\n", broken_lines_);
+}
+
+/// What the title calls the output.
+std::string Title_Name(std::string_view file_name)
+{
+    std::string_view name = File_Part_Of(file_name);
+    if (Ends_Ignoring_Case(name, ".$$$"))
+        name.remove_suffix(4);
+    if (Starts_Ignoring_Case(name, "clipboard") || Starts_Ignoring_Case(name, "$Clip$")
+        || Starts_Ignoring_Case(name, "$Std_In$"))
+        name = request.Source_Base_Name;
+    return std::string(name);
+}
+
+}  // namespace
+
+bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
+{
+    if (sheet == nullptr || sheet->row_count < 1 || sheet->column_count < 1)
+        return false;
+    const bool real_file = *file_name != '\0';
+    const Text_Layout layout = Layout_Of_Request(tab_mode);
+    Output_File file;
+    if (!real_file)
+        file.Open_Standard_Output();
+    else if (!file.Open(file_name))
+        return false;  // silent by design: the pipeline tells that the output was not written
+    Text_Table_Writer writer(*sheet, layout, file);
+    if (layout.layout == Layout::fixed && Get_Settings().csv_title != 0 && real_file)
+        writer.Write_Title(Title_Name(file_name));
+    if (!request.Omit_Header)
+        writer.Write_Names();
+    writer.Write_Rows();
+    return file.Close();
+}
+
+}  // namespace ingester
