@@ -13,11 +13,9 @@
 #include <new>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// The files of one call.
 struct Call_Files {
@@ -96,8 +94,7 @@ Request_Status Check_Sheet_Name(Request_Status status)
 }
 
 /// One call of INGESTER, step by step.
-class Ingester_Call
-{
+class Ingester_Call {
 public:
     explicit Ingester_Call(Call_Files files) : files_(std::move(files)) {}
 

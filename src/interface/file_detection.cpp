@@ -5,11 +5,9 @@
 
 #include <array>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// What the tests look at: the name, and the head of the file, with zeros behind a short one.
 struct Detection_Head {

@@ -4,8 +4,7 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Codes of file types, for inputs and outputs alike.
 enum File_Code : std::int32_t {

@@ -5,11 +5,9 @@
 #include "spreadsheet/text/text.h"
 #include "support/text.h"
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// A text is a table, unless a number of lines to skip asks for one of its lines.
 bool Read_Plain_Text(const char* file_name)

@@ -8,8 +8,7 @@
 #include <span>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Readers leave their Sheet in `Current_Sheet`; false after a message.
 using Reader = bool (*)(const char* file_name);

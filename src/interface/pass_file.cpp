@@ -8,11 +8,9 @@
 
 #include <cmath>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::int32_t Fewest_Arguments = 2;
 constexpr std::int32_t Most_Arguments = 6;
@@ -76,8 +74,7 @@ bool Pass_File::Read_Text(const Record_Words& words, std::string& text)
     return true;
 }
 
-namespace
-{
+namespace {
 
 /// A marker in the Secondary file string, and what it asks for.
 struct Secondary_Marker {
@@ -178,8 +175,7 @@ bool Read_Pass_File(Input_File& file, Pass_Request& asked)
     return Take_Column_Subset(pass) && Take_Row_Subset(pass, columns_asked);
 }
 
-namespace
-{
+namespace {
 
 /// Head of a carrier file, little-endian, as far as it is looked at.
 struct Carrier_Head_Layout {

@@ -8,12 +8,10 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// A pass file is read record by record; each call takes the next one.
-class Pass_File
-{
+class Pass_File {
 public:
     /// The words for the faults of one record.
     struct Record_Words {

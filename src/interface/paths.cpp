@@ -5,11 +5,9 @@
 #include <algorithm>
 #include <iterator>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::string_view Url_Starts[] = {"ftp:", "http:", "https:", "file:"};
 

@@ -4,8 +4,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Whether a name begins with "ftp:", "http:", "https:" or "file:".
 [[nodiscard]] bool Is_Url(std::string_view name);

@@ -12,11 +12,9 @@
 #include "platform/folders.h"
 #include "support/text.h"
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// What the stages hand on to each other.
 struct Request_Run {

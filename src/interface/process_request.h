@@ -7,8 +7,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Begins a request: its globals are fresh, the Sheets and messages of the one before are gone.
 /// `stem` names the message file, `<temp><stem>.ERR`.

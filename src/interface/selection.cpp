@@ -2,8 +2,7 @@
 
 #include "interface/request/messages.h"
 
-namespace ingester
-{
+namespace ingester {
 
 bool Delete_Empty_Rows(Sheet* sheet)
 {

@@ -3,8 +3,7 @@
 
 #include "model/sheet.h"
 
-namespace ingester
-{
+namespace ingester {
 
 /// Removes the rows that hold no data. The last row stays whatever it holds; a warning says so when
 /// all of them are empty.

@@ -8,11 +8,9 @@
 #include <algorithm>
 #include <cstdint>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 using Taken = std::size_t;  // the end of an option in its string
 

@@ -6,8 +6,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// One option. `take` acts on what stands behind the key at `at` and returns the end of what it took.
 struct Slash_Option {

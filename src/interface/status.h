@@ -5,8 +5,7 @@
 
 #include <cstdint>
 
-namespace ingester
-{
+namespace ingester {
 
 /// The status of the result file; the meanings stand in the public header.
 enum class Request_Status : std::int32_t {

@@ -7,11 +7,9 @@
 
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::size_t List_Line_Width = 1000;
 constexpr std::size_t Count_Line_Width = 100;

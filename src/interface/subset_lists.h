@@ -3,8 +3,7 @@
 
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Reads and deletes a list of columns into `Subset_Names`: a count, a line whose first character
 /// is "V" for names or anything else for numbers, and one entry a line. False, silently, when there

@@ -6,8 +6,7 @@
 
 #include <algorithm>
 
-namespace ingester
-{
+namespace ingester {
 
 bool Is_Missing_Text(std::string_view text)
 {
@@ -28,8 +27,7 @@ double Cell_Number(std::string_view text, double missing)
     return std::min(parsed.value, Greatest_Number);
 }
 
-namespace
-{
+namespace {
 
 /// The tests by which a text finds a label, tried in this order over all labels.
 constexpr bool (*Label_Tests[])(std::string_view label, std::string_view text) = {

@@ -5,8 +5,7 @@
 
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Whether `text` means "missing": nothing does while `Missing_Input_Text` is empty; otherwise
 /// blanks do, and that text in any case.

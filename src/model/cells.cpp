@@ -6,8 +6,7 @@
 
 #include <algorithm>
 
-namespace ingester
-{
+namespace ingester {
 
 void* Alloc_Zeroed(std::size_t bytes)
 {
@@ -27,8 +26,7 @@ void* Realloc_Checked(void* pointer, std::size_t bytes)
     return memory;
 }
 
-namespace
-{
+namespace {
 
 /// Links the nodes of one block, behind `last` if there is one; `set` fills a node's payload.
 template <class Node, class Set>

@@ -10,8 +10,7 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 /// What a node holds: a number, or a text kept in an arena (or null, for kinds 33 and 34).
 union Cell_Value {

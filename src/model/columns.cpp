@@ -12,11 +12,9 @@
 #include <string>
 #include <utility>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Characters of a name by which the host tells columns apart.
 constexpr std::size_t Telling_Width = 32;
@@ -180,8 +178,7 @@ Column* New_Data_Column(Sheet* sheet, std::int32_t type, std::string_view name, 
     return column;
 }
 
-namespace
-{
+namespace {
 
 const Level_Node* Find_Label(const Column& column, std::string_view text, bool ignore_case, double& level)
 {
@@ -249,8 +246,7 @@ bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::in
     return true;
 }
 
-namespace
-{
+namespace {
 
 /// The type that a Column asked for as `wanted` gets in this Sheet; false when it may not be added.
 bool Overrule_Type(const Sheet& sheet, std::int32_t wanted, std::int32_t position, std::int32_t& type)
@@ -358,8 +354,7 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
     return column;
 }
 
-namespace
-{
+namespace {
 
 /// A name as the host tells it from others: 32 characters, with a bracketed suffix beyond them.
 std::string Telling_Part(std::string_view name)

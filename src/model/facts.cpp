@@ -8,11 +8,9 @@
 #include <cmath>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 struct Type_Name {
     std::int32_t type;
@@ -99,8 +97,7 @@ std::int32_t Nearest_Level(const Column& column, double value)
     return nearest;
 }
 
-namespace
-{
+namespace {
 
 std::int32_t Widest_Text(const Cell_Node* node)
 {
@@ -151,8 +148,7 @@ void Compute_Column_Width(Column* column)
     column->width = std::max(widest, name_width) + 1;
 }
 
-namespace
-{
+namespace {
 
 /// The values of a Factor's levels as a table: lists are no place for look-ups cell by cell.
 std::vector<double> Level_Table(const Column& column)
@@ -195,8 +191,7 @@ bool Column_Statistics(const Column* column, Column_Summary& summary)
     return true;
 }
 
-namespace
-{
+namespace {
 
 struct Distinct_Count {
     std::int64_t present = 0;

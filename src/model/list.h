@@ -3,8 +3,7 @@
 
 #include <cstdint>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Walks to node `index` (from 0) of `count`, from the nearest of head, tail and the remembered
 /// position, and remembers it. Null for an index out of range.

@@ -7,8 +7,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// `name` as the host accepts it: letters, digits, "_" and "%", at most 60, with a repaired bracket
 /// suffix. An empty name becomes an automatic one. Left alone while the request keeps names as they

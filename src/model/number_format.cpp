@@ -5,11 +5,9 @@
 #include <algorithm>
 #include <cmath>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr int Default_Digits = 6;  // of "%g", "%e" and "%f"
 constexpr int Most_Digits = 17;

@@ -6,8 +6,7 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Prints `value` by a format code and its decimals; a value not above `missing` prints "*".
 /// `target` has `Number_Text_Room`. Returns the end of the text.

@@ -6,11 +6,9 @@
 #include <algorithm>
 #include <utility>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 bool Insertion_Fits(std::int32_t count)
 {
@@ -61,8 +59,7 @@ bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count)
     return true;
 }
 
-namespace
-{
+namespace {
 
 /// Row numbers always run 1..N, so the `Row` column grows at its end, wherever the rows came in.
 bool Lengthen_Row_Numbers(Sheet& sheet, std::int32_t count)
@@ -128,8 +125,7 @@ bool Remove_Cell(Column* column, std::int32_t index)
     return true;
 }
 
-namespace
-{
+namespace {
 
 void Remove_Row_Node(Sheet& sheet, std::int32_t index)
 {
@@ -171,8 +167,7 @@ bool Cell_Is_Present(const Column& column, const Cell_Node& cell)
                                         : Is_Present(*column.sheet, cell.value.number);
 }
 
-namespace
-{
+namespace {
 
 /// Clears `empty` on the rows where `column` holds data; returns how many it cleared.
 std::int32_t Clear_Filled_Rows(const Column& column, Row_Node* row)

@@ -8,13 +8,11 @@
 #include <utility>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 Sheet* Current_Sheet = nullptr;
 
-namespace
-{
+namespace {
 
 /// Every Sheet of the request.
 std::vector<std::unique_ptr<Sheet>> sheets;

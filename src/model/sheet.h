@@ -12,8 +12,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// The number that means "missing" (bits FFAC7B1F3CAC7433). A number is present when it is greater
 /// than its Sheet's `missing_value`, which starts as this.

@@ -11,12 +11,10 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 /// A file open for reading, or bytes in memory that stand for one.
-class Input_File
-{
+class Input_File {
 public:
     Input_File() = default;
     /// Reads from `bytes`, which must outlive it.
@@ -74,8 +72,7 @@ private:
 };
 
 /// A file being written through one large buffer. Unless `Close` said true it may be incomplete.
-class Output_File
-{
+class Output_File {
 public:
     Output_File() = default;
     Output_File(const Output_File&) = delete;
@@ -119,8 +116,7 @@ private:
 };
 
 /// Deletes the named file when it goes out of sight.
-class Scratch_File
-{
+class Scratch_File {
 public:
     explicit Scratch_File(std::string name) : name_(std::move(name)) {}
     Scratch_File(const Scratch_File&) = delete;

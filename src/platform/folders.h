@@ -7,8 +7,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// `name` with native separators.
 [[nodiscard]] std::string Native_Path(std::string_view name);

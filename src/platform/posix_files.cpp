@@ -10,11 +10,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::size_t Input_Buffer_Size = 1 << 16;
 constexpr std::size_t Output_Buffer_Size = 1 << 20;

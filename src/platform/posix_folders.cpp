@@ -8,11 +8,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr char Native_Separator = '/';
 constexpr char Request_Separator = '\\';

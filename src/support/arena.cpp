@@ -2,8 +2,7 @@
 
 #include <algorithm>
 
-namespace ingester
-{
+namespace ingester {
 
 void Text_Arena::Add_Chunk(std::size_t needed)
 {

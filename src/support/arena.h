@@ -9,14 +9,12 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Keeps texts, each behind a 16-bit length and in front of a NUL, in growing chunks.
 /// A stored text never changes and never moves, so cells with equal texts may share one: the arena
 /// remembers the texts stored of late, which makes a column of repeated labels cost its nodes only.
-class Text_Arena
-{
+class Text_Arena {
 public:
     static constexpr std::size_t greatest_length = 65535;
 

@@ -8,11 +8,9 @@
 #include <span>
 #include <type_traits>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace detail
-{
+namespace detail {
 
 template <std::size_t Size> struct Word_Of_Size;
 template <> struct Word_Of_Size<1> {

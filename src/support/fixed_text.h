@@ -7,12 +7,10 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// At most `Width` bytes and a NUL. Longer text is cut in `assign`, and nowhere else.
-template <std::size_t Width> class Fixed_Text
-{
+template <std::size_t Width> class Fixed_Text {
 public:
     static constexpr std::size_t width = Width;
 

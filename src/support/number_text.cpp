@@ -7,11 +7,9 @@
 #include <cmath>
 #include <cstring>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Every power of ten that a double holds exactly.
 constexpr std::array<double, 23> Exact_Powers = {1e0,  1e1,  1e2,  1e3,  1e4,  1e5,  1e6,  1e7,

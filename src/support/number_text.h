@@ -5,8 +5,7 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 enum class Number_Status : std::uint8_t {
     none,          ///< no number stands at the start

@@ -1,7 +1,6 @@
 #include "support/progress.h"
 
-namespace ingester
-{
+namespace ingester {
 
 Progress_Hook progress_hook = nullptr;
 

@@ -3,8 +3,7 @@
 
 #include <cstdint>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Told what is being done (a short text that lives on) and how much of it: `done` of `total`,
 /// in whatever unit the work counts (bytes read, rows written). `total` 0: not known.

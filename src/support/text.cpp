@@ -4,8 +4,7 @@
 #include <cstdio>
 #include <limits>
 
-namespace ingester
-{
+namespace ingester {
 
 long Leading_Integer(std::string_view text)
 {

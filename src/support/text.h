@@ -5,8 +5,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 [[nodiscard]] constexpr bool Is_Digit(char c)
 {

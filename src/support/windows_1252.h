@@ -3,8 +3,7 @@
 
 #include <array>
 
-namespace ingester
-{
+namespace ingester {
 
 /// For the bytes 128 to 254, in order: the letter without its accent, or "_" for a sign.
 extern const std::array<char, 127> Latin_Fold_Table;

@@ -7,11 +7,9 @@
 #include <memory>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// The open message file; null before the first message and after the last.
 std::unique_ptr<Output_File> message_file;

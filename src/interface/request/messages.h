@@ -5,8 +5,7 @@
 
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Writes `text` as it is to the message file, which the first message makes.
 /// Where the file can't be made the text is lost: there is nobody left to tell.

@@ -1,7 +1,6 @@
 #include "interface/request/request.h"
 
-namespace ingester
-{
+namespace ingester {
 
 Request_Globals request;
 

@@ -9,8 +9,7 @@
 #include <string>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 /// How the result is joined with an existing output.
 enum class Add_Modes : std::int32_t { none = 0, append = 1, concatenate = 2, merge = 3 };

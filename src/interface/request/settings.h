@@ -7,8 +7,7 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Month and day names begin and end with a mark that no date holds.
 constexpr std::string_view Name_List_Mark = "***";

@@ -7,8 +7,7 @@
 
 #include <cstdint>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Reads a text table into the `Current_Sheet`. False after a message, or when there is no table.
 bool Read_CSV_File(const char* file_name);

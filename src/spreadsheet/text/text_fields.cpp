@@ -7,11 +7,9 @@
 #include <algorithm>
 #include <cstring>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::string_view Number_Characters = "0123456789+-.eE";
 

@@ -11,11 +11,9 @@
 #include <algorithm>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// What is done with the fields of a column.
 enum class Filling : std::uint8_t {
@@ -45,8 +43,7 @@ bool Cells_Are_Plausible(std::int64_t rows, std::int64_t columns, std::size_t by
                 static_cast<long>(rows), static_cast<long>(columns), static_cast<long>(bytes));
 }
 
-class Sheet_Filler
-{
+class Sheet_Filler {
 public:
     Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, std::string_view text)
         : sheet_(sheet), shape_(shape), cutter_(options), trim_(options.trim_cells), text_(text)

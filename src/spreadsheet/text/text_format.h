@@ -12,8 +12,7 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Longest line, or joined record, in characters.
 constexpr std::size_t Greatest_Line = 262140;
@@ -54,8 +53,7 @@ struct Text_Field {
 };
 
 /// Cuts the lines of an image into fields. Every line must end with LF.
-class Field_Cutter
-{
+class Field_Cutter {
 public:
     explicit Field_Cutter(const Text_Scan_Options& options);
 

@@ -8,11 +8,9 @@
 #include <algorithm>
 #include <cstring>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Room behind the text, for line ends and a NUL that the file lacks.
 constexpr std::size_t Image_Slack = 8198;
@@ -67,8 +65,7 @@ void Blank_Out_Nuls(Text_Image& image)
 }
 
 /// The lines of the loaded file, in order.
-class Line_Source
-{
+class Line_Source {
 public:
     explicit Line_Source(const Text_Image& image)
         : at_(image.bytes.get()), last_(at_ + image.length),
@@ -142,8 +139,7 @@ Line_Range Range_Of(std::string_view text)
 }
 
 /// Copies the kept lines to the head of the image; they never outrun the lines still to be read.
-class Line_Keeper
-{
+class Line_Keeper {
 public:
     Line_Keeper(Text_Image& image, bool strip_titles)
         : image_(image), lines_(image), next_(image.bytes.get()), titles_pending_(strip_titles),

@@ -9,8 +9,7 @@
 #include <algorithm>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
 bool Read_Text_Lines(const char* file_name)
 {

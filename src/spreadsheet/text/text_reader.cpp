@@ -7,11 +7,9 @@
 
 #include <cstring>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Lines whose fields are looked at before the Sheet is made. What comes behind is settled while
 /// the cells are filled, so that every number is parsed once.

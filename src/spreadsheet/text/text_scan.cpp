@@ -6,18 +6,15 @@
 #include <algorithm>
 #include <cstring>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Fields count for the type with so many characters.
 constexpr std::size_t Scanned_Width = 180;
 
 /// Whether the first line holds names: a number, a sign or "*" at the start of a field says no.
-class Names_Decision
-{
+class Names_Decision {
 public:
     explicit Names_Decision(const Text_Scan_Options& options) : options_(options) {}
 

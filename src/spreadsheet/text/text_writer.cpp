@@ -14,11 +14,9 @@
 #include <string>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr int General_Digits = 15;  // a double holds so many decimal digits
 constexpr std::size_t Greatest_Written_Line = 65535;
@@ -56,8 +54,7 @@ struct Column_Writing {
 };
 
 /// A line under way; fields are printed straight into it.
-class Line_Buffer
-{
+class Line_Buffer {
 public:
     /// Room for `count` more characters.
     char* Reserve(std::size_t count)
@@ -141,8 +138,7 @@ std::string_view Name_Mark(const Column& column)
     return column.type == factor_column ? "!" : column.format == date_format_mark ? ":D" : "";
 }
 
-class Text_Table_Writer
-{
+class Text_Table_Writer {
 public:
     Text_Table_Writer(Sheet& sheet, const Text_Layout& layout, Output_File& file)
         : sheet_(sheet), layout_(layout), file_(file)
