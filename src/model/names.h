@@ -10,8 +10,8 @@
 namespace ingester {
 
 /// `name` as the host accepts it: letters, digits, "_" and "%", at most 60, with a repaired bracket
-/// suffix. An empty name becomes an automatic one. Left alone while the request keeps names as they
-/// stand (cut at 60 then).
+/// suffix (`[1]`, `[1][2]`, and `['text']` unless `bracket_names` makes numbers of them). An empty name
+/// becomes an automatic one. Left alone while the request keeps names as they stand (cut at 60 then).
 [[nodiscard]] std::string Make_Valid_Name(std::string_view name);
 
 /// The automatic name of column `number`, as "C1"; below 1, of the next number.
@@ -20,7 +20,8 @@ namespace ingester {
 /// Cuts a name to `limit` characters, keeping a bracket suffix whole where it fits.
 [[nodiscard]] std::string Shorten_Bracket_Name(std::string_view name, std::size_t limit);
 
-/// The text of a quoted suffix that the last `Make_Valid_Name` replaced by a number, up to 80.
+/// The text of a quoted suffix that `Make_Valid_Name` replaced by a number, up to 80. It is kept until
+/// it is used or the next one comes, since a cleaned name may be cleaned again on its way to a Column.
 void Remember_Bracket_Text(std::string_view text);
 
 /// Adds that text to `extra`, behind one blank when there is something, and forgets it.
@@ -32,11 +33,12 @@ void Use_Bracket_Text(Column& column);
 /// Starts the counters of bracket numbers anew.
 void Reset_Name_Counters();
 
-/// Names must differ in their first 32 characters: later ones of a clash get a number, and their
-/// old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
+/// Names must differ in their first 32 characters, a bracket suffix apart: later ones of a clash get a
+/// number, and their old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
 void Make_Column_Names_Unique(Sheet* sheet);
 
-/// `name` without its marks: ":D", ":T", ":E", ":" and a digit, and one "!", "#" or "$" at the end.
+/// `name` without its marks: every ":D", ":T", ":E" (in either case) and ":" with a digit, and one "!",
+/// "#" or "$" at the end of what is left.
 [[nodiscard]] std::string Strip_Name_Mark(std::string_view name);
 
 }  // namespace ingester

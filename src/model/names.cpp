@@ -1,0 +1,366 @@
+#include "model/names.h"
+
+#include "interface/request/request.h"
+#include "support/text.h"
+#include "support/windows_1252.h"
+
+#include <algorithm>
+#include <vector>
+
+namespace ingester {
+
+namespace {
+
+constexpr std::string_view Quoted_Open = "['";
+constexpr std::string_view Quoted_Close = "']";
+
+/// Bracket numbers run to here, and start again from 1.
+constexpr std::int32_t Greatest_Bracket_Number = 999;
+
+/// The members of structures that the host knows by name as well as by number.
+struct Known_Suffix {
+    std::string_view text;
+    std::int32_t number;
+};
+constexpr Known_Suffix Known_Suffixes[] = {
+    {"Vectors", 1},    {"Sums", 1},  {"Orders", 1}, {"Roots", 2}, {"Means", 2},
+    {"Parameters", 2}, {"Trace", 3}, {"NUnits", 3}, {"Lags", 3},  {"WMeans", 4},
+};
+
+/// Characters that become words.
+struct Character_Word {
+    char character;
+    std::string_view word;
+};
+constexpr Character_Word Character_Words[] = {
+    {'<', "lt"}, {'>', "gt"}, {'@', "at"}, {'=', "eq"}, {'\xF2', "ge"}, {'\xF3', "le"},
+};
+
+/// What automatic names and bracket numbers have come to.
+struct Name_State {
+    std::int32_t next_bracket_number = 1;
+    std::int32_t next_suffix_number = 1;
+    Fixed_Text<Extra_Width> bracket_text;
+};
+Name_State name_state;
+
+}  // namespace
+
+// --- Suffixes ------------------------------------------------------------------------------------
+
+std::size_t Bracket_Start(std::string_view name)
+{
+    return name.ends_with(']') ? std::min(name.find('['), name.size()) : name.size();
+}
+
+std::string Shorten_Bracket_Name(std::string_view name, std::size_t limit)
+{
+    const std::size_t start = Bracket_Start(name);
+    const std::string_view suffix = name.substr(start);
+    if (name.size() <= limit || suffix.size() >= limit)
+        return std::string(name.substr(0, limit));
+    return std::string(name.substr(0, limit - suffix.size())).append(suffix);
+}
+
+void Remember_Bracket_Text(std::string_view text)
+{
+    name_state.bracket_text = text;
+}
+
+void Use_Bracket_Text(Column& column)
+{
+    if (name_state.bracket_text.empty())
+        return;
+    if (!column.extra.empty())
+        column.extra.append(" ");
+    column.extra.append(name_state.bracket_text);
+    name_state.bracket_text.clear();
+}
+
+void Reset_Name_Counters()
+{
+    name_state = Name_State{};
+}
+
+// --- Automatic names -----------------------------------------------------------------------------
+
+std::string Default_Column_Name(std::int32_t number)
+{
+    Settings& settings = Get_Settings();
+    const long shown = number < 1 ? settings.next_column_number++ : number;
+    if (settings.prefix_given && settings.bracket_names != 0)
+        return Format_Text("%.8s[%li]", settings.column_prefix.c_str(), shown);
+    return Format_Text("%.6s%li", settings.column_prefix.c_str(), shown);
+}
+
+// --- Characters ----------------------------------------------------------------------------------
+
+namespace {
+
+[[nodiscard]] bool Is_Name_Start(char c)
+{
+    return Is_Letter(c) || c == '_' || c == '%';
+}
+
+[[nodiscard]] bool Is_Name_Character(char c)
+{
+    return Is_Name_Start(c) || Is_Digit(c);
+}
+
+[[nodiscard]] bool Is_Folded(char c)
+{
+    const auto byte = static_cast<unsigned char>(c);
+    return byte >= 128 && byte <= 254;
+}
+
+[[nodiscard]] std::string_view Without_Outer_Quotes(std::string_view name)
+{
+    const bool quoted =
+        name.size() >= 2 && name.front() == name.back() && (name.front() == '\'' || name.front() == '"');
+    return quoted ? name.substr(1, name.size() - 2) : name;
+}
+
+/// A run of characters that names can't hold is one "_".
+void Append_Underscore(std::string& name)
+{
+    if (!name.ends_with('_'))
+        name.push_back('_');
+}
+
+[[nodiscard]] char Fold_Quoted_Character(char c)
+{
+    if (Is_Folded(c))
+        return Latin_Fold(static_cast<unsigned char>(c));
+    return c >= 32 && c <= 126 ? c : ' ';
+}
+
+void Append_Folded_Character(std::string& name, char c)
+{
+    for (const Character_Word& entry : Character_Words)
+        if (entry.character == c) {
+            if (name.size() < Name_Width)
+                name.append(entry.word);
+            return;
+        }
+    const char folded = Is_Folded(c) ? Latin_Fold(static_cast<unsigned char>(c)) : c;
+    if (c == ']' && name.ends_with('['))
+        name.pop_back();  // nothing stood between them
+    else if (c == '[' || c == ']' || c == '_' || (folded != '_' && Is_Name_Character(folded)))
+        name.push_back(folded);  // a given "_" stays, even in a run
+    else
+        Append_Underscore(name);
+}
+
+/// Every character as names hold it; brackets stay, and text between `['` and `']` keeps its signs.
+[[nodiscard]] std::string Fold_Characters(std::string_view given)
+{
+    std::string name;
+    for (std::size_t at = 0; at < given.size(); ++at) {
+        if (given.substr(at, Quoted_Open.size()) != Quoted_Open) {
+            Append_Folded_Character(name, given[at]);
+            continue;
+        }
+        const std::size_t first = at + Quoted_Open.size();
+        const std::size_t end = std::min(given.find(Quoted_Close, first), given.size());
+        name.append(Quoted_Open);
+        for (const char c : given.substr(first, end - first))
+            name.push_back(Fold_Quoted_Character(c));
+        name.append(given.substr(end, Quoted_Close.size()));
+        at = end + Quoted_Close.size() - 1;
+    }
+    return name;
+}
+
+// --- Brackets ------------------------------------------------------------------------------------
+
+/// One dimension of a suffix.
+struct Bracket_Level {
+    bool quoted = false;
+    bool closed = false;
+    std::string_view text;
+};
+
+/// A name taken apart. Its views look into the name it was made from.
+struct Bracket_Parts {
+    std::vector<Bracket_Level> levels;
+    bool text_behind = false;  ///< the name goes on behind its last bracket
+};
+
+/// Takes a quoted level off the front of `rest`.
+[[nodiscard]] Bracket_Level Take_Quoted_Level(std::string_view& rest)
+{
+    rest.remove_prefix(Quoted_Open.size());
+    const std::size_t end = rest.find(Quoted_Close);
+    Bracket_Level level{.quoted = true, .closed = end != std::string_view::npos, .text = rest.substr(0, end)};
+    rest.remove_prefix(level.closed ? end + Quoted_Close.size() : rest.size());
+    if (!level.closed && (level.text.ends_with('\'') || level.text.ends_with(']')))
+        level.text.remove_suffix(1);  // half of the closing pair
+    return level;
+}
+
+/// Takes a level without quotes off the front of `rest`. An opening bracket closes it as well.
+[[nodiscard]] Bracket_Level Take_Plain_Level(std::string_view& rest)
+{
+    rest.remove_prefix(1);
+    const std::size_t end = rest.find_first_of("[]");
+    Bracket_Level level{
+        .quoted = false, .closed = end != std::string_view::npos, .text = rest.substr(0, end)};
+    rest.remove_prefix(std::min(end, rest.size()));
+    if (rest.starts_with(']'))
+        rest.remove_prefix(1);
+    return level;
+}
+
+/// The levels of what follows a stem, without the empty ones. Text between levels goes.
+[[nodiscard]] Bracket_Parts Take_Levels(std::string_view rest)
+{
+    Bracket_Parts parts;
+    while (!rest.empty()) {
+        if (rest.front() == '[') {
+            const bool quoted = rest.starts_with(Quoted_Open);
+            const Bracket_Level level = quoted ? Take_Quoted_Level(rest) : Take_Plain_Level(rest);
+            if (!level.text.empty())
+                parts.levels.push_back(level);
+            parts.text_behind = false;
+        } else {
+            parts.text_behind = parts.text_behind || rest.front() != ']';
+            rest.remove_prefix(1);
+        }
+    }
+    return parts;
+}
+
+/// "]" in front of the only "[": the two change places.
+void Turn_Swapped_Brackets(std::string& name)
+{
+    const std::size_t open = name.find('[');
+    if (open == std::string::npos || open == 0 || name.find(']', open) != std::string::npos)
+        return;
+    const std::size_t close = name.rfind(']', open);
+    if (close != std::string::npos)
+        std::swap(name[open], name[close]);
+}
+
+/// The name as if brackets and quotes were any other sign.
+[[nodiscard]] std::string Without_Brackets(std::string_view given)
+{
+    std::string name;
+    for (const char c : given) {
+        if (Is_Name_Character(c))
+            name.push_back(c);
+        else
+            Append_Underscore(name);
+    }
+    return name;
+}
+
+[[nodiscard]] std::int32_t Suffix_Number(std::string_view text)
+{
+    for (const Known_Suffix& known : Known_Suffixes)
+        if (known.text == text)
+            return known.number;
+    return name_state.next_suffix_number++;
+}
+
+[[nodiscard]] std::string Index_Digits(std::string_view text)
+{
+    std::string digits;
+    std::copy_if(text.begin(), text.end(), std::back_inserter(digits), Is_Digit);
+    if (!digits.empty())
+        return digits;
+    const std::int32_t number = name_state.next_bracket_number;
+    name_state.next_bracket_number = number % Greatest_Bracket_Number + 1;
+    return std::to_string(number);
+}
+
+/// The suffix that the levels make, of at most `room` characters; what can't be held goes.
+/// The texts that numbers stand for are remembered, with a blank between them.
+[[nodiscard]] std::string Make_Suffix(const std::vector<Bracket_Level>& levels, std::size_t room)
+{
+    const bool numbered = Get_Settings().bracket_names != 0;
+    std::string suffix;
+    std::string texts;
+    for (const Bracket_Level& level : levels) {
+        std::string inner;
+        if (!level.quoted) {
+            inner = Index_Digits(level.text);
+        } else if (numbered) {
+            inner = std::to_string(Suffix_Number(level.text));
+            texts.append(texts.empty() ? "" : " ").append(level.text);
+        } else {
+            const std::size_t taken = suffix.size() + Quoted_Open.size() + Quoted_Close.size();
+            const std::string_view held = level.text.substr(0, room > taken ? room - taken : 0);
+            if (held.empty())
+                break;
+            inner.append("'").append(held).append("'");
+        }
+        if (suffix.size() + inner.size() + 2 > room)
+            break;
+        suffix.append("[").append(inner).append("]");
+    }
+    if (!texts.empty())
+        Remember_Bracket_Text(texts);
+    return suffix;
+}
+
+/// Leaves no bracket or one well-formed suffix.
+[[nodiscard]] std::string Repair_Brackets(std::string name)
+{
+    Turn_Swapped_Brackets(name);
+    const std::size_t start = std::min(name.find('['), name.size());
+    const Bracket_Parts parts = Take_Levels(std::string_view(name).substr(start));
+    const bool no_room = !parts.levels.empty() && !parts.levels.back().quoted && !parts.levels.back().closed
+                         && name.size() >= Name_Width;
+    if (parts.text_behind || no_room)
+        return Without_Brackets(name);
+    std::string stem = name.substr(0, start);
+    std::replace(stem.begin(), stem.end(), ']', '_');
+    const std::string suffix = Make_Suffix(parts.levels, Name_Width - 1);
+    return stem.substr(0, Name_Width - suffix.size()) + suffix;
+}
+
+}  // namespace
+
+// --- Names ---------------------------------------------------------------------------------------
+
+std::string Make_Valid_Name(std::string_view name)
+{
+    if (request.Names_Kept_As_They_Stand)
+        return std::string(name.substr(0, Name_Width));
+    const std::string_view given = Without_Outer_Quotes(Trim_Copy(name));
+    if (given.empty())
+        return Default_Column_Name(0);
+    std::string valid = Fold_Characters(Shorten_Bracket_Name(given, Name_Width));
+    if (!Is_Name_Start(given.front()))
+        valid.insert(valid.begin(), '%');
+    valid = Shorten_Bracket_Name(valid, Name_Width);
+    if (valid.ends_with('_') && valid.size() > 1 && !given.ends_with('_'))
+        valid.pop_back();
+    valid = Repair_Brackets(std::move(valid));
+    return valid == "_" ? Default_Column_Name(0) : valid;
+}
+
+namespace {
+
+[[nodiscard]] bool Is_Colon_Mark(char c)
+{
+    return Is_Digit(c) || std::string_view("DdTtEe").find(c) != std::string_view::npos;
+}
+
+}  // namespace
+
+std::string Strip_Name_Mark(std::string_view name)
+{
+    std::string stripped;
+    for (std::size_t at = 0; at < name.size(); ++at) {
+        if (name[at] == ':' && at + 1 < name.size() && Is_Colon_Mark(name[at + 1]))
+            ++at;
+        else
+            stripped.push_back(name[at]);
+    }
+    if (stripped.ends_with('!') || stripped.ends_with('#') || stripped.ends_with('$'))
+        stripped.pop_back();
+    return stripped;
+}
+
+}  // namespace ingester
