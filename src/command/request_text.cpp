@@ -7,6 +7,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <iterator>
 
 namespace ingester
 {
@@ -44,6 +45,13 @@ constexpr Output_Option Output_Options[] = {
 
 /// Messages cut no name shorter than this.
 constexpr std::size_t Shortest_Cut = 100;
+
+/// `name` is fetched, not opened.
+bool Is_Url(std::string_view name)
+{
+    return std::ranges::any_of(Url_Starts,
+                               [name](std::string_view start) { return Starts_Ignoring_Case(name, start); });
+}
 
 /// Where the value that begins at `at` ends.
 std::size_t Value_End(std::string_view options, std::size_t at, Value_Form form)
@@ -94,13 +102,27 @@ std::size_t Match_Length(std::string_view message, const Spelling& spelling)
     return spelling.may_be_cut && common >= Shortest_Cut ? common : 0;
 }
 
-}  // namespace
+struct Found_Name {
+    std::size_t length = 0;  ///< in the message; 0 when no name was found
+    std::string_view native;
+};
 
-bool Is_Url(std::string_view name)
+/// The longest spelling that `message` begins with. A cut one is as short in its native form.
+Found_Name Name_At_Start(std::string_view message, const std::array<std::array<Spelling, 4>, 2>& all)
 {
-    return std::ranges::any_of(Url_Starts,
-                               [name](std::string_view start) { return Starts_Ignoring_Case(name, start); });
+    Found_Name found;
+    for (const auto& spellings : all) {
+        for (const Spelling& spelling : spellings) {
+            const std::size_t length = Match_Length(message, spelling);
+            const bool same_size = spelling.native.size() == spelling.request.size();
+            if (length > found.length)
+                found = {length, same_size ? spelling.native.substr(0, length) : spelling.native};
+        }
+    }
+    return found;
 }
+
+}  // namespace
 
 std::string Fault_Of_Name(std::string_view native)
 {
@@ -142,24 +164,11 @@ std::string With_Native_Names(std::string_view message, const Sent_Name& input, 
     std::string told;
     bool name_may_start = true;
     while (!message.empty()) {
-        std::size_t longest = 0;
-        std::string_view native;
-        for (const auto& spellings : all)
-            for (const Spelling& spelling : spellings)
-                if (const std::size_t length = name_may_start ? Match_Length(message, spelling) : 0;
-                    length > longest) {
-                    longest = length;
-                    native = spelling.native.substr(0, spelling.native.size() == spelling.request.size()
-                                                           ? length
-                                                           : std::string_view::npos);
-                }
-        if (longest == 0) {
-            native = message.substr(0, 1);
-            longest = 1;
-        }
-        told.append(native);
-        name_may_start = Before_A_Name.find(message[longest - 1]) != std::string_view::npos;
-        message.remove_prefix(longest);
+        const Found_Name found = name_may_start ? Name_At_Start(message, all) : Found_Name{};
+        const std::size_t taken = std::max<std::size_t>(found.length, 1);
+        told.append(found.length > 0 ? found.native : message.substr(0, 1));
+        name_may_start = Before_A_Name.find(message[taken - 1]) != std::string_view::npos;
+        message.remove_prefix(taken);
     }
     return told;
 }

@@ -17,9 +17,6 @@ struct Sent_Name {
 /// Why a request can't carry `native` as the name of a file, and what to do; empty when it can.
 [[nodiscard]] std::string Fault_Of_Name(std::string_view native);
 
-/// `name` is fetched, not opened.
-[[nodiscard]] bool Is_Url(std::string_view name);
-
 /// The output options ask for an addition to the output, so an existing one is what they expect.
 [[nodiscard]] bool Options_Add_To_Output(std::string_view options);
 

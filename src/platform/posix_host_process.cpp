@@ -11,6 +11,7 @@
 #include <cstddef>
 #include <cstdlib>
 #include <filesystem>
+#include <iterator>
 #include <memory>
 #include <system_error>
 
@@ -78,28 +79,40 @@ void Remove_Doomed_Folder()
     ::rmdir(doomed_folder.data());
 }
 
-/// The default action is back in force by now and takes the process when the handler returns.
-extern "C" void Clean_Up_And_End(int signal_number)
+/// What was in force for each of `Ending_Signals`, to be put back before one of them takes effect.
+std::array<struct sigaction, std::size(Ending_Signals)> earlier_actions{};
+
+bool Is_Fault(int signal_number, const siginfo_t& facts)
+{
+    return facts.si_code > 0
+           && (signal_number == SIGSEGV || signal_number == SIGBUS || signal_number == SIGFPE
+               || signal_number == SIGILL);
+}
+
+extern "C" void Clean_Up_And_End(int signal_number, siginfo_t* facts, void*)
 {
     if (doomed_file.front() != '\0')
         ::unlink(doomed_file.data());
     if (doomed_folder.front() != '\0')
         Remove_Doomed_Folder();
-    ::raise(signal_number);
+    for (std::size_t i = 0; i < std::size(Ending_Signals); ++i)
+        if (Ending_Signals[i] == signal_number)
+            ::sigaction(signal_number, &earlier_actions[i], nullptr);
+    if (!Is_Fault(signal_number, *facts))  // a fault comes again by itself, and tells its place then
+        ::raise(signal_number);
 }
 
 void Watch_Ending_Signals()
 {
-    for (const int signal_number : Ending_Signals) {
-        struct sigaction action {
-        };
-        if (::sigaction(signal_number, nullptr, &action) != 0 || action.sa_handler == SIG_IGN)
-            continue;  // as under nohup: whoever started us wants it ignored
-        action = {};
-        action.sa_handler = Clean_Up_And_End;
-        action.sa_flags = SA_RESETHAND;
-        ::sigfillset(&action.sa_mask);
-        ::sigaction(signal_number, &action, nullptr);
+    struct sigaction action {
+    };
+    action.sa_sigaction = Clean_Up_And_End;
+    action.sa_flags = SA_SIGINFO;
+    ::sigfillset(&action.sa_mask);
+    for (std::size_t i = 0; i < std::size(Ending_Signals); ++i) {
+        struct sigaction& earlier = earlier_actions[i];
+        if (::sigaction(Ending_Signals[i], nullptr, &earlier) == 0 && earlier.sa_handler != SIG_IGN)
+            ::sigaction(Ending_Signals[i], &action, nullptr);  // ignored ones stay so, as under nohup
     }
 }
 
