@@ -1,0 +1,278 @@
+#include "command/host.h"
+
+#include "command/progress_line.h"
+#include "command/request_text.h"
+#include "ingester/ingester.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/host_process.h"
+#include "support/text.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace ingester
+{
+
+namespace
+{
+
+/// For what can't be asked of the library: among the codes of wrong command lines.
+constexpr int Unusable_Arguments = 105;
+
+constexpr std::size_t Longest_File_Record = 1120;
+constexpr std::size_t Longest_Sheet_Record = 280;
+
+/// Names in the private folder. The library knows the first one.
+constexpr const char* Standard_Input_Name = "$Std_In$";
+constexpr const char* Standard_Output_Name = "x.csv";
+
+/// Whose fault it is, as far as a status tells.
+enum class Blamed : std::uint8_t { input, output, request };
+
+struct Status_Sentence {
+    int status;
+    Blamed blamed;
+    const char* sentence;
+};
+
+constexpr Status_Sentence Status_Sentences[] = {
+    {INGESTER_NO_REQUEST, Blamed::request,
+     "the request did not reach the library; is there room in the temporary folder?"},
+    {INGESTER_INPUT_UNREADABLE, Blamed::input, "the file can't be opened, or is empty"},
+    {INGESTER_INPUT_UNKNOWN, Blamed::input, "this is no file of a known type"},
+    {INGESTER_NO_DATA, Blamed::input, "no data could be read, or all of them are missing"},
+    {INGESTER_NOT_IMPORTED, Blamed::input, "the data could not be imported"},
+    {INGESTER_OUTPUT_FAILED, Blamed::output, "the file could not be written"},
+    {INGESTER_NO_ROWS, Blamed::input, "the table has no rows"},
+    {INGESTER_INEXACT_SHEET, Blamed::input, "no sheet of that name holds data, or data could not be added"},
+    {INGESTER_CLIPBOARD_FAILED, Blamed::request, "the clipboard could not be used"},
+    {INGESTER_RENAME_FAILED, Blamed::output, "the finished file could not take its name"},
+    {INGESTER_ZIP_UNSUPPORTED, Blamed::input, "this is a zip archive; give the files in it one by one"},
+    {INGESTER_NOTHING_SELECTED, Blamed::input, "no columns or rows were selected"},
+    {INGESTER_QTL_FAILED, Blamed::input, "the QTL file could not be converted"},
+    {INGESTER_QTL_OPTIONS, Blamed::input, "these options do not fit a QTL file"},
+    {INGESTER_DOWNLOAD_FAILED, Blamed::input, "the download failed"},
+};
+
+/// One conversion, in the names of both sides.
+struct Conversion {
+    const Command_Options& options;
+    Sent_Name input;
+    Sent_Name output;
+
+    [[nodiscard]] bool From_Standard_Input() const { return options.input == Standard_Stream; }
+    [[nodiscard]] bool To_Standard_Output() const { return options.output == Standard_Stream; }
+};
+
+/// What the library answered.
+struct Answer {
+    int status = INGESTER_NO_REQUEST;
+    std::string messages;
+
+    /// The output is what was asked for.
+    [[nodiscard]] bool Is_Good() const { return status == INGESTER_SUCCESS || status == INGESTER_NO_ROWS; }
+};
+
+void Say(std::string_view about, std::string_view sentence)
+{
+    const std::string line =
+        std::string("ingester: ").append(about).append(": ").append(sentence).append("\n");
+    std::fwrite(line.data(), 1, line.size(), stderr);
+}
+
+Sent_Name Name_Of(const std::string& given, const char* stream, const std::string& stand_in)
+{
+    return given == Standard_Stream ? Sent_Name{stream, stand_in} : Sent_Name{given, Request_Path(given)};
+}
+
+bool Length_Is_Carried(std::string_view about, std::size_t length, std::size_t longest)
+{
+    if (length <= longest)
+        return true;
+    Say(about, Format_Text("a request can carry %zu characters here, with slash options, and these are %zu; "
+                           "use a shorter one",
+                           longest, length));
+    return false;
+}
+
+bool Name_Is_Carried(const std::string& given)
+{
+    const std::string fault = Fault_Of_Name(given);
+    if (!fault.empty())
+        Say(given, fault);
+    return fault.empty();
+}
+
+bool Request_Can_Carry(const Conversion& conversion)
+{
+    const Command_Options& options = conversion.options;
+    return Name_Is_Carried(options.input) && Name_Is_Carried(options.output)
+           && Length_Is_Carried(conversion.input.native,
+                                conversion.input.request.size() + options.input_options.size(),
+                                Longest_File_Record)
+           && Length_Is_Carried(conversion.output.native,
+                                conversion.output.request.size() + options.output_options.size(),
+                                Longest_File_Record)
+           && Length_Is_Carried("--sheet", options.sheet.size(), Longest_Sheet_Record)
+           && Length_Is_Carried("--range", options.range.size(), Longest_Sheet_Record);
+}
+
+bool Output_May_Be_Written(const Conversion& conversion)
+{
+    const Command_Options& options = conversion.options;
+    const Sent_Name& output = conversion.output;
+    if (conversion.To_Standard_Output())
+        return true;
+    const char* refusal = nullptr;
+    if (Folder_Exists(output.request))
+        refusal = "this is a folder; name a file in it";
+    else if (Is_Special_File(output.request))
+        refusal = "this is a device or a pipe, which a finished file can't replace; "
+                  "give - to write on standard output";
+    else if (!options.force && File_Exists(output.request) && !Options_Add_To_Output(options.output_options))
+        refusal = "the file exists already and was left as it is; give --force to replace it";
+    if (refusal != nullptr)
+        Say(output.native, refusal);
+    return refusal == nullptr;
+}
+
+void Write_Text_Record(Output_File& file, std::string_view text)
+{
+    file.Write_Little<std::int32_t>(0);
+    file.Write_Little(static_cast<std::int32_t>(text.size()));
+    file.Write(text);
+}
+
+bool Write_Pass_File(const Conversion& conversion, const std::string& name)
+{
+    const Command_Options& options = conversion.options;
+    std::vector<std::string> records = {conversion.input.request + options.input_options,
+                                        conversion.output.request + options.output_options};
+    if (!options.sheet.empty() || !options.range.empty())
+        records.push_back(options.sheet);
+    if (!options.range.empty())
+        records.push_back(options.range);
+    Output_File file;
+    if (!file.Open_Scratch(name))
+        return false;
+    file.Write_Little(static_cast<double>(records.size()));
+    for (const std::string& record : records)
+        Write_Text_Record(file, record);
+    return file.Close();
+}
+
+int Read_Status(const std::string& name)
+{
+    Input_File file;
+    std::int32_t status = 0;
+    const bool read = file.Open(name) && file.Read_Little(status);
+    return read && status >= 0 && status < Unusable_Arguments ? status : INGESTER_NO_REQUEST;
+}
+
+std::string Read_Messages(const std::string& name)
+{
+    std::string text;
+    Input_File file;
+    if (!file.Open(name))
+        return text;
+    char part[4096];
+    while (const std::size_t got = file.Read(part, sizeof part))
+        text.append(part, got);
+    constexpr std::string_view end_mark = ":\n";
+    if (text.ends_with(end_mark))
+        text.resize(text.size() - end_mark.size());
+    if (!text.empty() && !text.ends_with('\n'))
+        text += '\n';
+    return text;
+}
+
+Answer Call_Library(const Conversion& conversion, const std::string& folder)
+{
+    const std::string stem = folder + Format_Text("IG%li", Process_Id());
+    Answer answer;
+    if (!Write_Pass_File(conversion, stem + ".inp"))
+        return answer;
+    {
+        const Progress_Line progress(!conversion.options.quiet);
+        INGESTER("", "", 0, 0);
+    }
+    answer.status = Read_Status(stem + ".out");
+    answer.messages = With_Native_Names(Read_Messages(stem + ".ERR"), conversion.input, conversion.output);
+    return answer;
+}
+
+/// The file that a conversion cut short may leave behind: a new output, or the copy beside an old
+/// one. Empty when a file of that name was there before.
+std::string Unfinished_File(const Sent_Name& output)
+{
+    std::string name = File_Exists(output.request) ? With_Extension(output.request, ".$$$") : output.request;
+    if (File_Exists(name))
+        name.clear();
+    return name;
+}
+
+Answer Convert(const Conversion& conversion, const std::string& folder)
+{
+    const std::string unfinished = Unfinished_File(conversion.output);
+    Remove_On_Signal(unfinished);
+    const Answer answer = Call_Library(conversion, folder);
+    if (!answer.Is_Good() && !unfinished.empty())
+        Delete_File(unfinished);
+    Remove_On_Signal({});
+    return answer;
+}
+
+/// The library's own words, and a sentence of ours when they don't say which file they are about.
+void Tell_Answer(const Conversion& conversion, const Answer& answer)
+{
+    std::fwrite(answer.messages.data(), 1, answer.messages.size(), stderr);
+    if (answer.status == INGESTER_SUCCESS)
+        return;
+    Status_Sentence told{answer.status, Blamed::request, "the library gave a status of unknown meaning"};
+    for (const Status_Sentence& row : Status_Sentences)
+        if (row.status == answer.status)
+            told = row;
+    const std::string& about =
+        told.blamed == Blamed::output ? conversion.output.native : conversion.input.native;
+    if (answer.messages.find(about) == std::string::npos)
+        Say(about, told.sentence);
+}
+
+}  // namespace
+
+int Run_Command(const Command_Options& options)
+{
+    Start_Host_Process();
+    Private_Folder folder;
+    if (!folder.Make()) {
+        Say(Native_Path(Get_Temp_Folder()),
+            "no temporary folder can be made here; set TMPDIR to a folder that you can write to");
+        return INGESTER_NO_REQUEST;
+    }
+    const Conversion conversion{
+        options, Name_Of(options.input, "standard input", folder.Name() + Standard_Input_Name),
+        Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name)};
+    if (!Request_Can_Carry(conversion))
+        return Unusable_Arguments;
+    if (!Output_May_Be_Written(conversion))
+        return INGESTER_OUTPUT_FAILED;
+    if (conversion.From_Standard_Input() && !Copy_Standard_Input(conversion.input.request)) {
+        Say(conversion.input.native, "could not be read to its end and kept in the temporary folder");
+        return INGESTER_INPUT_UNREADABLE;
+    }
+    const Answer answer = Convert(conversion, folder.Name());
+    Tell_Answer(conversion, answer);
+    if (conversion.To_Standard_Output() && answer.Is_Good()
+        && !Copy_To_Standard_Output(conversion.output.request)) {
+        Say(conversion.output.native, "could not be written to its end");
+        return INGESTER_OUTPUT_FAILED;
+    }
+    return answer.status;
+}
+
+}  // namespace ingester

@@ -1,0 +1,79 @@
+#include "command/options.h"
+
+#include <CLI/CLI.hpp>
+
+namespace ingester
+{
+
+namespace
+{
+
+constexpr const char* Description = "Converts a table from one file format to another.\n"
+                                    "The input's content decides how it is read, the output's extension how "
+                                    "it is written.";
+
+constexpr const char* Examples = R"(Examples:
+  ingester crops.csv crops.tab
+      comma text becomes tab-separated text
+  ingester crops.csv - | head
+      comma text on standard output
+  zcat crops.csv.gz | ingester - crops.tab
+      the table comes from standard input
+  ingester --force yields.csv yields.tab
+      replaces an older yields.tab
+  ingester --range 3:40 field.txt field.csv
+      lines 3 to 40 of the text; the first of them may hold the names
+  ingester --in-options '/csv=2/n' long.csv long.tab
+      two lines make one record, and no line holds names
+  ingester --in-options '/c=2:4' --out-options '/mv=NA' crops.csv part.csv
+      columns 2 to 4; missing cells are written as NA
+
+Exit status: 0 when the output is complete; 1 to 19 when a request failed, as messages on standard
+error say (6: the output; 7: the table has no rows); above 100 when the command line is wrong.)";
+
+std::string Check_Not_Empty(const std::string& text)
+{
+    return text.empty() ? "the name is empty" : "";
+}
+
+std::string Check_Slash_Options(const std::string& text)
+{
+    return text.empty() || text.front() == '/' ? "" : "options begin with '/', as in '/csv=2/n'";
+}
+
+}  // namespace
+
+std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
+{
+    CLI::App app{Description, "ingester"};
+    app.set_version_flag("--version", "ingester " INGESTER_VERSION);
+    app.set_help_flag("-h,--help", "Print this help and exit");
+    app.footer(Examples);
+    app.add_option("INPUT", options.input, "File or URL to read; - is standard input")
+        ->required()
+        ->check(Check_Not_Empty);
+    app.add_option("OUTPUT", options.output, "File to write; - is comma text on standard output")
+        ->required()
+        ->check(Check_Not_Empty);
+    app.add_option("--sheet", options.sheet, "Sheet to read, of a file that holds several")
+        ->type_name("NAME");
+    app.add_option("--range", options.range, "Cells to read; of text files, lines as FIRST:LAST")
+        ->type_name("TEXT");
+    app.add_option("--in-options", options.input_options, "Slash options of the input")
+        ->type_name("TEXT")
+        ->check(Check_Slash_Options);
+    app.add_option("--out-options", options.output_options,
+                   "Slash options of the output; folders in values take backslashes")
+        ->type_name("TEXT")
+        ->check(Check_Slash_Options);
+    app.add_flag("-f,--force", options.force, "Replace an output that exists");
+    app.add_flag("-q,--quiet", options.quiet, "Show no progress");
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::ParseError& end) {
+        return app.exit(end);
+    }
+    return std::nullopt;
+}
+
+}  // namespace ingester

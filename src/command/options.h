@@ -1,0 +1,29 @@
+// The command line.
+#pragma once
+
+#include <optional>
+#include <string>
+
+namespace ingester
+{
+
+/// The name that stands for standard input or output.
+constexpr const char* Standard_Stream = "-";
+
+struct Command_Options {
+    std::string input;
+    std::string output;
+    std::string sheet;
+    std::string range;
+    std::string input_options;  ///< in the option language of requests, such as "/csv=2/n"
+    std::string output_options;
+    bool force = false;
+    bool quiet = false;
+};
+
+/// The exit status when nothing is left to run: help and version were printed, or the command line
+/// is wrong and that was said.
+[[nodiscard]] std::optional<int> Parse_Command_Line(int argc, const char* const* argv,
+                                                    Command_Options& options);
+
+}  // namespace ingester

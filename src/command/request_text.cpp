@@ -1,0 +1,176 @@
+#include "command/request_text.h"
+
+#include "platform/folders.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <iterator>
+
+namespace ingester
+{
+
+namespace
+{
+
+constexpr std::string_view Url_Starts[] = {"ftp:", "http:", "https:", "file:"};
+
+/// Texts that the library replaces wherever they stand in a name.
+constexpr std::string_view Path_Tokens[] = {
+    "%TMP%",     "%TEMP%",         "%TABDIR%",     "%DATA%",     "%EXAMPLES%",
+    "%PROCLIB%", "%SYSTEMADDINS%", "%USERADDINS%", "%TABDIR32%", "%TABDIR64%",
+};
+
+/// How the value of an option ends: there is none, at the next "/", or at a quote that it began with.
+enum class Value_Form : std::uint8_t { none, bare, quoted };
+
+struct Output_Option {
+    std::string_view key;
+    Value_Form form;
+    bool adds;  ///< to the output
+};
+
+/// Those that add to the output, and those cut out before them that could be taken for one, or whose
+/// value could hold one; in the order in which a request is searched for them.
+constexpr Output_Option Output_Options[] = {
+    {"/rewrite=", Value_Form::bare, false}, {"/mv=", Value_Form::quoted, false},
+    {"/av", Value_Form::none, false},       {"/a", Value_Form::none, true},
+    {"/x=", Value_Form::quoted, false},     {"/r", Value_Form::none, true},
+    {"/!=", Value_Form::quoted, false},     {"/@", Value_Form::none, true},
+    {"/&", Value_Form::none, true},         {"/^", Value_Form::none, true},
+    {"/%", Value_Form::none, true},
+};
+
+/// Messages cut no name shorter than this.
+constexpr std::size_t Shortest_Cut = 100;
+
+/// `name` is fetched, not opened.
+bool Is_Url(std::string_view name)
+{
+    return std::ranges::any_of(Url_Starts,
+                               [name](std::string_view start) { return Starts_Ignoring_Case(name, start); });
+}
+
+/// Where the value that begins at `at` ends.
+std::size_t Value_End(std::string_view options, std::size_t at, Value_Form form)
+{
+    if (form == Value_Form::none || at >= options.size())
+        return at;
+    if (form == Value_Form::quoted && options[at] == '=')
+        ++at;
+    if (form == Value_Form::quoted && at < options.size() && (options[at] == '"' || options[at] == '\''))
+        return std::min(options.find(options[at], at + 1), options.size() - 1) + 1;
+    return std::min(options.find('/', at), options.size());
+}
+
+/// One text that a message may hold, and what it becomes.
+struct Spelling {
+    std::string_view request;
+    std::string_view native;
+    bool may_be_cut;
+};
+
+/// The forms of one name, the longest first. Without a folder both names are the same anyway.
+std::array<Spelling, 4> Spellings_Of(const Sent_Name& name)
+{
+    const std::string_view request = name.request;
+    const std::string_view native = name.native;
+    std::array<Spelling, 4> spellings{{{request, native, true}}};
+    if (request.size() != native.size())
+        return spellings;  // a stand-in of ours: its parts mean nothing to the user
+    const std::size_t folder = Folder_Of(request).size();
+    const std::size_t lengths[] = {Extension_Start(request), folder, folder > 1 ? folder - 1 : 0};
+    for (std::size_t i = 0; i < std::size(lengths); ++i)
+        spellings[i + 1] = {request.substr(0, lengths[i]), native.substr(0, lengths[i]), false};
+    return spellings;
+}
+
+/// Names in messages stand between these.
+constexpr std::string_view Before_A_Name = " \t\r\n'\"`(:=";
+constexpr std::string_view Behind_A_Name = " \t\r\n'\"`).,;:";
+
+/// How much of `message`, which begins at a possible start of a name, is `spelling`; 0 when none.
+std::size_t Match_Length(std::string_view message, const Spelling& spelling)
+{
+    const std::size_t common = Common_Start(message, spelling.request);
+    if (common == spelling.request.size())
+        return common == message.size() || Behind_A_Name.find(message[common]) != std::string_view::npos
+                   ? common
+                   : 0;
+    return spelling.may_be_cut && common >= Shortest_Cut ? common : 0;
+}
+
+struct Found_Name {
+    std::size_t length = 0;  ///< in the message; 0 when no name was found
+    std::string_view native;
+};
+
+/// The longest spelling that `message` begins with. A cut one is as short in its native form.
+Found_Name Name_At_Start(std::string_view message, const std::array<std::array<Spelling, 4>, 2>& all)
+{
+    Found_Name found;
+    for (const auto& spellings : all) {
+        for (const Spelling& spelling : spellings) {
+            const std::size_t length = Match_Length(message, spelling);
+            const bool same_size = spelling.native.size() == spelling.request.size();
+            if (length > found.length)
+                found = {length, same_size ? spelling.native.substr(0, length) : spelling.native};
+        }
+    }
+    return found;
+}
+
+}  // namespace
+
+std::string Fault_Of_Name(std::string_view native)
+{
+    if (Native_Path(Request_Path(native)) != native)
+        return "a request reads the backslash in this name as the end of a folder's name; "
+               "rename the file, or give it another name by a link";
+    if (Is_Url(native))
+        return {};
+    for (const std::string_view token : Path_Tokens)
+        if (Find_Ignoring_Case(native, token) != std::string_view::npos)
+            return std::string("a request puts a folder in the place of ")
+                .append(token)
+                .append("; rename the file or its folder, or use a link");
+    const std::size_t first_end = native.find('/');
+    if (native.starts_with('%') && first_end != std::string_view::npos && first_end > 1
+        && native[first_end - 1] == '%')
+        return std::string(
+            "a request takes the first part for a variable of the environment; put ./ in front");
+    return {};
+}
+
+bool Options_Add_To_Output(std::string_view options)
+{
+    std::string rest(options);
+    for (const Output_Option& option : Output_Options) {
+        const std::size_t at = rest.find(option.key);
+        if (at == std::string::npos)
+            continue;
+        if (option.adds)
+            return true;
+        rest.erase(at, Value_End(rest, at + option.key.size(), option.form) - at);
+    }
+    return false;
+}
+
+std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)
+{
+    const std::array<std::array<Spelling, 4>, 2> all{Spellings_Of(input), Spellings_Of(output)};
+    std::string told;
+    bool name_may_start = true;
+    while (!message.empty()) {
+        const Found_Name found = name_may_start ? Name_At_Start(message, all) : Found_Name{};
+        const std::size_t taken = std::max<std::size_t>(found.length, 1);
+        told.append(found.length > 0 ? found.native : message.substr(0, 1));
+        name_may_start = Before_A_Name.find(message[taken - 1]) != std::string_view::npos;
+        message.remove_prefix(taken);
+    }
+    return told;
+}
+
+}  // namespace ingester
