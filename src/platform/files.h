@@ -28,6 +28,9 @@ public:
 
     [[nodiscard]] const std::string& Name() const { return name_; }
 
+    /// The system's number of the open file; below 0 for bytes in memory. For this floor only.
+    [[nodiscard]] int Descriptor() const { return descriptor_; }
+
     /// Bytes in all; 0 where that isn't known before they are read.
     [[nodiscard]] std::int64_t Size() const;
     [[nodiscard]] std::int64_t Position() const { return position_; }

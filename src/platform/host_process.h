@@ -5,8 +5,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// Readies this process: standard streams that were closed can't be mistaken for files opened later,
 /// and a file that outgrows its limit is a failed write, not the end of the process.
@@ -14,8 +13,7 @@ void Start_Host_Process();
 
 /// A folder that only this user can enter, in the temporary folder, which it then stands in for.
 /// It goes with all in it at the end, and when a signal ends the process. One at a time.
-class Private_Folder
-{
+class Private_Folder {
 public:
     Private_Folder() = default;
     Private_Folder(const Private_Folder&) = delete;

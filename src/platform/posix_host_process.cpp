@@ -20,11 +20,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::size_t Copy_Size = 1 << 16;
 
@@ -36,8 +34,7 @@ std::array<char, PATH_MAX> doomed_folder{};
 std::array<char, PATH_MAX> doomed_file{};
 
 /// Signals wait while this lives, so that a handler never sees half a path.
-class Signals_Held
-{
+class Signals_Held {
 public:
     Signals_Held()
     {
@@ -104,8 +101,7 @@ extern "C" void Clean_Up_And_End(int signal_number, siginfo_t* facts, void*)
 
 void Watch_Ending_Signals()
 {
-    struct sigaction action {
-    };
+    struct sigaction action {};
     action.sa_sigaction = Clean_Up_And_End;
     action.sa_flags = SA_SIGINFO;
     ::sigfillset(&action.sa_mask);

@@ -1,11 +1,14 @@
 #include "support/number_text.h"
 
+#include "support/byte_fields.h"
 #include "support/text.h"
 
 #include <array>
+#include <bit>
 #include <charconv>
 #include <cmath>
 #include <cstring>
+#include <limits>
 
 namespace ingester {
 
@@ -119,15 +122,114 @@ bool Is_Plain_Integer(double value, double limit)
 
 }  // namespace
 
-Parsed_Number Parse_Number(const char* first, const char* last)
+namespace {
+
+constexpr std::uint64_t Exact_Integer_Limit = std::uint64_t{1} << 53;
+constexpr int Safe_Digits = 18;  // that many fit a signed 64-bit integer
+
+constexpr std::uint64_t Integer_Powers[] = {1, 10, 100, 1000, 10000, 100000, 1000000, 10000000, 100000000};
+
+/// Up to eight characters as a word, the first in the low byte.
+std::uint64_t Load_Word(const char* at)
 {
-    const char* start = first;
-    if (start != last && *start == '+')
-        ++start;
-    // The library would also take "inf" and "nan", and a second sign behind our "+".
-    const char* const digits = start != last && *start == '-' && start == first ? start + 1 : start;
-    if (digits == last || !(Is_Digit(*digits) || *digits == '.'))
-        return {first, 0.0, Number_Status::none};
+    return Number_At<std::uint64_t>(at);
+}
+
+/// How many of the characters of `word` are digits, before the first that isn't. `word` has been
+/// xor-ed with '0's, so that digits are 0 to 9.
+int Leading_Digits(std::uint64_t word)
+{
+    const std::uint64_t others = ((word + 0x7676767676767676U) | word) & 0x8080808080808080U;
+    return others == 0 ? 8 : std::countr_zero(others) / 8;
+}
+
+/// The number that `count` digits (1 to 8) at the low end of `word` make: neighbours are joined to
+/// pairs, pairs to fours, fours to eight, all at once.
+std::uint64_t Join_Digits(std::uint64_t word, int count)
+{
+    word <<= 64 - 8 * count;
+    word = word * 10 + (word >> 8);
+    constexpr std::uint64_t pairs = 0x000000FF000000FFU;
+    return ((word & pairs) * 0x000F424000000064U + ((word >> 16) & pairs) * 0x0000271000000001U) >> 32;
+}
+
+/// A number under way: `digits` * 10^`exponent`, of `count` digits.
+struct Decimal_Scan {
+    std::uint64_t digits = 0;
+    int count = 0;
+    int exponent = 0;
+};
+
+/// Takes a run of digits; beyond `Safe_Digits` only their count goes on.
+inline const char* Take_Digits(const char* at, Decimal_Scan& scan)
+{
+    constexpr std::uint64_t zeros = 0x3030303030303030U;
+    for (;;) {
+        const std::uint64_t word = Load_Word(at) ^ zeros;
+        const int found = Leading_Digits(word);
+        if (found == 0)
+            return at;
+        scan.count += found;
+        if (scan.count <= Safe_Digits)
+            scan.digits = scan.digits * Integer_Powers[found] + Join_Digits(word, found);
+        at += found;
+        if (found < 8 || scan.count > Safe_Digits)
+            return at;
+    }
+}
+
+/// An exponent counts only with a digit in it: "1e" is the number 1 and a letter.
+const char* Take_Exponent(const char* at, Decimal_Scan& scan)
+{
+    const char* digit = at + 1;
+    const bool negative = *digit == '-';
+    if (negative || *digit == '+')
+        ++digit;
+    if (!Is_Digit(*digit))
+        return at;
+    int exponent = 0;
+    for (; Is_Digit(*digit); ++digit)
+        exponent = exponent < 10000 ? exponent * 10 + (*digit - '0') : exponent;
+    scan.exponent += negative ? -exponent : exponent;
+    return digit;
+}
+
+/// Where digits and power are exact as they are, one multiplication or division rounds once, which
+/// makes the nearest double.
+bool Convert_Exactly(const Decimal_Scan& scan, double& value)
+{
+    if (scan.digits > Exact_Integer_Limit)
+        return false;
+    value = static_cast<double>(static_cast<std::int64_t>(scan.digits));
+    if (scan.exponent < 0)
+        value /= Exact_Powers[static_cast<std::size_t>(-scan.exponent)];
+    else
+        value *= Exact_Powers[static_cast<std::size_t>(scan.exponent)];
+    return true;
+}
+
+/// With a wider type for the one rounding, a second one to double does no harm unless the wide
+/// result lies half-way between two doubles.
+bool Convert_Widely(const Decimal_Scan& scan, double& value)
+{
+    using Wide = long double;
+    if constexpr (std::numeric_limits<Wide>::digits != 64 || std::numeric_limits<double>::digits != 53)
+        return false;
+    auto wide = static_cast<Wide>(static_cast<std::int64_t>(scan.digits));
+    if (scan.exponent < 0)
+        wide /= static_cast<Wide>(Exact_Powers[static_cast<std::size_t>(-scan.exponent)]);
+    else
+        wide *= static_cast<Wide>(Exact_Powers[static_cast<std::size_t>(scan.exponent)]);
+    std::uint64_t mantissa;
+    std::memcpy(&mantissa, &wide, sizeof mantissa);
+    value = static_cast<double>(wide);
+    return (mantissa & 0x7FF) != 0x400;
+}
+
+/// The library takes what the quick roads don't.
+Parsed_Number Parse_By_Library(const char* first, const char* last)
+{
+    const char* const start = *first == '+' ? first + 1 : first;
     double value = 0.0;
     const auto [end, error] = std::from_chars(start, last, value);
     if (error == std::errc::invalid_argument)
@@ -135,6 +237,51 @@ Parsed_Number Parse_Number(const char* first, const char* last)
     if (error != std::errc{})
         return {end, 0.0, Number_Status::out_of_range};
     return {end, value, Number_Status::good};
+}
+
+}  // namespace
+
+Parsed_Number Parse_Number_In_Buffer(const char* first)
+{
+    const bool negative = *first == '-';
+    const char* at = first + (negative || *first == '+' ? 1 : 0);
+    Decimal_Scan scan;
+    at = Take_Digits(at, scan);
+    if (*at == '.') {
+        const int whole_digits = scan.count;
+        at = Take_Digits(at + 1, scan);
+        scan.exponent = whole_digits - scan.count;
+    }
+    if (scan.count == 0)
+        return {first, 0.0, Number_Status::none};
+    if (*at == 'e' || *at == 'E')
+        at = Take_Exponent(at, scan);
+    double value;
+    const bool in_reach = scan.count <= Safe_Digits && scan.exponent >= -Greatest_Exact_Power
+                          && scan.exponent <= Greatest_Exact_Power;
+    if (in_reach && (Convert_Exactly(scan, value) || Convert_Widely(scan, value)))
+        return {at, negative ? -value : value, Number_Status::good};
+    while (Is_Digit(*at) || *at == '.' || *at == '-' || *at == '+' || *at == 'e' || *at == 'E')
+        ++at;
+    return Parse_By_Library(first, at);
+}
+
+Parsed_Number Parse_Number(const char* first, const char* last)
+{
+    constexpr std::size_t room = 64;
+    const auto length = static_cast<std::size_t>(last - first);
+    if (length < room - Readable_Behind) {
+        char padded[room];
+        std::memcpy(padded, first, length);
+        std::memset(padded + length, 0, room - length);
+        const Parsed_Number parsed = Parse_Number_In_Buffer(padded);
+        return {first + (parsed.end - padded), parsed.value, parsed.status};
+    }
+    // The library would also take "inf" and "nan", and a second sign behind a "+".
+    const char* const digits = *first == '-' || *first == '+' ? first + 1 : first;
+    if (!Is_Digit(*digits) && *digits != '.')
+        return {first, 0.0, Number_Status::none};
+    return Parse_By_Library(first, last);
 }
 
 char* Print_Integer(char* target, std::int64_t value)

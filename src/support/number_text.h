@@ -23,6 +23,11 @@ struct Parsed_Number {
 /// `e` or `E`. Nothing else counts: no blanks, no "nan", no "inf", no hexadecimal.
 [[nodiscard]] Parsed_Number Parse_Number(const char* first, const char* last);
 
+/// The same where `Readable_Behind` bytes behind the number may be read, whatever they are, and
+/// something that can't be part of a number ends it: for numbers in the midst of a large buffer.
+[[nodiscard]] Parsed_Number Parse_Number_In_Buffer(const char* first);
+constexpr std::size_t Readable_Behind = 8;
+
 /// The number that the whole of `text` is, if it is one.
 [[nodiscard]] inline bool Whole_Number_Text(std::string_view text, double& value)
 {

@@ -5,13 +5,16 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <cstring>
+#include <string>
 
 namespace ingester {
 
 namespace {
 
 constexpr std::string_view Number_Characters = "0123456789+-.eE";
+
+/// Small enough that the window and its places stay in the nearest caches while they are used.
+constexpr std::size_t Window_Size = 1 << 12;
 
 bool Is_Blank_Or_Tab(char c)
 {
@@ -20,41 +23,102 @@ bool Is_Blank_Or_Tab(char c)
 
 }  // namespace
 
-Field_Cutter::Field_Cutter(const Text_Scan_Options& options) : quotes_(options.separators_given)
+Field_Walker::Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer)
+    : text_(buffer.text), quotes_(options.separators_given), at_(text_.data()), window_(text_.substr(0, 0)),
+      places_(Window_Size)
 {
-    ends_['\n'] = true;
-    const std::string_view separators = options.separators_given ? options.separators.view() : " \t";
-    for (const char c : separators) {
-        ends_[static_cast<unsigned char>(c)] = true;
-        numbers_run_on_ = numbers_run_on_ || Number_Characters.find(c) != std::string_view::npos;
-    }
+    std::string marks = buffer.facts.returns > 0 ? "\n\r" : "\n";
+    marks += options.separators_given ? options.separators.view() : " \t";
+    numbers_run_on_ = marks.find_first_of(Number_Characters) != std::string::npos;
+    ends_ = Byte_Finder(marks);
+    const auto add_quote = [&](char quote, bool present) {
+        if (!quotes_ || !present || ends_.Holds(quote))
+            return;
+        marks += quote;
+        quotes_inside_ = true;
+    };
+    add_quote('"', buffer.facts.double_quotes);
+    add_quote('\'', buffer.facts.single_quotes);
+    marks_ = Byte_Finder(marks);
+}
+
+void Field_Walker::Go_To(const char* at)
+{
+    at_ = at;
+    window_ = text_.substr(static_cast<std::size_t>(at - text_.data()), 0);
+    next_ = found_ = 0;
+}
+
+/// The text ends with LF, so there is always another place until its end has been taken.
+void Field_Walker::Look_At_Next_Window()
+{
+    do {
+        const auto start = static_cast<std::size_t>(window_.data() + window_.size() - text_.data());
+        window_ = text_.substr(start, Window_Size);
+        found_ = marks_.Find_All(window_, places_.data());
+    } while (found_ == 0);
+    next_ = 0;
+}
+
+const char* Field_Walker::Next_Quote(const char* from, char quote)
+{
+    const char* mark;
+    do {
+        if (next_ == found_)
+            Look_At_Next_Window();
+        mark = window_.data() + places_[next_++];
+    } while (mark < from || (*mark != quote && *mark != '\n' && *mark != '\r'));
+    return mark;
 }
 
 /// A doubled quote doesn't close; without a close the field runs to the end of the line.
-Text_Field Field_Cutter::Cut_Quoted(const char* at) const
+Text_Field Field_Walker::Next_Quoted()
 {
-    const char quote = *at;
-    const char* end = at + 1;
-    for (; *end != '\n'; ++end) {
-        if (*end != quote)
-            continue;
-        if (end[1] != quote)
-            return {at, Field_End(end + 1), true};
-        ++end;
+    const char* const first = at_;
+    const char quote = *first;
+    for (const char* mark = first;;) {
+        mark = Next_Quote(mark + 1, quote);
+        if (*mark != quote) {
+            at_ = mark;
+            return {first, at_, false};
+        }
+        if (mark[1] != quote) {
+            at_ = Next_End(mark + 1);
+            return {first, at_, true};
+        }
+        ++mark;
     }
-    return {at, end, false};
 }
 
-const char* Field_Cutter::First_Line(std::string_view text) const
+/// Behind a blank, or the CR of a CR LF, that has been stepped over.
+bool Field_Walker::More_Behind(char end)
 {
-    const char* at = text.data();
-    const char* const last = at + text.size();
-    while (!quotes_ && at != last && *at == '"')
-        at = static_cast<const char*>(std::memchr(at, '\n', static_cast<std::size_t>(last - at))) + 1;
-    return at;
+    while (end == ' ' && *at_ == ' ')
+        ++at_;
+    if (*at_ == '\r')
+        ++at_;
+    if (*at_ != '\n')
+        return true;
+    ++at_;
+    return false;
 }
 
-std::string_view Field_Cutter::Content(const Text_Field& field) const
+void Field_Walker::Skip_Line()
+{
+    while (*at_ != '\n')
+        at_ = Next_End(at_ + 1);
+    ++at_;
+}
+
+const char* Field_Walker::First_Line() const
+{
+    std::string_view rest = text_;
+    while (!quotes_ && rest.starts_with('"'))
+        rest.remove_prefix(rest.find('\n') + 1);
+    return rest.data();
+}
+
+std::string_view Field_Walker::Content(const Text_Field& field) const
 {
     std::string_view text(field.first, static_cast<std::size_t>(field.last - field.first));
     if (!quotes_)

@@ -45,8 +45,9 @@ bool Cells_Are_Plausible(std::int64_t rows, std::int64_t columns, std::size_t by
 
 class Sheet_Filler {
 public:
-    Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, std::string_view text)
-        : sheet_(sheet), shape_(shape), cutter_(options), trim_(options.trim_cells), text_(text)
+    Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer)
+        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells),
+          text_(buffer.text)
     {
         for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
             Start_Column(column);
@@ -54,20 +55,25 @@ public:
 
     bool Fill()
     {
-        const char* at = cutter_.First_Line(text_);
+        walker_.Go_To(walker_.First_Line());
         if (shape_.has_names)
-            at = Fill_Names(at);
-        return Fill_Rows(at, sheet_.row_count) && Redo_Rows(at);
+            Fill_Names();
+        const char* const first_row = walker_.Place();
+        if (!Fill_Rows())
+            return false;
+        walker_.Go_To(first_row);
+        Redo_Rows();
+        return true;
     }
 
 private:
     void Start_Column(Column* column);
-    const char* Fill_Names(const char* at);
+    void Fill_Names();
     void Name_Column(Column& column, std::string_view text);
-    bool Fill_Rows(const char* at, std::int64_t rows);
-    bool Redo_Rows(const char* at);
-    const char* Fill_Row(const char* at);
-    const char* Fill_Number(const char* at, Column_Filling& state);
+    bool Fill_Rows();
+    void Redo_Rows();
+    void Fill_Row();
+    void Fill_Number(const Text_Field& field, Column_Filling& state);
     void Fill_Checked(const Text_Field& field, Column_Filling& state);
     void Fill_Text(const Text_Field& field, Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
@@ -76,7 +82,7 @@ private:
 
     Sheet& sheet_;
     Text_Shape& shape_;
-    Field_Cutter cutter_;
+    Field_Walker walker_;
     bool trim_;
     std::string_view text_;
     std::vector<Column_Filling> columns_;
@@ -102,27 +108,22 @@ void Sheet_Filler::Name_Column(Column& column, std::string_view text)
 }
 
 /// An empty field leaves a column the name it has.
-const char* Sheet_Filler::Fill_Names(const char* at)
+void Sheet_Filler::Fill_Names()
 {
-    for (std::size_t index = 0;; ++index) {
-        const Text_Field field = cutter_.Cut(at);
+    std::size_t index = 0;
+    do {
         bool unquoted;
-        const std::string_view name = Text_Of(field, unquoted);
+        const std::string_view name = Text_Of(walker_.Next(), unquoted);
         if (index < columns_.size() && (!name.empty() || unquoted))
             Name_Column(*columns_[index].column, name);
-        at = field.last;
-        if (!cutter_.Step_Over_Separator(at))
-            break;
-    }
-    while (*at != '\n')
-        ++at;
-    return at + 1;
+        ++index;
+    } while (walker_.Has_More());
 }
 
 /// A field's text: without its quotes, if it has them, and with doubled ones inside made single.
 std::string_view Sheet_Filler::Text_Of(const Text_Field& field, bool& unquoted)
 {
-    std::string_view content = cutter_.Content(field);
+    std::string_view content = walker_.Content(field);
     unquoted = content.data() != field.first && (content.data()[-1] == '"' || content.data()[-1] == '\'');
     const char pair[] = {unquoted ? content.data()[-1] : '\0', unquoted ? content.data()[-1] : '\0'};
     const std::string_view doubled(pair, 2);
@@ -170,7 +171,7 @@ void Sheet_Filler::Turn_To_Text(Column_Filling& state)
 void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 {
     double value;
-    switch (Kind_Of_Field(cutter_.Content(field), field.quoted, value)) {
+    switch (Kind_Of_Field(walker_.Content(field), field.quoted, value)) {
     case Field_Kind::number:
         state.cell->value.number = value;
         break;
@@ -185,21 +186,14 @@ void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
     }
 }
 
-/// The quick road: a number that ends at a separator needs no cutting first.
-inline const char* Sheet_Filler::Fill_Number(const char* at, Column_Filling& state)
+/// The quick road: a number that fills its field, as most do.
+inline void Sheet_Filler::Fill_Number(const Text_Field& field, Column_Filling& state)
 {
-    while (*at == ' ')
-        ++at;
-    if (!cutter_.Numbers_May_Run_On()) {
-        const Parsed_Number parsed = Parse_Number(at, text_.data() + text_.size());
-        if (parsed.status == Number_Status::good && cutter_.Ends_Field(*parsed.end)) {
-            state.cell->value.number = std::min(parsed.value, Greatest_Number);
-            return parsed.end;
-        }
-    }
-    const Text_Field field = cutter_.Cut(at);
-    Fill_Checked(field, state);
-    return field.last;
+    const Parsed_Number parsed = Parse_Number_In_Buffer(field.first);
+    if (parsed.end == field.last && parsed.status == Number_Status::good) [[likely]]
+        state.cell->value.number = std::min(parsed.value, Greatest_Number);
+    else
+        Fill_Checked(field, state);
 }
 
 /// A line with more fields than any that the scan saw.
@@ -229,50 +223,44 @@ bool Sheet_Filler::Add_Late_Column()
     return true;
 }
 
-/// Returns the end of the line. Columns without a field in this line move on to the next row too.
-const char* Sheet_Filler::Fill_Row(const char* at)
+/// Columns without a field in this line move on to the next row too.
+void Sheet_Filler::Fill_Row()
 {
     std::size_t index = 0;
-    for (bool more = true; more; ++index) {
-        if (index == columns_.size() && (columns_full_ || !Add_Late_Column())) {
-            while (*at != '\n')
-                ++at;
-            return at;
+    do {
+        if (index == columns_.size() && (columns_full_ || !Add_Late_Column())) [[unlikely]] {
+            walker_.Skip_Line();
+            return;
         }
-        Column_Filling& state = columns_[index];
+        Column_Filling& state = columns_[index++];
         Cell_Node* const cell = state.cell;
-        if (state.filling == Filling::numbers_so_far || state.filling == Filling::numbers) {
-            at = Fill_Number(at, state);
-        } else {
-            const Text_Field field = cutter_.Cut(at);
-            at = field.last;
-            if (state.filling == Filling::texts)
-                Fill_Text(field, state);
-        }
+        const Text_Field field = walker_.Next();
+        if (state.filling <= Filling::numbers)
+            Fill_Number(field, state);
+        else if (state.filling == Filling::texts)
+            Fill_Text(field, state);
         state.cell = cell->next;
-        more = cutter_.Step_Over_Separator(at);
-    }
+    } while (walker_.Has_More());
     for (; index < columns_.size(); ++index)
         columns_[index].cell = columns_[index].cell->next;
-    return at;
 }
 
-bool Sheet_Filler::Fill_Rows(const char* at, std::int64_t rows)
+bool Sheet_Filler::Fill_Rows()
 {
     constexpr std::ptrdiff_t progress_step = std::ptrdiff_t{1} << 22;
-    const char* told = at;
-    for (row_ = 0; row_ < rows && !failed_; ++row_) {
-        at = Fill_Row(at) + 1;
-        if (at - told >= progress_step) {
-            told = at;
-            Show_Progress("Reading", at - text_.data(), static_cast<std::int64_t>(text_.size()));
+    const char* told = walker_.Place();
+    for (row_ = 0; row_ < sheet_.row_count && !failed_; ++row_) {
+        Fill_Row();
+        if (walker_.Place() - told >= progress_step) {
+            told = walker_.Place();
+            Show_Progress("Reading", told - text_.data(), static_cast<std::int64_t>(text_.size()));
         }
     }
     return !failed_;
 }
 
 /// Columns that turned into Text late get the texts of their first rows.
-bool Sheet_Filler::Redo_Rows(const char* at)
+void Sheet_Filler::Redo_Rows()
 {
     std::int64_t rows = 0;
     for (Column_Filling& state : columns_) {
@@ -282,12 +270,11 @@ bool Sheet_Filler::Redo_Rows(const char* at)
     }
     columns_full_ = true;
     for (row_ = 0; row_ < rows; ++row_) {
-        at = Fill_Row(at) + 1;
+        Fill_Row();
         for (Column_Filling& state : columns_)
             if (row_ + 1 == state.rows_to_redo)
                 state.filling = Filling::passed_over;
     }
-    return true;
 }
 
 }  // namespace
@@ -316,11 +303,10 @@ Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type)
     return sheet;
 }
 
-bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options, std::string_view text,
-                     bool tab_file)
+bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
+                     const Text_Buffer& buffer)
 {
-    static_cast<void>(tab_file);
-    return sheet != nullptr && Sheet_Filler(*sheet, shape, options, text).Fill();
+    return sheet != nullptr && Sheet_Filler(*sheet, shape, options, buffer).Fill();
 }
 
 bool Text_Fits_In_Memory(const Text_Shape& shape, std::size_t bytes)

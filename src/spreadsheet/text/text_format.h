@@ -2,13 +2,13 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "platform/file_image.h"
 #include "platform/files.h"
+#include "support/byte_scan.h"
 #include "support/fixed_text.h"
 
-#include <array>
 #include <cstdint>
 #include <limits>
-#include <memory>
 #include <string_view>
 #include <vector>
 
@@ -17,17 +17,15 @@ namespace ingester {
 /// Longest line, or joined record, in characters.
 constexpr std::size_t Greatest_Line = 262140;
 
-/// The kept lines of a text, each ended by one LF, in one buffer with a NUL behind.
-struct Text_Image {
-    std::unique_ptr<char, Free_Deleter> bytes;
-    std::size_t length = 0;
-
-    [[nodiscard]] std::string_view Text() const { return {bytes.get(), length}; }
+/// The lines of a text in memory, each ended by LF or CR LF, and what is known of it.
+struct Text_Buffer {
+    std::string_view text;
+    Text_Facts facts;
 };
 
-/// Loads the lines that the request's options keep. `strip_titles` drops the quoted lines that a
-/// text begins with. False after a message, or when the file could not be read.
-bool Load_Text_Image(Input_File& file, bool strip_titles, Text_Image& image);
+/// Loads the lines that the request's options keep into `image`. `strip_titles` drops the quoted
+/// lines that a text begins with. `buffer` is empty for no lines. False after a message.
+bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer);
 
 /// Walks a text line by line; CR, LF and CR LF end one. A text given starts a walk, an empty view
 /// with a null pointer goes on. False at the end.
@@ -52,58 +50,81 @@ struct Text_Field {
     bool quoted = false;  ///< starts with a quote that is closed
 };
 
-/// Cuts the lines of an image into fields. Every line must end with LF.
-class Field_Cutter {
+/// Walks the fields of a text, behind which `Readable_Behind` bytes may be read. The places of separators,
+/// line ends and quotes are found for a window of the text at once, so that cutting a field is looking up
+/// where the next of them stands.
+class Field_Walker {
 public:
-    explicit Field_Cutter(const Text_Scan_Options& options);
+    Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer);
 
-    [[nodiscard]] bool Ends_Field(char c) const { return ends_[static_cast<unsigned char>(c)]; }
+    /// Goes to a place: the start of a line that is not before the one walked.
+    void Go_To(const char* at);
 
-    /// The field that starts at `at`.
-    [[nodiscard]] Text_Field Cut(const char* at) const
+    /// The first of the lines that count: without separators, quoted lines at the head don't.
+    [[nodiscard]] const char* First_Line() const;
+
+    /// Cuts the next field.
+    [[nodiscard]] Text_Field Next()
     {
-        while (*at == ' ')
-            ++at;
-        if (quotes_ && (*at == '"' || *at == '\''))
-            return Cut_Quoted(at);
-        return {at, Field_End(at), false};
+        while (*at_ == ' ')
+            ++at_;
+        if (quotes_ && (*at_ == '"' || *at_ == '\'')) [[unlikely]]
+            return Next_Quoted();
+        const char* const first = at_;
+        at_ = Next_End(first);
+        return {first, at_, false};
     }
 
-    /// Whether another field follows one that ended at `at`; steps over the separator then. Blanks
-    /// at a line's end separate nothing.
-    [[nodiscard]] bool Step_Over_Separator(const char*& at) const
+    /// Whether another field follows in the line; steps over the separator then, otherwise over the
+    /// line's end. Blanks at a line's end separate nothing.
+    [[nodiscard]] bool Has_More()
     {
-        if (*at == '\n')
-            return false;
-        if (*at++ != ' ')
-            return true;
-        while (*at == ' ')
-            ++at;
-        return *at != '\n';
+        const char end = *at_++;
+        if (end == ' ' || end == '\r') [[unlikely]]
+            return More_Behind(end);
+        return end != '\n';
     }
+
+    /// Passes over what is left of the line.
+    void Skip_Line();
+
+    [[nodiscard]] const char* Place() const { return at_; }
 
     /// A digit, point, sign or exponent letter separates fields, so numbers must be cut first.
     [[nodiscard]] bool Numbers_May_Run_On() const { return numbers_run_on_; }
-
-    /// The first of the lines that count: without separators, quoted lines at the head don't.
-    [[nodiscard]] const char* First_Line(std::string_view text) const;
 
     /// The field's text as it stands: no outer blanks and tabs, no pair of quotes around it, but
     /// quotes inside still doubled.
     [[nodiscard]] std::string_view Content(const Text_Field& field) const;
 
 private:
-    [[nodiscard]] const char* Field_End(const char* at) const
+    /// The next separator or line end at or behind `from`.
+    [[nodiscard]] const char* Next_End(const char* from)
     {
-        while (!Ends_Field(*at))
-            ++at;
-        return at;
+        const char* end;
+        do {
+            if (next_ == found_) [[unlikely]]
+                Look_At_Next_Window();
+            end = window_.data() + places_[next_++];
+        } while (end < from || (quotes_inside_ && !ends_.Holds(*end)));
+        return end;
     }
-    [[nodiscard]] Text_Field Cut_Quoted(const char* at) const;
+    [[nodiscard]] const char* Next_Quote(const char* from, char quote);
+    [[nodiscard]] Text_Field Next_Quoted();
+    [[nodiscard]] bool More_Behind(char end);
+    void Look_At_Next_Window();
 
-    std::array<bool, 256> ends_{};
-    bool quotes_ = false;
+    std::string_view text_;
+    Byte_Finder ends_;     ///< separators and LF
+    Byte_Finder marks_;    ///< the same, and quotes where the text has any
+    bool quotes_ = false;  ///< quotes around fields count
+    bool quotes_inside_ = false;
     bool numbers_run_on_ = false;
+    const char* at_;
+    std::string_view window_;
+    std::vector<std::uint32_t> places_;  ///< of the marks in the window
+    std::size_t next_ = 0;
+    std::size_t found_ = 0;
 };
 
 /// The type of a column about which its fields have said nothing yet.
@@ -125,9 +146,9 @@ struct Text_Shape {
 
 constexpr std::int64_t All_Lines = std::numeric_limits<std::int64_t>::max();
 
-/// Finds the shape of `text`. The fields of at most `field_lines` lines are looked at: with fewer
+/// Finds the shape of a text. The fields of at most `field_lines` lines are looked at: with fewer
 /// than all, `columns` and `types` are what those lines say, and columns may stay undecided.
-void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, std::string_view text,
+void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t field_lines = All_Lines);
 
 /// Whether a text of so many bytes may ask for the cells of `shape`. False after a message.
@@ -137,14 +158,14 @@ bool Text_Fits_In_Memory(const Text_Shape& shape, std::size_t bytes);
 /// message; the earlier `Current_Sheet` is back then.
 Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type);
 
-/// Puts the fields of `text` into the Sheet. Undecided columns stay numeric for as long as their
+/// Puts the fields of a text into the Sheet. Undecided columns stay numeric for as long as their
 /// fields are numbers, and become Text with the first that isn't; columns that the scan did not see
 /// are added. False after a message.
-bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options, std::string_view text,
-                     bool tab_file);
+bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
+                     const Text_Buffer& buffer);
 
-/// From the image to the `Current_Sheet`.
-bool Parse_Text_Buffer(std::string_view text, bool tab_file, bool csv_file, bool blank_separated);
+/// From a text in memory to the `Current_Sheet`.
+bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated);
 
 /// What a field says of its column's type: nothing, a number, or text.
 enum class Field_Kind : std::uint8_t { nothing, number, text };

@@ -2,7 +2,6 @@
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "spreadsheet/text/text_format.h"
-#include "support/progress.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -12,49 +11,12 @@ namespace ingester {
 
 namespace {
 
-/// Room behind the text, for line ends and a NUL that the file lacks.
-constexpr std::size_t Image_Slack = 8198;
-constexpr std::size_t Read_Block = std::size_t{16} << 20;
-
-bool Grow_Image(Text_Image& image, std::size_t& room)
-{
-    room *= 2;
-    void* const bytes = Realloc_Checked(image.bytes.get(), room + Image_Slack);
-    if (bytes == nullptr)
-        return false;
-    static_cast<void>(image.bytes.release());
-    image.bytes.reset(static_cast<char*>(bytes));
-    return true;
-}
-
-/// Reads the whole file. Its size is what the system says; a pipe's grows as it comes.
-bool Read_Whole_File(Input_File& file, Text_Image& image)
-{
-    const std::int64_t size = file.Size();
-    auto room = static_cast<std::size_t>(size > 0 ? size : 1 << 20);
-    image.bytes.reset(static_cast<char*>(Alloc_Zeroed(room + Image_Slack)));
-    if (image.bytes == nullptr)
-        return false;
-    for (;;) {
-        if (image.length == room + 1 && !Grow_Image(image, room))
-            return false;
-        // One byte more than the size: where it comes, the file has grown meanwhile.
-        const std::size_t wanted = std::min(room + 1 - image.length, Read_Block);
-        const std::size_t got = file.Read(image.bytes.get() + image.length, wanted);
-        image.length += got;
-        Show_Progress("Loading", file.Position(), size);
-        if (got < wanted)
-            break;
-    }
-    return !file.Failed() || Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
-}
-
 /// A NUL would end the text for everything that reads it; blanks keep the fields in their places.
-void Blank_Out_Nuls(Text_Image& image)
+void Blank_Out_Nuls(File_Image& image)
 {
-    char* const last = image.bytes.get() + image.length;
+    char* const last = image.Bytes() + image.Size();
     long count = 0;
-    for (char* at = image.bytes.get(); at != last; ++at, ++count) {
+    for (char* at = image.Bytes(); at != last; ++at, ++count) {
         at = static_cast<char*>(std::memchr(at, '\0', static_cast<std::size_t>(last - at)));
         if (at == nullptr)
             break;
@@ -67,9 +29,8 @@ void Blank_Out_Nuls(Text_Image& image)
 /// The lines of the loaded file, in order.
 class Line_Source {
 public:
-    explicit Line_Source(const Text_Image& image)
-        : at_(image.bytes.get()), last_(at_ + image.length),
-          has_returns_(image.length > 0 && std::memchr(at_, '\r', image.length) != nullptr)
+    explicit Line_Source(std::string_view text, bool has_returns)
+        : at_(text.data()), last_(at_ + text.size()), has_returns_(has_returns)
     {
     }
 
@@ -138,16 +99,22 @@ Line_Range Range_Of(std::string_view text)
     return range;
 }
 
+bool Is_Title_Line(std::string_view line)
+{
+    return line.size() >= 2 && line.front() == '"' && line.back() == '"';
+}
+
 /// Copies the kept lines to the head of the image; they never outrun the lines still to be read.
 class Line_Keeper {
 public:
-    Line_Keeper(Text_Image& image, bool strip_titles)
-        : image_(image), lines_(image), next_(image.bytes.get()), titles_pending_(strip_titles),
-          start_pending_(!request.Start_Text.empty())
+    Line_Keeper(File_Image& image, const Text_Facts& facts, bool strip_titles)
+        : image_(image), lines_({image.Bytes(), image.Size()}, facts.returns > 0), next_(image.Bytes()),
+          titles_pending_(strip_titles), start_pending_(!request.Start_Text.empty())
     {
     }
 
-    bool Keep(const Line_Range& range);
+    /// The kept lines are `text` then. False after a message.
+    bool Keep(const Line_Range& range, std::string_view& text);
 
 private:
     bool Starts_Data(std::string_view line);
@@ -158,7 +125,7 @@ private:
     void End_Line();
     void Report_Missed_Marks(bool end_found) const;
 
-    Text_Image& image_;
+    File_Image& image_;
     Line_Source lines_;
     char* next_;
     bool titles_pending_;
@@ -174,16 +141,14 @@ bool Line_Keeper::Starts_Data(std::string_view line)
     if (!line.starts_with(request.Start_Text.view()))
         return false;
     start_pending_ = false;
-    next_ = image_.bytes.get();
+    next_ = image_.Bytes();
     content_kept_ = false;
     return true;
 }
 
 bool Line_Keeper::Is_Title(std::string_view line)
 {
-    if (!titles_pending_)
-        return false;
-    titles_pending_ = line.size() >= 2 && line.front() == '"' && line.back() == '"';
+    titles_pending_ = titles_pending_ && Is_Title_Line(line);
     return titles_pending_;
 }
 
@@ -244,7 +209,7 @@ void Line_Keeper::Report_Missed_Marks(bool end_found) const
         Report_Message_Text("Warning: Ending line start text '%s' NOT found.\n", request.End_Text.c_str());
 }
 
-bool Line_Keeper::Keep(const Line_Range& range)
+bool Line_Keeper::Keep(const Line_Range& range, std::string_view& text)
 {
     bool end_found = false;
     std::string_view line;
@@ -269,25 +234,63 @@ bool Line_Keeper::Keep(const Line_Range& range)
     }
     Report_Missed_Marks(end_found);
     if (start_pending_)
-        next_ = image_.bytes.get();
-    image_.length = static_cast<std::size_t>(next_ - image_.bytes.get());
-    *next_ = '\0';
+        next_ = image_.Bytes();
+    text = {image_.Bytes(), static_cast<std::size_t>(next_ - image_.Bytes())};
     return true;
+}
+
+/// Whether every line is kept, but for blank lines and titles at the head, and ends with LF or CR LF.
+bool Stands_As_It_Is(const Line_Range& range, const Text_Facts& facts)
+{
+    return range.first <= 1 && range.last == Line_Range{}.last && request.Start_Text.empty()
+           && request.End_Text.empty() && request.Lines_Per_Record < 2 && facts.returns == facts.return_feeds
+           && facts.longest_line <= Greatest_Line;
+}
+
+/// The text without its leading blank lines and titles, ended by LF.
+void Cut_Head(File_Image& image, bool strip_titles, Text_Buffer& buffer)
+{
+    buffer.text = {image.Bytes(), image.Size()};
+    if (buffer.text.back() != '\n') {
+        image.Bytes()[image.Size()] = '\n';
+        buffer.text = {image.Bytes(), image.Size() + 1};
+        ++buffer.facts.line_feeds;
+    }
+    while (!buffer.text.empty()) {
+        const std::size_t end = buffer.text.find('\n');
+        std::string_view line = buffer.text.substr(0, end);
+        if (line.ends_with('\r'))
+            line.remove_suffix(1);
+        strip_titles = strip_titles && Is_Title_Line(line);
+        if (!line.empty() && !strip_titles)
+            break;
+        buffer.text.remove_prefix(end + 1);
+        --buffer.facts.line_feeds;
+    }
 }
 
 }  // namespace
 
-bool Load_Text_Image(Input_File& file, bool strip_titles, Text_Image& image)
+bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer)
 {
     const Line_Range range = Range_Of(request.Cell_Range);
     if (range.first > range.last)
         return Fail("Error: First line > Last line in cell range.\n");
-    if (!Read_Whole_File(file, image))
-        return false;
-    if (image.length == 0)
+    if (!image.Load(file))
+        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+    if (image.Size() == 0)
         return true;
-    Blank_Out_Nuls(image);
-    return Line_Keeper(image, strip_titles).Keep(range);
+    buffer.facts = Look_At_Text({image.Bytes(), image.Size()});
+    if (buffer.facts.nuls)
+        Blank_Out_Nuls(image);
+    if (Stands_As_It_Is(range, buffer.facts)) {
+        Cut_Head(image, strip_titles, buffer);
+        return true;
+    }
+    if (!Line_Keeper(image, buffer.facts, strip_titles).Keep(range, buffer.text))
+        return false;
+    buffer.facts = Look_At_Text(buffer.text);
+    return true;
 }
 
 bool Next_Text_Line(std::string_view text, std::string_view& line, bool& has_end)

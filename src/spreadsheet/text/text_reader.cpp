@@ -5,8 +5,6 @@
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
 
-#include <cstring>
-
 namespace ingester {
 
 namespace {
@@ -29,12 +27,7 @@ Text_Scan_Options Options_Of_Settings()
     return options;
 }
 
-bool Holds(std::string_view text, char c)
-{
-    return std::memchr(text.data(), c, text.size()) != nullptr;
-}
-
-std::string_view Separators_Of(std::string_view text, bool tab_file, bool csv_file, bool blank_separated)
+std::string_view Separators_Of(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated)
 {
     if (csv_file)
         return request.Custom_Separators.empty() ? std::string_view(",") : request.Custom_Separators.view();
@@ -42,9 +35,9 @@ std::string_view Separators_Of(std::string_view text, bool tab_file, bool csv_fi
         return "\t";
     if (blank_separated)
         return " ";
-    if (Holds(text, '\t'))
+    if (buffer.facts.tabs)
         return "\t";
-    return Holds(text, ',') || Holds(text, ';') ? ",;" : "";
+    return buffer.facts.commas || buffer.text.find(';') != std::string_view::npos ? ",;" : "";
 }
 
 /// One trailing mark of a name has done its work when the types are set.
@@ -61,18 +54,18 @@ void Cut_Type_Marks(Sheet& sheet)
 
 }  // namespace
 
-bool Parse_Text_Buffer(std::string_view text, bool tab_file, bool csv_file, bool blank_separated)
+bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated)
 {
     Text_Scan_Options options = Options_Of_Settings();
-    options.separators = Separators_Of(text, tab_file, csv_file, blank_separated);
+    options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
     options.separators_given = !options.separators.empty();
     Text_Shape shape;
-    Scan_Text_Dimensions(shape, options, text, Sampled_Lines);
+    Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines);
     if (shape.columns < 1 || shape.rows - (shape.has_names ? 1 : 0) < 1
-        || !Text_Fits_In_Memory(shape, text.size()))
+        || !Text_Fits_In_Memory(shape, buffer.text.size()))
         return false;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);
-    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, text, tab_file))
+    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer))
         return false;
     Cut_Type_Marks(*sheet);
     Make_Column_Names_Unique(sheet);
@@ -85,16 +78,21 @@ bool Read_CSV(Input_File& file)
     bool tab_file = Ends_Ignoring_Case(file.Name(), ".tab");
     const bool strip_titles = !csv_file && !tab_file;
     bool blank_separated = false;
-    Text_Image image;
-    if (!Load_Text_Image(file, strip_titles, image) || image.length == 0)
+    File_Image image;
+    Text_Buffer buffer;
+    if (!Load_Text_Image(file, strip_titles, image, buffer) || buffer.text.empty())
         return false;
     if (!request.Custom_Separators.empty())
         csv_file = true;
-    else if (strip_titles && !Holds(image.Text(), '\t') && !Holds(image.Text(), ','))
+    else if (strip_titles && !buffer.facts.tabs && !buffer.facts.commas)
         blank_separated = true;
-    else if (Holds(image.Text(), '\t'))
+    else if (buffer.facts.tabs)
         tab_file = true;
-    return Parse_Text_Buffer(image.Text(), tab_file, csv_file, blank_separated);
+    if (!Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated))
+        return false;
+    if (image.Changed())
+        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+    return true;
 }
 
 bool Read_CSV_File(const char* file_name)

@@ -4,7 +4,8 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <cstring>
+#include <string>
+#include <vector>
 
 namespace ingester {
 
@@ -20,7 +21,7 @@ public:
 
     [[nodiscard]] bool Decide(const char* at)
     {
-        for (; *at != '\n' && *at != '\0'; ++at)
+        for (; *at != '\n' && *at != '\r'; ++at)
             if (Says_No(*at))
                 return false;
         return true;
@@ -53,19 +54,23 @@ bool Is_Blank_Line(std::string_view line)
     return std::all_of(line.begin(), line.end(), Is_Blank_Or_Control);
 }
 
-/// Lines from `at` up to the first empty one; a blank one at the end doesn't count.
-std::int64_t Count_Lines(const char* at, const char* last)
+/// Lines up to the first empty one; a blank one at the end doesn't count.
+std::int64_t Count_Lines(std::string_view text, const Text_Facts& facts)
 {
-    std::int64_t lines = 0;
-    std::string_view line;
-    while (at != last && *at != '\n') {
-        const void* const feed = std::memchr(at, '\n', static_cast<std::size_t>(last - at));
-        const char* const end = feed == nullptr ? last : static_cast<const char*>(feed);
-        line = {at, static_cast<std::size_t>(end - at)};
-        ++lines;
-        at = end == last ? last : end + 1;
+    std::int64_t lines = facts.line_feeds;
+    std::string_view last;
+    if (facts.empty_lines) {
+        lines = 0;
+        while (!text.empty() && text.front() != '\n' && !text.starts_with("\r\n")) {
+            last = text.substr(0, text.find('\n'));
+            text.remove_prefix(last.size() + 1);
+            ++lines;
+        }
+    } else {
+        const std::size_t feed = text.rfind('\n', text.size() - 2);
+        last = feed == std::string_view::npos ? text : text.substr(feed + 1);
     }
-    return lines > 0 && Is_Blank_Line(line) ? lines - 1 : lines;
+    return lines > 0 && Is_Blank_Line(last) ? lines - 1 : lines;
 }
 
 /// What the marks at the end of a name ask for: "!" a Factor, "$" Text, "#" a Variate.
@@ -120,70 +125,69 @@ void Take_Field(std::string_view content, bool quoted, Column_Scan& column)
 }
 
 /// Looks at the fields of one line; `names` when it is the line of names.
-const char* Scan_Line(const Field_Cutter& cutter, const char* at, bool names, Text_Shape& shape)
+void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape)
 {
-    for (std::int32_t index = 0;; ++index) {
-        const Text_Field field = cutter.Cut(at);
-        at = field.last;
+    std::int32_t index = 0;
+    do {
+        const Text_Field field = walker.Next();
         if (index >= request.Max_Columns) {  // no Sheet takes more
-            while (*at != '\n')
-                ++at;
-            break;
+            walker.Skip_Line();
+            return;
         }
         if (index >= shape.columns) {
             shape.columns = index + 1;
             shape.types.emplace_back();
         }
-        Column_Scan& column = shape.types[static_cast<std::size_t>(index)];
-        std::string_view content = cutter.Content(field).substr(0, Scanned_Width);
+        Column_Scan& column = shape.types[static_cast<std::size_t>(index++)];
+        const std::string_view content = walker.Content(field).substr(0, Scanned_Width);
         if (names)
             Take_Name_Mark(Trim_Copy(content), column);
         else
             Take_Field(content, field.quoted, column);
-        if (!cutter.Step_Over_Separator(at))
-            break;
-    }
-    return at;
+    } while (walker.Has_More());
 }
 
-void Take_Wanted_Types(const Field_Cutter& cutter, const char* names, Text_Shape& shape)
+/// The names of the columns, for lists that go by name.
+std::vector<std::string> Names_Of_Line(Field_Walker& walker)
+{
+    std::vector<std::string> names;
+    walker.Go_To(walker.First_Line());
+    do
+        names.emplace_back(Trim_Copy(walker.Content(walker.Next())));
+    while (walker.Has_More());
+    return names;
+}
+
+void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
 {
     if (request.Column_Wanted_Types.empty())
         return;
-    for (std::int32_t index = 0; index < shape.columns; ++index) {
-        std::string_view name;
-        if (names != nullptr && *names != '\n') {
-            const Text_Field field = cutter.Cut(names);
-            name = Trim_Copy(cutter.Content(field));
-            names = field.last;
-            if (!cutter.Step_Over_Separator(names))
-                names = nullptr;
-        }
-        Take_Wanted_Type(index, name, shape.types[static_cast<std::size_t>(index)]);
-    }
+    std::vector<std::string> names;
+    if (shape.has_names)
+        names = Names_Of_Line(walker);
+    names.resize(shape.types.size());
+    for (std::size_t index = 0; index < names.size(); ++index)
+        Take_Wanted_Type(static_cast<std::int32_t>(index), names[index], shape.types[index]);
 }
 
 }  // namespace
 
-void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, std::string_view text,
+void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t field_lines)
 {
-    const Field_Cutter cutter(options);
-    const char* const first = cutter.First_Line(text);
-    const char* const last = text.data() + text.size();
+    Field_Walker walker(options, buffer);
+    const char* const first = walker.First_Line();
+    const char* const last = buffer.text.data() + buffer.text.size();
     shape = Text_Shape{};
     if (first == last)
         return;
     shape.has_names = options.names_mode == names_given
                       || (options.names_mode == names_decided && Names_Decision(options).Decide(first));
-    shape.rows = Count_Lines(first, last);
-    const char* at = first;
-    bool names = shape.has_names;
-    for (std::int64_t line = 0; line < std::min(shape.rows, field_lines); ++line) {
-        at = Scan_Line(cutter, at, names, shape) + 1;
-        names = false;
-    }
-    Take_Wanted_Types(cutter, shape.has_names ? first : nullptr, shape);
+    shape.rows = Count_Lines(buffer.text, buffer.facts) - std::count(buffer.text.data(), first, '\n');
+    walker.Go_To(first);
+    for (std::int64_t line = 0; line < std::min(shape.rows, field_lines); ++line)
+        Scan_Line(walker, line == 0 && shape.has_names, shape);
+    Take_Wanted_Types(walker, shape);
     if (field_lines < shape.rows)
         return;
     for (Column_Scan& column : shape.types)
