@@ -14,11 +14,9 @@
 #include <string>
 #include <system_error>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 std::filesystem::path scratch_folder;
 

@@ -7,8 +7,7 @@
 #include <span>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// An in-memory reader.
 using Fuzz_Entry = bool (*)(Input_File& file);

@@ -5,15 +5,12 @@
 #include <cstdint>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// Collects faults, but no more of them than a reader of the report wants to see.
-class Fault_List
-{
+class Fault_List {
 public:
     void Add(const std::string& where, const std::string& what)
     {

@@ -5,8 +5,7 @@
 
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
 /// What is wrong with `sheet`, one line a fault and at most a few lines; empty when all is well.
 /// Lists are walked no further than their stated length, so broken ones are safe to check.

@@ -8,10 +8,8 @@
 #include <functional>
 #include <string>
 
-namespace ingester
-{
-namespace
-{
+namespace ingester {
+namespace {
 
 constexpr std::int32_t row_count = 3;
 
