@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Feeds a reader with hostile bytes and fails on a finding.
 # Usage: tools/fuzz.sh READER [SECONDS] | --build | --list
+# FUZZ_BUILT=1 says that the targets are built, so that several readers can run at a time.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -13,7 +14,7 @@ build_targets() {
 case ${1:-} in
     --build) build_targets fuzz_readers; exit ;;
     --list) sed -n 's/^fuzz_reader(\([a-z0-9_]*\) .*/\1/p' fuzz/CMakeLists.txt; exit ;;
-    '' | -*) sed -n '2,3s/^# //p' "$0" >&2; exit 2 ;;
+    '' | -*) sed -n '2,4s/^# //p' "$0" >&2; exit 2 ;;
 esac
 
 reader=$1
@@ -22,7 +23,7 @@ if ! tools/fuzz.sh --list | grep -qx -- "$reader"; then
     echo "fuzz: no reader is called '$reader'; there are:" $(tools/fuzz.sh --list) >&2
     exit 2
 fi
-build_targets "fuzz_$reader"
+[[ -n ${FUZZ_BUILT:-} ]] || build_targets "fuzz_$reader"
 
 corpus=build/fuzz/corpus/$reader
 findings=build/fuzz/findings/$reader
