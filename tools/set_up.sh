@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Installs the Debian packages that the given parts of the work need and that are missing.
-# Usage: tools/set_up.sh PART...    parts: build test bench fuzz format tidy
+# Installs the Debian packages that the given kinds of work need and that are missing.
+# Usage: tools/set_up.sh KIND...    kinds: build test bench fuzz format tidy
 set -euo pipefail
 
 # "package" is looked up with dpkg, "package:command" is there when the command is.
@@ -12,14 +12,14 @@ needs_of() {
         fuzz) echo clang:clang++ libclang-rt-dev ;;
         format) echo clang-format:clang-format ;;
         tidy) echo clang-tidy:clang-tidy clang:clang++ ;;
-        *) echo "set_up: no part is called '$1'" >&2; exit 2 ;;
+        *) echo "set_up: no kind is called '$1'" >&2; exit 2 ;;
     esac
 }
 
 needs=()
-for part in "$@"; do
+for kind in "$@"; do
     # shellcheck disable=SC2207  # package names hold no blanks
-    needs+=($(needs_of "$part"))
+    needs+=($(needs_of "$kind"))
 done
 
 missing=()
