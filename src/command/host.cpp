@@ -15,11 +15,9 @@
 #include <string_view>
 #include <vector>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 /// For what can't be asked of the library: among the codes of wrong command lines.
 constexpr int Unusable_Arguments = 105;

@@ -3,8 +3,7 @@
 
 #include "command/options.h"
 
-namespace ingester
-{
+namespace ingester {
 
 /// Runs one conversion. Returns the exit status.
 [[nodiscard]] int Run_Command(const Command_Options& options);

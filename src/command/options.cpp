@@ -2,11 +2,9 @@
 
 #include <CLI/CLI.hpp>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr const char* Description = "Converts a table from one file format to another.\n"
                                     "The input's content decides how it is read, the output's extension how "

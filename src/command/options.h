@@ -4,8 +4,7 @@
 #include <optional>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
 /// The name that stands for standard input or output.
 constexpr const char* Standard_Stream = "-";

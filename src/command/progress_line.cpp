@@ -10,11 +10,9 @@
 #include <cstdio>
 #include <string>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 using Clock = std::chrono::steady_clock;
 

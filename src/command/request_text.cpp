@@ -9,11 +9,9 @@
 #include <cstdint>
 #include <iterator>
 
-namespace ingester
-{
+namespace ingester {
 
-namespace
-{
+namespace {
 
 constexpr std::string_view Url_Starts[] = {"ftp:", "http:", "https:", "file:"};
 

@@ -5,8 +5,7 @@
 #include <string>
 #include <string_view>
 
-namespace ingester
-{
+namespace ingester {
 
 /// One file of a request, by both its names.
 struct Sent_Name {

@@ -21,8 +21,7 @@ constexpr std::size_t Greatest_System_Request = 1 << 30;  // the kernel takes no
 }  // namespace
 
 Input_File::Input_File(std::span<const std::byte> bytes, std::string_view name) : name_(name), memory_(bytes)
-{
-}
+{}
 
 Input_File::~Input_File()
 {

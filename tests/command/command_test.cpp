@@ -17,10 +17,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-namespace ingester
-{
-namespace
-{
+namespace ingester {
+namespace {
 
 namespace fs = std::filesystem;
 
@@ -44,8 +42,7 @@ struct Setting {
     const char* temp_folder = "../temp";
 };
 
-class Command_Test : public testing::Test
-{
+class Command_Test : public testing::Test {
 protected:
     void SetUp() override
     {

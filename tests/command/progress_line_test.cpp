@@ -14,14 +14,11 @@
 #include <poll.h>
 #include <unistd.h>
 
-namespace ingester
-{
-namespace
-{
+namespace ingester {
+namespace {
 
 /// Standard error is a terminal of our own while this lives.
-class Terminal
-{
+class Terminal {
 public:
     Terminal() : master_(::posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK)), before_(::dup(STDERR_FILENO))
     {

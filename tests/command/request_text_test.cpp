@@ -2,10 +2,8 @@
 
 #include <gtest/gtest.h>
 
-namespace ingester
-{
-namespace
-{
+namespace ingester {
+namespace {
 
 TEST(Request_Text, Tells_Options_That_Add_From_Those_That_Look_Like_Them)
 {

@@ -31,8 +31,7 @@ class Line_Source {
 public:
     explicit Line_Source(std::string_view text, bool has_returns)
         : at_(text.data()), last_(at_ + text.size()), has_returns_(has_returns)
-    {
-    }
+    {}
 
     [[nodiscard]] std::int64_t Number() const { return number_; }
 
@@ -110,8 +109,7 @@ public:
     Line_Keeper(File_Image& image, const Text_Facts& facts, bool strip_titles)
         : image_(image), lines_({image.Bytes(), image.Size()}, facts.returns > 0), next_(image.Bytes()),
           titles_pending_(strip_titles), start_pending_(!request.Start_Text.empty())
-    {
-    }
+    {}
 
     /// The kept lines are `text` then. False after a message.
     bool Keep(const Line_Range& range, std::string_view& text);

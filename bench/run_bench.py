@@ -1,0 +1,233 @@
+#!/usr/bin/env python3
+"""Measures the text reader and writer, alone and against the peers that are installed.
+
+Every number is the median of paired runs: ours and a peer's take turns, each in a process of its
+own, and a ratio is the median of the ratios of neighbours. "1.50x" says that the peer took 1.5
+times as long as we did. The inner times are of the calls alone (file to table, table to file),
+without the start of an interpreter or a process; the whole times are of one process that starts,
+reads, writes and ends.
+"""
+
+import argparse
+import os
+import shutil
+import statistics
+import subprocess
+import sys
+import tempfile
+import time
+
+SEED = 1
+
+# kind: rows, columns, and what the ratios of the inner times should reach.
+WORKLOADS = {
+    "numeric": (1_000_000, 10, {"fread": 1.0, "fwrite": 1.0, "read_csv": 3.0}),
+    "mixed": (1_000_000, 8, {"fread": 1.0, "fwrite": 1.0, "read_csv": 2.0}),
+    "wide": (1_000, 10_000, {}),
+    "text": (5_000_000, 1, {}),
+}
+
+# Beyond the image of the file, for numbers.
+GREATEST_BYTES_A_CELL = 26
+
+R_SCRIPT = """
+suppressMessages(library(data.table))
+setDTthreads(1)
+a <- commandArgs(TRUE)
+taken <- function(work) system.time(work)[["elapsed"]]
+r <- taken(d <- fread(a[1], nThread = 1, showProgress = FALSE))
+w <- taken(fwrite(d, a[2], nThread = 1, showProgress = FALSE))
+cat(sprintf("read_seconds %.6f\\nwrite_seconds %.6f\\n", r, w))
+"""
+
+PANDAS_SCRIPT = """
+import sys, time
+import pandas
+start = time.perf_counter()
+table = pandas.read_csv(sys.argv[1], engine="c")
+read = time.perf_counter() - start
+start = time.perf_counter()
+table.to_csv(sys.argv[2], index=False)
+print("read_seconds %.6f\\nwrite_seconds %.6f" % (read, time.perf_counter() - start))
+"""
+
+
+class Peer:
+    """Another program that reads and writes the same files."""
+
+    def __init__(self, name, reads, writes, command, version):
+        self.name, self.reads, self.writes, self.command = name, reads, writes, command
+        self.version = self.find(version)
+
+    def find(self, version):
+        if shutil.which(self.command[0]) is None:
+            return None
+        found = subprocess.run(version, capture_output=True, text=True, check=False)
+        return found.stdout.strip() if found.returncode == 0 else None
+
+
+def find_peers():
+    python = "/usr/bin/python3" if os.path.exists("/usr/bin/python3") else sys.executable
+    return [
+        Peer("data.table, 1 thread", "fread", "fwrite", ["Rscript", "-e", R_SCRIPT],
+             ["Rscript", "-e", "cat(as.character(packageVersion('data.table')))"]),
+        Peer("pandas, C reader", "read_csv", "to_csv", [python, "-c", PANDAS_SCRIPT],
+             [python, "-c", "import pandas; print(pandas.__version__)"]),
+    ]
+
+
+def run(command):
+    """One process: the "name number" lines it prints, its seconds and its peak memory."""
+    start = time.perf_counter()
+    process = subprocess.Popen(command, stdout=subprocess.PIPE, text=True)
+    printed = process.stdout.read()
+    _, status, usage = os.wait4(process.pid, 0)
+    taken = time.perf_counter() - start
+    process.returncode = os.waitstatus_to_exitcode(status)
+    process.stdout.close()
+    if process.returncode != 0:
+        sys.exit("bench: failed with %d: %s" % (process.returncode, " ".join(command)[:200]))
+    result = {"whole_seconds": taken, "whole_peak": usage.ru_maxrss * 1024}
+    for line in printed.splitlines():
+        words = line.split()
+        if len(words) == 2:
+            result[words[0]] = float(words[1])
+    return result
+
+
+def make_data(make, folder, kind, rows, columns):
+    path = os.path.join(folder, "%s-%dx%d-%d.csv" % (kind, rows, columns, SEED))
+    if not os.path.exists(path):
+        os.makedirs(folder, exist_ok=True)
+        subprocess.run([make, kind, str(rows), str(columns), str(SEED), path + ".part"], check=True)
+        os.replace(path + ".part", path)
+    with open(path, "rb") as file:  # so that the first run finds it in memory, as the others do
+        while file.read(1 << 24):
+            pass
+    return path
+
+
+class Measures:
+    """The values of all runs, by name."""
+
+    def __init__(self):
+        self.values = {}
+
+    def add(self, name, value):
+        self.values.setdefault(name, []).append(value)
+
+    def __getitem__(self, name):
+        return statistics.median(self.values[name])
+
+
+def measure(programs, peers, data, out, pairs):
+    """Our runs and each peer's in turn: packed, peer, padded, and the command."""
+    found = Measures()
+
+    def ours(*arguments):
+        result = run(list(arguments))
+        os.remove(out)
+        return result
+
+    for _ in range(pairs):
+        for peer in peers or [None]:
+            packed = ours(programs["time_text"], data, out, "packed")
+            theirs = ours(*peer.command, data, out) if peer else None
+            padded = ours(programs["time_text"], data, out, "padded")
+            command = ours(programs["ingester"], data, out)
+            for name, value in packed.items():
+                found.add(name, value)
+            found.add("padded_seconds", padded["write_seconds"])
+            found.add("command_seconds", command["whole_seconds"])
+            found.add("command_peak", command["whole_peak"])
+            if peer:
+                for name, value in theirs.items():
+                    found.add(peer.name + name, value)
+                for name, above, below in (
+                        ("read", theirs["read_seconds"], packed["read_seconds"]),
+                        ("packed", theirs["write_seconds"], packed["write_seconds"]),
+                        ("padded", theirs["write_seconds"], padded["write_seconds"]),
+                        ("whole", theirs["whole_seconds"], command["whole_seconds"])):
+                    found.add(peer.name + name + "_ratio", above / max(below, 1e-6))
+    return found
+
+
+def goal_text(ratio, goal):
+    if goal is None:
+        return ""
+    return "  (goal %.2gx: %s)" % (goal, "reached" if ratio >= goal else "SHORT")
+
+
+def show(kind, data, peers, found, goals):
+    size = os.path.getsize(data)
+    rows, columns = int(found["rows"]), int(found["columns"])
+    cells = max(rows * columns, 1)
+    print("\n%s: %d rows x %d columns, %.1f MB" % (kind, rows, columns, size / 1e6))
+    print("  ours, inner    read %.3f s (%.0f MB/s)   write packed %.3f s   padded %.3f s"
+          % (found["read_seconds"], size / 1e6 / found["read_seconds"], found["write_seconds"],
+             found["padded_seconds"]))
+    print("  ours, whole    command %.3f s, peak %.1f MB"
+          % (found["command_seconds"], found["command_peak"] / 1e6))
+    read_peak = found["peak_after_read"] - found["resident_before"]
+    beyond = (read_peak - size) / cells
+    note = ""
+    if kind in ("numeric", "wide"):
+        note = "  (goal %d: %s)" % (GREATEST_BYTES_A_CELL,
+                                    "reached" if beyond <= GREATEST_BYTES_A_CELL else "SHORT")
+    print("  ours, memory   peak of the read %.1f MB = the file's image + %.1f bytes a cell%s"
+          % (read_peak / 1e6, beyond, note))
+    print("                 the Sheet itself %.1f bytes a cell; writing adds %.1f MB to the peak"
+          % ((found["resident_after_read"] - found["resident_before"]) / cells,
+             (found["peak_after_write"] - found["peak_after_read"]) / 1e6))
+    for peer in peers:
+        if peer.version is None:
+            print("  %s: skipped: not installed" % peer.name)
+            continue
+        value = lambda name: found[peer.name + name]
+        print("  %s" % peer.name)
+        print("    %-8s     %.3f s   %.2fx%s" % (peer.reads, value("read_seconds"), value("read_ratio"),
+                                              goal_text(value("read_ratio"), goals.get(peer.reads))))
+        for form in ("packed", "padded"):
+            ratio = value(form + "_ratio")
+            print("    %-8s     %.3f s   %.2fx to our %s form%s"
+                  % (peer.writes, value("write_seconds"), ratio, form,
+                     goal_text(ratio, goals.get(peer.writes))))
+        print("    whole        %.3f s   %.2fx to our command, peak %.1f MB"
+              % (value("whole_seconds"), value("whole_ratio"), value("whole_peak") / 1e6))
+    sys.stdout.flush()
+
+
+def main():
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--build", default="build/release", help="folder of the built programs")
+    parser.add_argument("--rows-scale", type=float, default=1.0, help="part of the rows, for a quick run")
+    parser.add_argument("--only", choices=sorted(WORKLOADS), action="append", help="this workload; repeatable")
+    parser.add_argument("--pairs", type=int, default=5, help="paired runs (default %(default)s)")
+    options = parser.parse_args()
+
+    programs = {"make_data": "bench/make_data", "time_text": "bench/time_text", "ingester": "ingester"}
+    programs = {name: os.path.join(options.build, path) for name, path in programs.items()}
+    peers = find_peers()
+    memory_folder = "/dev/shm"
+    out_root = memory_folder if os.access(memory_folder, os.W_OK) else "build/bench"
+    os.makedirs("build/bench", exist_ok=True)
+
+    print("Medians of %d paired runs on %d processors. Input in memory (page cache); all parties write to %s."
+          % (options.pairs, os.cpu_count(), out_root))
+    for peer in peers:
+        print("%s: %s" % (peer.name, peer.version or "skipped: not installed"))
+    with tempfile.TemporaryDirectory(prefix="ingester-bench-", dir=out_root) as folder:
+        for kind in options.only or WORKLOADS:
+            rows, columns, goals = WORKLOADS[kind]
+            rows = max(int(rows * options.rows_scale), 1)
+            data = make_data(programs["make_data"], "build/bench/data", kind, rows, columns)
+            found = measure(programs, [peer for peer in peers if peer.version], data,
+                            os.path.join(folder, "out.csv"), max(options.pairs, 1))
+            if (int(found["rows"]), int(found["columns"])) != (rows, columns):
+                sys.exit("bench: our reader found %d rows x %d columns in %s"
+                         % (found["rows"], found["columns"], data))
+            show(kind, data, peers, found, goals)
+
+
+if __name__ == "__main__":
+    main()

@@ -1,0 +1,86 @@
+// Times one read of delimited text into a Sheet and, if asked, one write of the Sheet as comma
+// text. Prints "name value" lines: seconds, counts and bytes.
+
+#include "interface/process_request.h"
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/sheet.h"
+#include "spreadsheet/text/text.h"
+
+#include <chrono>
+#include <cstdint>
+#include <cstdio>
+#include <string>
+#include <string_view>
+
+namespace {
+
+using namespace ingester;
+
+/// A line of /proc/self/status, as "VmHWM:", in bytes.
+long long Memory_Now(std::string_view wanted)
+{
+    long long kilobytes = -1;
+    if (std::FILE* const status = std::fopen("/proc/self/status", "r")) {
+        char line[256];
+        while (std::fgets(line, sizeof line, status) != nullptr)
+            if (std::string_view(line).starts_with(wanted))
+                std::sscanf(line + wanted.size(), "%lld", &kilobytes);
+        std::fclose(status);
+    }
+    return kilobytes * 1024;
+}
+
+void Print_Memory(const char* moment)
+{
+    std::printf("peak_%s %lld\nresident_%s %lld\n", moment, Memory_Now("VmHWM:"), moment,
+                Memory_Now("VmRSS:"));
+}
+
+/// Runs `work` and prints its seconds; its truth is passed on.
+template <class Work> bool Time(const char* name, Work work)
+{
+    const auto start = std::chrono::steady_clock::now();
+    const bool done = work();
+    const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - start;
+    std::printf("%s %.6f\n", name, taken.count());
+    return done;
+}
+
+}  // namespace
+
+int main(int count, char** arguments)
+{
+    const std::string_view form = count == 4 ? arguments[3] : "packed";
+    if ((count != 2 && count != 4) || (form != "packed" && form != "padded")) {
+        std::fputs("usage: time_text FILE [OUTPUT packed|padded]\n", stderr);
+        return 2;
+    }
+    Start_Request();
+    Print_Memory("before");
+    const bool read = Time("read_seconds", [&] { return Read_CSV_File(arguments[1]); });
+    Print_Memory("after_read");
+    if (!read || Current_Sheet == nullptr) {
+        Close_Message_File();
+        std::fprintf(stderr, "time_text: %s could not be read\n", arguments[1]);
+        return 1;
+    }
+    std::printf("rows %lld\ncolumns %lld\n", static_cast<long long>(Current_Sheet->row_count),
+                static_cast<long long>(Current_Sheet->column_count));
+    if (count == 4) {
+        request.CSV_Output = true;
+        request.Packed_Csv_Output = form == "packed";
+        request.settings.csv_title = 0;
+        Current_Sheet->settings.csv_title = 0;
+        const bool written =
+            Time("write_seconds", [&] { return Write_Text_File(Current_Sheet, arguments[2], false); });
+        Print_Memory("after_write");
+        if (!written) {
+            Close_Message_File();
+            std::fprintf(stderr, "time_text: %s could not be written\n", arguments[2]);
+            return 1;
+        }
+    }
+    Free_Sheets();
+    return 0;
+}
