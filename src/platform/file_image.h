@@ -27,13 +27,18 @@ public:
     [[nodiscard]] std::size_t Size() const { return size_; }
     [[nodiscard]] bool Changed() const;
 
+    /// The bytes in front of `at` are not needed for now: where they can be had from the file again,
+    /// their memory goes. Not for bytes that have been written to.
+    void Release_Before(const char* at);
+
 private:
     [[nodiscard]] bool Map(const Input_File& file);
     [[nodiscard]] bool Read_All(Input_File& file);
 
     char* bytes_ = nullptr;
     std::size_t size_ = 0;
-    std::size_t mapped_ = 0;  ///< length of the mapping; 0: the bytes came from malloc
+    std::size_t mapped_ = 0;    ///< length of the mapping; 0: the bytes came from malloc
+    std::size_t released_ = 0;  ///< bytes given back so far
 };
 
 }  // namespace ingester

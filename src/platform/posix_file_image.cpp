@@ -85,6 +85,17 @@ bool File_Image::Changed() const
     return mapped_ != 0 && watched.lost != 0;
 }
 
+void File_Image::Release_Before(const char* at)
+{
+    if (mapped_ == 0)
+        return;
+    const std::size_t place = static_cast<std::size_t>(at - bytes_) / Page_Size() * Page_Size();
+    if (place <= released_)
+        return;
+    ::madvise(bytes_ + released_, place - released_, MADV_DONTNEED);
+    released_ = place;
+}
+
 /// The file's pages lie over the head of an empty mapping, whose tail is the slack.
 bool File_Image::Map(const Input_File& file)
 {

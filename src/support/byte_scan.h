@@ -26,20 +26,4 @@ private:
     std::string members_;
 };
 
-/// What a text is made of, found in one pass.
-struct Text_Facts {
-    std::int64_t line_feeds = 0;
-    std::int64_t returns = 0;       ///< CR
-    std::int64_t return_feeds = 0;  ///< CR with LF behind it
-    bool empty_lines = false;       ///< LF at the start, or behind another line end
-    bool nuls = false;
-    bool tabs = false;
-    bool commas = false;
-    bool double_quotes = false;
-    bool single_quotes = false;
-    std::size_t longest_line = 0;  ///< from one LF to the next; not told below 64
-};
-
-[[nodiscard]] Text_Facts Look_At_Text(std::string_view text);
-
 }  // namespace ingester

@@ -5,16 +5,16 @@
 #include "support/text.h"
 
 #include <algorithm>
+#include <cstring>
 #include <string>
 
 namespace ingester {
 
 namespace {
 
-constexpr std::string_view Number_Characters = "0123456789+-.eE";
-
 /// Small enough that the window and its places stay in the nearest caches while they are used.
-constexpr std::size_t Window_Size = 1 << 12;
+constexpr std::ptrdiff_t Window_Size = 1 << 12;
+constexpr std::string_view Line_Ends = "\r\n";
 
 bool Is_Blank_Or_Tab(char c)
 {
@@ -24,40 +24,49 @@ bool Is_Blank_Or_Tab(char c)
 }  // namespace
 
 Field_Walker::Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer)
-    : text_(buffer.text), quotes_(options.separators_given), at_(text_.data()), window_(text_.substr(0, 0)),
-      places_(Window_Size)
+    : text_(buffer), quotes_(options.separators_given), at_(buffer.first), window_(buffer.first),
+      window_end_(buffer.first), places_(Window_Size)
 {
-    std::string marks = buffer.facts.returns > 0 ? "\n\r" : "\n";
+    std::string marks = "\n\r";
     marks += options.separators_given ? options.separators.view() : " \t";
-    numbers_run_on_ = marks.find_first_of(Number_Characters) != std::string::npos;
     ends_ = Byte_Finder(marks);
-    const auto add_quote = [&](char quote, bool present) {
-        if (!quotes_ || !present || ends_.Holds(quote))
-            return;
-        marks += quote;
-        quotes_inside_ = true;
-    };
-    add_quote('"', buffer.facts.double_quotes);
-    add_quote('\'', buffer.facts.single_quotes);
+    for (const char quote : {'"', '\''})
+        if (quotes_ && !ends_.Holds(quote))
+            marks += quote;
     marks_ = Byte_Finder(marks);
 }
 
 void Field_Walker::Go_To(const char* at)
 {
     at_ = at;
-    window_ = text_.substr(static_cast<std::size_t>(at - text_.data()), 0);
+    window_ = window_end_ = text_.first + (at - text_.first);
     next_ = found_ = 0;
 }
 
-/// The text ends with LF, so there is always another place until its end has been taken.
+/// The last line is ended like the others, so there is always another place until that is taken.
 void Field_Walker::Look_At_Next_Window()
 {
     do {
-        const auto start = static_cast<std::size_t>(window_.data() + window_.size() - text_.data());
-        window_ = text_.substr(start, Window_Size);
-        found_ = marks_.Find_All(window_, places_.data());
+        window_ = window_end_;
+        window_end_ += std::min(text_.last - window_, Window_Size);
+        const auto size = static_cast<std::size_t>(window_end_ - window_);
+        found_ = marks_.Find_All({window_, size}, places_.data());
     } while (found_ == 0);
     next_ = 0;
+}
+
+/// A NUL would end the text for everything that reads it; a blank keeps the fields in their places.
+void Field_Walker::Blank_Out_Nuls(const Text_Field& field)
+{
+    char* const first = text_.first + (field.first - text_.first);
+    char* const last = first + (field.last - field.first);
+    nuls_ += std::count(first, last, '\0');
+    std::replace(first, last, '\0', ' ');
+}
+
+bool Field_Walker::Is_Blank_Line(const char* line) const
+{
+    return std::all_of(line, at_, Is_Blank_Or_Control);
 }
 
 const char* Field_Walker::Next_Quote(const char* from, char quote)
@@ -66,7 +75,7 @@ const char* Field_Walker::Next_Quote(const char* from, char quote)
     do {
         if (next_ == found_)
             Look_At_Next_Window();
-        mark = window_.data() + places_[next_++];
+        mark = window_ + places_[next_++];
     } while (mark < from || (*mark != quote && *mark != '\n' && *mark != '\r'));
     return mark;
 }
@@ -90,37 +99,43 @@ Text_Field Field_Walker::Next_Quoted()
     }
 }
 
-/// Behind a blank, or the CR of a CR LF, that has been stepped over.
+/// Behind a blank or a CR that has been stepped over. Both may stand in front of the line's end.
 bool Field_Walker::More_Behind(char end)
 {
     while (end == ' ' && *at_ == ' ')
         ++at_;
-    if (*at_ == '\r')
+    const bool at_end = end == '\r' || *at_ == '\r' || *at_ == '\n';
+    if (end != '\r' && *at_ == '\r')
         ++at_;
-    if (*at_ != '\n')
-        return true;
-    ++at_;
-    return false;
+    if (at_end && at_ != text_.last && *at_ == '\n')
+        ++at_;
+    return !at_end;
 }
 
 void Field_Walker::Skip_Line()
 {
-    while (*at_ != '\n')
+    while (*at_ != '\n' && *at_ != '\r')
         at_ = Next_End(at_ + 1);
-    ++at_;
+    static_cast<void>(Has_More());
 }
 
 const char* Field_Walker::First_Line() const
 {
-    std::string_view rest = text_;
-    while (!quotes_ && rest.starts_with('"'))
-        rest.remove_prefix(rest.find('\n') + 1);
-    return rest.data();
+    const char* line = text_.first;
+    while (!quotes_ && line != text_.last && *line == '"') {
+        line = std::find_first_of(line, static_cast<const char*>(text_.last), Line_Ends.begin(),
+                                  Line_Ends.end());
+        while (line != text_.last && Line_Ends.find(*line) != std::string_view::npos)
+            ++line;
+    }
+    return line;
 }
 
-std::string_view Field_Walker::Content(const Text_Field& field) const
+std::string_view Field_Walker::Content(const Text_Field& field)
 {
     std::string_view text(field.first, static_cast<std::size_t>(field.last - field.first));
+    if (text.find('\0') != std::string_view::npos) [[unlikely]]
+        Blank_Out_Nuls(field);
     if (!quotes_)
         return text;
     while (!text.empty() && Is_Blank_Or_Tab(text.front()))
@@ -138,8 +153,7 @@ std::string_view Field_Walker::Content(const Text_Field& field) const
 
 Field_Kind Kind_Of_Field(std::string_view content, bool quoted, double& value)
 {
-    while (!content.empty() && static_cast<unsigned char>(content.back()) <= 32)
-        content.remove_suffix(1);
+    content = Trim_Copy(content);
     value = 0.0;
     const std::string_view missing = request.Missing_Input_Text;
     if (content.empty() || (missing != "*" && Equal_Ignoring_Case(content, missing)))

@@ -1,6 +1,7 @@
 // The fields of a text into the cells of its Sheet.
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "model/cell_appender.h"
 #include "model/cell_text.h"
 #include "model/names.h"
 #include "spreadsheet/text/text_format.h"
@@ -25,80 +26,103 @@ enum class Filling : std::uint8_t {
 
 struct Column_Filling {
     Column* column;
-    Cell_Node* cell;  ///< of the row being filled; null behind the last
+    Cell_Appender cells;
     Filling filling;
     std::int64_t rows_to_redo = 0;  ///< rows filled with numbers before the column became Text
+    Cell_Node* cell_to_redo = nullptr;
 };
+
+constexpr std::int32_t New_Column_Width = 6;
+constexpr std::size_t Line_End_Width = 2;
 
 /// A text of fewer cells than this is never refused; above, most of its cells must be there.
 constexpr std::int64_t Always_Allowed_Cells = 40'000'000;
 constexpr std::int64_t Cells_Per_Byte = 2;
 
-/// A few hostile bytes could ask for any number of cells: a long first line, then short ones.
-bool Cells_Are_Plausible(std::int64_t rows, std::int64_t columns, std::size_t bytes)
-{
-    if (rows * columns <= std::max(Always_Allowed_Cells, Cells_Per_Byte * static_cast<std::int64_t>(bytes)))
-        return true;
-    return Fail("Error: %li rows of %li columns are too many for a text of %li characters.\n",
-                static_cast<long>(rows), static_cast<long>(columns), static_cast<long>(bytes));
-}
-
 class Sheet_Filler {
 public:
-    Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer)
-        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells),
-          text_(buffer.text)
+    Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
+                 File_Image* image)
+        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells), buffer_(buffer),
+          image_(image)
     {
+        missing_.number = sheet.missing_value;
+        empty_.text = Text_Arena::Empty();
+        double number;
+        no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number);
+        const std::int64_t expected = Expected_Rows();
         for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-            Start_Column(column);
+            Start_Column(*column, expected);
+        Limit_Rows();
     }
 
-    bool Fill()
-    {
-        walker_.Go_To(walker_.First_Line());
-        if (shape_.has_names)
-            Fill_Names();
-        const char* const first_row = walker_.Place();
-        if (!Fill_Rows())
-            return false;
-        walker_.Go_To(first_row);
-        Redo_Rows();
-        return true;
-    }
+    bool Fill();
 
 private:
-    void Start_Column(Column* column);
+    [[nodiscard]] std::int64_t Expected_Rows() const;
+    void Limit_Rows();
+    void Start_Column(Column& column, std::int64_t expected);
     void Fill_Names();
     void Name_Column(Column& column, std::string_view text);
     bool Fill_Rows();
-    void Redo_Rows();
+    bool Finish_Rows(const char* last_line);
+    void Report_Oddities() const;
+    void Redo_Rows(const char* first_row);
+    void Redo_Row();
     void Fill_Row();
     void Fill_Number(const Text_Field& field, Column_Filling& state);
     void Fill_Checked(const Text_Field& field, Column_Filling& state);
-    void Fill_Text(const Text_Field& field, Column_Filling& state);
+    void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
+    void Append_Blank(Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
     std::string_view Text_Of(const Text_Field& field, bool& unquoted);
+    void Refuse_Extra_Columns();
     bool Add_Late_Column();
+    bool Row_Is_Acceptable(const char* line);
+    void Tell_Progress();
 
     Sheet& sheet_;
     Text_Shape& shape_;
     Field_Walker walker_;
     bool trim_;
-    std::string_view text_;
+    const Text_Buffer& buffer_;
+    File_Image* image_;
+    Cell_Value missing_;
+    Cell_Value empty_;
     std::vector<Column_Filling> columns_;
     std::int64_t row_ = 0;
+    std::int64_t row_limit_ = 0;
+    const char* told_ = nullptr;  ///< how far progress has been told
     bool columns_full_ = false;
-    bool failed_ = false;
+    bool no_number_is_missing_;  ///< else one does by `Missing_Input_Text`, and all are looked at
     std::string undoubled_;
 };
 
-void Sheet_Filler::Start_Column(Column* column)
+/// By the lines of the sample; where rows turn out to be longer than that, blocks are left unused.
+std::int64_t Sheet_Filler::Expected_Rows() const
+{
+    const auto size = static_cast<double>(buffer_.Text().size());
+    const double by_sample = size / static_cast<double>(shape_.bytes) * static_cast<double>(shape_.rows);
+    const double by_columns = size / shape_.columns;  // a cell takes at least its separator
+    return static_cast<std::int64_t>(std::min(by_sample * 1.02, by_columns)) + 64;
+}
+
+/// A few hostile bytes could ask for any number of cells: a long first line, then short ones.
+void Sheet_Filler::Limit_Rows()
+{
+    const auto bytes = static_cast<std::int64_t>(buffer_.Text().size());
+    const std::int64_t cells = std::max(Always_Allowed_Cells, Cells_Per_Byte * bytes);
+    row_limit_ = std::min<std::int64_t>(cells / static_cast<std::int64_t>(columns_.size()),
+                                        std::numeric_limits<std::int32_t>::max());
+}
+
+void Sheet_Filler::Start_Column(Column& column, std::int64_t expected)
 {
     const Column_Scan& scan = shape_.types[columns_.size()];
-    const Filling filling = Is_Text_Like(column->type)    ? Filling::texts
+    const Filling filling = Is_Text_Like(column.type)     ? Filling::texts
                             : scan.type == Undecided_Type ? Filling::numbers_so_far
                                                           : Filling::numbers;
-    columns_.push_back({column, column->first_cell, filling});
+    columns_.push_back({&column, Cell_Appender(column, expected), filling});
 }
 
 void Sheet_Filler::Name_Column(Column& column, std::string_view text)
@@ -114,7 +138,9 @@ void Sheet_Filler::Fill_Names()
     do {
         bool unquoted;
         const std::string_view name = Text_Of(walker_.Next(), unquoted);
-        if (index < columns_.size() && (!name.empty() || unquoted))
+        if (index >= columns_.size())
+            Refuse_Extra_Columns();
+        else if (!name.empty() || unquoted)
             Name_Column(*columns_[index].column, name);
         ++index;
     } while (walker_.Has_More());
@@ -140,48 +166,43 @@ std::string_view Sheet_Filler::Text_Of(const Text_Field& field, bool& unquoted)
     return trim_ ? Trim_Copy(content) : content;
 }
 
-void Sheet_Filler::Fill_Text(const Text_Field& field, Column_Filling& state)
+void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell)
 {
     bool unquoted;
-    std::string_view content = Text_Of(field, unquoted);
-    if (content.empty())
-        return;
-    if (content.size() >= Long_Field && state.column->type == text_column)
-        state.column->type = long_text_column;
-    if (content == "*" && !unquoted)
-        content = {};
-    Set_Cell_From_Text(*state.column, *state.cell, content);
+    const std::string_view text = Text_Of(field, unquoted);
+    if (text.size() >= Long_Field && column.type == text_column)
+        column.type = long_text_column;
+    if (!text.empty() && (unquoted || text != "*"))
+        Set_Cell_From_Text(column, cell, text);
 }
 
-/// The column's numbers so far are taken back; their text is fetched in a second walk.
+/// The column's numbers so far are taken back; their texts are fetched when all rows are in.
 void Sheet_Filler::Turn_To_Text(Column_Filling& state)
 {
     Column& column = *state.column;
     column.type = text_column;
     column.format = general_format;
     column.decimals = 0;
-    for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
-        cell->value.text = Text_Arena::Empty();
+    for (Cell_Node* cell = &state.cells.Last(); cell != nullptr; cell = cell->prev)
+        cell->value = empty_;
     state.filling = Filling::texts;
     state.rows_to_redo = row_;
-    shape_.types[static_cast<std::size_t>(&state - columns_.data())].type = text_column;
 }
 
-/// A field that is not simply a number up to its separator.
+/// A field that is not simply a number up to its separator; its cell is there, and missing.
 void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 {
     double value;
     switch (Kind_Of_Field(walker_.Content(field), field.quoted, value)) {
     case Field_Kind::number:
-        state.cell->value.number = value;
+        state.cells.Last().value.number = value;
         break;
     case Field_Kind::nothing:
         break;
     case Field_Kind::text:
-        if (state.filling == Filling::numbers_so_far) {
+        if (state.filling == Filling::numbers_so_far)
             Turn_To_Text(state);
-            Fill_Text(field, state);
-        }
+        Fill_Text(field, *state.column, state.cells.Last());
         break;
     }
 }
@@ -190,128 +211,194 @@ void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 inline void Sheet_Filler::Fill_Number(const Text_Field& field, Column_Filling& state)
 {
     const Parsed_Number parsed = Parse_Number_In_Buffer(field.first);
-    if (parsed.end == field.last && parsed.status == Number_Status::good) [[likely]]
-        state.cell->value.number = std::min(parsed.value, Greatest_Number);
-    else
+    if (parsed.end == field.last && parsed.status == Number_Status::good && no_number_is_missing_)
+        [[likely]] {
+        Cell_Value value;
+        value.number = std::min(parsed.value, Greatest_Number);
+        state.cells.Append(value);
+    } else {
+        state.cells.Append(missing_);
         Fill_Checked(field, state);
+    }
 }
 
-/// A line with more fields than any that the scan saw.
+inline void Sheet_Filler::Append_Blank(Column_Filling& state)
+{
+    state.cells.Append(state.filling == Filling::texts ? empty_ : missing_);
+}
+
+void Sheet_Filler::Refuse_Extra_Columns()
+{
+    if (!columns_full_)
+        Report_Message_Long("Maximum number of columns (%li) exceeded.\nIgnoring extra columns.\n",
+                            request.Max_Columns);
+    columns_full_ = true;
+}
+
+/// A line with more fields than any before it. Columns have as many cells as there are rows.
 bool Sheet_Filler::Add_Late_Column()
 {
-    const auto columns = static_cast<std::int64_t>(columns_.size()) + 1;
-    if (columns > request.Max_Columns) {
-        if (!columns_full_)
-            Report_Message_Long("Maximum number of columns (%li) exceeded.\nIgnoring extra columns.\n",
-                                request.Max_Columns);
-        columns_full_ = true;
-        return false;
-    }
-    Column* const column =
-        Cells_Are_Plausible(sheet_.row_count, columns, text_.size())
-            ? New_Data_Column(&sheet_, variate_column,
-                              Default_Column_Name(static_cast<std::int32_t>(columns)), sheet_.row_count)
-            : nullptr;
+    const auto number = static_cast<std::int32_t>(columns_.size()) + 1;
+    Column* const column = New_Data_Column(&sheet_, variate_column, Default_Column_Name(number), 0);
     if (column == nullptr) {
-        failed_ = true;
+        Refuse_Extra_Columns();
         return false;
     }
+    column->width = New_Column_Width;
     shape_.types.emplace_back();
-    shape_.columns = static_cast<std::int32_t>(columns);
-    Start_Column(column);
-    columns_.back().cell = Cell_At(column, static_cast<std::int32_t>(row_));
-    return true;
+    shape_.columns = number;
+    Start_Column(*column, row_ + 64);
+    for (std::int64_t row = 0; row < row_; ++row)
+        columns_.back().cells.Append(missing_);
+    Limit_Rows();
+    return row_ < row_limit_;
 }
 
-/// Columns without a field in this line move on to the next row too.
+/// Columns without a field in this line get a cell too.
 void Sheet_Filler::Fill_Row()
 {
     std::size_t index = 0;
     do {
         if (index == columns_.size() && (columns_full_ || !Add_Late_Column())) [[unlikely]] {
             walker_.Skip_Line();
-            return;
+            break;
         }
         Column_Filling& state = columns_[index++];
-        Cell_Node* const cell = state.cell;
         const Text_Field field = walker_.Next();
-        if (state.filling <= Filling::numbers)
+        if (state.filling != Filling::texts)
             Fill_Number(field, state);
-        else if (state.filling == Filling::texts)
-            Fill_Text(field, state);
-        state.cell = cell->next;
+        else
+            Fill_Text(field, *state.column, state.cells.Append(empty_));
     } while (walker_.Has_More());
     for (; index < columns_.size(); ++index)
-        columns_[index].cell = columns_[index].cell->next;
+        Append_Blank(columns_[index]);
+}
+
+bool Sheet_Filler::Row_Is_Acceptable(const char* line)
+{
+    if (row_ >= row_limit_)
+        return Fail("Error: More than %li rows of %li columns are too many for a text of %li characters.\n",
+                    static_cast<long>(row_limit_), static_cast<long>(columns_.size()),
+                    static_cast<long>(buffer_.Text().size()));
+    if (walker_.Place() - line > static_cast<std::ptrdiff_t>(Greatest_Line + Line_End_Width))
+        return Fail("Error: A line has more than %li characters.\n", static_cast<long>(Greatest_Line));
+    return true;
+}
+
+void Sheet_Filler::Tell_Progress()
+{
+    constexpr std::ptrdiff_t step = std::ptrdiff_t{1} << 22;
+    if (walker_.Place() - told_ < step)
+        return;
+    told_ = walker_.Place();
+    Show_Progress("Reading", told_ - buffer_.first, buffer_.last - buffer_.first);
+    if (image_ != nullptr && walker_.Nuls() == 0)
+        image_->Release_Before(told_);
 }
 
 bool Sheet_Filler::Fill_Rows()
 {
-    constexpr std::ptrdiff_t progress_step = std::ptrdiff_t{1} << 22;
-    const char* told = walker_.Place();
-    for (row_ = 0; row_ < sheet_.row_count && !failed_; ++row_) {
+    const char* line = walker_.Place();
+    told_ = line;
+    for (; walker_.At_Line(); ++row_) {
+        line = walker_.Place();
         Fill_Row();
-        if (walker_.Place() - told >= progress_step) {
-            told = walker_.Place();
-            Show_Progress("Reading", told - text_.data(), static_cast<std::int64_t>(text_.size()));
-        }
+        if (!Row_Is_Acceptable(line))
+            return false;
+        Tell_Progress();
     }
-    return !failed_;
+    return Finish_Rows(line);
+}
+
+/// A blank line at the end is no row.
+bool Sheet_Filler::Finish_Rows(const char* last_line)
+{
+    if (row_ > 0 && walker_.Is_Blank_Line(last_line))
+        --row_;
+    sheet_.row_count = static_cast<std::int32_t>(row_);
+    for (Column_Filling& state : columns_)
+        state.cells.Finish(sheet_.row_count);
+    return Setup_Rows(&sheet_);
+}
+
+void Sheet_Filler::Report_Oddities() const
+{
+    if (walker_.Nuls() > 0)
+        Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", walker_.Nuls());
+    const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
+    if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos)
+        Report_Message_Long(
+            "Warning: An empty line stands behind row %li, and what follows it was not read.\n",
+            sheet_.row_count);
+}
+
+/// One line once more, for the columns whose texts are still wanted.
+void Sheet_Filler::Redo_Row()
+{
+    std::size_t index = 0;
+    do {
+        const Text_Field field = walker_.Next();
+        if (index == columns_.size())
+            continue;
+        Column_Filling& state = columns_[index++];
+        if (row_ >= state.rows_to_redo)
+            continue;
+        Fill_Text(field, *state.column, *state.cell_to_redo);
+    } while (walker_.Has_More());
+    for (Column_Filling& state : columns_)
+        if (row_ < state.rows_to_redo)
+            state.cell_to_redo = state.cell_to_redo->next;
 }
 
 /// Columns that turned into Text late get the texts of their first rows.
-void Sheet_Filler::Redo_Rows()
+void Sheet_Filler::Redo_Rows(const char* first_row)
 {
     std::int64_t rows = 0;
     for (Column_Filling& state : columns_) {
         rows = std::max(rows, state.rows_to_redo);
-        state.filling = state.rows_to_redo > 0 ? Filling::texts : Filling::passed_over;
-        state.cell = state.column->first_cell;
+        state.cell_to_redo = state.column->first_cell;
     }
-    columns_full_ = true;
-    for (row_ = 0; row_ < rows; ++row_) {
-        Fill_Row();
-        for (Column_Filling& state : columns_)
-            if (row_ + 1 == state.rows_to_redo)
-                state.filling = Filling::passed_over;
-    }
+    walker_.Go_To(first_row);
+    for (row_ = 0; row_ < rows; ++row_)
+        Redo_Row();
+}
+
+bool Sheet_Filler::Fill()
+{
+    walker_.Go_To(walker_.First_Line());
+    if (shape_.has_names)
+        Fill_Names();
+    const char* const first_row = walker_.Place();
+    if (!Fill_Rows())
+        return false;
+    Report_Oddities();
+    Redo_Rows(first_row);
+    return true;
 }
 
 }  // namespace
 
 Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type)
 {
-    const std::int64_t rows = shape.rows - (shape.has_names ? 1 : 0);
-    if (rows > std::numeric_limits<std::int32_t>::max()) {
-        Report_Message_Long("Error: %li rows are more than a spreadsheet holds.\n", static_cast<long>(rows));
-        return nullptr;
-    }
     Sheet* const earlier = Current_Sheet;
-    Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(rows));
-    if (sheet == nullptr)
-        return nullptr;
+    Sheet* const sheet = New_Sheet();
     for (std::int32_t index = 0; index < shape.columns; ++index) {
         const std::int32_t type = shape.types[static_cast<std::size_t>(index)].type;
         Column* const column = New_Data_Column(sheet, type == Undecided_Type ? default_type : type,
-                                               Default_Column_Name(index + 1), sheet->row_count);
+                                               Default_Column_Name(index + 1), 0);
         if (column == nullptr) {
             Current_Sheet = earlier;
             return nullptr;
         }
-        column->width = 6;
+        column->width = New_Column_Width;
     }
     return sheet;
 }
 
 bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
-                     const Text_Buffer& buffer)
+                     const Text_Buffer& buffer, File_Image* image)
 {
-    return sheet != nullptr && Sheet_Filler(*sheet, shape, options, buffer).Fill();
-}
-
-bool Text_Fits_In_Memory(const Text_Shape& shape, std::size_t bytes)
-{
-    return Cells_Are_Plausible(shape.rows, shape.columns, bytes);
+    return sheet != nullptr && Sheet_Filler(*sheet, shape, options, buffer, image).Fill();
 }
 
 }  // namespace ingester

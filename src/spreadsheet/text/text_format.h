@@ -17,15 +17,21 @@ namespace ingester {
 /// Longest line, or joined record, in characters.
 constexpr std::size_t Greatest_Line = 262140;
 
-/// The lines of a text in memory, each ended by LF or CR LF, and what is known of it.
+/// The lines of a text in memory, the last one ended like the others. NULs in its fields
+/// become blanks as they are met.
 struct Text_Buffer {
-    std::string_view text;
-    Text_Facts facts;
+    char* first = nullptr;
+    char* last = nullptr;
+
+    [[nodiscard]] std::string_view Text() const { return {first, static_cast<std::size_t>(last - first)}; }
+    [[nodiscard]] bool Holds(char c) const { return Text().find(c) != std::string_view::npos; }
 };
 
 /// Loads the lines that the request's options keep into `image`. `strip_titles` drops the quoted
-/// lines that a text begins with. `buffer` is empty for no lines. False after a message.
-bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer);
+/// lines that a text begins with. `buffer` is empty for no lines; `rewritten` tells that the image
+/// no longer is the file's. False after a message.
+bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
+                     bool& rewritten);
 
 /// Walks a text line by line; CR, LF and CR LF end one. A text given starts a walk, an empty view
 /// with a null pointer goes on. False at the end.
@@ -80,22 +86,30 @@ public:
     [[nodiscard]] bool Has_More()
     {
         const char end = *at_++;
+        if (end == '\n')
+            return false;
         if (end == ' ' || end == '\r') [[unlikely]]
             return More_Behind(end);
-        return end != '\n';
+        return true;
     }
 
     /// Passes over what is left of the line.
     void Skip_Line();
 
-    [[nodiscard]] const char* Place() const { return at_; }
+    /// Whether a line stands here that isn't empty: the first empty one ends a text's rows.
+    [[nodiscard]] bool At_Line() const { return at_ != text_.last && *at_ != '\n' && *at_ != '\r'; }
 
-    /// A digit, point, sign or exponent letter separates fields, so numbers must be cut first.
-    [[nodiscard]] bool Numbers_May_Run_On() const { return numbers_run_on_; }
+    /// Whether the line that starts at `line` and ends here holds nothing but blanks.
+    [[nodiscard]] bool Is_Blank_Line(const char* line) const;
+
+    /// NULs found so far.
+    [[nodiscard]] long Nuls() const { return nuls_; }
+
+    [[nodiscard]] const char* Place() const { return at_; }
 
     /// The field's text as it stands: no outer blanks and tabs, no pair of quotes around it, but
     /// quotes inside still doubled.
-    [[nodiscard]] std::string_view Content(const Text_Field& field) const;
+    [[nodiscard]] std::string_view Content(const Text_Field& field);
 
 private:
     /// The next separator or line end at or behind `from`.
@@ -105,23 +119,24 @@ private:
         do {
             if (next_ == found_) [[unlikely]]
                 Look_At_Next_Window();
-            end = window_.data() + places_[next_++];
-        } while (end < from || (quotes_inside_ && !ends_.Holds(*end)));
+            end = window_ + places_[next_++];
+        } while (end < from || !ends_.Holds(*end));
         return end;
     }
     [[nodiscard]] const char* Next_Quote(const char* from, char quote);
     [[nodiscard]] Text_Field Next_Quoted();
     [[nodiscard]] bool More_Behind(char end);
     void Look_At_Next_Window();
+    void Blank_Out_Nuls(const Text_Field& field);
 
-    std::string_view text_;
-    Byte_Finder ends_;     ///< separators and LF
-    Byte_Finder marks_;    ///< the same, and quotes where the text has any
-    bool quotes_ = false;  ///< quotes around fields count
-    bool quotes_inside_ = false;
-    bool numbers_run_on_ = false;
+    Text_Buffer text_;
+    Byte_Finder ends_;   ///< separators, LF and CR
+    Byte_Finder marks_;  ///< the same, and quotes
+    bool quotes_;        ///< quotes around fields count
+    long nuls_ = 0;
     const char* at_;
-    std::string_view window_;
+    char* window_;
+    char* window_end_;
     std::vector<std::uint32_t> places_;  ///< of the marks in the window
     std::size_t next_ = 0;
     std::size_t found_ = 0;
@@ -136,36 +151,37 @@ struct Column_Scan {
     bool make_factor = false;  ///< marked for a Factor: the final type is negated
 };
 
-/// The shape of a text.
+/// The shape of a text, or of the lines of it that were looked at.
 struct Text_Shape {
     std::int64_t rows = 0;     ///< lines up to the first empty one, the line of names included
     std::int32_t columns = 0;  ///< the most fields in a line
     bool has_names = false;
+    bool whole = false;     ///< every line was looked at
+    std::size_t bytes = 0;  ///< of the lines looked at
     std::vector<Column_Scan> types;
 };
 
 constexpr std::int64_t All_Lines = std::numeric_limits<std::int64_t>::max();
 
-/// Finds the shape of a text. The fields of at most `field_lines` lines are looked at: with fewer
-/// than all, `columns` and `types` are what those lines say, and columns may stay undecided.
+/// Finds the shape of a text by its first `lines` lines. With fewer than all, columns whose type
+/// isn't sure stay undecided.
 void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
-                          std::int64_t field_lines = All_Lines);
+                          std::int64_t lines = All_Lines);
 
-/// Whether a text of so many bytes may ask for the cells of `shape`. False after a message.
-bool Text_Fits_In_Memory(const Text_Shape& shape, std::size_t bytes);
-
-/// Makes the Sheet of a shape: one column a type, undecided ones of `default_type`. Null after a
-/// message; the earlier `Current_Sheet` is back then.
+/// Makes the Sheet of a shape, without rows: one column a type, undecided ones of `default_type`.
+/// Null when it can't be made; the earlier `Current_Sheet` is back then.
 Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type);
 
-/// Puts the fields of a text into the Sheet. Undecided columns stay numeric for as long as their
-/// fields are numbers, and become Text with the first that isn't; columns that the scan did not see
-/// are added. False after a message.
+/// Puts the fields of a text into the Sheet, row by row, up to the first empty line. Undecided
+/// columns stay numeric for as long as their fields are numbers, and become Text with the first that
+/// isn't; columns that the scan did not see are added. `image`, when given, may let go of what has
+/// been read. False after a message, or without rows.
 bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
-                     const Text_Buffer& buffer);
+                     const Text_Buffer& buffer, File_Image* image);
 
 /// From a text in memory to the `Current_Sheet`.
-bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated);
+bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
+                       File_Image* image = nullptr);
 
 /// What a field says of its column's type: nothing, a number, or text.
 enum class Field_Kind : std::uint8_t { nothing, number, text };

@@ -11,26 +11,11 @@ namespace ingester {
 
 namespace {
 
-/// A NUL would end the text for everything that reads it; blanks keep the fields in their places.
-void Blank_Out_Nuls(File_Image& image)
-{
-    char* const last = image.Bytes() + image.Size();
-    long count = 0;
-    for (char* at = image.Bytes(); at != last; ++at, ++count) {
-        at = static_cast<char*>(std::memchr(at, '\0', static_cast<std::size_t>(last - at)));
-        if (at == nullptr)
-            break;
-        *at = ' ';
-    }
-    if (count > 0)
-        Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", count);
-}
-
 /// The lines of the loaded file, in order.
 class Line_Source {
 public:
-    explicit Line_Source(std::string_view text, bool has_returns)
-        : at_(text.data()), last_(at_ + text.size()), has_returns_(has_returns)
+    explicit Line_Source(std::string_view text)
+        : at_(text.data()), last_(at_ + text.size()), has_returns_(text.find('\r') != std::string_view::npos)
     {}
 
     [[nodiscard]] std::int64_t Number() const { return number_; }
@@ -106,20 +91,20 @@ bool Is_Title_Line(std::string_view line)
 /// Copies the kept lines to the head of the image; they never outrun the lines still to be read.
 class Line_Keeper {
 public:
-    Line_Keeper(File_Image& image, const Text_Facts& facts, bool strip_titles)
-        : image_(image), lines_({image.Bytes(), image.Size()}, facts.returns > 0), next_(image.Bytes()),
+    Line_Keeper(File_Image& image, bool strip_titles)
+        : image_(image), lines_(std::string_view(image.Bytes(), image.Size())), next_(image.Bytes()),
           titles_pending_(strip_titles), start_pending_(!request.Start_Text.empty())
     {}
 
-    /// The kept lines are `text` then. False after a message.
-    bool Keep(const Line_Range& range, std::string_view& text);
+    /// The kept lines are in `buffer` then. False after a message.
+    bool Keep(const Line_Range& range, Text_Buffer& buffer);
 
 private:
     bool Starts_Data(std::string_view line);
     bool Is_Title(std::string_view line);
     void Take_Line(std::string_view line);
     void Take_Record(std::string_view line);
-    bool Append_To_Record(std::size_t& length, std::string_view line, bool last);
+    bool Append_To_Record(std::size_t& length, std::string_view line, bool first);
     void End_Line();
     void Report_Missed_Marks(bool end_found) const;
 
@@ -168,20 +153,20 @@ void Line_Keeper::Take_Line(std::string_view line)
     End_Line();
 }
 
-/// Puts a line behind the record, with a "," unless it is the record's last. False when it is full.
-bool Line_Keeper::Append_To_Record(std::size_t& length, std::string_view line, bool last)
+/// Puts a line behind those of the record so far, which end with a "," then. False when it is full.
+bool Line_Keeper::Append_To_Record(std::size_t& length, std::string_view line, bool first)
 {
-    if (!last)
-        while (!line.empty() && (line.back() == ' ' || line.back() == '\t'))
-            line.remove_suffix(1);
+    if (!first) {
+        while (length > 0 && (next_[length - 1] == ' ' || next_[length - 1] == '\t'))
+            --length;
+        if ((length == 0 || next_[length - 1] != ',') && length < Greatest_Line)
+            next_[length++] = ',';
+    }
     const std::size_t taken = std::min(line.size(), Greatest_Line - length);
     std::memmove(next_ + length, line.data(), taken);
     length += taken;
-    if (!last && taken == line.size() && (line.empty() || line.back() != ',') && length < Greatest_Line)
-        next_[length++] = ',';
-    else if (taken < line.size())
-        return Fail("Error: Combined CSV line length > %li.\n", static_cast<long>(Greatest_Line));
-    return true;
+    return taken == line.size()
+           || Fail("Error: Combined CSV line length > %li.\n", static_cast<long>(Greatest_Line));
 }
 
 /// Joins `Lines_Per_Record` lines. Lines of a record that ran full are passed over, so that the
@@ -191,9 +176,8 @@ void Line_Keeper::Take_Record(std::string_view line)
     std::size_t length = 0;
     bool open = true;
     for (std::int32_t i = 1;; ++i) {
-        const bool last = i >= request.Lines_Per_Record;
-        open = open && Append_To_Record(length, line, last);
-        if (last || !lines_.Next(line))
+        open = open && Append_To_Record(length, line, i == 1);
+        if (i >= request.Lines_Per_Record || !lines_.Next(line))
             break;
     }
     Take_Line({next_, length});
@@ -207,7 +191,7 @@ void Line_Keeper::Report_Missed_Marks(bool end_found) const
         Report_Message_Text("Warning: Ending line start text '%s' NOT found.\n", request.End_Text.c_str());
 }
 
-bool Line_Keeper::Keep(const Line_Range& range, std::string_view& text)
+bool Line_Keeper::Keep(const Line_Range& range, Text_Buffer& buffer)
 {
     bool end_found = false;
     std::string_view line;
@@ -233,61 +217,50 @@ bool Line_Keeper::Keep(const Line_Range& range, std::string_view& text)
     Report_Missed_Marks(end_found);
     if (start_pending_)
         next_ = image_.Bytes();
-    text = {image_.Bytes(), static_cast<std::size_t>(next_ - image_.Bytes())};
+    buffer = {image_.Bytes(), next_};
     return true;
 }
 
-/// Whether every line is kept, but for blank lines and titles at the head, and ends with LF or CR LF.
-bool Stands_As_It_Is(const Line_Range& range, const Text_Facts& facts)
+/// Whether every line is kept, but for blank lines and titles at the head.
+bool Keeps_Every_Line(const Line_Range& range)
 {
     return range.first <= 1 && range.last == Line_Range{}.last && request.Start_Text.empty()
-           && request.End_Text.empty() && request.Lines_Per_Record < 2 && facts.returns == facts.return_feeds
-           && facts.longest_line <= Greatest_Line;
+           && request.End_Text.empty() && request.Lines_Per_Record < 2;
 }
 
-/// The text without its leading blank lines and titles, ended by LF.
-void Cut_Head(File_Image& image, bool strip_titles, Text_Buffer& buffer)
+/// The text without its leading blank lines and titles.
+void Cut_Head(const File_Image& image, bool strip_titles, Text_Buffer& buffer)
 {
-    buffer.text = {image.Bytes(), image.Size()};
-    if (buffer.text.back() != '\n') {
-        image.Bytes()[image.Size()] = '\n';
-        buffer.text = {image.Bytes(), image.Size() + 1};
-        ++buffer.facts.line_feeds;
-    }
-    while (!buffer.text.empty()) {
-        const std::size_t end = buffer.text.find('\n');
-        std::string_view line = buffer.text.substr(0, end);
-        if (line.ends_with('\r'))
-            line.remove_suffix(1);
+    buffer = {image.Bytes(), image.Bytes() + image.Size()};
+    if (buffer.last[-1] != '\n' && buffer.last[-1] != '\r')
+        *buffer.last++ = '\n';
+    bool has_end;
+    for (std::string_view line, text = buffer.Text(); Next_Text_Line(text, line, has_end); text = {}) {
         strip_titles = strip_titles && Is_Title_Line(line);
+        buffer.first = image.Bytes() + (line.data() - image.Bytes());
         if (!line.empty() && !strip_titles)
-            break;
-        buffer.text.remove_prefix(end + 1);
-        --buffer.facts.line_feeds;
+            return;
     }
+    buffer.first = buffer.last;
 }
 
 }  // namespace
 
-bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer)
+bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
+                     bool& rewritten)
 {
     const Line_Range range = Range_Of(request.Cell_Range);
+    rewritten = false;
     if (range.first > range.last)
         return Fail("Error: First line > Last line in cell range.\n");
     if (!image.Load(file))
         return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
     if (image.Size() == 0)
         return true;
-    buffer.facts = Look_At_Text({image.Bytes(), image.Size()});
-    if (buffer.facts.nuls)
-        Blank_Out_Nuls(image);
-    if (Stands_As_It_Is(range, buffer.facts)) {
-        Cut_Head(image, strip_titles, buffer);
-        return true;
-    }
-    if (!Line_Keeper(image, buffer.facts, strip_titles).Keep(range, buffer.text))
-        return false;
-    buffer.facts = Look_At_Text(buffer.text);
+    rewritten = !Keeps_Every_Line(range);
+    if (rewritten)
+        return Line_Keeper(image, strip_titles).Keep(range, buffer);
+    Cut_Head(image, strip_titles, buffer);
     return true;
 }
 

@@ -35,9 +35,9 @@ std::string_view Separators_Of(const Text_Buffer& buffer, bool tab_file, bool cs
         return "\t";
     if (blank_separated)
         return " ";
-    if (buffer.facts.tabs)
+    if (buffer.Holds('\t'))
         return "\t";
-    return buffer.facts.commas || buffer.text.find(';') != std::string_view::npos ? ",;" : "";
+    return buffer.Holds(',') || buffer.Holds(';') ? ",;" : "";
 }
 
 /// One trailing mark of a name has done its work when the types are set.
@@ -54,19 +54,22 @@ void Cut_Type_Marks(Sheet& sheet)
 
 }  // namespace
 
-bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated)
+bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
+                       File_Image* image)
 {
     Text_Scan_Options options = Options_Of_Settings();
     options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
     options.separators_given = !options.separators.empty();
     Text_Shape shape;
     Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines);
-    if (shape.columns < 1 || shape.rows - (shape.has_names ? 1 : 0) < 1
-        || !Text_Fits_In_Memory(shape, buffer.text.size()))
+    if (shape.columns < 1 || (shape.whole && shape.rows - (shape.has_names ? 1 : 0) < 1))
         return false;
+    Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);
-    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer))
+    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image)) {
+        Current_Sheet = earlier;
         return false;
+    }
     Cut_Type_Marks(*sheet);
     Make_Column_Names_Unique(sheet);
     return true;
@@ -78,17 +81,18 @@ bool Read_CSV(Input_File& file)
     bool tab_file = Ends_Ignoring_Case(file.Name(), ".tab");
     const bool strip_titles = !csv_file && !tab_file;
     bool blank_separated = false;
+    bool rewritten;
     File_Image image;
     Text_Buffer buffer;
-    if (!Load_Text_Image(file, strip_titles, image, buffer) || buffer.text.empty())
+    if (!Load_Text_Image(file, strip_titles, image, buffer, rewritten) || buffer.Text().empty())
         return false;
     if (!request.Custom_Separators.empty())
         csv_file = true;
-    else if (strip_titles && !buffer.facts.tabs && !buffer.facts.commas)
+    else if (strip_titles && !buffer.Holds('\t') && !buffer.Holds(','))
         blank_separated = true;
-    else if (buffer.facts.tabs)
+    else if (strip_titles && buffer.Holds('\t'))
         tab_file = true;
-    if (!Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated))
+    if (!Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated, rewritten ? nullptr : &image))
         return false;
     if (image.Changed())
         return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());

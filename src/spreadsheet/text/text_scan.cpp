@@ -33,45 +33,28 @@ private:
         if (at_start_ && (Is_Digit(c) || c == '-' || c == '+' || c == '*'))
             return true;
         const bool quote = c == '"' || c == '\'';
-        if (c == '.' || (!options_.separators_given && (c == ',' || c == ';' || c == '|')))
-            return false;
-        if (c == ' ' || c == '\t')
+        if (c == ' ' || c == '\t' || Separates(c))
             at_start_ = true;
-        else if (quote && at_start_ && !options_.separators_given)
-            return false;
-        else
-            at_start_ =
-                options_.separators_given && options_.separators.view().find(c) != std::string_view::npos;
+        else if (quote && at_start_)
+            at_start_ = !options_.separators_given;
+        else if (c != '.' && !Passes_Over(c))
+            at_start_ = false;
         return false;
+    }
+
+    [[nodiscard]] bool Separates(char c) const
+    {
+        return options_.separators_given && options_.separators.view().find(c) != std::string_view::npos;
+    }
+
+    [[nodiscard]] bool Passes_Over(char c) const
+    {
+        return !options_.separators_given && (c == ',' || c == ';' || c == '|');
     }
 
     const Text_Scan_Options& options_;
     bool at_start_ = true;
 };
-
-bool Is_Blank_Line(std::string_view line)
-{
-    return std::all_of(line.begin(), line.end(), Is_Blank_Or_Control);
-}
-
-/// Lines up to the first empty one; a blank one at the end doesn't count.
-std::int64_t Count_Lines(std::string_view text, const Text_Facts& facts)
-{
-    std::int64_t lines = facts.line_feeds;
-    std::string_view last;
-    if (facts.empty_lines) {
-        lines = 0;
-        while (!text.empty() && text.front() != '\n' && !text.starts_with("\r\n")) {
-            last = text.substr(0, text.find('\n'));
-            text.remove_prefix(last.size() + 1);
-            ++lines;
-        }
-    } else {
-        const std::size_t feed = text.rfind('\n', text.size() - 2);
-        last = feed == std::string_view::npos ? text : text.substr(feed + 1);
-    }
-    return lines > 0 && Is_Blank_Line(last) ? lines - 1 : lines;
-}
 
 /// What the marks at the end of a name ask for: "!" a Factor, "$" Text, "#" a Variate.
 void Take_Name_Mark(std::string_view name, Column_Scan& column)
@@ -173,22 +156,27 @@ void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
 }  // namespace
 
 void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
-                          std::int64_t field_lines)
+                          std::int64_t lines)
 {
+    shape = Text_Shape{};
     Field_Walker walker(options, buffer);
     const char* const first = walker.First_Line();
-    const char* const last = buffer.text.data() + buffer.text.size();
-    shape = Text_Shape{};
-    if (first == last)
+    walker.Go_To(first);
+    if (!walker.At_Line())
         return;
     shape.has_names = options.names_mode == names_given
                       || (options.names_mode == names_decided && Names_Decision(options).Decide(first));
-    shape.rows = Count_Lines(buffer.text, buffer.facts) - std::count(buffer.text.data(), first, '\n');
-    walker.Go_To(first);
-    for (std::int64_t line = 0; line < std::min(shape.rows, field_lines); ++line)
-        Scan_Line(walker, line == 0 && shape.has_names, shape);
+    const char* line = first;
+    for (; walker.At_Line() && shape.rows < lines; ++shape.rows) {
+        line = walker.Place();
+        Scan_Line(walker, shape.rows == 0 && shape.has_names, shape);
+    }
+    shape.bytes = static_cast<std::size_t>(walker.Place() - first);
+    shape.whole = !walker.At_Line();
+    if (shape.whole && walker.Is_Blank_Line(line))
+        --shape.rows;
     Take_Wanted_Types(walker, shape);
-    if (field_lines < shape.rows)
+    if (!shape.whole)
         return;
     for (Column_Scan& column : shape.types)
         if (column.type == Undecided_Type)
