@@ -9,26 +9,62 @@
 
 namespace ingester {
 
-void Cell_Appender::Add_Block()
+namespace {
+
+constexpr std::int64_t Least_Block = 64;
+
+/// A block of nodes for `blocks` to own. Throws std::bad_alloc after the message.
+Cell_Node* New_Block(Block_Table& blocks, std::size_t count)
 {
-    constexpr std::int64_t least_size = 64;
-    constexpr auto greatest_size = static_cast<std::int64_t>(Cell_Nodes_Per_Block);
-    const auto size = static_cast<std::size_t>(std::clamp(block_size_, least_size, greatest_size));
-    void* const block = std::malloc(size * sizeof(Cell_Node));
+    void* const block = std::malloc(count * sizeof(Cell_Node));
     if (block == nullptr) {
         Report_Message("Ingester out of memory.\n");
         throw std::bad_alloc();
     }
-    column_->blocks.emplace_back(block);
-    Advise_Large_Pages(block, size * sizeof(Cell_Node));
-    next_ = static_cast<Cell_Node*>(block);
-    block_end_ = next_ + size;
+    blocks.emplace_back(block);
+    Advise_Large_Pages(block, count * sizeof(Cell_Node));
+    return static_cast<Cell_Node*>(block);
+}
+
+}  // namespace
+
+void Cell_Appender::Go_On_In(Cell_Node* nodes, std::size_t count)
+{
+    next_ = nodes;
+    block_end_ = nodes + count;
     if (last_ == nullptr)
-        column_->first_cell = next_;
+        column_->first_cell = nodes;
     else
-        last_->next = next_;
-    appended_ += static_cast<std::int64_t>(size);
+        last_->next = nodes;
+    appended_ += static_cast<std::int64_t>(count);
     block_size_ = appended_;  // the length doubles, so blocks stay few
+}
+
+void Cell_Appender::Add_Block()
+{
+    constexpr auto greatest = static_cast<std::int64_t>(Cell_Nodes_Per_Block);
+    const auto count = static_cast<std::size_t>(std::clamp(block_size_, Least_Block, greatest));
+    Go_On_In(New_Block(column_->blocks, count), count);
+}
+
+std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, std::int64_t expected)
+{
+    constexpr std::int64_t short_column = 20000;
+    constexpr std::int32_t many_columns = 64;
+    std::vector<Cell_Appender> appenders;
+    const auto count = static_cast<std::size_t>(expected);
+    const bool shared = sheet.column_count >= many_columns && expected < short_column;
+    Cell_Node* nodes =
+        shared ? New_Block(sheet.shared_blocks, count * static_cast<std::size_t>(sheet.column_count))
+               : nullptr;
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        appenders.emplace_back(*column, expected);
+        if (shared) {
+            appenders.back().Go_On_In(nodes, count);
+            nodes += count;
+        }
+    }
+    return appenders;
 }
 
 void Cell_Appender::Finish(std::int32_t length)

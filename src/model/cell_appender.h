@@ -3,7 +3,9 @@
 
 #include "model/sheet.h"
 
+#include <cstddef>
 #include <cstdint>
+#include <vector>
 
 namespace ingester {
 
@@ -13,6 +15,9 @@ class Cell_Appender {
 public:
     /// `expected` cells go into the first block; more may come.
     Cell_Appender(Column& column, std::int64_t expected) : column_(&column), block_size_(expected) {}
+
+    /// Puts the next cells into `nodes`, which somebody else owns.
+    void Go_On_In(Cell_Node* nodes, std::size_t count);
 
     /// Throws std::bad_alloc, after the message, when there is no room.
     Cell_Node& Append(Cell_Value value)
@@ -30,6 +35,9 @@ public:
     /// The cell appended last.
     [[nodiscard]] Cell_Node& Last() { return *last_; }
 
+    /// Has the next node brought near.
+    void Prefetch() const { __builtin_prefetch(next_, 1); }
+
     /// Ends the list behind cell number `length`, which is the last one or the one before it.
     void Finish(std::int32_t length);
 
@@ -43,5 +51,9 @@ private:
     Cell_Node* block_end_ = nullptr;
     Cell_Node* last_ = nullptr;
 };
+
+/// Appenders for columns of `expected` cells each. Short columns share one block, so that a wide
+/// sheet lies in few pages.
+[[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, std::int64_t expected);
 
 }  // namespace ingester

@@ -154,6 +154,7 @@ struct Sheet {
     double missing_value = Missing_Value;
     Fixed_Text<32> sheet_name;
     Block_Table row_blocks;
+    Block_Table shared_blocks;  ///< cells of many short columns
 
     Sheet() = default;
     Sheet(const Sheet&) = delete;

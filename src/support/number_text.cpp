@@ -23,9 +23,11 @@ constexpr int Greatest_Exact_Power = static_cast<int>(Exact_Powers.size()) - 1;
 
 /// The decimal digits of a number: value = 0.d1d2d3... * 10^point.
 struct Decimal_Digits {
-    char digits[20];
-    int count;
-    int point;
+    char text[32] = {};  ///< the digits stand at the end of the first half
+    int count = 0;       ///< without the zeros at the end
+    int point = 0;
+
+    [[nodiscard]] const char* Digits(int all) const { return text + sizeof text / 2 - all; }
 };
 
 /// a * b as an unevaluated sum, exact while nothing overflows (Dekker's product).
@@ -55,56 +57,88 @@ std::uint64_t Round_Scaled(double value, int scale)
     return whole;
 }
 
+/// The eight digits of a number below 10^8 as a word, the first in the low byte, each 0 to 9: the
+/// number is halved to fours, pairs and digits, all at once.
+std::uint64_t Spread_Digits(std::uint64_t number)
+{
+    const std::uint64_t fours = number / 10000 | (number % 10000) << 32;
+    const std::uint64_t pair_heads = (fours * 10486 >> 20) & 0x0000007F0000007FU;
+    const std::uint64_t pairs = pair_heads + ((fours - 100 * pair_heads) << 16);
+    const std::uint64_t tens = (pairs * 103 >> 10) & 0x000F000F000F000FU;
+    return tens + ((pairs - 10 * tens) << 8);
+}
+
+constexpr std::uint64_t Eight_Digits = 100000000;
+constexpr std::uint64_t Zero_Characters = 0x3030303030303030U;
+
+/// Sixteen digits with leading zeros; `zeros` gets how many stand at the end.
+void Print_Sixteen_Digits(char* target, std::uint64_t number, int& zeros)
+{
+    const std::uint64_t high = Spread_Digits(number / Eight_Digits);
+    const std::uint64_t low = Spread_Digits(number % Eight_Digits);
+    zeros = low != 0 ? std::countl_zero(low) / 8 : 8 + std::countl_zero(high) / 8;
+    Put_Number<std::uint64_t>(target, high | Zero_Characters);
+    Put_Number<std::uint64_t>(target + 8, low | Zero_Characters);
+}
+
+/// Digits of a positive `value` in front of the decimal point, or one too few, by its power of two.
+int Estimate_Point(double value)
+{
+    const int exponent = static_cast<int>(std::bit_cast<std::uint64_t>(value) >> 52) - 1023;
+    return (exponent * 1233 >> 12) + 1;  // 1233 / 4096 is a little less than log10(2)
+}
+
+constexpr int Most_Quick_Digits = 15;
+
 /// Digits of a positive `value` rounded to `wanted` of them, when doubles can do it exactly.
 bool Round_To_Digits(double value, int wanted, Decimal_Digits& decimal)
 {
-    if (!(value >= 1e-5 && value < 1e15) || wanted > 15)
+    if (!(value >= 1e-5 && value < 1e15) || wanted > Most_Quick_Digits)
         return false;
-    int point = 0;  // digits in front of the decimal point
-    if (value >= 1.0)
-        while (value >= Exact_Powers[static_cast<std::size_t>(point)])
-            ++point;
-    else
-        while (value * Exact_Powers[static_cast<std::size_t>(1 - point)] < 1.0)
-            --point;
-    const int scale = wanted - point;
-    if (scale < 0 || scale > Greatest_Exact_Power)
-        return false;
-    const std::uint64_t rounded = Round_Scaled(value, scale);
-    const auto printed = std::to_chars(decimal.digits, decimal.digits + sizeof decimal.digits, rounded);
-    decimal.count = static_cast<int>(printed.ptr - decimal.digits);
-    decimal.point = decimal.count - scale;
-    return decimal.count == wanted || decimal.count == wanted + 1;
+    int scale = wanted - Estimate_Point(value);
+    const auto limit = static_cast<std::uint64_t>(Exact_Powers[static_cast<std::size_t>(wanted)]);
+    std::uint64_t rounded = 0;
+    for (;; --scale) {
+        if (scale < 0 || scale > Greatest_Exact_Power)
+            return false;
+        rounded = Round_Scaled(value, scale);
+        if (rounded < limit)
+            break;
+    }
+    int zeros;
+    Print_Sixteen_Digits(decimal.text, rounded, zeros);
+    decimal.count = wanted - zeros;
+    decimal.point = wanted - scale;
+    return rounded >= limit / 10;
 }
 
+/// Both write sixteen characters, of which `count` stay: a fixed length is two moves, no call.
 char* Copy_Digits(char* target, const char* digits, int count)
 {
-    std::memcpy(target, digits, static_cast<std::size_t>(count));
+    std::memcpy(target, digits, 16);
     return target + count;
 }
 
 char* Fill_Zeros(char* target, int count)
 {
-    std::memset(target, '0', static_cast<std::size_t>(count));
+    std::memset(target, '0', 16);
     return target + count;
 }
 
-/// Lays digits out without an exponent, trailing zeros gone.
-char* Lay_Out_Plain(char* target, const Decimal_Digits& decimal)
+/// Lays `all` digits out without an exponent, trailing zeros gone.
+char* Lay_Out_Plain(char* target, const Decimal_Digits& decimal, int all)
 {
-    int count = decimal.count;
-    while (count > 1 && decimal.digits[count - 1] == '0')
-        --count;
+    const char* const digits = decimal.Digits(all);
     if (decimal.point <= 0) {
         *target++ = '0';
         *target++ = '.';
-        return Copy_Digits(Fill_Zeros(target, -decimal.point), decimal.digits, count);
+        return Copy_Digits(Fill_Zeros(target, -decimal.point), digits, decimal.count);
     }
-    if (count <= decimal.point)
-        return Fill_Zeros(Copy_Digits(target, decimal.digits, count), decimal.point - count);
-    target = Copy_Digits(target, decimal.digits, decimal.point);
+    if (decimal.count <= decimal.point)
+        return Fill_Zeros(Copy_Digits(target, digits, decimal.count), decimal.point - decimal.count);
+    target = Copy_Digits(target, digits, decimal.point);
     *target++ = '.';
-    return Copy_Digits(target, decimal.digits + decimal.point, count - decimal.point);
+    return Copy_Digits(target, digits + decimal.point, decimal.count - decimal.point);
 }
 
 char* Print_By_Library(char* target, double value, std::chars_format format, int precision)
@@ -295,13 +329,13 @@ char* Print_General(char* target, double value, int digits)
         digits >= 15 ? Plain_Integer_Limit : Exact_Powers[static_cast<std::size_t>(digits)];
     if (Is_Plain_Integer(value, integer_limit))
         return Print_Integer(target, static_cast<std::int64_t>(value));
-    Decimal_Digits decimal;
+    Decimal_Digits decimal{};
     const double size = std::fabs(value);
     // "%g" leaves the plain form below 1e-4; a rounding up to 10^digits would leave it too.
     if (size >= 1e-4 && Round_To_Digits(size, digits, decimal) && decimal.point <= digits) {
         if (value < 0.0)
             *target++ = '-';
-        return Lay_Out_Plain(target, decimal);
+        return Lay_Out_Plain(target, decimal, digits);
     }
     return Print_By_Library(target, value, std::chars_format::general, digits);
 }

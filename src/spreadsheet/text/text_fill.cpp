@@ -34,6 +34,8 @@ struct Column_Filling {
 
 constexpr std::int32_t New_Column_Width = 6;
 constexpr std::size_t Line_End_Width = 2;
+constexpr std::int64_t Spare_Rows = 8;
+constexpr std::size_t Columns_Ahead = 12;
 
 /// A text of fewer cells than this is never refused; above, most of its cells must be there.
 constexpr std::int64_t Always_Allowed_Cells = 40'000'000;
@@ -50,9 +52,11 @@ public:
         empty_.text = Text_Arena::Empty();
         double number;
         no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number);
-        const std::int64_t expected = Expected_Rows();
-        for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-            Start_Column(*column, expected);
+        Column* column = sheet.first_column->next;
+        for (const Cell_Appender& cells : Make_Appenders(sheet, Expected_Rows())) {
+            Start_Column(*column, cells);
+            column = column->next;
+        }
         Limit_Rows();
     }
 
@@ -61,7 +65,7 @@ public:
 private:
     [[nodiscard]] std::int64_t Expected_Rows() const;
     void Limit_Rows();
-    void Start_Column(Column& column, std::int64_t expected);
+    void Start_Column(Column& column, const Cell_Appender& cells);
     void Fill_Names();
     void Name_Column(Column& column, std::string_view text);
     bool Fill_Rows();
@@ -104,7 +108,7 @@ std::int64_t Sheet_Filler::Expected_Rows() const
     const auto size = static_cast<double>(buffer_.Text().size());
     const double by_sample = size / static_cast<double>(shape_.bytes) * static_cast<double>(shape_.rows);
     const double by_columns = size / shape_.columns;  // a cell takes at least its separator
-    return static_cast<std::int64_t>(std::min(by_sample * 1.02, by_columns)) + 64;
+    return static_cast<std::int64_t>(std::min(by_sample * 1.02, by_columns)) + Spare_Rows;
 }
 
 /// A few hostile bytes could ask for any number of cells: a long first line, then short ones.
@@ -116,13 +120,13 @@ void Sheet_Filler::Limit_Rows()
                                         std::numeric_limits<std::int32_t>::max());
 }
 
-void Sheet_Filler::Start_Column(Column& column, std::int64_t expected)
+void Sheet_Filler::Start_Column(Column& column, const Cell_Appender& cells)
 {
     const Column_Scan& scan = shape_.types[columns_.size()];
     const Filling filling = Is_Text_Like(column.type)     ? Filling::texts
                             : scan.type == Undecided_Type ? Filling::numbers_so_far
                                                           : Filling::numbers;
-    columns_.push_back({&column, Cell_Appender(column, expected), filling});
+    columns_.push_back({&column, cells, filling});
 }
 
 void Sheet_Filler::Name_Column(Column& column, std::string_view text)
@@ -247,7 +251,7 @@ bool Sheet_Filler::Add_Late_Column()
     column->width = New_Column_Width;
     shape_.types.emplace_back();
     shape_.columns = number;
-    Start_Column(*column, row_ + 64);
+    Start_Column(*column, Cell_Appender(*column, row_ + Spare_Rows));
     for (std::int64_t row = 0; row < row_; ++row)
         columns_.back().cells.Append(missing_);
     Limit_Rows();
@@ -263,6 +267,8 @@ void Sheet_Filler::Fill_Row()
             walker_.Skip_Line();
             break;
         }
+        if (index + Columns_Ahead < columns_.size())  // in a wide sheet every cell is far from the last
+            columns_[index + Columns_Ahead].cells.Prefetch();
         Column_Filling& state = columns_[index++];
         const Text_Field field = walker_.Next();
         if (state.filling != Filling::texts)
