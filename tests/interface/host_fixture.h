@@ -5,6 +5,7 @@
 #include "support/request_fixture.h"
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <cstdint>
 #include <string>
@@ -55,12 +56,12 @@ protected:
         return std::string(std::getenv("TMPDIR")) + "/" + name;
     }
 
-    /// As a request names it: no slash that could open an option.
+    /// As a request names it: no slash but those of the options in `name`.
     [[nodiscard]] static std::string Request_Name(const std::string& name)
     {
-        std::string path = Path(name);
-        std::ranges::replace(path, '/', '\\');
-        return path;
+        std::string folder = Path("");
+        std::ranges::replace(folder, '/', '\\');
+        return folder + name;
     }
 
     [[nodiscard]] static std::string Stem() { return "IG" + std::to_string(::getpid()); }
