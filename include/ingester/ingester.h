@@ -4,7 +4,8 @@
  * A host leaves a request in the temporary folder (TMPDIR, else TMP, else TEMP, else /tmp), calls
  * INGESTER, and reads the answer from the same folder. With <pid> the number of the calling process:
  *
- *   IG<pid>.inp   the request ("pass file"), written by the host, deleted by the library
+ *   IG<pid>.inp   the request ("pass file"), written by the host, deleted by the library unless it
+ *                 is faulty
  *   IG<pid>.out   the result: a 32-bit status and a 32-bit 0
  *   IG<pid>.ERR   messages for the user; absent when there are none, else closed by a line ":"
  *
@@ -56,7 +57,8 @@ enum ingester_status {
  *
  *   pass_name    of the host's carrier file, used only when IG<pid>.inp does not exist: a small file
  *                whose head holds a request id, so that the names above become IG<ID>.tmp,
- *                IG<ID>.out and IG<ID>.ERR with the id in upper-case hexadecimal
+ *                IG<ID>.out and IG<ID>.ERR with the id in upper-case hexadecimal; without an id
+ *                they are ingester.inp, ingester.out and TxtToNum.ERR
  *   result_name  replaces the name of the result file
  *
  * Always returns 0: success or failure is in the result file.

@@ -10,7 +10,7 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <new>
+#include <exception>
 #include <string>
 
 namespace ingester {
@@ -117,13 +117,13 @@ private:
         Input_File file;
         if (!file.Open(files_.pass))
             return Fail("Pass file %s not found./n", files_.pass.c_str());
-        if (!Read_Pass_File(file, asked_))
-            return false;
+        const bool good = Read_Pass_File(file, asked_);
         file.Close();
         if (!asked_.secondary_scratch.empty())
             Delete_File(asked_.secondary_scratch);
-        Delete_File(files_.pass);
-        return true;
+        if (good)
+            Delete_File(files_.pass);
+        return good;
     }
 
     Call_Files files_;
@@ -132,8 +132,8 @@ private:
     Request_Status status_ = Request_Status::no_request;
 };
 
-/// Runs the call with nothing thrown past it: lack of memory is a fault like any other.
-bool Run_Call(const Call_Files& files, Request_Status& status)
+/// Runs the request. Lack of memory is a fault like any other. False when no answer may be given.
+bool Run_Request(const Call_Files& files, Request_Status& status)
 {
     bool answer = true;
     try {
@@ -141,13 +141,23 @@ bool Run_Call(const Call_Files& files, Request_Status& status)
         Ingester_Call call(files);
         answer = call.Run();
         status = Check_Sheet_Name(call.Status());
-    } catch (const std::bad_alloc&) {
-        Free_Sheets();  // room for the words
+    } catch (const std::exception&) {  // no room, or a length beyond what any room could hold
+        Free_Sheets();                 // room for the words
         Report_Message("Error: Not enough memory to read data.\n");
         status = Request_Status::no_data;
     }
     Close_Message_File();
     return answer;
+}
+
+void Run_Call(std::string_view carrier, std::string_view result_name)
+{
+    Call_Files files = Find_Call_Files(Carrier_Name(carrier));
+    if (!result_name.empty())
+        files.result = result_name;
+    Request_Status status = Request_Status::no_request;
+    if (Run_Request(files, status))
+        Write_Result_File(files.result, status);
 }
 
 }  // namespace
@@ -158,11 +168,10 @@ std::int32_t INGESTER(const char* pass_name, const char* result_name, std::int32
                       std::int32_t result_name_length)
 {
     using namespace ingester;
-    Call_Files files = Find_Call_Files(Carrier_Name(Argument_Name(pass_name, pass_name_length)));
-    if (const std::string_view name = Argument_Name(result_name, result_name_length); !name.empty())
-        files.result = name;
-    Request_Status status = Request_Status::no_request;
-    if (Run_Call(files, status))
-        Write_Result_File(files.result, status);
+    try {
+        Run_Call(Argument_Name(pass_name, pass_name_length), Argument_Name(result_name, result_name_length));
+    } catch (const std::exception&) {
+        // silent by design: a host without a result file knows; nothing may be thrown into it
+    }
     return 0;
 }

@@ -211,7 +211,7 @@ std::int64_t Read_Carrier_Id(std::string_view name)
 
 void Write_Result_File(std::string_view name, Request_Status status)
 {
-    Output_File file;
+    Output_File file(Output_File::small_buffer);
     if (!file.Open(name))
         return;  // silent by design: the host sees that there is no result
     file.Write_Little(static_cast<std::int32_t>(status));

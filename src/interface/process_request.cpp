@@ -10,7 +10,10 @@
 #include "model/names.h"
 #include "model/sheet.h"
 #include "platform/folders.h"
+#include "spreadsheet/text/text.h"
 #include "support/text.h"
+
+#include <algorithm>
 
 namespace ingester {
 
@@ -28,9 +31,11 @@ struct Request_Run {
     const Output_Driver* output = nullptr;
 
     /// What was begun and not finished doesn't stay, whatever ended it: an output is complete or
-    /// absent.
+    /// absent. Nor does the copy of a fetched input.
     ~Request_Run()
     {
+        if (downloaded)
+            Delete_File(infile);
         if (writing && (temp_output != outfile || !output_was_there))
             Delete_File(temp_output);
     }
@@ -48,6 +53,32 @@ Request_Status Stop(Request_Status status, const char* words, Arguments... argum
     return status;
 }
 
+/// "/rewrite=n" in the Outfile: no table, but lines joined until they hold n fields.
+struct Reflow_Order {
+    bool asked = false;
+    bool has_number = false;
+    std::int32_t fields = 0;
+};
+
+Reflow_Order Take_Reflow_Order(std::string& outfile)
+{
+    constexpr std::string_view key = "/rewrite=";
+    constexpr long most = 2147483647;
+    Reflow_Order order;
+    const std::size_t at = outfile.find(key);
+    if (at == std::string::npos)
+        return order;
+    const std::size_t number = at + key.size();
+    const std::size_t end = std::min(outfile.find_first_not_of("0123456789", number), outfile.size());
+    order.asked = true;
+    order.has_number = end > number;
+    order.fields = static_cast<std::int32_t>(
+        std::min(Leading_Integer(std::string_view(outfile).substr(number, end - number)), most));
+    outfile.erase(at, end - at);
+    outfile = std::string(Trim_Copy(outfile));
+    return order;
+}
+
 Request_Status Cut_Input_Options(Request_Run& run)
 {
     Cut_Options(Input_Options(), run.infile);
@@ -62,6 +93,35 @@ Request_Status Fetch_Input(Request_Run& run)
                     run.infile.c_str());
     request.Source_Url = source_url;
     return Done;
+}
+
+/// Names that stand for the clipboard, which must not become files on the way.
+constexpr std::string_view Clipboard_Inputs[] = {"clipboard", "clipboard.tab", "clipboard.csv",
+                                                 "clipboard.rda"};
+constexpr std::string_view Clipboard_Output_Start = "clipboard.";
+constexpr std::string_view Clipboard_Output_Extensions[] = {".csv", ".tab", ".txt", ".gen", ".rda"};
+
+Request_Status Stop_At_Clipboard()
+{
+    return Stop(Request_Status::clipboard_failed, "Using the clipboard is not available in this version.\n");
+}
+
+Request_Status Refuse_Clipboard_Input(Request_Run& run)
+{
+    for (const std::string_view name : Clipboard_Inputs)
+        if (Equal_Ignoring_Case(run.infile, name))
+            return Stop_At_Clipboard();
+    return Done;
+}
+
+Request_Status Refuse_Clipboard_Output(Request_Run& run)
+{
+    if (!Starts_Ignoring_Case(run.outfile, Clipboard_Output_Start))
+        return Done;
+    for (const std::string_view extension : Clipboard_Output_Extensions)
+        if (Ends_Ignoring_Case(run.outfile, extension))
+            return Stop_At_Clipboard();
+    return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
 }
 
 Request_Status Find_Source_Base_Name(Request_Run& run)
@@ -166,8 +226,6 @@ Request_Status Read_Input(Request_Run& run)
     const bool good = read != nullptr && read(run.infile.c_str());
     if (!good)
         return Stop(Request_Status::not_imported, "No data could be imported.\n");
-    if (run.downloaded)
-        Delete_File(run.infile);
     if (Current_Sheet == nullptr)
         return Stop(Request_Status::no_data, "Data could not be read from input file.\n");
     return Done;
@@ -194,10 +252,15 @@ Request_Status Note_Source(Request_Run& run)
 Request_Status Name_Temporary_Output(Request_Run& run)
 {
     run.output_was_there = File_Exists(run.outfile);
-    request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there;
+    // A device or a pipe takes the text itself; a rename would put a file in its place.
+    request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there && !Is_Special_File(run.outfile);
     run.temp_output = run.outfile;
-    if (request.Write_Via_Temp && !request.Add_To_Output)
-        run.temp_output = With_Extension(run.outfile, ".$$$");
+    if (!request.Write_Via_Temp || request.Add_To_Output)
+        return Done;
+    run.temp_output = With_Extension(run.outfile, ".$$$");
+    if (Same_File(run.temp_output, run.infile))
+        return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
+    Delete_File(run.temp_output);  // a link of that name would lead the text elsewhere
     return Done;
 }
 
@@ -228,17 +291,38 @@ Request_Status Replace_Old_Output(Request_Run& run)
     return Done;
 }
 
+/// The lines of the input, joined. A fault is told in words alone: the status is always the same.
+Request_Status Reflow_Lines(Request_Run& run, const Reflow_Order& order)
+{
+    if (!order.has_number)
+        return Done;
+    for (const Stage stage : {Fetch_Input, Refuse_Same_File, Name_Temporary_Output})
+        if (const Request_Status status = stage(run); status != Done)
+            return status;
+    run.writing = true;
+    if (!Reflow_Lines_By_Fields(run.infile.c_str(), run.temp_output.c_str(), order.fields)) {
+        Report_Message("Output file not written.\n");
+        return Done;
+    }
+    return Replace_Old_Output(run);
+}
+
 /// Every stage, in the order in which they act; the first that doesn't succeed ends the request.
 constexpr Stage Stages[] = {
-    Cut_Input_Options,     Fetch_Input,
-    Find_Source_Base_Name, Detect_Input,
-    Cut_Output_Options,    Refuse_Missing_Operations,
-    Choose_Output,         Refuse_Same_File,
-    Require_Output_Folder, Read_Input,
-    Drop_Empty_Columns,    Note_Source,
-    Name_Temporary_Output, Drop_Empty_Rows,
-    Write_Output,          Replace_Old_Output,
+    Cut_Input_Options,  Fetch_Input,        Refuse_Clipboard_Input,    Find_Source_Base_Name,
+    Detect_Input,       Cut_Output_Options, Refuse_Missing_Operations, Refuse_Clipboard_Output,
+    Choose_Output,      Refuse_Same_File,   Require_Output_Folder,     Read_Input,
+    Drop_Empty_Columns, Note_Source,        Name_Temporary_Output,     Drop_Empty_Rows,
+    Write_Output,       Replace_Old_Output,
 };
+
+Request_Status Run_Stages(Request_Run& run)
+{
+    for (const Stage stage : Stages)
+        if (const Request_Status status = stage(run); status != Done)
+            return status;
+    return Done;
+}
 
 }  // namespace
 
@@ -258,11 +342,10 @@ Request_Status Process_Request(std::string& infile, std::string& outfile, std::i
     run.outfile = outfile;
     rows = 0;
     Request_Status status = Done;
-    for (const Stage stage : Stages) {
-        status = stage(run);
-        if (status != Done)
-            break;
-    }
+    if (const Reflow_Order order = Take_Reflow_Order(run.outfile); order.asked)
+        status = Reflow_Lines(run, order);
+    else
+        status = Run_Stages(run);
     infile = run.infile;
     outfile = run.outfile;
     if (Current_Sheet != nullptr)

@@ -2,6 +2,7 @@
 
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "platform/folders.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -103,22 +104,27 @@ bool Take_Digits(std::string_view text, std::size_t& at, std::int32_t& number)
     return at > start;
 }
 
-/// "=n" behind a key that may stand alone.
+/// "=n" behind a key that may stand alone; digits without a "=" belong to the name.
 template <auto Flag, auto Number> Taken Take_Flag_And_Number(std::string_view text, std::size_t at)
 {
     request.*Flag = true;
-    at = Behind_Equals(text, at);
-    Take_Digits(text, at, request.*Number);
+    if (!Stands_At(text, at, "="))
+        return at;
+    Take_Digits(text, ++at, request.*Number);
     return at;
 }
 
 // --- Input -------------------------------------------------------------------------------------
 
+/// Without a value the map stands beside the input: its name up to the first option, with ".map".
 Taken Take_Map_File(std::string_view text, std::size_t at)
 {
     request.Qtl_Map_Given = true;
-    if (!Stands_At(text, at, "="))
+    if (!Stands_At(text, at, "=")) {
+        const std::string_view name = Up_To(text, 0, Option_Start).text;
+        request.Qtl_Map_File = With_Extension(Trim_Copy(name), ".map");
         return at;
+    }
     const Option_Value value = Quoted_Or_Bare(text, at + 1, Quotes, Option_Start);
     request.Qtl_Map_File = value.text;
     return value.end;
@@ -190,8 +196,9 @@ Taken Take_Missing_Codes(std::string_view text, std::size_t at)
 Taken Take_Title_Row(std::string_view text, std::size_t at)
 {
     request.Use_Title_Row = true;
-    at = Behind_Equals(text, at);
-    if (Stands_At(text, at, "$")) {
+    if (!Stands_At(text, at, "="))
+        return at;
+    if (Stands_At(text, ++at, "$")) {
         request.Title_Row_Absolute = true;
         ++at;
     }
@@ -201,14 +208,16 @@ Taken Take_Title_Row(std::string_view text, std::size_t at)
 
 template <auto Member> Taken Take_Prefix(std::string_view text, std::size_t at)
 {
-    const Option_Value value = Up_To(text, Behind_Equals(text, at), Option_Start);
+    if (!Stands_At(text, at, "="))
+        return at;
+    const Option_Value value = Up_To(text, at + 1, Option_Start);
     Get_Settings().*Member = value.text;
     return value.end;
 }
 
 Taken Take_Column_Prefix(std::string_view text, std::size_t at)
 {
-    Get_Settings().prefix_given = true;
+    Get_Settings().prefix_given = Stands_At(text, at, "=");
     return Take_Prefix<&Settings::column_prefix>(text, at);
 }
 
@@ -225,7 +234,9 @@ Taken Take_Transpose(std::string_view text, std::size_t at)
 /// One digit, at most 4.
 Taken Take_Text_Number_Mode(std::string_view text, std::size_t at)
 {
-    const std::size_t digit = Behind_Equals(text, at);
+    if (!Stands_At(text, at, "="))
+        return at;
+    const std::size_t digit = at + 1;
     if (!Stands_At(text, digit, "0123456789"))
         return digit;
     request.Text_Number_Mode = std::min(text[digit] - '0', 4);
@@ -359,8 +370,7 @@ std::string_view Take_Key(std::string_view text, std::size_t& at)
 Taken Take_Append(std::string_view text, std::size_t at)
 {
     request.Add_Mode = Add_Modes::append;
-    at = Behind_Equals(text, at);
-    if (Stands_At(text, at, "N")) {
+    if (Stands_At(text, at, "=") && Stands_At(text, ++at, "N")) {
         request.Keep_Sorted = false;
         ++at;
     }
@@ -394,8 +404,9 @@ Taken Take_Source_Key(std::string_view text, std::size_t at)
 Taken Take_Merge(std::string_view text, std::size_t at)
 {
     request.Add_Mode = Add_Modes::merge;
-    at = Behind_Equals(text, at);
-    if (Stands_At(text, at, "0123456789"))
+    if (!Stands_At(text, at, "="))
+        return at;
+    if (Stands_At(text, ++at, "0123456789"))
         request.Merge_Key_Count = text[at++] - '0';
     if (Stands_At(text, at, "U")) {
         request.Unique_Rows = true;

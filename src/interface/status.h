@@ -18,6 +18,7 @@ enum class Request_Status : std::int32_t {
     output_failed = INGESTER_OUTPUT_FAILED,
     no_rows = INGESTER_NO_ROWS,
     inexact_sheet = INGESTER_INEXACT_SHEET,
+    clipboard_failed = INGESTER_CLIPBOARD_FAILED,
     rename_failed = INGESTER_RENAME_FAILED,
     zip_unsupported = INGESTER_ZIP_UNSUPPORTED,
     nothing_selected = INGESTER_NOTHING_SELECTED,

@@ -77,7 +77,10 @@ private:
 /// A file being written through one large buffer. Unless `Close` said true it may be incomplete.
 class Output_File {
 public:
-    Output_File() = default;
+    static constexpr std::size_t large_buffer = std::size_t{1} << 20;
+    static constexpr std::size_t small_buffer = std::size_t{1} << 12;  ///< for a few lines
+
+    explicit Output_File(std::size_t buffer_size = large_buffer) : buffer_size_(buffer_size) {}
     Output_File(const Output_File&) = delete;
     Output_File& operator=(const Output_File&) = delete;
     ~Output_File();
@@ -114,6 +117,7 @@ private:
     int descriptor_ = -1;
     bool owned_ = false;
     bool failed_ = false;
+    std::size_t buffer_size_;
     std::unique_ptr<char[]> buffer_;
     std::size_t used_ = 0;
 };

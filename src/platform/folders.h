@@ -24,11 +24,15 @@ namespace ingester {
 [[nodiscard]] bool File_Exists(std::string_view name);
 [[nodiscard]] bool Folder_Exists(std::string_view name);
 
+/// Something of that name exists that is no file on a disk: a device, a pipe, a socket.
+[[nodiscard]] bool Is_Special_File(std::string_view name);
+
 /// Both names lead to the same existing file.
 [[nodiscard]] bool Same_File(std::string_view a, std::string_view b);
 
-/// False when it could not be deleted; a file that isn't there counts as deleted.
-bool Delete_File(std::string_view name);
+/// False when it could not be deleted; a file that isn't there counts as deleted. Takes no memory, so
+/// that clearing away works when there is none.
+bool Delete_File(std::string_view name) noexcept;
 
 /// Puts `from` in the place of `to` in one step; both on one file system.
 [[nodiscard]] bool Replace_File(std::string_view from, std::string_view to);

@@ -34,9 +34,6 @@ void Remove_On_Signal(std::string_view name);
 
 [[nodiscard]] bool Standard_Error_Is_Terminal();
 
-/// Something of that name exists that is no file on a disk: a device, a pipe, a socket.
-[[nodiscard]] bool Is_Special_File(std::string_view name);
-
 /// Standard input to its end, into a scratch file of that name.
 [[nodiscard]] bool Copy_Standard_Input(std::string_view name);
 

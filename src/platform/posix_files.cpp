@@ -15,7 +15,6 @@ namespace ingester {
 namespace {
 
 constexpr std::size_t Input_Buffer_Size = 1 << 16;
-constexpr std::size_t Output_Buffer_Size = 1 << 20;
 constexpr std::size_t Greatest_System_Request = 1 << 30;  // the kernel takes no more at once
 
 }  // namespace
@@ -160,6 +159,8 @@ bool Input_File::Close()
     if (descriptor_ >= 0)
         ::close(descriptor_);
     descriptor_ = -1;
+    if (memory_.data() != nullptr)
+        position_ = 0;  // nothing is left to read
     memory_ = {};
     return !failed_;
 }
@@ -172,12 +173,14 @@ Output_File::~Output_File()
 
 bool Output_File::Start(int descriptor)
 {
+    if (descriptor_ >= 0 && owned_)
+        ::close(descriptor_);
     descriptor_ = descriptor;
     owned_ = true;
     failed_ = descriptor < 0;
     used_ = 0;
     if (!failed_ && buffer_ == nullptr)
-        buffer_ = std::make_unique_for_overwrite<char[]>(Output_Buffer_Size);
+        buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
     return !failed_;
 }
 
@@ -224,9 +227,9 @@ void Output_File::Write(const void* bytes, std::size_t count)
         failed_ = true;
         return;
     }
-    if (count > Output_Buffer_Size - used_)
+    if (count > buffer_size_ - used_)
         Flush();
-    if (count > Output_Buffer_Size) {
+    if (count > buffer_size_) {
         Write_Directly(static_cast<const char*>(bytes), count);
         return;
     }

@@ -1,6 +1,8 @@
 #include "platform/folders.h"
 
 #include <algorithm>
+#include <array>
+#include <climits>
 #include <cstdlib>
 #include <ctime>
 
@@ -27,9 +29,25 @@ std::string With_Separator(std::string_view name, char separator)
     return text;
 }
 
+/// A native path off the heap. The system takes no longer ones; here they are empty.
+class Stack_Path {
+public:
+    explicit Stack_Path(std::string_view name)
+    {
+        const std::size_t length = name.size() < bytes_.size() ? name.size() : 0;
+        std::replace_copy_if(name.begin(), name.begin() + length, bytes_.begin(), Is_Separator,
+                             Native_Separator);
+        bytes_[length] = '\0';
+    }
+    [[nodiscard]] const char* c_str() const { return bytes_.data(); }
+
+private:
+    std::array<char, PATH_MAX> bytes_;
+};
+
 bool Look_At(std::string_view name, struct stat& facts)
 {
-    return ::stat(Native_Path(name).c_str(), &facts) == 0;
+    return ::stat(Stack_Path(name).c_str(), &facts) == 0;
 }
 
 }  // namespace
@@ -75,6 +93,12 @@ bool Folder_Exists(std::string_view name)
     return Look_At(name, facts) && S_ISDIR(facts.st_mode);
 }
 
+bool Is_Special_File(std::string_view name)
+{
+    struct stat facts;
+    return Look_At(name, facts) && !S_ISREG(facts.st_mode) && !S_ISDIR(facts.st_mode);
+}
+
 bool Same_File(std::string_view a, std::string_view b)
 {
     struct stat facts_a;
@@ -83,9 +107,9 @@ bool Same_File(std::string_view a, std::string_view b)
            && facts_a.st_ino == facts_b.st_ino;
 }
 
-bool Delete_File(std::string_view name)
+bool Delete_File(std::string_view name) noexcept
 {
-    return ::unlink(Native_Path(name).c_str()) == 0 || !File_Exists(name);
+    return ::unlink(Stack_Path(name).c_str()) == 0 || !File_Exists(name);
 }
 
 bool Replace_File(std::string_view from, std::string_view to)

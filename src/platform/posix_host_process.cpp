@@ -17,7 +17,6 @@
 
 #include <dirent.h>
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 namespace ingester {
@@ -155,13 +154,6 @@ void Remove_On_Signal(std::string_view name)
 bool Standard_Error_Is_Terminal()
 {
     return ::isatty(STDERR_FILENO) != 0;
-}
-
-bool Is_Special_File(std::string_view name)
-{
-    struct stat facts;
-    return ::stat(Native_Path(name).c_str(), &facts) == 0 && !S_ISREG(facts.st_mode)
-           && !S_ISDIR(facts.st_mode);
 }
 
 bool Copy_Standard_Input(std::string_view name)

@@ -30,7 +30,7 @@ void Start_Message_File()
 void Report_Message(std::string_view text)
 {
     if (message_file == nullptr) {
-        auto file = std::make_unique<Output_File>();
+        auto file = std::make_unique<Output_File>(Output_File::small_buffer);
         if (!file->Open_Scratch(Message_File_Name()))
             return;  // silent by design: messages have no other way out
         message_file = std::move(file);
