@@ -228,7 +228,7 @@ TEST_F(Pipeline_Test, Lack_Of_Memory_Is_A_Fault_Like_Any_Other)
         const Host_Answer answer = Convert("large.csv", "old.tab");
         return answer.messages.starts_with("Ingester out of memory.\n") ? answer.status : 100;
     });
-    EXPECT_EQ(status, 5);
+    EXPECT_EQ(status, 4);
     EXPECT_EQ(Get("old.tab"), "old");
     EXPECT_EQ(Files(), "large.csv old.tab");
 #endif

@@ -33,7 +33,6 @@ struct Column_Filling {
 };
 
 constexpr std::int32_t New_Column_Width = 6;
-constexpr std::size_t Line_End_Width = 2;
 constexpr std::int64_t Spare_Rows = 8;
 constexpr std::size_t Columns_Ahead = 12;
 
@@ -286,9 +285,8 @@ bool Sheet_Filler::Row_Is_Acceptable(const char* line)
         return Fail("Error: More than %li rows of %li columns are too many for a text of %li characters.\n",
                     static_cast<long>(row_limit_), static_cast<long>(columns_.size()),
                     static_cast<long>(buffer_.Text().size()));
-    if (walker_.Place() - line > static_cast<std::ptrdiff_t>(Greatest_Line + Line_End_Width))
-        return Fail("Error: A line has more than %li characters.\n", static_cast<long>(Greatest_Line));
-    return true;
+    return Line_Is_Short_Enough(line, walker_.Place(),
+                                buffer_.lines_before + (shape_.has_names ? 2 : 1) + row_);
 }
 
 void Sheet_Filler::Tell_Progress()
@@ -298,7 +296,7 @@ void Sheet_Filler::Tell_Progress()
         return;
     told_ = walker_.Place();
     Show_Progress("Reading", told_ - buffer_.first, buffer_.last - buffer_.first);
-    if (image_ != nullptr && walker_.Nuls() == 0)
+    if (image_ != nullptr && shape_.nuls + walker_.Nuls() == 0)
         image_->Release_Before(told_);
 }
 
@@ -329,8 +327,8 @@ bool Sheet_Filler::Finish_Rows(const char* last_line)
 
 void Sheet_Filler::Report_Oddities() const
 {
-    if (walker_.Nuls() > 0)
-        Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", walker_.Nuls());
+    if (const long nuls = shape_.nuls + walker_.Nuls(); nuls > 0)
+        Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", nuls);
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
     if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos)
         Report_Message_Long(

@@ -22,6 +22,7 @@ constexpr std::size_t Greatest_Line = 262140;
 struct Text_Buffer {
     char* first = nullptr;
     char* last = nullptr;
+    std::int64_t lines_before = 0;  ///< lines of the file that were cut off in front
 
     [[nodiscard]] std::string_view Text() const { return {first, static_cast<std::size_t>(last - first)}; }
     [[nodiscard]] bool Holds(char c) const { return Text().find(c) != std::string_view::npos; }
@@ -158,14 +159,19 @@ struct Text_Shape {
     bool has_names = false;
     bool whole = false;     ///< every line was looked at
     std::size_t bytes = 0;  ///< of the lines looked at
+    long nuls = 0;          ///< NULs that became blanks
     std::vector<Column_Scan> types;
 };
 
 constexpr std::int64_t All_Lines = std::numeric_limits<std::int64_t>::max();
 
-/// Finds the shape of a text by its first `lines` lines. With fewer than all, columns whose type
-/// isn't sure stay undecided.
-void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
+/// Whether a line from `line` up to `end`, behind its line end, is of a length that is read; false
+/// after a message that calls it line `number`.
+bool Line_Is_Short_Enough(const char* line, const char* end, std::int64_t number);
+
+/// Finds the shape of a text by its first `lines` lines. False after a message. With fewer than
+/// all, columns whose type isn't sure stay undecided.
+bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t lines = All_Lines);
 
 /// Makes the Sheet of a shape, without rows: one column a type, undecided ones of `default_type`.

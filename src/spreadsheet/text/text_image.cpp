@@ -240,6 +240,7 @@ void Cut_Head(const File_Image& image, bool strip_titles, Text_Buffer& buffer)
         buffer.first = image.Bytes() + (line.data() - image.Bytes());
         if (!line.empty() && !strip_titles)
             return;
+        ++buffer.lines_before;
     }
     buffer.first = buffer.last;
 }

@@ -61,8 +61,8 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
     options.separators_given = !options.separators.empty();
     Text_Shape shape;
-    Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines);
-    if (shape.columns < 1 || (shape.whole && shape.rows - (shape.has_names ? 1 : 0) < 1))
+    if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1
+        || (shape.whole && shape.rows - (shape.has_names ? 1 : 0) < 1))
         return false;
     Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);

@@ -1,4 +1,5 @@
 // The shape of a text: how many rows and columns, whether names come first, what the columns are.
+#include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
@@ -155,7 +156,15 @@ void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
 
 }  // namespace
 
-void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
+bool Line_Is_Short_Enough(const char* line, const char* end, std::int64_t number)
+{
+    constexpr std::ptrdiff_t line_end_width = 2;
+    return end - line <= static_cast<std::ptrdiff_t>(Greatest_Line) + line_end_width
+           || Fail("Error: Line %li has more than %li characters.\n", static_cast<long>(number),
+                   static_cast<long>(Greatest_Line));
+}
+
+bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t lines)
 {
     shape = Text_Shape{};
@@ -163,24 +172,28 @@ void Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, c
     const char* const first = walker.First_Line();
     walker.Go_To(first);
     if (!walker.At_Line())
-        return;
+        return true;
     shape.has_names = options.names_mode == names_given
                       || (options.names_mode == names_decided && Names_Decision(options).Decide(first));
     const char* line = first;
     for (; walker.At_Line() && shape.rows < lines; ++shape.rows) {
         line = walker.Place();
         Scan_Line(walker, shape.rows == 0 && shape.has_names, shape);
+        if (!Line_Is_Short_Enough(line, walker.Place(), buffer.lines_before + shape.rows + 1))
+            return false;
     }
     shape.bytes = static_cast<std::size_t>(walker.Place() - first);
     shape.whole = !walker.At_Line();
     if (shape.whole && walker.Is_Blank_Line(line))
         --shape.rows;
     Take_Wanted_Types(walker, shape);
+    shape.nuls = walker.Nuls();
     if (!shape.whole)
-        return;
+        return true;
     for (Column_Scan& column : shape.types)
         if (column.type == Undecided_Type)
             column.type = variate_column;
+    return true;
 }
 
 }  // namespace ingester
