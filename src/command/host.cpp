@@ -57,6 +57,15 @@ constexpr Status_Sentence Status_Sentences[] = {
     {INGESTER_DOWNLOAD_FAILED, Blamed::input, "the download failed"},
 };
 
+/// Comma text for other programs has no padding between its commas.
+std::string Packed_Option(const Command_Options& options, std::string_view output)
+{
+    constexpr std::string_view packed = "/h";
+    const bool comma_text = Ends_Ignoring_Case(output, ".csv");
+    const bool said = options.padded || options.output_options.find(packed) != std::string::npos;
+    return comma_text && !said ? std::string(packed) : std::string();
+}
+
 /// One conversion, in the names of both sides.
 struct Conversion {
     const Command_Options& options;
@@ -149,8 +158,9 @@ void Write_Text_Record(Output_File& file, std::string_view text)
 bool Write_Pass_File(const Conversion& conversion, const std::string& name)
 {
     const Command_Options& options = conversion.options;
+    const std::string& output = conversion.output.request;
     std::vector<std::string> records = {conversion.input.request + options.input_options,
-                                        conversion.output.request + options.output_options};
+                                        output + options.output_options + Packed_Option(options, output)};
     if (!options.sheet.empty() || !options.range.empty())
         records.push_back(options.sheet);
     if (!options.range.empty())

@@ -23,8 +23,8 @@ constexpr const char* Examples = R"(Examples:
       lines 3 to 40 of the text; the first of them may hold the names
   ingester --in-options '/csv=2/n' long.csv long.tab
       two lines make one record, and no line holds names
-  ingester --in-options '/c=2:4' --out-options '/mv=NA' crops.csv part.csv
-      columns 2 to 4; missing cells are written as NA
+  ingester --in-options '/x=NA' --out-options '/mv=.' field.csv other.csv
+      NA means missing in the input; missing cells are written as a point
 
 Exit status: 0 when the output is complete; 1 to 19 when a request failed, as messages on standard
 error say (6: the output; 7: the table has no rows); above 100 when the command line is wrong.)";
@@ -64,6 +64,7 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
                    "Slash options of the output; folders in values take backslashes")
         ->type_name("TEXT")
         ->check(Check_Slash_Options);
+    app.add_flag("--padded", options.padded, "Comma text with blanks that keep its columns in line");
     app.add_flag("-f,--force", options.force, "Replace an output that exists");
     app.add_flag("-q,--quiet", options.quiet, "Show no progress");
     try {

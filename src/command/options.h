@@ -16,6 +16,7 @@ struct Command_Options {
     std::string range;
     std::string input_options;  ///< in the option language of requests, such as "/csv=2/n"
     std::string output_options;
+    bool padded = false;  ///< comma text keeps its columns under each other
     bool force = false;
     bool quiet = false;
 };

@@ -34,7 +34,8 @@ namespace ingester {
 /// that clearing away works when there is none.
 bool Delete_File(std::string_view name) noexcept;
 
-/// Puts `from` in the place of `to` in one step; both on one file system.
+/// Puts `from` in the place of `to` in one step, with the permissions that `to` had; both on one file
+/// system.
 [[nodiscard]] bool Replace_File(std::string_view from, std::string_view to);
 
 /// The folder part of a request name, with its last separator; empty when there is none.

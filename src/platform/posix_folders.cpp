@@ -114,7 +114,11 @@ bool Delete_File(std::string_view name) noexcept
 
 bool Replace_File(std::string_view from, std::string_view to)
 {
-    return ::rename(Native_Path(from).c_str(), Native_Path(to).c_str()) == 0;
+    const std::string from_path = Native_Path(from);
+    struct stat facts;
+    if (Look_At(to, facts))
+        static_cast<void>(::chmod(from_path.c_str(), facts.st_mode & 07777));  // where that is ours to do
+    return ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
 std::string_view Folder_Of(std::string_view name)
