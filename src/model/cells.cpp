@@ -56,14 +56,18 @@ template <class Node, class Set> std::size_t Alloc_Nodes(std::int64_t count, std
     last = nullptr;
     if (count < 1)
         return 0;
+    const std::size_t blocks_before = blocks.size();
     for (auto left = static_cast<std::size_t>(count); left > 0;) {
         const std::size_t size = std::min(left, per_block);
-        void* const block = std::malloc(size * sizeof(Node));
+        blocks.emplace_back(std::malloc(size * sizeof(Node)));
+        void* const block = blocks.back().get();
         if (block == nullptr) {
+            blocks.resize(blocks_before);
+            first = nullptr;
+            last = nullptr;
             Report_Message("Ingester out of memory.\n");
             return 0;
         }
-        blocks.emplace_back(block);
         Advise_Large_Pages(block, size * sizeof(Node));
         Link_Block(static_cast<Node*>(block), size, first, last, set);
         left -= size;

@@ -68,8 +68,8 @@ enum Node_Kind : std::int32_t {
 
 /// Makes `count` linked nodes for a list of `kind` (a column type, 33, 34, 90 or 91): numbers are
 /// `Missing_Value`, texts empty, or null for 33 and 34. The blocks go behind those of `blocks`.
-/// Returns how many blocks there are then; 0 for a `count` below 1, or after
-/// "Ingester out of memory.\n".
+/// Returns how many blocks there are then; 0 and no nodes for a `count` below 1, or
+/// after "Ingester out of memory.\n".
 std::size_t Alloc_Cell_Nodes(std::int32_t kind, std::int64_t count, Cell_Node*& first, Cell_Node*& last,
                              Block_Table& blocks);
 

@@ -36,14 +36,17 @@ bool Split_Quoted_Suffix(std::string_view name, std::string_view& stem, std::str
     return true;
 }
 
+std::string_view Stem_Of(std::string_view name)
+{
+    return name.substr(0, Bracket_Start(name));
+}
+
 std::int32_t Count_Stem(const Sheet& sheet, std::string_view stem)
 {
     std::int32_t count = 0;
-    for (const Column* column = sheet.first_column; column != nullptr; column = column->next) {
-        const std::string_view name = column->name;
-        if (Equal_Ignoring_Case(name.substr(0, Bracket_Start(name)), stem))
+    for (const Column* column = sheet.first_column; column != nullptr; column = column->next)
+        if (column->type != row_column && Equal_Ignoring_Case(Stem_Of(column->name), stem))
             ++count;
-    }
     return count;
 }
 
@@ -56,8 +59,11 @@ std::string Number_Quoted_Suffix(const Sheet& sheet, Column& column, std::string
         || !Split_Quoted_Suffix(name, stem, text))
         return std::string(name);
     column.extra = text;
-    return Format_Text("%.*s[%li]", static_cast<int>(stem.size()), stem.data(),
-                       static_cast<long>(Count_Stem(sheet, stem)) + 1);
+    // Earlier Columns have valid names, so the stem is compared as it will be.
+    const std::string first = Make_Valid_Name(std::string(stem).append("[1]"));
+    const std::string_view valid_stem = Stem_Of(first);
+    return std::string(valid_stem)
+        .append(Format_Text("[%li]", static_cast<long>(Count_Stem(sheet, valid_stem)) + 1));
 }
 
 void Name_Column(const Sheet& sheet, Column& column, std::string_view name)
@@ -70,7 +76,8 @@ void Name_Column(const Sheet& sheet, Column& column, std::string_view name)
     else if (!Holds_Labels(column.type) && column.type != row_column)
         wanted = Make_Valid_Name(wanted);
     column.name = wanted;
-    Use_Bracket_Text(column);
+    if (column.type != row_column)
+        Use_Bracket_Text(column);
 }
 
 void Set_Column_Defaults(const Sheet& sheet, Column& column)
@@ -232,8 +239,10 @@ bool Fill_Column(Column* column, std::int32_t type, std::int32_t length, std::in
         column->nlevels = nlevels;
     if (length < 1)
         return true;
-    if (Alloc_Cell_Nodes(type, length, column->first_cell, column->last_cell, column->blocks) == 0)
+    if (Alloc_Cell_Nodes(type, length, column->first_cell, column->last_cell, column->blocks) == 0) {
+        column->length = 0;
         return false;
+    }
     if (Is_Text_Like(type)) {
         for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
             Set_Text(*column, *cell, text);
@@ -279,8 +288,6 @@ std::int32_t Level_Value_Width(double value)
 {
     constexpr std::int32_t exponent_width = 12;
     const double size = std::fabs(value);
-    if (size == 0.0)
-        return 1;
     if (size <= 1e-10 || size >= 1e10)
         return exponent_width;
     return static_cast<std::int32_t>(std::max(std::trunc(std::log10(size)), 0.0)) + 1;
@@ -307,19 +314,23 @@ bool Copy_Levels(Column& column, const Column_Request& wanted)
         for (Level_Node* to = column.labels; to != nullptr && from != nullptr;
              to = to->next, from = from->next) {
             to->value.text = column.texts.Store(from->Text());
-            column.width = std::max(column.width, static_cast<std::int32_t>(to->Text().size()));
+            column.label_width = std::max(column.label_width, static_cast<std::int32_t>(to->Text().size()));
         }
-        column.label_width = column.width;
+        column.width = std::max(column.width, column.label_width);
         column.factor_kind = factor_with_labels;
     }
     return true;
 }
 
-/// The column after which, in list order, a Column added at `position` has to stand.
-std::int32_t Target_Index(const Sheet& sheet, std::int32_t position, bool insert_after)
+/// The index that a Column added at `position` gets: data stays behind the leading columns.
+std::int32_t Target_Index(const Sheet& sheet, const Column& column, std::int32_t position, bool insert_after)
 {
-    const std::int32_t first = 1;
-    return std::clamp(insert_after ? position + 1 : position, first, sheet.column_count);
+    const bool leading = Is_Leading(sheet, column.type);
+    const std::int32_t first = leading ? 1 : sheet.leading_columns;
+    const std::int32_t last = leading ? sheet.leading_columns - 1 : sheet.column_count;
+    if (position >= last)
+        return last;
+    return std::max(insert_after ? position + 1 : position, first);
 }
 
 }  // namespace
@@ -336,17 +347,19 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
     Column* const column = New_Column(sheet, type, wanted.name);
     if (column == nullptr)
         return nullptr;
-    const bool units = Is_Units(type);
-    if (!units && (position <= sheet->column_count - 1 || insert_after))
-        Move_Column(sheet, column->index, Target_Index(*sheet, position, insert_after));
+    if (!Is_Units(type))
+        Move_Column(sheet, column->index, Target_Index(*sheet, *column, position, insert_after));
     column->decimals = wanted.decimals;
     column->width = 6;
-    if (sheet->type == symmetric_matrix_sheet && !units)
-        Insert_Rows(sheet, First_Row_Of(*column), 1, false);
+    const bool square = type == symmetric_matrix_column;
+    if (square && !Insert_Rows(sheet, First_Row_Of(*column), 1, false)) {
+        Delete_Column(column, false);
+        return nullptr;
+    }
     if ((type == factor_column && !Copy_Levels(*column, wanted))
         || !Fill_Column(column, type, Cells_For_Rows(*column, sheet->row_count), wanted.nlevels,
                         wanted.fill)) {
-        Delete_Column(column, false);
+        Delete_Column(column, square);
         return nullptr;
     }
     if (sheet->label_state == 0)
@@ -356,15 +369,17 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
 
 namespace {
 
-/// A name as the host tells it from others: 32 characters, with a bracketed suffix beyond them.
-std::string Telling_Part(std::string_view name)
+/// A name as the host tells it from others: 32 characters, and any bracketed suffix apart.
+struct Telling_Parts {
+    std::string_view stem;
+    std::string_view suffix;
+    bool operator==(const Telling_Parts&) const = default;
+};
+
+Telling_Parts Tell_Parts(std::string_view name)
 {
     name = Trim_Copy(name);
-    const std::size_t bracket = Bracket_Start(name);
-    std::string part(name.substr(0, Telling_Width));
-    if (bracket >= Telling_Width && bracket < name.size())
-        part.append(name.substr(bracket));
-    return part;
+    return {Stem_Of(name).substr(0, Telling_Width), name.substr(Bracket_Start(name))};
 }
 
 }  // namespace
@@ -373,9 +388,9 @@ Column* Find_Column(const Sheet* sheet, std::string_view name)
 {
     if (sheet == nullptr)
         return nullptr;
-    const std::string wanted = Telling_Part(name);
+    const Telling_Parts wanted = Tell_Parts(name);
     for (Column* column = sheet->first_column; column != nullptr; column = column->next)
-        if (column->type != row_column && Telling_Part(column->name) == wanted)
+        if (column->type != row_column && Tell_Parts(column->name) == wanted)
             return column;
     return nullptr;
 }
@@ -413,6 +428,8 @@ bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to)
 
 void Number_Matrix_Columns(Sheet* sheet)
 {
+    if (sheet == nullptr)
+        return;
     for (Column* column = sheet->first_column; column != nullptr; column = column->next)
         if (column->type == matrix_column || column->type == symmetric_matrix_column)
             column->name = std::to_string(column->index - sheet->leading_columns + 1);

@@ -342,24 +342,33 @@ std::string Make_Valid_Name(std::string_view name)
 
 namespace {
 
-[[nodiscard]] bool Is_Colon_Mark(char c)
+/// Cuts ":" and one of `marks` off the end of `name`.
+bool Cut_End_Mark(std::string& name, std::string_view marks)
 {
-    return Is_Digit(c) || std::string_view("DdTtEe").find(c) != std::string_view::npos;
+    const std::size_t size = name.size();
+    if (size < 2 || name[size - 2] != ':' || marks.find(name[size - 1]) == std::string_view::npos)
+        return false;
+    name.resize(size - 2);
+    return true;
 }
 
 }  // namespace
 
 std::string Strip_Name_Mark(std::string_view name)
 {
+    constexpr std::string_view marks_anywhere = "DdTt";
+    constexpr std::string_view end_marks = "Ee0123456789";
     std::string stripped;
     for (std::size_t at = 0; at < name.size(); ++at) {
-        if (name[at] == ':' && at + 1 < name.size() && Is_Colon_Mark(name[at + 1]))
-            ++at;
-        else
-            stripped.push_back(name[at]);
+        stripped.push_back(name[at]);
+        if (at > 0 && name[at - 1] == ':' && marks_anywhere.find(name[at]) != std::string_view::npos)
+            stripped.resize(stripped.size() - 2);
     }
+    const bool cut = Cut_End_Mark(stripped, end_marks);
     if (stripped.ends_with('!') || stripped.ends_with('#') || stripped.ends_with('$'))
         stripped.pop_back();
+    if (!cut)
+        Cut_End_Mark(stripped, end_marks);
     return stripped;
 }
 

@@ -37,8 +37,8 @@ void Reset_Name_Counters();
 /// number, and their old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
 void Make_Column_Names_Unique(Sheet* sheet);
 
-/// `name` without its marks: every ":D", ":T", ":E" (in either case) and ":" with a digit, and one "!",
-/// "#" or "$" at the end of what is left.
+/// `name` without its marks: every ":D" and ":T" (in either case), and at the end one "!", "#" or "$" and
+/// one ":E" or ":" with a digit.
 [[nodiscard]] std::string Strip_Name_Mark(std::string_view name);
 
 }  // namespace ingester

@@ -10,7 +10,6 @@ namespace ingester {
 namespace {
 
 constexpr int Default_Digits = 6;  // of "%g", "%e" and "%f"
-constexpr int Most_Digits = 17;
 constexpr int Most_Decimals = 40;
 
 /// "%.{decimals}g" where the digits in front of the point leave room for it, else "%g".
@@ -18,7 +17,7 @@ char* Print_Significant(char* target, double value, std::int32_t decimals)
 {
     const double size = std::fabs(value);
     if (size >= 1e-12 && size <= 1e12 && std::fabs(std::trunc(std::log10(size)) + 1.0) < decimals)
-        return Print_General(target, value, std::clamp(decimals, 1, Most_Digits));
+        return Print_General(target, value, decimals);
     return Print_General(target, value, Default_Digits);
 }
 

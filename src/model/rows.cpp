@@ -1,9 +1,11 @@
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
 #include "model/list.h"
 #include "model/sheet.h"
 #include "support/text.h"
 
 #include <algorithm>
+#include <string>
 #include <utility>
 
 namespace ingester {
@@ -39,8 +41,11 @@ bool Insert_Cells(Column* column, std::int32_t position, std::int32_t count)
         for (Cell_Node* cell = first; cell != nullptr; cell = cell->next)
             cell->value.number = column->sheet->missing_value;
     Link_Before(column->first_cell, column->last_cell, before, first, last);
-    column->length += count;
-    column->cursor_index = -1;
+    const std::int32_t old_length = std::max(column->length, 0);
+    column->length = old_length + count;
+    // The new cells are remembered, so that a sweep of insertions stays linear.
+    column->cursor_node = first;
+    column->cursor_index = std::min(position, old_length);
     return true;
 }
 
@@ -54,8 +59,9 @@ bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count)
     if (Alloc_Row_Nodes(count, first, last, sheet->row_blocks) == 0)
         return false;
     Link_Before(sheet->first_row, sheet->last_row, before, first, last);
+    sheet->cursor_row = first;
+    sheet->cursor_row_index = std::min(position, sheet->row_count);
     sheet->row_count += count;
-    sheet->cursor_row_index = -1;
     return true;
 }
 
@@ -78,7 +84,7 @@ bool Lengthen_Row_Numbers(Sheet& sheet, std::int32_t count)
 bool Insert_Square_Columns(Sheet& sheet, std::int32_t position, std::int32_t count)
 {
     for (std::int32_t i = 0; i < count; ++i) {
-        Column* const column = New_Column(&sheet, symmetric_matrix_column, "");
+        Column* const column = New_Column(&sheet, symmetric_matrix_column, std::to_string(position + i + 1));
         if (column == nullptr
             || !Move_Column(&sheet, column->index,
                             std::min(sheet.leading_columns + position + i, sheet.column_count))
@@ -96,6 +102,9 @@ bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool k
 {
     if (sheet == nullptr || position < 0 || !Insertion_Fits(count))
         return false;
+    const bool square = keep_square && sheet->type == symmetric_matrix_sheet;
+    if (square && (sheet->read_only != 0 || count > request.Max_Columns - sheet->column_count))
+        return false;
     position = std::min(position, sheet->row_count);
     if (!Insert_Row_Nodes(sheet, position, count) || !Lengthen_Row_Numbers(*sheet, count))
         return false;
@@ -107,9 +116,7 @@ bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool k
         if (!Insert_Cells(column, position - first_row, count))
             return false;
     }
-    if (keep_square && sheet->type == symmetric_matrix_sheet)
-        return Insert_Square_Columns(*sheet, position, count);
-    return true;
+    return !square || Insert_Square_Columns(*sheet, position, count);
 }
 
 bool Remove_Cell(Column* column, std::int32_t index)

@@ -4,6 +4,7 @@
 #include "model/list.h"
 #include "model/names.h"
 
+#include <algorithm>
 #include <memory>
 #include <utility>
 #include <vector>
@@ -62,7 +63,7 @@ Sheet* New_Sheet_With_Rows(std::int32_t rows)
 {
     Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = New_Sheet();
-    sheet->row_count = rows;
+    sheet->row_count = std::max(rows, 0);
     if (rows >= 1 && !Setup_Rows(sheet)) {
         sheets.pop_back();
         Current_Sheet = earlier;
@@ -77,6 +78,9 @@ bool Setup_Rows(Sheet* sheet)
         return false;
     const std::int32_t rows = sheet->row_count;
     Column& numbers = *sheet->first_column;
+    Free_Cell_Nodes(&numbers, row_column);
+    sheet->row_blocks.clear();
+    sheet->cursor_row_index = -1;
     if (Alloc_Row_Nodes(rows, sheet->first_row, sheet->last_row, sheet->row_blocks) == 0
         || Alloc_Cell_Nodes(row_column, rows, numbers.first_cell, numbers.last_cell, numbers.blocks) == 0)
         return false;

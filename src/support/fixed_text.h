@@ -24,6 +24,9 @@ public:
         return *this;
     }
 
+    // A literal would otherwise convert as well to a view as to a text.
+    constexpr Fixed_Text& operator=(const char* text) { return *this = std::string_view(text); }
+
     /// Takes up to the first NUL of `text`, cut at the width. `text` may lie inside this one.
     constexpr void assign(std::string_view text)
     {

@@ -304,6 +304,8 @@ Parsed_Number Parse_Number(const char* first, const char* last)
 {
     constexpr std::size_t room = 64;
     const auto length = static_cast<std::size_t>(last - first);
+    if (length == 0)
+        return {first, 0.0, Number_Status::none};
     if (length < room - Readable_Behind) {
         char padded[room];
         std::memcpy(padded, first, length);

@@ -39,7 +39,7 @@ constexpr std::size_t Readable_Behind = 8;
 /// Room for any number printed by the functions below with at most 40 decimals.
 constexpr std::size_t Number_Text_Room = 400;
 
-/// As printf's "%.{digits}g" prints a finite `value`; 1 to 17 digits. Returns the end of the text.
+/// As printf's "%.{digits}g" prints a finite `value`; 1 to 40 digits. Returns the end of the text.
 char* Print_General(char* target, double value, int digits);
 
 /// As printf's "%.{decimals}e" prints it; 0 to 40 decimals.

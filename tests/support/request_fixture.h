@@ -29,7 +29,7 @@ protected:
 
     void TearDown() override
     {
-        Close_Message_File();
+        Start_Request("t");
         std::filesystem::remove_all(folder_);
         if (earlier_.empty())
             ::unsetenv("TMPDIR");
@@ -37,16 +37,19 @@ protected:
             ::setenv("TMPDIR", earlier_.c_str(), 1);
     }
 
-    /// What was reported since SetUp, with the closing mark; empty when nothing was.
+    /// What was reported since the last call, with the closing mark; empty when nothing was.
     [[nodiscard]] std::string Messages() const
     {
         Close_Message_File();
         std::ifstream file(folder_ / "t.ERR", std::ios::binary);
-        return {std::istreambuf_iterator<char>(file), {}};
+        const std::string text(std::istreambuf_iterator<char>(file), {});
+        Start_Message_File();
+        return text;
     }
 
-private:
     std::filesystem::path folder_;
+
+private:
     std::string earlier_;
 };
 
