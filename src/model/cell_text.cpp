@@ -10,6 +10,8 @@ namespace ingester {
 
 bool Is_Missing_Text(std::string_view text)
 {
+    if (text.data() == nullptr)
+        return true;
     if (request.Missing_Input_Text.empty())
         return false;
     text = Trim_Copy(text);

@@ -7,8 +7,8 @@
 
 namespace ingester {
 
-/// Whether `text` means "missing": nothing does while `Missing_Input_Text` is empty; otherwise
-/// blanks do, and that text in any case.
+/// Whether `text` means "missing": a null view does; nothing else does while `Missing_Input_Text` is
+/// empty; otherwise blanks do, and that text in any case.
 [[nodiscard]] bool Is_Missing_Text(std::string_view text);
 
 /// Puts `text` into a cell by its column's type: text is kept up to the cell's width, a Factor takes
