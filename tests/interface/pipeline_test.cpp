@@ -61,7 +61,7 @@ TEST_F(Pipeline_Test, Converts)
         {std::string("a,b\n1,x\0y\n", 10), "c.csv", "o.tab", "o.tab", "a\tb\r\n1\tx y\r\n",
          "Warning: 1 NUL characters in the text were read as blanks.\n:\n"},
         {"a,b\n1,'x, y\n2,z\n", "c.csv", "o.tab", "o.tab", "a\tb\r\n1\t\"'x, y\"\r\n2\tz\r\n", ""},
-        {"a,b,c\n1\n2,3\n", "c.csv", "o.txt/rewrite=3", "o.txt", "a,b,c,1\n2,3\n", "", 7},
+        {"a,b,c\n1\n2,3\n", "c.csv", "o.txt/rewrite=3", "o.txt", "a,b,c\n1,2,3\n", "", 7},
         {"a\n", "c.csv", "o.txt/rewrite=", "o.txt", "", "", 7},
     };
     for (const auto& one : cases) {

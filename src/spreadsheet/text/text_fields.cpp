@@ -89,11 +89,11 @@ Text_Field Field_Walker::Next_Quoted()
         mark = Next_Quote(mark + 1, quote);
         if (*mark != quote) {
             at_ = mark;
-            return {first, at_, false};
+            return {first, at_};
         }
         if (mark[1] != quote) {
             at_ = Next_End(mark + 1);
-            return {first, at_, true};
+            return {first, at_};
         }
         ++mark;
     }
@@ -131,36 +131,36 @@ const char* Field_Walker::First_Line() const
     return line;
 }
 
-std::string_view Field_Walker::Content(const Text_Field& field)
+Field_Content Field_Walker::Content(const Text_Field& field)
 {
     std::string_view text(field.first, static_cast<std::size_t>(field.last - field.first));
     if (text.find('\0') != std::string_view::npos) [[unlikely]]
         Blank_Out_Nuls(field);
     if (!quotes_)
-        return text;
+        return {text};
     while (!text.empty() && Is_Blank_Or_Tab(text.front()))
         text.remove_prefix(1);
     if (text.empty() || (text.front() != '"' && text.front() != '\''))
-        return text;
+        return {text};
     std::string_view bare = text;
     while (Is_Blank_Or_Tab(bare.back()))
         bare.remove_suffix(1);
     // Where the other quote of the pair is missing, the text stands as it is.
     if (bare.size() < 2 || bare.back() != bare.front())
-        return text;
-    return bare.substr(1, bare.size() - 2);
+        return {text};
+    return {bare.substr(1, bare.size() - 2), bare.front()};
 }
 
-Field_Kind Kind_Of_Field(std::string_view content, bool quoted, double& value)
+Field_Kind Kind_Of_Field(const Field_Content& content, double& value)
 {
-    content = Trim_Copy(content);
+    const std::string_view text = Trim_Copy(content.text);
     value = 0.0;
     const std::string_view missing = request.Missing_Input_Text;
-    if (content.empty() || (missing != "*" && Equal_Ignoring_Case(content, missing)))
+    if (text.empty() || (missing != "*" && Equal_Ignoring_Case(text, missing)))
         return Field_Kind::nothing;
-    const char* const last = content.data() + content.size();
-    const Parsed_Number parsed = Parse_Number(content.data(), last);
-    const bool starred = !quoted && parsed.end + 1 == last && *parsed.end == '*';
+    const char* const last = text.data() + text.size();
+    const Parsed_Number parsed = Parse_Number(text.data(), last);
+    const bool starred = content.quote == '\0' && parsed.end + 1 == last && *parsed.end == '*';
     if (parsed.end != last && !starred)
         return Field_Kind::text;
     if (parsed.status != Number_Status::good)

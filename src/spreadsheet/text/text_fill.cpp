@@ -78,7 +78,7 @@ private:
     void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
     void Append_Blank(Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
-    std::string_view Text_Of(const Text_Field& field, bool& unquoted);
+    std::string_view Text_Of(const Field_Content& content);
     void Refuse_Extra_Columns();
     bool Add_Late_Column();
     bool Row_Is_Acceptable(const char* line);
@@ -139,43 +139,42 @@ void Sheet_Filler::Fill_Names()
 {
     std::size_t index = 0;
     do {
-        bool unquoted;
-        const std::string_view name = Text_Of(walker_.Next(), unquoted);
+        const Field_Content content = walker_.Content(walker_.Next());
+        const std::string_view name = Text_Of(content);
         if (index >= columns_.size())
             Refuse_Extra_Columns();
-        else if (!name.empty() || unquoted)
+        else if (!name.empty() || content.quote != '\0')
             Name_Column(*columns_[index].column, name);
         ++index;
     } while (walker_.Has_More());
 }
 
-/// A field's text: without its quotes, if it has them, and with doubled ones inside made single.
-std::string_view Sheet_Filler::Text_Of(const Text_Field& field, bool& unquoted)
+/// A field's text, doubled quotes made single, cut and trimmed.
+std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
 {
-    std::string_view content = walker_.Content(field);
-    unquoted = content.data() != field.first && (content.data()[-1] == '"' || content.data()[-1] == '\'');
-    const char pair[] = {unquoted ? content.data()[-1] : '\0', unquoted ? content.data()[-1] : '\0'};
+    std::string_view text = content.text;
+    const char pair[] = {content.quote, content.quote};
     const std::string_view doubled(pair, 2);
-    if (unquoted && content.find(doubled) != std::string_view::npos) {
+    if (content.quote != '\0' && text.find(doubled) != std::string_view::npos) {
         undoubled_.clear();
-        for (std::size_t i = 0; i < content.size(); ++i) {
-            undoubled_ += content[i];
-            if (content.substr(i, 2) == doubled)
+        for (std::size_t i = 0; i < text.size(); ++i) {
+            undoubled_ += text[i];
+            if (text.substr(i, 2) == doubled)
                 ++i;
         }
-        content = undoubled_;
+        text = undoubled_;
     }
-    content = content.substr(0, Long_Text_Width);
-    return trim_ ? Trim_Copy(content) : content;
+    text = text.substr(0, Long_Text_Width);
+    return trim_ ? Trim_Copy(text) : text;
 }
 
 void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell)
 {
-    bool unquoted;
-    const std::string_view text = Text_Of(field, unquoted);
+    const Field_Content content = walker_.Content(field);
+    const std::string_view text = Text_Of(content);
     if (text.size() >= Long_Field && column.type == text_column)
         column.type = long_text_column;
-    if (!text.empty() && (unquoted || text != "*"))
+    if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);
 }
 
@@ -196,7 +195,7 @@ void Sheet_Filler::Turn_To_Text(Column_Filling& state)
 void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 {
     double value;
-    switch (Kind_Of_Field(walker_.Content(field), field.quoted, value)) {
+    switch (Kind_Of_Field(walker_.Content(field), value)) {
     case Field_Kind::number:
         state.cells.Last().value.number = value;
         break;

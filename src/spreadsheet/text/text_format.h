@@ -53,8 +53,14 @@ struct Text_Scan_Options {
 /// A field between its separators; the blanks in front are not part of it.
 struct Text_Field {
     const char* first;
-    const char* last;     ///< at the separator or line end behind it
-    bool quoted = false;  ///< starts with a quote that is closed
+    const char* last;  ///< at the separator or line end behind it
+};
+
+/// What a field says: without outer blanks and tabs, and without the pair of quotes around it; but
+/// such quotes inside are doubled still.
+struct Field_Content {
+    std::string_view text;
+    char quote = '\0';  ///< the pair that was taken away
 };
 
 /// Walks the fields of a text, behind which `Readable_Behind` bytes may be read. The places of separators,
@@ -79,7 +85,7 @@ public:
             return Next_Quoted();
         const char* const first = at_;
         at_ = Next_End(first);
-        return {first, at_, false};
+        return {first, at_};
     }
 
     /// Whether another field follows in the line; steps over the separator then, otherwise over the
@@ -108,9 +114,8 @@ public:
 
     [[nodiscard]] const char* Place() const { return at_; }
 
-    /// The field's text as it stands: no outer blanks and tabs, no pair of quotes around it, but
-    /// quotes inside still doubled.
-    [[nodiscard]] std::string_view Content(const Text_Field& field);
+    /// What a field of this text says.
+    [[nodiscard]] Field_Content Content(const Text_Field& field);
 
 private:
     /// The next separator or line end at or behind `from`.
@@ -191,7 +196,7 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
 
 /// What a field says of its column's type: nothing, a number, or text.
 enum class Field_Kind : std::uint8_t { nothing, number, text };
-[[nodiscard]] Field_Kind Kind_Of_Field(std::string_view content, bool quoted, double& value);
+[[nodiscard]] Field_Kind Kind_Of_Field(const Field_Content& content, double& value);
 
 /// From so many characters on, text needs a Long Text column.
 constexpr std::size_t Long_Field = Text_Cell_Width + 1;

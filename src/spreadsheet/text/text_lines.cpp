@@ -1,7 +1,9 @@
 // The two line services: one line read as a column, and lines joined by their number of fields.
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "model/cell_text.h"
 #include "model/names.h"
+#include "platform/folders.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
@@ -23,11 +25,13 @@ bool Read_Text_Lines(const char* file_name)
 bool Read_Text_Lines(Input_File& file)
 {
     std::string line;
-    for (std::int32_t skipped = 0; skipped < request.Fixed_Lines; ++skipped)
-        if (!file.Read_Line(line, Greatest_Line))
-            break;
-    if (!file.Read_Line(line, Greatest_Line))
-        return Fail("Could not read data file %.200s.\n", file.Name().c_str());
+    const long wanted = std::max(request.Fixed_Lines, 0) + 1L;
+    for (long number = 1; number <= wanted; ++number)
+        if (!file.Read_Line(line, line.max_size()))
+            return Fail("Could not read data file %.200s.\n", file.Name().c_str());
+    if (line.size() > Greatest_Line)
+        return Fail("Error: Line %li has more than %li characters.\n", wanted,
+                    static_cast<long>(Greatest_Line));
     const char separator =
         request.Custom_Separators.empty() ? '\t' : request.Custom_Separators.view().front();
     const auto fields = std::count(line.begin(), line.end(), separator) + 1;
@@ -39,7 +43,7 @@ bool Read_Text_Lines(Input_File& file)
     std::string_view rest = line;
     for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
         const std::size_t end = std::min(rest.find(separator), rest.size());
-        Set_Text(*column, *cell, Trim_Copy(rest.substr(0, end), Text_Cell_Width));
+        Set_Cell_From_Text(*column, *cell, Trim_Copy(rest.substr(0, end), Text_Cell_Width));
         rest.remove_prefix(std::min(end + 1, rest.size()));
     }
     return file.Close();
@@ -47,29 +51,32 @@ bool Read_Text_Lines(Input_File& file)
 
 bool Reflow_Lines_By_Fields(const char* input, const char* output, std::int32_t fields_per_record)
 {
-    constexpr std::size_t longest_line = 65535;
     Input_File from;
     if (!from.Open(input))
         return Fail("CSV data file %.100s not found.\n", input);
+    if (Same_File(input, output))
+        return Fail("Input and output files are the same.\n");
     Output_File to;
     if (!to.Open(output))
         return Fail("CSV data file %.100s could not be opened.\n", output);
     std::string line;
     std::int64_t commas = 0;
     bool record_open = false;
-    bool ends_with_comma = true;
-    while (from.Read_Line(line, longest_line)) {
+    bool field_open = false;  // the record doesn't end with a comma
+    while (from.Read_Line(line, line.max_size())) {
         const std::int64_t more = std::count(line.begin(), line.end(), ',');
-        commas += more;
+        // The last field of one line and the first of the next stay apart.
+        const bool joint = field_open && !line.empty();
+        commas += more + (joint ? 1 : 0);
         if (record_open && commas >= fields_per_record) {
             to.Write("\n");
             commas = more;
-        } else if (!ends_with_comma && !line.empty()) {
-            to.Write(",");  // the last field of one line and the first of the next stay apart
+        } else if (joint) {
+            to.Write(",");
         }
         to.Write(line);
         record_open = true;
-        ends_with_comma = line.empty() || line.back() == ',';
+        field_open = line.empty() ? field_open : line.back() != ',';
     }
     if (record_open)
         to.Write("\n");

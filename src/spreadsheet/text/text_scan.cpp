@@ -97,14 +97,15 @@ void Take_Wanted_Type(std::int32_t index, std::string_view name, Column_Scan& co
         column.type = wanted;
 }
 
-void Take_Field(std::string_view content, bool quoted, Column_Scan& column)
+void Take_Field(Field_Content content, Column_Scan& column)
 {
     double value;
-    while (!content.empty() && static_cast<unsigned char>(content.back()) <= 32)
-        content.remove_suffix(1);
-    if (column.type == Undecided_Type && Kind_Of_Field(content, quoted, value) == Field_Kind::text)
+    content.text = content.text.substr(0, Scanned_Width);
+    while (!content.text.empty() && static_cast<unsigned char>(content.text.back()) <= 32)
+        content.text.remove_suffix(1);
+    if (column.type == Undecided_Type && Kind_Of_Field(content, value) == Field_Kind::text)
         column.type = text_column;
-    if (column.type == text_column && content.size() >= Long_Field)
+    if (column.type == text_column && content.text.size() >= Long_Field)
         column.type = long_text_column;
 }
 
@@ -123,11 +124,10 @@ void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape)
             shape.types.emplace_back();
         }
         Column_Scan& column = shape.types[static_cast<std::size_t>(index++)];
-        const std::string_view content = walker.Content(field).substr(0, Scanned_Width);
         if (names)
-            Take_Name_Mark(Trim_Copy(content), column);
+            Take_Name_Mark(Trim_Copy(walker.Content(field).text), column);
         else
-            Take_Field(content, field.quoted, column);
+            Take_Field(walker.Content(field), column);
     } while (walker.Has_More());
 }
 
@@ -137,7 +137,7 @@ std::vector<std::string> Names_Of_Line(Field_Walker& walker)
     std::vector<std::string> names;
     walker.Go_To(walker.First_Line());
     do
-        names.emplace_back(Trim_Copy(walker.Content(walker.Next())));
+        names.emplace_back(Trim_Copy(walker.Content(walker.Next()).text));
     while (walker.Has_More());
     return names;
 }

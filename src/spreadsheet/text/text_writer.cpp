@@ -98,14 +98,24 @@ private:
     std::size_t used_ = 0;
 };
 
+bool Prints_By_Format(const Column& column)
+{
+    return request.Use_Formats || column.format == date_format_mark;
+}
+
+char* Print_Number(char* target, const Column& column, double value)
+{
+    return Prints_By_Format(column) ? Format_Cell_Number(target, column, value)
+                                    : Print_General(target, value, General_Digits);
+}
+
 Cell_Kind Kind_Of(const Column& column)
 {
     if (Is_Text_Like(column.type))
         return Cell_Kind::text;
     if (column.type == factor_column)
         return Cell_Kind::factor;
-    return request.Use_Formats || column.format == date_format_mark ? Cell_Kind::formatted_number
-                                                                    : Cell_Kind::number;
+    return Prints_By_Format(column) ? Cell_Kind::formatted_number : Cell_Kind::number;
 }
 
 std::vector<std::string> Printed_Levels(const Column& column)
@@ -119,7 +129,7 @@ std::vector<std::string> Printed_Levels(const Column& column)
             levels.emplace_back(label->Text());
             label = label->next;
         } else if (value != nullptr) {
-            levels.emplace_back(text, Format_Cell_Number(text, column, value->value.number));
+            levels.emplace_back(text, Print_Number(text, column, value->value.number));
             value = value->next;
         } else {
             levels.emplace_back(text, Print_Integer(text, level));
@@ -128,6 +138,11 @@ std::vector<std::string> Printed_Levels(const Column& column)
     if (column.sheet->type == table_sheet && column.sheet->has_margins != 0)
         levels.emplace_back(column.sheet->margin_label);
     return levels;
+}
+
+bool Is_Level(const Column_Writing& state, double value)
+{
+    return value >= 1.0 && value < static_cast<double>(state.levels.size()) + 1.0;
 }
 
 /// The mark behind a name by which a reader knows the column's type again.
@@ -153,11 +168,12 @@ public:
 
 private:
     void Start_Column(const Column& column);
-    std::int32_t Measured_Width(Column_Writing& state);
+    std::int32_t Measured_Width(const Column_Writing& state);
+    void Put_Level(const Column_Writing& state, std::string_view level);
     void Put_Cell(const Column_Writing& state, const Cell_Node& cell);
     void Put_Factor(const Column_Writing& state, double value);
     void Put_Text(std::string_view text);
-    [[nodiscard]] bool Needs_Quotes(std::string_view text) const;
+    [[nodiscard]] bool Would_Be_Misread(std::string_view text) const;
     void Put_Quoted(std::string_view text);
     void Put_Field(Column_Writing& state, std::int32_t row);
     void Write_Line();
@@ -183,33 +199,36 @@ void Text_Table_Writer::Start_Column(const Column& column)
         state.width = Measured_Width(state);
 }
 
-/// The widest printed cell, or the name with its mark, and 1.
-std::int32_t Text_Table_Writer::Measured_Width(Column_Writing& state)
+/// The widest printed cell, or the name with its mark, and 1. The levels of a Factor count whether
+/// they occur or not; a missing cell only where there is one.
+std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
 {
     const Column& column = *state.column;
-    std::size_t widest = column.name.size() + Name_Mark(column).size();
+    const bool factor = state.kind == Cell_Kind::factor;
+    std::size_t widest = column.name.size() + (factor ? 1 : Name_Mark(column).size());
+    const auto take_printed = [&] {
+        widest = std::max(widest, line_.Size());
+        line_.Clear();
+    };
     line_.Clear();
-    if (state.kind == Cell_Kind::factor) {
-        for (const std::string& level : state.levels)
-            widest = std::max(
-                widest, level.size() + (layout_.quoted && column.factor_kind == factor_with_labels ? 2 : 0));
-    } else {
-        for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-            Put_Cell(state, *cell);
-            widest = std::max(widest, line_.Size());
-            line_.Clear();
-        }
+    for (const std::string& level : state.levels) {
+        Put_Level(state, level);
+        take_printed();
+    }
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
+        if (factor && Is_Level(state, cell->value.number))
+            continue;
+        Put_Cell(state, *cell);
+        take_printed();
     }
     return static_cast<std::int32_t>(widest) + 1;
 }
 
-bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
+/// Without quotes around it, a reader would take the text apart or cut quotes of its own.
+bool Text_Table_Writer::Would_Be_Misread(std::string_view text) const
 {
-    if (layout_.layout == Layout::fixed)
-        return false;
-    const bool starts_quoted = text.front() == '"' || text.front() == '\'';
-    return layout_.quoted || starts_quoted || text.find(layout_.separator) != std::string_view::npos
-           || text.find_first_of("\r\n") != std::string_view::npos;
+    return text.starts_with('"') || text.starts_with('\'') || text.find(layout_.separator) != text.npos
+           || text.find_first_of("\r\n") != text.npos;
 }
 
 void Text_Table_Writer::Put_Quoted(std::string_view text)
@@ -228,24 +247,27 @@ void Text_Table_Writer::Put_Text(std::string_view text)
 {
     if (text.empty())
         return;
-    if (Needs_Quotes(text))
+    if (layout_.layout != Layout::fixed && (layout_.quoted || Would_Be_Misread(text)))
         Put_Quoted(text);
     else
         line_.Put(text);
 }
 
-void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
+void Text_Table_Writer::Put_Level(const Column_Writing& state, std::string_view level)
 {
-    const bool labelled = state.column->factor_kind == factor_with_labels;
-    if (!(value >= 1.0) || value >= static_cast<double>(state.levels.size()) + 1.0) {
-        line_.Put(labelled ? std::string_view(" ") : request.Missing_Text.view());
-        return;
-    }
-    const std::string& level = state.levels[static_cast<std::size_t>(value) - 1];
-    if (labelled)
+    if (state.column->factor_kind == factor_with_labels)
         Put_Text(level);
     else
         line_.Put(level);
+}
+
+void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
+{
+    if (Is_Level(state, value))
+        Put_Level(state, state.levels[static_cast<std::size_t>(value) - 1]);
+    else
+        line_.Put(state.column->factor_kind == factor_with_labels ? std::string_view(" ")
+                                                                  : request.Missing_Text.view());
 }
 
 inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
@@ -331,7 +353,7 @@ void Text_Table_Writer::Write_Names()
                 line_.Put(' ');
             line_.Put(name);
             line_.Pad(start, state.width, left);
-        } else if (name.find_first_of(",\t\"\r\n") != std::string::npos) {
+        } else if (Would_Be_Misread(name)) {
             Put_Quoted(name);
         } else {
             line_.Put(name);
