@@ -9,47 +9,33 @@ namespace {
 
 constexpr double gone = Missing_Value;
 
-class Cell_Text : public Request_Test {
-protected:
-    void SetUp() override
-    {
-        Request_Test::SetUp();
-        sheet = New_Sheet_With_Rows(1);
-    }
+using Cell_Text = Request_Test;
 
-    /// What the cell of `column` holds after `text` was put in.
-    double After(Column* column, std::string_view text)
-    {
-        EXPECT_TRUE(Set_Cell_From_Text(column, 0, text));
-        return column->first_cell->value.number;
-    }
-
-    Sheet* sheet = nullptr;
-};
+/// What the cell of `column` holds after `text` was put in.
+double After(Column* column, std::string_view text)
+{
+    EXPECT_TRUE(Set_Cell_From_Text(column, 0, text));
+    return column->first_cell->value.number;
+}
 
 TEST_F(Cell_Text, Finds_Labels_By_Each_Test_In_Turn)
 {
-    Column* const column = New_Data_Column(sheet, factor_column, "f", 1);
+    Column* const column = New_Data_Column(New_Sheet_With_Rows(1), factor_column, "f", 1);
     ASSERT_TRUE(
         Put_Levels(*column, {1, 2, 3, 4, 5, 6, 7, 8},
                    {"northern", "North", "NORTH", "south-west", "South", "Sorghum", "wheat", "where"}));
     const struct {
         const char* text;
         double level;
-    } cases[] = {
-        {"NORTH", 3},  // exact, though others are equal in any case
-        {"nORTH", 2},  // in any case, before a start that is exact
-        {"nor", 1},    // the exact start of a label, before starts in any case
-        {"SOUTH-", 4},   {"N", 2},       {"w", 7},    {"southern", 4},  // the longest common start, by itself
-        {"Sorrel", 6},   {"whey", gone},                                // shared by two
-        {"xylem", gone}, {"", gone},     {"*", gone},
-    };
+    } cases[] = {{"NORTH", 3},    {"nORTH", 2},  {"nor", 1},     {"N", 2},        {"SOUTH-", 4}, {"w", 7},
+                 {"southern", 4}, {"Sorrel", 6}, {"whey", gone}, {"xylem", gone}, {"", gone},    {"*", gone}};
     for (const auto& c : cases)
         EXPECT_EQ(After(column, c.text), c.level) << c.text;
 }
 
 TEST_F(Cell_Text, Numbers_And_Levels)
 {
+    Sheet* const sheet = New_Sheet_With_Rows(1);
     sheet->missing_value = -9;
     Column* const number = New_Data_Column(sheet, variate_column, "x", 1);
     Column* const factor = New_Data_Column(sheet, factor_column, "f", 1);
@@ -72,6 +58,7 @@ TEST_F(Cell_Text, Numbers_And_Levels)
 
 TEST_F(Cell_Text, Missing_Texts_And_Widths)
 {
+    Sheet* const sheet = New_Sheet_With_Rows(1);
     Column* const text = New_Data_Column(sheet, text_column, "t", 1);
     Column* const long_text = New_Data_Column(sheet, long_text_column, "l", 1);
     const struct {

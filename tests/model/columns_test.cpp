@@ -17,26 +17,20 @@ TEST_F(Columns, Are_Named_And_Placed_By_Type)
 {
     const struct {
         std::int32_t sheet_type, type;
-        const char* name;
-        const char* becomes;
-        std::int32_t index, leading, format;
-    } cases[] = {{1, 4, "1 a", "%1_a", 2, 1, 1},
-                 {1, 4, "", "C1", 2, 1, 1},
-                 {1, 3, "t", "t", 2, 1, 4},
-                 {1, 33, "t", "t", 2, 1, 4},
-                 {1, 2, "f", "f", 2, 1, 1},
-                 {1, -3, "u v", "u_v", 1, 2, 4},
-                 {1, -4, "u", "u", 1, 2, 1},
-                 {2, 5, "1 a", "1 a", 2, 1, 1},
-                 {3, 7, "1 a", "1 a", 2, 1, 1},
-                 {4, 6, "1 a", "%1_a", 2, 1, 1},
-                 {5, 8, "1 a", "1 a", 2, 1, 1},
-                 {5, 22, "1 a", "1 a", 2, 1, 1},
-                 {5, 2, "f g", "f_g", 2, 2, 1},
-                 {5, 2, "vclass['classification'][1]", "C1", 2, 2, 1},
-                 {5, 2, "*['classification'][2]", "C1", 2, 2, 1}};
+        const char *name, *becomes;
+        std::vector<std::int32_t> index_leading_format;
+    } cases[] = {{1, 4, "1 a", "%1_a", {2, 1, 1}},
+                 {1, 4, "", "C1", {2, 1, 1}},
+                 {1, 33, "t", "t", {2, 1, 4}},
+                 {1, 2, "f", "f", {2, 1, 1}},
+                 {1, -3, "u v", "u_v", {1, 2, 4}},
+                 {1, -4, "u", "u", {1, 2, 1}},
+                 {3, 7, "1 a", "1 a", {2, 1, 1}},
+                 {4, 6, "1 a", "%1_a", {2, 1, 1}},
+                 {5, 22, "1 a", "1 a", {2, 1, 1}},
+                 {5, 2, "f g", "f_g", {2, 2, 1}},
+                 {5, 2, "vclass['classification'][1]", "C1", {2, 2, 1}}};
     for (const auto& c : cases) {
-        SCOPED_TRACE(testing::Message() << c.sheet_type << ' ' << c.type << ' ' << c.name);
         Start_Request("t");
         Sheet* const sheet = New_Sheet();
         sheet->type = c.sheet_type;
@@ -44,7 +38,8 @@ TEST_F(Columns, Are_Named_And_Placed_By_Type)
         Column* const column = New_Column(sheet, c.type, c.name);
         EXPECT_EQ(column->name, c.becomes);
         EXPECT_EQ((std::vector{column->index, sheet->leading_columns, column->format}),
-                  (std::vector{c.index, c.leading, c.format}));
+                  c.index_leading_format)
+            << c.sheet_type << ' ' << c.type << ' ' << c.name;
         EXPECT_EQ(Check_Sheet(*sheet), "");
     }
 }
@@ -72,19 +67,14 @@ TEST_F(Columns, Start_With_Blank_Cells)
     Sheet* const sheet = New_Sheet_With_Rows(2);
     sheet->missing_value = -5;
     const Column* const number = New_Data_Column(sheet, table_column, "n", 2);
-    const Column* const text = New_Data_Column(sheet, text_column, "text", 2);
     const Column* const bare = New_Data_Column(sheet, unbuffered_text_column, "bare", 2);
     Column* const none = New_Data_Column(sheet, variate_column, "none", -4);
     EXPECT_EQ(number->last_cell->value.number + number->range_low + number->range_high, -15);
-    EXPECT_EQ((std::vector{number->decimals, number->width, text->decimals, text->width, bare->type}),
-              (std::vector<std::int32_t>{-1, 6, 0, 6, text_column}));
-    EXPECT_EQ(text->last_cell->value.text, Text_Arena::Empty());
-    EXPECT_EQ(bare->last_cell->value.text, nullptr);
-    EXPECT_TRUE(none->length == -4 && none->first_cell == nullptr && Cell_At(none, 0) == nullptr);
-    EXPECT_TRUE(Insert_Cells(none, 0, 2));
+    EXPECT_TRUE(bare->type == text_column && bare->last_cell->value.text == nullptr);
+    EXPECT_TRUE(none->length == -4 && Cell_At(none, 0) == nullptr && Insert_Cells(none, 0, 2));
     EXPECT_EQ(Check_Sheet(*sheet), "");
-    request.Max_Columns = 4;
-    EXPECT_EQ(New_Column(sheet, variate_column, "fifth"), nullptr);
+    request.Max_Columns = 3;
+    EXPECT_EQ(New_Column(sheet, variate_column, "fourth"), nullptr);
 }
 
 TEST_F(Columns, Are_Filled_From_A_Text)
@@ -159,7 +149,6 @@ TEST_F(Columns, Bring_Their_Levels)
         asked.level_values = source.level_values;
         const Column* const values = Add_Column(sheet, asked, 9, false);
         EXPECT_EQ(values->width, width) << value;
-        EXPECT_EQ(values->level_values->value.number, value);
         asked.labels = source.labels;
         asked.fill = "HIGH";
         const Column* const labels = Add_Column(sheet, asked, 9, false);

@@ -28,13 +28,12 @@ inline void Put_Texts(Column& column, Cell_Node* first, const std::vector<std::s
 inline bool Put_Levels(Column& column, const std::vector<double>& values,
                        const std::vector<std::string>& labels = {})
 {
-    const auto count = static_cast<std::int32_t>(values.size());
-    if (!Make_Level_Values(column, count) || !Make_Labels(column, count))
+    column.nlevels = static_cast<std::int32_t>(values.size());
+    column.factor_kind = labels.empty() ? factor_with_levels : factor_with_labels;
+    if (!Make_Level_Values(column, column.nlevels) || !Make_Labels(column, column.nlevels))
         return false;
     Put_Numbers(column.level_values, values);
     Put_Texts(column, column.labels, labels);
-    column.factor_kind = labels.empty() ? factor_with_levels : factor_with_labels;
-    column.nlevels = count;
     return true;
 }
 
