@@ -51,7 +51,7 @@ bool Insert_Cells(Column* column, std::int32_t position, std::int32_t count)
 
 bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count)
 {
-    if (sheet == nullptr || position < 0 || !Insertion_Fits(count))
+    if (!Need_Rows(sheet) || position < 0 || !Insertion_Fits(count))
         return false;
     Row_Node* const before = position < sheet->row_count ? Row_At(sheet, position) : nullptr;
     Row_Node* first;
@@ -213,6 +213,19 @@ std::int32_t Mark_Empty_Rows(Sheet& sheet)
     return empty;
 }
 
+/// Some column has a value in every row, so that none can be empty.
+bool Has_Full_Column(const Sheet& sheet)
+{
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        const Cell_Node* cell = column->first_cell;
+        while (cell != nullptr && Cell_Is_Present(*column, *cell))
+            cell = cell->next;
+        if (cell == nullptr && column->length == sheet.row_count)
+            return true;
+    }
+    return false;
+}
+
 /// On a Symmetric Matrix row and column i are two halves of one thing: empty only together.
 void Pair_Rows_With_Columns(Sheet& sheet)
 {
@@ -240,7 +253,7 @@ void Mark_All_Empty(Sheet& sheet, bool paired)
 
 std::int32_t Find_Empty_Rows(Sheet* sheet, bool also_columns)
 {
-    if (sheet == nullptr)
+    if (sheet == nullptr || (sheet->rows_due && Has_Full_Column(*sheet)) || !Need_Rows(sheet))
         return 0;
     if (!also_columns || sheet->type != symmetric_matrix_sheet)
         return Mark_Empty_Rows(*sheet);
@@ -255,7 +268,7 @@ std::int32_t Find_Empty_Columns(Sheet* sheet, bool also_rows)
 {
     if (sheet == nullptr)
         return 0;
-    if (also_rows && sheet->type == symmetric_matrix_sheet)
+    if (also_rows && sheet->type == symmetric_matrix_sheet && Need_Rows(sheet))
         Mark_All_Empty(*sheet, true);
     else
         for (Column* column = sheet->first_column->next; column != nullptr; column = column->next)

@@ -81,6 +81,7 @@ bool Setup_Rows(Sheet* sheet)
     Free_Cell_Nodes(&numbers, row_column);
     sheet->row_blocks.clear();
     sheet->cursor_row_index = -1;
+    sheet->rows_due = false;
     if (Alloc_Row_Nodes(rows, sheet->first_row, sheet->last_row, sheet->row_blocks) == 0
         || Alloc_Cell_Nodes(row_column, rows, numbers.first_cell, numbers.last_cell, numbers.blocks) == 0)
         return false;
@@ -90,6 +91,19 @@ bool Setup_Rows(Sheet* sheet)
     for (Cell_Node* cell = numbers.first_cell; cell != nullptr; cell = cell->next)
         cell->value.number = ++number;
     return true;
+}
+
+void Expect_Rows(Sheet* sheet, std::int32_t rows)
+{
+    if (sheet == nullptr)
+        return;
+    sheet->row_count = std::max(rows, 0);
+    sheet->rows_due = rows > 0;
+}
+
+bool Need_Rows(Sheet* sheet)
+{
+    return sheet != nullptr && (!sheet->rows_due || Setup_Rows(sheet));
 }
 
 Column* Column_At(Sheet* sheet, std::int32_t index)
@@ -102,7 +116,7 @@ Column* Column_At(Sheet* sheet, std::int32_t index)
 
 Row_Node* Row_At(Sheet* sheet, std::int32_t index)
 {
-    if (sheet == nullptr)
+    if (!Need_Rows(sheet))
         return nullptr;
     return Walk_To(sheet->first_row, sheet->last_row, sheet->cursor_row, sheet->cursor_row_index,
                    sheet->row_count, index);
@@ -110,7 +124,7 @@ Row_Node* Row_At(Sheet* sheet, std::int32_t index)
 
 Cell_Node* Cell_At(Column* column, std::int32_t index)
 {
-    if (column == nullptr)
+    if (column == nullptr || (column->type == row_column && !Need_Rows(column->sheet)))
         return nullptr;
     return Walk_To(column->first_cell, column->last_cell, column->cursor_node, column->cursor_index,
                    column->length, index);

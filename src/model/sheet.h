@@ -151,6 +151,7 @@ struct Sheet {
     std::int16_t has_margins = 0;
     std::int16_t has_table_data = 0;  ///< a Table whose body was given, so empty columns may go
     std::int16_t read_only = 0;
+    bool rows_due = false;  ///< rows and `Row` cells are still to be made
     double missing_value = Missing_Value;
     Fixed_Text<32> sheet_name;
     Block_Table row_blocks;
@@ -184,6 +185,14 @@ Sheet* New_Sheet_With_Rows(std::int32_t rows);
 
 /// Makes the rows of `row_count` and numbers the `Row` column 1..N. False for no rows.
 bool Setup_Rows(Sheet* sheet);
+
+/// Gives a Sheet that has none its number of rows, and puts off making them until somebody needs
+/// them: a table that only passes through never does. `Row_At`, `Cell_At` of the `Row` column and
+/// all operations on rows make them by themselves; whoever walks from `first_row` calls `Need_Rows`.
+void Expect_Rows(Sheet* sheet, std::int32_t rows);
+
+/// Makes rows that were put off. False after a message, when there is no room for them.
+bool Need_Rows(Sheet* sheet);
 
 // --- Columns -----------------------------------------------------------------------------------
 

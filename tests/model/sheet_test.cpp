@@ -233,5 +233,33 @@ TEST_F(Sheet_Lists, What_Is_Empty)
     EXPECT_EQ(Check_Sheet(*table), "");
 }
 
+TEST_F(Sheet_Lists, Rows_That_Were_Put_Off_Come_When_They_Are_Needed)
+{
+    const struct {
+        const char* name;
+        void (*need)(Sheet* sheet);
+        std::int32_t rows;
+    } cases[] = {
+        {"nobody", [](Sheet*) {}, 3},
+        {"a row", [](Sheet* sheet) { EXPECT_NE(Row_At(sheet, 2), nullptr); }, 3},
+        {"a row number", [](Sheet* sheet) { EXPECT_EQ(Cell_At(sheet->first_column, 2)->value.number, 3.0); },
+         3},
+        {"an insertion", [](Sheet* sheet) { EXPECT_TRUE(Insert_Rows(sheet, 1, 2, false)); }, 5},
+        {"an insertion behind the end", [](Sheet* sheet) { EXPECT_TRUE(Insert_Rows(sheet, 9, 1, false)); },
+         4},
+        {"a deletion", [](Sheet* sheet) { EXPECT_TRUE(Delete_Row(sheet, 0, false)); }, 2},
+        {"a search", [](Sheet* sheet) { EXPECT_EQ(Find_Empty_Rows(sheet, true), 2); }, 3},
+    };
+    for (const auto& [name, need, rows] : cases) {
+        SCOPED_TRACE(name);
+        Sheet* const sheet = New_Sheet();
+        Expect_Rows(sheet, 3);
+        New_Data_Column(sheet, variate_column, "x", 3)->last_cell->value.number = 1;
+        need(sheet);
+        EXPECT_EQ(sheet->row_count, rows);
+        EXPECT_EQ(Check_Sheet(*sheet), "");
+    }
+}
+
 }  // namespace
 }  // namespace ingester

@@ -73,7 +73,7 @@ std::string Where_Is(const Column& column)
 /// A Symmetric Matrix column begins at the diagonal; all others have a cell for every row.
 std::int64_t Expected_Length(const Sheet& sheet, const Column& column)
 {
-    const std::int64_t rows = sheet.row_count;
+    const std::int64_t rows = column.type == row_column && sheet.rows_due ? 0 : sheet.row_count;
     return column.type == symmetric_matrix_column ? rows + sheet.leading_columns - column.index : rows;
 }
 
@@ -159,8 +159,8 @@ std::string Check_Sheet(const Sheet& sheet)
                        faults.Add(Where_Is(column), "the Row column is at the head, and only there");
                    Check_Column(sheet, column, faults);
                });
-    Check_List("rows", sheet.first_row, sheet.last_row, sheet.row_count, sheet.cursor_row,
-               sheet.cursor_row_index, faults, [](const Row_Node&, std::int64_t) {});
+    Check_List("rows", sheet.first_row, sheet.last_row, sheet.rows_due ? 0 : sheet.row_count,
+               sheet.cursor_row, sheet.cursor_row_index, faults, [](const Row_Node&, std::int64_t) {});
     return faults.Text();
 }
 

@@ -318,10 +318,10 @@ bool Sheet_Filler::Finish_Rows(const char* last_line)
 {
     if (row_ > 0 && walker_.Is_Blank_Line(last_line))
         --row_;
-    sheet_.row_count = static_cast<std::int32_t>(row_);
+    Expect_Rows(&sheet_, static_cast<std::int32_t>(row_));
     for (Column_Filling& state : columns_)
         state.cells.Finish(sheet_.row_count);
-    return Setup_Rows(&sheet_);
+    return row_ > 0;
 }
 
 void Sheet_Filler::Report_Oddities() const
