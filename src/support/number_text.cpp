@@ -3,12 +3,17 @@
 #include "support/byte_fields.h"
 #include "support/text.h"
 
+#include <algorithm>
 #include <array>
 #include <bit>
 #include <charconv>
 #include <cmath>
 #include <cstring>
 #include <limits>
+
+#if defined(__SSE2__)
+#include <immintrin.h>
+#endif
 
 namespace ingester {
 
@@ -159,78 +164,140 @@ bool Is_Plain_Integer(double value, double limit)
 namespace {
 
 constexpr std::uint64_t Exact_Integer_Limit = std::uint64_t{1} << 53;
-constexpr int Safe_Digits = 18;  // that many fit a signed 64-bit integer
 
 constexpr std::uint64_t Integer_Powers[] = {1, 10, 100, 1000, 10000, 100000, 1000000, 10000000, 100000000};
 
-/// Up to eight characters as a word, the first in the low byte.
-std::uint64_t Load_Word(const char* at)
+constexpr unsigned Word_Digits = 8;
+constexpr unsigned Most_Safe_Digits = 18;  // that many fit a signed 64-bit integer
+
+/// The same character in all eight bytes of a word.
+constexpr std::uint64_t Eight_Times(unsigned char c)
 {
-    return Number_At<std::uint64_t>(at);
+    return 0x0101010101010101U * c;
 }
 
-/// How many of the characters of `word` are digits, before the first that isn't. `word` has been
-/// xor-ed with '0's, so that digits are 0 to 9.
-int Leading_Digits(std::uint64_t word)
+/// Up to eight digits as a word of values 0 to 9, the first in the low byte, zeros in front.
+std::uint64_t Load_Digits(const char* at, unsigned count)
 {
-    const std::uint64_t others = ((word + 0x7676767676767676U) | word) & 0x8080808080808080U;
-    return others == 0 ? 8 : std::countr_zero(others) / 8;
+    return (Number_At<std::uint64_t>(at) ^ Eight_Times('0')) << (64 - 8 * count);
 }
 
-/// The number that `count` digits (1 to 8) at the low end of `word` make: neighbours are joined to
-/// pairs, pairs to fours, fours to eight, all at once.
-std::uint64_t Join_Digits(std::uint64_t word, int count)
+/// High bits where a loaded word holds something that is no digit.
+std::uint64_t Strangers(std::uint64_t word)
 {
-    word <<= 64 - 8 * count;
+    return ((word + Eight_Times(0x76)) | word) & Eight_Times(0x80);
+}
+
+/// The number that the digits of a word make: neighbours are joined to pairs, pairs to fours, fours
+/// to eight, all at once.
+std::uint64_t Join_Digits(std::uint64_t word)
+{
     word = word * 10 + (word >> 8);
     constexpr std::uint64_t pairs = 0x000000FF000000FFU;
     return ((word & pairs) * 0x000F424000000064U + ((word >> 16) & pairs) * 0x0000271000000001U) >> 32;
 }
 
-/// A number under way: `digits` * 10^`exponent`, of `count` digits.
+/// Where the first decimal point stands in eight characters; 8 for none.
+unsigned Find_Point(const char* at)
+{
+    const std::uint64_t word = Number_At<std::uint64_t>(at) ^ Eight_Times('.');
+    const std::uint64_t zeros = (word - Eight_Times(1)) & ~word & Eight_Times(0x80);
+    return zeros == 0 ? Word_Digits : static_cast<unsigned>(std::countr_zero(zeros)) / 8;
+}
+
+/// A number under way: `digits` * 10^`exponent`.
 struct Decimal_Scan {
     std::uint64_t digits = 0;
-    int count = 0;
     int exponent = 0;
 };
 
-/// Takes a run of digits; beyond `Safe_Digits` only their count goes on.
-inline const char* Take_Digits(const char* at, Decimal_Scan& scan)
+/// Takes `count` digits behind those there are. False when others stand among them.
+inline bool Take_Digits(const char* at, unsigned count, Decimal_Scan& scan)
 {
-    constexpr std::uint64_t zeros = 0x3030303030303030U;
-    for (;;) {
-        const std::uint64_t word = Load_Word(at) ^ zeros;
-        const int found = Leading_Digits(word);
-        if (found == 0)
-            return at;
-        scan.count += found;
-        if (scan.count <= Safe_Digits)
-            scan.digits = scan.digits * Integer_Powers[found] + Join_Digits(word, found);
-        at += found;
-        if (found < 8 || scan.count > Safe_Digits)
-            return at;
+    std::uint64_t strangers = 0;
+    while (count > 0) {
+        const unsigned taken = std::min(count, Word_Digits);
+        const std::uint64_t word = Load_Digits(at, taken);
+        scan.digits = scan.digits * Integer_Powers[taken] + Join_Digits(word);
+        strangers |= Strangers(word);
+        at += taken;
+        count -= taken;
     }
+    return strangers == 0;
 }
 
-/// An exponent counts only with a digit in it: "1e" is the number 1 and a letter.
-const char* Take_Exponent(const char* at, Decimal_Scan& scan)
+/// Takes `length` characters, digits with at most one point between them. False for anything else.
+bool Take_Mantissa_By_Words(const char* first, unsigned length, Decimal_Scan& scan)
 {
-    const char* digit = at + 1;
-    const bool negative = *digit == '-';
-    if (negative || *digit == '+')
-        ++digit;
-    if (!Is_Digit(*digit))
-        return at;
-    int exponent = 0;
-    for (; Is_Digit(*digit); ++digit)
-        exponent = exponent < 10000 ? exponent * 10 + (*digit - '0') : exponent;
-    scan.exponent += negative ? -exponent : exponent;
-    return digit;
+    const unsigned whole = Find_Point(first);
+    if (whole >= length)
+        return length <= Most_Safe_Digits && Take_Digits(first, length, scan);
+    const unsigned fraction = length - whole - 1;
+    scan.exponent -= static_cast<int>(fraction);
+    return whole != 0 && whole != Word_Digits && fraction != 0 && Take_Digits(first, whole, scan)
+           && Take_Digits(first + whole + 1, fraction, scan);
+}
+
+#if defined(__SSE2__)
+/// The same with all characters, where they are sixteen at most, in one register: the point is
+/// closed up, zeros come in front, and neighbours are joined as above.
+__attribute__((target("sse4.1"))) bool Take_Mantissa_At_Once(const char* first, unsigned length,
+                                                             Decimal_Scan& scan)
+{
+    if (length > 16)
+        return Take_Mantissa_By_Words(first, length, scan);
+    const __m128i digits =
+        _mm_sub_epi8(_mm_loadu_si128(reinterpret_cast<const __m128i*>(first)), _mm_set1_epi8('0'));
+    const __m128i good = _mm_cmpeq_epi8(_mm_min_epu8(digits, _mm_set1_epi8(9)), digits);
+    const unsigned strangers = ~static_cast<unsigned>(_mm_movemask_epi8(good)) & ((1U << length) - 1);
+    unsigned whole = length;
+    unsigned count = length;
+    if (strangers != 0) {
+        whole = static_cast<unsigned>(std::countr_zero(strangers));
+        count = length - 1;
+        if ((strangers & (strangers - 1)) != 0 || first[whole] != '.' || count == 0)
+            return false;
+        scan.exponent -= static_cast<int>(count - whole);
+    }
+    // Place i takes character i - (16 - count), or the next one from the point on; below 0, a zero.
+    const __m128i places = _mm_setr_epi8(0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15);
+    __m128i from = _mm_sub_epi8(places, _mm_set1_epi8(static_cast<char>(16 - count)));
+    from = _mm_sub_epi8(from, _mm_cmpgt_epi8(from, _mm_set1_epi8(static_cast<char>(whole - 1))));
+    const __m128i ones = _mm_shuffle_epi8(digits, from);
+    const __m128i pairs =
+        _mm_maddubs_epi16(ones, _mm_setr_epi8(10, 1, 10, 1, 10, 1, 10, 1, 10, 1, 10, 1, 10, 1, 10, 1));
+    const __m128i fours = _mm_madd_epi16(pairs, _mm_setr_epi16(100, 1, 100, 1, 100, 1, 100, 1));
+    const __m128i eights = _mm_madd_epi16(_mm_packus_epi32(fours, fours),
+                                          _mm_setr_epi16(10000, 1, 10000, 1, 10000, 1, 10000, 1));
+    const auto both = static_cast<std::uint64_t>(_mm_cvtsi128_si64(eights));
+    scan.digits = (both & 0xFFFFFFFFU) * Integer_Powers[Word_Digits] + (both >> 32);
+    return true;
+}
+
+bool (*const Take_Mantissa)(const char*, unsigned, Decimal_Scan&) = __builtin_cpu_supports("sse4.1")
+                                                                        ? Take_Mantissa_At_Once
+                                                                        : Take_Mantissa_By_Words;
+#else
+constexpr auto Take_Mantissa = Take_Mantissa_By_Words;
+#endif
+
+/// Cuts an exponent of the usual form, as "e-05" or "e+10", off the end.
+inline void Cut_Exponent(const char* first, const char*& last, Decimal_Scan& scan)
+{
+    constexpr std::ptrdiff_t width = 4;
+    if (last - first <= width || (last[-4] != 'e' && last[-4] != 'E'))
+        return;
+    const bool negative = last[-3] == '-';
+    if ((!negative && last[-3] != '+') || !Is_Digit(last[-2]) || !Is_Digit(last[-1]))
+        return;
+    const int exponent = (last[-2] - '0') * 10 + (last[-1] - '0');
+    scan.exponent = negative ? -exponent : exponent;
+    last -= width;
 }
 
 /// Where digits and power are exact as they are, one multiplication or division rounds once, which
 /// makes the nearest double.
-bool Convert_Exactly(const Decimal_Scan& scan, double& value)
+inline bool Convert_Exactly(const Decimal_Scan& scan, double& value)
 {
     if (scan.digits > Exact_Integer_Limit)
         return false;
@@ -260,10 +327,34 @@ bool Convert_Widely(const Decimal_Scan& scan, double& value)
     return (mantissa & 0x7FF) != 0x400;
 }
 
-/// The library takes what the quick roads don't.
-Parsed_Number Parse_By_Library(const char* first, const char* last)
+}  // namespace
+
+bool Parse_Usual_Number(const char* first, const char* last, double& value)
 {
-    const char* const start = *first == '+' ? first + 1 : first;
+    const bool negative = *first == '-';
+    first += negative ? 1 : 0;
+    Decimal_Scan scan;
+    Cut_Exponent(first, last, scan);
+    const std::ptrdiff_t length = last - first;
+    if (length < 1 || length > static_cast<std::ptrdiff_t>(Most_Safe_Digits) + 1
+        || !Take_Mantissa(first, static_cast<unsigned>(length), scan))
+        return false;
+    if (scan.exponent < -Greatest_Exact_Power || scan.exponent > Greatest_Exact_Power
+        || !(Convert_Exactly(scan, value) || Convert_Widely(scan, value)))
+        return false;
+    value = negative ? -value : value;
+    return true;
+}
+
+Parsed_Number Parse_Number(const char* first, const char* last)
+{
+    const char* start = first;
+    if (start != last && *start == '+')
+        ++start;
+    // The library would also take "inf" and "nan", and a second sign behind a "+".
+    const char* const digits = start != last && *start == '-' && start == first ? start + 1 : start;
+    if (digits == last || !(Is_Digit(*digits) || *digits == '.'))
+        return {first, 0.0, Number_Status::none};
     double value = 0.0;
     const auto [end, error] = std::from_chars(start, last, value);
     if (error == std::errc::invalid_argument)
@@ -271,53 +362,6 @@ Parsed_Number Parse_By_Library(const char* first, const char* last)
     if (error != std::errc{})
         return {end, 0.0, Number_Status::out_of_range};
     return {end, value, Number_Status::good};
-}
-
-}  // namespace
-
-Parsed_Number Parse_Number_In_Buffer(const char* first)
-{
-    const bool negative = *first == '-';
-    const char* at = first + (negative || *first == '+' ? 1 : 0);
-    Decimal_Scan scan;
-    at = Take_Digits(at, scan);
-    if (*at == '.') {
-        const int whole_digits = scan.count;
-        at = Take_Digits(at + 1, scan);
-        scan.exponent = whole_digits - scan.count;
-    }
-    if (scan.count == 0)
-        return {first, 0.0, Number_Status::none};
-    if (*at == 'e' || *at == 'E')
-        at = Take_Exponent(at, scan);
-    double value;
-    const bool in_reach = scan.count <= Safe_Digits && scan.exponent >= -Greatest_Exact_Power
-                          && scan.exponent <= Greatest_Exact_Power;
-    if (in_reach && (Convert_Exactly(scan, value) || Convert_Widely(scan, value)))
-        return {at, negative ? -value : value, Number_Status::good};
-    while (Is_Digit(*at) || *at == '.' || *at == '-' || *at == '+' || *at == 'e' || *at == 'E')
-        ++at;
-    return Parse_By_Library(first, at);
-}
-
-Parsed_Number Parse_Number(const char* first, const char* last)
-{
-    constexpr std::size_t room = 64;
-    const auto length = static_cast<std::size_t>(last - first);
-    if (length == 0)
-        return {first, 0.0, Number_Status::none};
-    if (length < room - Readable_Behind) {
-        char padded[room];
-        std::memcpy(padded, first, length);
-        std::memset(padded + length, 0, room - length);
-        const Parsed_Number parsed = Parse_Number_In_Buffer(padded);
-        return {first + (parsed.end - padded), parsed.value, parsed.status};
-    }
-    // The library would also take "inf" and "nan", and a second sign behind a "+".
-    const char* const digits = *first == '-' || *first == '+' ? first + 1 : first;
-    if (!Is_Digit(*digits) && *digits != '.')
-        return {first, 0.0, Number_Status::none};
-    return Parse_By_Library(first, last);
 }
 
 char* Print_Integer(char* target, std::int64_t value)

@@ -212,11 +212,8 @@ void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 /// The quick road: a number that fills its field, as most do.
 inline void Sheet_Filler::Fill_Number(const Text_Field& field, Column_Filling& state)
 {
-    const Parsed_Number parsed = Parse_Number_In_Buffer(field.first);
-    if (parsed.end == field.last && parsed.status == Number_Status::good && no_number_is_missing_)
-        [[likely]] {
-        Cell_Value value;
-        value.number = std::min(parsed.value, Greatest_Number);
+    Cell_Value value;
+    if (no_number_is_missing_ && Parse_Usual_Number(field.first, field.last, value.number)) [[likely]] {
         state.cells.Append(value);
     } else {
         state.cells.Append(missing_);
