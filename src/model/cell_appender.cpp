@@ -1,7 +1,6 @@
 #include "model/cell_appender.h"
 
 #include "interface/request/messages.h"
-#include "platform/folders.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -22,7 +21,6 @@ Cell_Node* New_Block(Block_Table& blocks, std::size_t count)
         throw std::bad_alloc();
     }
     blocks.emplace_back(block);
-    Advise_Large_Pages(block, count * sizeof(Cell_Node));
     return static_cast<Cell_Node*>(block);
 }
 

@@ -2,7 +2,6 @@
 
 #include "interface/request/messages.h"
 #include "model/sheet.h"
-#include "platform/folders.h"
 
 #include <algorithm>
 
@@ -13,8 +12,6 @@ void* Alloc_Zeroed(std::size_t bytes)
     void* const memory = std::calloc(std::max<std::size_t>(bytes, 1), 1);
     if (memory == nullptr)
         Report_Message("Error: Not enough memory to read data.\n");
-    else
-        Advise_Large_Pages(memory, bytes);
     return memory;
 }
 
@@ -68,7 +65,6 @@ template <class Node, class Set> std::size_t Alloc_Nodes(std::int64_t count, std
             Report_Message("Ingester out of memory.\n");
             return 0;
         }
-        Advise_Large_Pages(block, size * sizeof(Node));
         Link_Block(static_cast<Node*>(block), size, first, last, set);
         left -= size;
     }

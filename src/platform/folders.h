@@ -56,7 +56,4 @@ struct Local_Time {
 };
 [[nodiscard]] Local_Time Local_Time_Now();
 
-/// Asks the system to back a large, fresh allocation by large pages, where it can.
-void Advise_Large_Pages(void* memory, std::size_t bytes);
-
 }  // namespace ingester

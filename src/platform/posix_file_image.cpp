@@ -1,6 +1,5 @@
 #include "platform/file_image.h"
 
-#include "platform/folders.h"
 #include "support/progress.h"
 
 #include <algorithm>
@@ -131,7 +130,6 @@ bool File_Image::Read_All(Input_File& file)
             if (larger == nullptr)
                 return false;
             bytes_ = static_cast<char*>(larger);
-            Advise_Large_Pages(bytes_, room);
         }
         const std::size_t wanted = std::min(room - size_, Read_Block);
         const std::size_t got = file.Read(bytes_ + size_, wanted);

@@ -6,7 +6,6 @@
 #include <cstdlib>
 #include <ctime>
 
-#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -150,23 +149,6 @@ Local_Time Local_Time_Now()
     std::tm parts{};
     ::localtime_r(&now, &parts);
     return {parts.tm_hour, parts.tm_min, parts.tm_sec, parts.tm_mon + 1, parts.tm_mday, parts.tm_year + 1900};
-}
-
-void Advise_Large_Pages(void* memory, std::size_t bytes)
-{
-#ifdef MADV_HUGEPAGE
-    constexpr std::size_t large_page = std::size_t{2} << 20;
-    constexpr std::size_t page = 4096;
-    if (bytes < 2 * large_page)
-        return;
-    const auto address = reinterpret_cast<std::uintptr_t>(memory);
-    const std::uintptr_t first = (address + page - 1) / page * page;
-    const std::uintptr_t last = (address + bytes) / page * page;
-    ::madvise(reinterpret_cast<void*>(first), last - first, MADV_HUGEPAGE);  // advice: refusal is no fault
-#else
-    static_cast<void>(memory);
-    static_cast<void>(bytes);
-#endif
 }
 
 }  // namespace ingester
