@@ -46,7 +46,7 @@ private:
 
     Column* column_;
     std::int64_t block_size_;
-    std::int64_t appended_ = 0;  ///< in the blocks before the last
+    std::int64_t appended_ = 0;  ///< nodes in all blocks
     Cell_Node* next_ = nullptr;
     Cell_Node* block_end_ = nullptr;
     Cell_Node* last_ = nullptr;

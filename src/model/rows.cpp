@@ -150,7 +150,7 @@ void Remove_Row_Node(Sheet& sheet, std::int32_t index)
 bool Delete_Row(Sheet* sheet, std::int32_t index, bool keep_square)
 {
     if (sheet == nullptr || sheet->type == scalar_sheet || sheet->row_count <= 1 || index < 0
-        || index >= sheet->row_count)
+        || index >= sheet->row_count || !Need_Rows(sheet))
         return false;
     if (keep_square && sheet->type == symmetric_matrix_sheet)
         return Delete_Column(Column_At(sheet, sheet->leading_columns + index), true);

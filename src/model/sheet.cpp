@@ -81,10 +81,11 @@ bool Setup_Rows(Sheet* sheet)
     Free_Cell_Nodes(&numbers, row_column);
     sheet->row_blocks.clear();
     sheet->cursor_row_index = -1;
-    sheet->rows_due = false;
+    sheet->rows_due = true;
     if (Alloc_Row_Nodes(rows, sheet->first_row, sheet->last_row, sheet->row_blocks) == 0
         || Alloc_Cell_Nodes(row_column, rows, numbers.first_cell, numbers.last_cell, numbers.blocks) == 0)
         return false;
+    sheet->rows_due = false;
     numbers.length = rows;
     numbers.width = Row_Number_Width(rows);
     double number = 0.0;

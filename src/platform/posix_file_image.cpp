@@ -50,7 +50,7 @@ void Watch(const void* bytes, std::size_t length)
 {
     struct sigaction action = {};
     action.sa_sigaction = Replace_Lost_Page;
-    action.sa_flags = SA_SIGINFO;
+    action.sa_flags = SA_SIGINFO | SA_ONSTACK;  // where a host keeps a stack for signals
     ::sigemptyset(&action.sa_mask);
     watched.first = reinterpret_cast<std::uintptr_t>(bytes);
     watched.length = length;

@@ -24,8 +24,7 @@ bool Is_Blank_Or_Tab(char c)
 }  // namespace
 
 Field_Walker::Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer)
-    : text_(buffer), quotes_(options.separators_given), at_(buffer.first), window_(buffer.first),
-      window_end_(buffer.first), places_(Window_Size)
+    : text_(buffer), quotes_(options.separators_given), places_(Window_Size)
 {
     std::string marks = "\n\r";
     marks += options.separators_given ? options.separators.view() : " \t";
@@ -34,34 +33,43 @@ Field_Walker::Field_Walker(const Text_Scan_Options& options, const Text_Buffer& 
         if (quotes_ && !ends_.Holds(quote))
             marks += quote;
     marks_ = Byte_Finder(marks);
+    Go_To(buffer.first);
 }
 
 void Field_Walker::Go_To(const char* at)
 {
     at_ = at;
-    window_ = window_end_ = text_.first + (at - text_.first);
+    window_ = window_end_ = clean_end_ = text_.first + (at - text_.first);
     next_ = found_ = 0;
+    Blank_Out_Nuls();
 }
 
-/// The last line is ended like the others, so there is always another place until that is taken.
+/// The last line is ended like the others, so there is another place until that one is taken.
 void Field_Walker::Look_At_Next_Window()
 {
     do {
+        if (window_end_ == text_.last)
+            throw Text_Changed();
         window_ = window_end_;
         window_end_ += std::min(text_.last - window_, Window_Size);
         const auto size = static_cast<std::size_t>(window_end_ - window_);
         found_ = marks_.Find_All({window_, size}, places_.data());
+        Blank_Out_Nuls();
     } while (found_ == 0);
     next_ = 0;
 }
 
-/// A NUL would end the text for everything that reads it; a blank keeps the fields in their places.
-void Field_Walker::Blank_Out_Nuls(const Text_Field& field)
+/// A NUL would end the text for everything that reads it. A window ahead, so that whoever looks at the
+/// next field's start, or steps over blanks, sees none.
+void Field_Walker::Blank_Out_Nuls()
 {
-    char* const first = text_.first + (field.first - text_.first);
-    char* const last = first + (field.last - field.first);
-    nuls_ += std::count(first, last, '\0');
-    std::replace(first, last, '\0', ' ');
+    char* const first = clean_end_;
+    clean_end_ = window_end_ + std::min(text_.last - window_end_, Window_Size);
+    if (std::string_view(first, static_cast<std::size_t>(clean_end_ - first)).find('\0')
+        == std::string_view::npos) [[likely]]
+        return;
+    nuls_ += std::count(first, clean_end_, '\0');
+    std::replace(first, clean_end_, '\0', ' ');
 }
 
 bool Field_Walker::Is_Blank_Line(const char* line) const
@@ -131,11 +139,9 @@ const char* Field_Walker::First_Line() const
     return line;
 }
 
-Field_Content Field_Walker::Content(const Text_Field& field)
+Field_Content Field_Walker::Content(const Text_Field& field) const
 {
     std::string_view text(field.first, static_cast<std::size_t>(field.last - field.first));
-    if (text.find('\0') != std::string_view::npos) [[unlikely]]
-        Blank_Out_Nuls(field);
     if (!quotes_)
         return {text};
     while (!text.empty() && Is_Blank_Or_Tab(text.front()))

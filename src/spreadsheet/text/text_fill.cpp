@@ -21,7 +21,6 @@ enum class Filling : std::uint8_t {
     numbers_so_far,  ///< undecided: numbers until a field says otherwise
     numbers,         ///< a Variate by its mark: what isn't a number is missing
     texts,
-    passed_over,  ///< in the second walk: a column that the first one filled
 };
 
 struct Column_Filling {
@@ -68,7 +67,7 @@ private:
     void Fill_Names();
     void Name_Column(Column& column, std::string_view text);
     bool Fill_Rows();
-    bool Finish_Rows(const char* last_line);
+    void Finish_Rows(const char* last_line);
     void Report_Oddities() const;
     void Redo_Rows(const char* first_row);
     void Redo_Row();
@@ -101,9 +100,11 @@ private:
     std::string undoubled_;
 };
 
-/// By the lines of the sample; where rows turn out to be longer than that, blocks are left unused.
+/// By the lines that were looked at; where rows turn out to be longer than that, blocks are left unused.
 std::int64_t Sheet_Filler::Expected_Rows() const
 {
+    if (shape_.whole)
+        return shape_.rows + Spare_Rows;
     const auto size = static_cast<double>(buffer_.Text().size());
     const double by_sample = size / static_cast<double>(shape_.bytes) * static_cast<double>(shape_.rows);
     const double by_columns = size / shape_.columns;  // a cell takes at least its separator
@@ -172,7 +173,7 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
 {
     const Field_Content content = walker_.Content(field);
     const std::string_view text = Text_Of(content);
-    if (text.size() >= Long_Field && column.type == text_column)
+    if (text.size() > Text_Cell_Width && column.type == text_column)
         column.type = long_text_column;
     if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);
@@ -281,7 +282,7 @@ bool Sheet_Filler::Row_Is_Acceptable(const char* line)
         return Fail("Error: More than %li rows of %li columns are too many for a text of %li characters.\n",
                     static_cast<long>(row_limit_), static_cast<long>(columns_.size()),
                     static_cast<long>(buffer_.Text().size()));
-    return Line_Is_Short_Enough(line, walker_.Place(),
+    return Line_Is_Short_Enough({line, walker_.Place()},
                                 buffer_.lines_before + (shape_.has_names ? 2 : 1) + row_);
 }
 
@@ -293,7 +294,7 @@ void Sheet_Filler::Tell_Progress()
     told_ = walker_.Place();
     Show_Progress("Reading", told_ - buffer_.first, buffer_.last - buffer_.first);
     if (image_ != nullptr && shape_.nuls + walker_.Nuls() == 0)
-        image_->Release_Before(told_);
+        image_->Release_Before(std::min<const char*>(told_, buffer_.last - 1));  // whose line end may be ours
 }
 
 bool Sheet_Filler::Fill_Rows()
@@ -307,18 +308,18 @@ bool Sheet_Filler::Fill_Rows()
             return false;
         Tell_Progress();
     }
-    return Finish_Rows(line);
+    Finish_Rows(line);
+    return true;
 }
 
 /// A blank line at the end is no row.
-bool Sheet_Filler::Finish_Rows(const char* last_line)
+void Sheet_Filler::Finish_Rows(const char* last_line)
 {
     if (row_ > 0 && walker_.Is_Blank_Line(last_line))
         --row_;
     Expect_Rows(&sheet_, static_cast<std::int32_t>(row_));
     for (Column_Filling& state : columns_)
         state.cells.Finish(sheet_.row_count);
-    return row_ > 0;
 }
 
 void Sheet_Filler::Report_Oddities() const
@@ -373,7 +374,7 @@ bool Sheet_Filler::Fill()
         return false;
     Report_Oddities();
     Redo_Rows(first_row);
-    return true;
+    return sheet_.row_count > 0;
 }
 
 }  // namespace

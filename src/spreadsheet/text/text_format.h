@@ -8,6 +8,7 @@
 #include "support/fixed_text.h"
 
 #include <cstdint>
+#include <exception>
 #include <limits>
 #include <string_view>
 #include <vector>
@@ -17,8 +18,7 @@ namespace ingester {
 /// Longest line, or joined record, in characters.
 constexpr std::size_t Greatest_Line = 262140;
 
-/// The lines of a text in memory, the last one ended like the others. NULs in its fields
-/// become blanks as they are met.
+/// The lines of a text in memory, the last one ended like the others.
 struct Text_Buffer {
     char* first = nullptr;
     char* last = nullptr;
@@ -34,9 +34,9 @@ struct Text_Buffer {
 bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
                      bool& rewritten);
 
-/// Walks a text line by line; CR, LF and CR LF end one. A text given starts a walk, an empty view
-/// with a null pointer goes on. False at the end.
-bool Next_Text_Line(std::string_view text, std::string_view& line, bool& has_end);
+/// Whether a line, with its end or without, is of a length that is read; false after a message that
+/// calls it line `number`.
+bool Line_Is_Short_Enough(std::string_view line, std::int64_t number);
 
 enum Names_Mode : std::int32_t { names_decided = 0, names_given = 1, names_absent = 2 };
 
@@ -45,9 +45,7 @@ struct Text_Scan_Options {
     std::int32_t names_mode = names_decided;
     bool separators_given = false;
     Fixed_Text<20> separators;
-    bool auto_factors = true;
     bool trim_cells = true;
-    bool delete_empty_rows = true;
 };
 
 /// A field between its separators; the blanks in front are not part of it.
@@ -63,14 +61,17 @@ struct Field_Content {
     char quote = '\0';  ///< the pair that was taken away
 };
 
+/// The line end that a text stopped with is gone: its file was changed while it was read.
+struct Text_Changed : std::exception {};
+
 /// Walks the fields of a text, behind which `Readable_Behind` bytes may be read. The places of separators,
 /// line ends and quotes are found for a window of the text at once, so that cutting a field is looking up
-/// where the next of them stands.
+/// where the next of them stands. NULs become blanks ahead of the walk. Throws `Text_Changed`.
 class Field_Walker {
 public:
     Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer);
 
-    /// Goes to a place: the start of a line that is not before the one walked.
+    /// Goes to the start of a line, wherever the walk has come to.
     void Go_To(const char* at);
 
     /// The first of the lines that count: without separators, quoted lines at the head don't.
@@ -104,7 +105,7 @@ public:
     void Skip_Line();
 
     /// Whether a line stands here that isn't empty: the first empty one ends a text's rows.
-    [[nodiscard]] bool At_Line() const { return at_ != text_.last && *at_ != '\n' && *at_ != '\r'; }
+    [[nodiscard]] bool At_Line() const { return at_ < text_.last && *at_ != '\n' && *at_ != '\r'; }
 
     /// Whether the line that starts at `line` and ends here holds nothing but blanks.
     [[nodiscard]] bool Is_Blank_Line(const char* line) const;
@@ -115,7 +116,7 @@ public:
     [[nodiscard]] const char* Place() const { return at_; }
 
     /// What a field of this text says.
-    [[nodiscard]] Field_Content Content(const Text_Field& field);
+    [[nodiscard]] Field_Content Content(const Text_Field& field) const;
 
 private:
     /// The next separator or line end at or behind `from`.
@@ -133,7 +134,7 @@ private:
     [[nodiscard]] Text_Field Next_Quoted();
     [[nodiscard]] bool More_Behind(char end);
     void Look_At_Next_Window();
-    void Blank_Out_Nuls(const Text_Field& field);
+    void Blank_Out_Nuls();
 
     Text_Buffer text_;
     Byte_Finder ends_;   ///< separators, LF and CR
@@ -143,6 +144,7 @@ private:
     const char* at_;
     char* window_;
     char* window_end_;
+    char* clean_end_;                    ///< no NULs up to here, which is a window further
     std::vector<std::uint32_t> places_;  ///< of the marks in the window
     std::size_t next_ = 0;
     std::size_t found_ = 0;
@@ -170,10 +172,6 @@ struct Text_Shape {
 
 constexpr std::int64_t All_Lines = std::numeric_limits<std::int64_t>::max();
 
-/// Whether a line from `line` up to `end`, behind its line end, is of a length that is read; false
-/// after a message that calls it line `number`.
-bool Line_Is_Short_Enough(const char* line, const char* end, std::int64_t number);
-
 /// Finds the shape of a text by its first `lines` lines. False after a message. With fewer than
 /// all, columns whose type isn't sure stay undecided.
 bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
@@ -190,15 +188,12 @@ Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type);
 bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
                      const Text_Buffer& buffer, File_Image* image);
 
-/// From a text in memory to the `Current_Sheet`.
+/// From a text in memory to the `Current_Sheet`, which stays as it is when there is no table.
 bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
                        File_Image* image = nullptr);
 
 /// What a field says of its column's type: nothing, a number, or text.
 enum class Field_Kind : std::uint8_t { nothing, number, text };
 [[nodiscard]] Field_Kind Kind_Of_Field(const Field_Content& content, double& value);
-
-/// From so many characters on, text needs a Long Text column.
-constexpr std::size_t Long_Field = Text_Cell_Width + 1;
 
 }  // namespace ingester

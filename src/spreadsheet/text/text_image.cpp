@@ -11,12 +11,10 @@ namespace ingester {
 
 namespace {
 
-/// The lines of the loaded file, in order.
+/// The lines of a text, in order; LF, CR and CR LF end one.
 class Line_Source {
 public:
-    explicit Line_Source(std::string_view text)
-        : at_(text.data()), last_(at_ + text.size()), has_returns_(text.find('\r') != std::string_view::npos)
-    {}
+    explicit Line_Source(std::string_view text) : at_(text.data()), last_(at_ + text.size()) {}
 
     [[nodiscard]] std::int64_t Number() const { return number_; }
 
@@ -24,33 +22,28 @@ public:
     {
         if (at_ == last_)
             return false;
-        const auto left = static_cast<std::size_t>(last_ - at_);
-        const void* const feed = std::memchr(at_, '\n', left);
-        const char* end = feed == nullptr ? last_ : static_cast<const char*>(feed);
-        const char* next = feed == nullptr ? last_ : end + 1;
-        if (has_returns_)
-            End_At_Return(end, next);
+        // Each LF is looked for once, however many lines that end with a CR stand in front of it.
+        if (feed_ == nullptr || feed_ < at_)
+            feed_ = Find('\n', last_);
+        const char* const end = Find('\r', feed_);
         line = {at_, static_cast<std::size_t>(end - at_)};
-        at_ = next;
+        at_ = end == last_ ? end : end + 1;
+        if (end != feed_ && at_ == feed_ && feed_ != last_)
+            ++at_;
         ++number_;
         return true;
     }
 
 private:
-    void End_At_Return(const char*& end, const char*& next) const
+    [[nodiscard]] const char* Find(char c, const char* otherwise) const
     {
-        const void* const found = std::memchr(at_, '\r', static_cast<std::size_t>(end - at_));
-        if (found == nullptr)
-            return;
-        const char* const return_at = static_cast<const char*>(found);
-        if (return_at + 1 != end || end == last_)
-            next = return_at + 1;
-        end = return_at;
+        const void* const found = std::memchr(at_, c, static_cast<std::size_t>(otherwise - at_));
+        return found == nullptr ? otherwise : static_cast<const char*>(found);
     }
 
     const char* at_;
     const char* last_;
-    bool has_returns_;
+    const char* feed_ = nullptr;  ///< the next LF, or the text's end
     std::int64_t number_ = 0;
 };
 
@@ -124,8 +117,6 @@ bool Line_Keeper::Starts_Data(std::string_view line)
     if (!line.starts_with(request.Start_Text.view()))
         return false;
     start_pending_ = false;
-    next_ = image_.Bytes();
-    content_kept_ = false;
     return true;
 }
 
@@ -206,17 +197,14 @@ bool Line_Keeper::Keep(const Line_Range& range, Text_Buffer& buffer)
         end_found = !pending && !request.End_Text.empty() && line.starts_with(request.End_Text.view());
         if (end_found)
             break;
-        if (line.size() > Greatest_Line)
-            return Fail("Error: Line %li has more than %li characters.\n", static_cast<long>(lines_.Number()),
-                        static_cast<long>(Greatest_Line));
+        if (!Line_Is_Short_Enough(line, lines_.Number()))
+            return false;
         if (request.Lines_Per_Record >= 2)
             Take_Record(line);
         else
             Take_Line(line);
     }
     Report_Missed_Marks(end_found);
-    if (start_pending_)
-        next_ = image_.Bytes();
     buffer = {image_.Bytes(), next_};
     return true;
 }
@@ -234,18 +222,32 @@ void Cut_Head(const File_Image& image, bool strip_titles, Text_Buffer& buffer)
     buffer = {image.Bytes(), image.Bytes() + image.Size()};
     if (buffer.last[-1] != '\n' && buffer.last[-1] != '\r')
         *buffer.last++ = '\n';
-    bool has_end;
-    for (std::string_view line, text = buffer.Text(); Next_Text_Line(text, line, has_end); text = {}) {
+    Line_Source lines(buffer.Text());
+    for (std::string_view line; lines.Next(line);) {
         strip_titles = strip_titles && Is_Title_Line(line);
-        buffer.first = image.Bytes() + (line.data() - image.Bytes());
-        if (!line.empty() && !strip_titles)
+        if (!line.empty() && !strip_titles) {
+            buffer.first += line.data() - buffer.first;
+            buffer.lines_before = lines.Number() - 1;
             return;
-        ++buffer.lines_before;
+        }
     }
     buffer.first = buffer.last;
 }
 
 }  // namespace
+
+bool Line_Is_Short_Enough(std::string_view line, std::int64_t number)
+{
+    if (line.size() <= Greatest_Line)
+        return true;
+    if (line.ends_with('\n'))
+        line.remove_suffix(1);
+    if (line.ends_with('\r'))
+        line.remove_suffix(1);
+    return line.size() <= Greatest_Line
+           || Fail("Error: Line %li has more than %li characters.\n", static_cast<long>(number),
+                   static_cast<long>(Greatest_Line));
+}
 
 bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
                      bool& rewritten)
@@ -262,22 +264,6 @@ bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Tex
     if (rewritten)
         return Line_Keeper(image, strip_titles).Keep(range, buffer);
     Cut_Head(image, strip_titles, buffer);
-    return true;
-}
-
-bool Next_Text_Line(std::string_view text, std::string_view& line, bool& has_end)
-{
-    static std::string_view rest;
-    if (text.data() != nullptr)
-        rest = text;
-    if (rest.empty())
-        return false;
-    const std::size_t end = rest.find_first_of("\r\n");
-    has_end = end != std::string_view::npos;
-    line = rest.substr(0, end);
-    rest.remove_prefix(has_end ? end : rest.size());
-    if (has_end)
-        rest.remove_prefix(rest.starts_with("\r\n") ? 2 : 1);
     return true;
 }
 

@@ -29,9 +29,8 @@ bool Read_Text_Lines(Input_File& file)
     for (long number = 1; number <= wanted; ++number)
         if (!file.Read_Line(line, line.max_size()))
             return Fail("Could not read data file %.200s.\n", file.Name().c_str());
-    if (line.size() > Greatest_Line)
-        return Fail("Error: Line %li has more than %li characters.\n", wanted,
-                    static_cast<long>(Greatest_Line));
+    if (!Line_Is_Short_Enough(line, wanted))
+        return false;
     const char separator =
         request.Custom_Separators.empty() ? '\t' : request.Custom_Separators.view().front();
     const auto fields = std::count(line.begin(), line.end(), separator) + 1;

@@ -15,11 +15,8 @@ constexpr std::int64_t Sampled_Lines = 200;
 
 Text_Scan_Options Options_Of_Settings()
 {
-    const Settings& settings = Get_Settings();
     Text_Scan_Options options;
-    options.auto_factors = settings.auto_factors != 0;
-    options.trim_cells = settings.trim_cells != 0;
-    options.delete_empty_rows = settings.delete_empty_rows != 0;
+    options.trim_cells = Get_Settings().trim_cells != 0;
     if (request.No_Names)
         options.names_mode = names_absent;
     else if (request.Names_Given)
@@ -61,17 +58,16 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
     options.separators_given = !options.separators.empty();
     Text_Shape shape;
-    if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1
-        || (shape.whole && shape.rows - (shape.has_names ? 1 : 0) < 1))
+    if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1)
         return false;
     Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);
-    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image)) {
-        Current_Sheet = earlier;
+    Current_Sheet = earlier;
+    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image))
         return false;
-    }
     Cut_Type_Marks(*sheet);
     Make_Column_Names_Unique(sheet);
+    Current_Sheet = sheet;
     return true;
 }
 
@@ -92,11 +88,18 @@ bool Read_CSV(Input_File& file)
         blank_separated = true;
     else if (strip_titles && buffer.Holds('\t'))
         tab_file = true;
-    if (!Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated, rewritten ? nullptr : &image))
-        return false;
-    if (image.Changed())
-        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
-    return true;
+    Sheet* const earlier = Current_Sheet;
+    bool good = false;
+    bool changed = false;
+    try {
+        good = Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated, rewritten ? nullptr : &image);
+    } catch (const Text_Changed&) {
+        changed = true;
+    }
+    if (!changed && !image.Changed())
+        return good;
+    Current_Sheet = earlier;
+    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
 }
 
 bool Read_CSV_File(const char* file_name)

@@ -12,19 +12,20 @@ namespace ingester {
 
 namespace {
 
-/// Fields count for the type with so many characters.
-constexpr std::size_t Scanned_Width = 180;
-
 /// Whether the first line holds names: a number, a sign or "*" at the start of a field says no.
 class Names_Decision {
 public:
     explicit Names_Decision(const Text_Scan_Options& options) : options_(options) {}
 
-    [[nodiscard]] bool Decide(const char* at)
+    /// Looks at the first line of `text`.
+    [[nodiscard]] bool Decide(std::string_view text)
     {
-        for (; *at != '\n' && *at != '\r'; ++at)
-            if (Says_No(*at))
+        for (const char c : text) {
+            if (c == '\n' || c == '\r')
+                break;
+            if (Says_No(c))
                 return false;
+        }
         return true;
     }
 
@@ -92,21 +93,16 @@ void Take_Wanted_Type(std::int32_t index, std::string_view name, Column_Scan& co
     if (wanted <= 0)
         return;
     column.make_factor = wanted == factor_column;
-    const bool long_enough = wanted == text_column && column.type == long_text_column;
-    if (!column.make_factor && !long_enough)
+    if (!column.make_factor)
         column.type = wanted;
 }
 
-void Take_Field(Field_Content content, Column_Scan& column)
+/// Whether Text has to be Long Text shows when it is kept.
+void Take_Field(const Field_Content& content, Column_Scan& column)
 {
     double value;
-    content.text = content.text.substr(0, Scanned_Width);
-    while (!content.text.empty() && static_cast<unsigned char>(content.text.back()) <= 32)
-        content.text.remove_suffix(1);
     if (column.type == Undecided_Type && Kind_Of_Field(content, value) == Field_Kind::text)
         column.type = text_column;
-    if (column.type == text_column && content.text.size() >= Long_Field)
-        column.type = long_text_column;
 }
 
 /// Looks at the fields of one line; `names` when it is the line of names.
@@ -156,14 +152,6 @@ void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
 
 }  // namespace
 
-bool Line_Is_Short_Enough(const char* line, const char* end, std::int64_t number)
-{
-    constexpr std::ptrdiff_t line_end_width = 2;
-    return end - line <= static_cast<std::ptrdiff_t>(Greatest_Line) + line_end_width
-           || Fail("Error: Line %li has more than %li characters.\n", static_cast<long>(number),
-                   static_cast<long>(Greatest_Line));
-}
-
 bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t lines)
 {
@@ -173,13 +161,14 @@ bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, c
     walker.Go_To(first);
     if (!walker.At_Line())
         return true;
-    shape.has_names = options.names_mode == names_given
-                      || (options.names_mode == names_decided && Names_Decision(options).Decide(first));
+    shape.has_names =
+        options.names_mode == names_given
+        || (options.names_mode == names_decided && Names_Decision(options).Decide({first, buffer.last}));
     const char* line = first;
     for (; walker.At_Line() && shape.rows < lines; ++shape.rows) {
         line = walker.Place();
         Scan_Line(walker, shape.rows == 0 && shape.has_names, shape);
-        if (!Line_Is_Short_Enough(line, walker.Place(), buffer.lines_before + shape.rows + 1))
+        if (!Line_Is_Short_Enough({line, walker.Place()}, buffer.lines_before + shape.rows + 1))
             return false;
     }
     shape.bytes = static_cast<std::size_t>(walker.Place() - first);

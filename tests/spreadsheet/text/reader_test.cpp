@@ -2,6 +2,7 @@
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_test_support.h"
 #include "support/check_sheet.h"
+#include "support/progress.h"
 #include "support/request_fixture.h"
 #include "support/text.h"
 
@@ -75,6 +76,8 @@ TEST_F(Text_Reader, Decides_Whether_Names_Come_First)
         {"told that they do", "x.csv", "1,b\n1,2\n", "%1 V1; b V2", [] { request.Names_Given = true; }},
         {"told that they don't", "x.csv", "a,b\n1,2\n", "C1 Ta|1; C2 Tb|2", [] { request.No_Names = true; }},
         {"nothing but names", "x.csv", "a,b\n", ""},
+        {"nothing behind names", "x.csv", "a\n\n1\n", "", [] {},
+         "Warning: An empty line stands behind row 0, and what follows it was not read.\n"},
         {"names are made valid", "x.csv", "a b,,\"c,d\"\nx,2,3\n", "a_b Tx; C2 V2; c_d V3"},
         {"names that clash", "x.csv", "yield,yield\n1,2\n", "yield V1; yield1 V2"},
     };
@@ -112,8 +115,8 @@ TEST_F(Text_Reader, Cuts_Lines_And_Fields)
         {"empty lines at the head", "x.csv", "\n\r\na\n1\n", "a V1"},
         {"an empty line ends the rows, not one of blanks", "x.csv", "a\n1\n  \n2\n\n3\n", "a V1|*|2", [] {},
          "Warning: An empty line stands behind row 3, and what follows it was not read.\n"},
-        {"a NUL is a blank", "x.csv", std::string("a,b\n1,x\0y\n", 10), "a V1; b Tx y", [] {},
-         "Warning: 1 NUL characters in the text were read as blanks.\n"},
+        {"a NUL is a blank", "x.csv", std::string("a,b\n1,x\0y\n2,\0\"x,y\"\0\n", 20), "a V1|2; b Tx y|x,y",
+         [] {}, "Warning: 3 NUL characters in the text were read as blanks.\n"},
     };
     Try(cases);
 }
@@ -137,6 +140,7 @@ TEST_F(Text_Reader, Knows_Numbers_Texts_And_Missing_Cells)
              request.Column_Wanted_Types = {4, 3};
          }},
         {"90 characters", "x.csv", "a\n" + std::string(90, 'x') + "\n", "a T90 characters"},
+        {"90 characters are kept", "x.csv", "a\n\"" + std::string(89, 'x') + "\"\" \"\n", "a T90 characters"},
         {"91 characters", "x.csv", "a\ny\n" + std::string(91, 'x') + "\n", "a Ly|91 characters"},
         {"12000 characters", "x.csv", "a\n" + std::string(12000, 'x') + "\n", "a L10000 characters"},
     };
@@ -154,6 +158,7 @@ TEST_F(Text_Reader, Takes_The_Lines_That_Are_Asked_For)
     const std::string half(200000, '1');
     const Case cases[] = {
         {"lines 2 to 3", "x.csv", text, "a V1; b V2", range("2:3")},
+        {"lines that end with a CR", "x.csv", "x\ra,b\r\n1,2\r3,4", "a V1|3; b V2|4", range("2")},
         {"to line 1", "x.csv", text, "", range(":1")},
         {"no such range", "x.csv", text, "", range("3:2"), "Error: First line > Last line in cell range.\n"},
         {"start and end", "x.csv", text, "a V1|3; b V2|4", between("a,", "en")},
@@ -163,7 +168,7 @@ TEST_F(Text_Reader, Takes_The_Lines_That_Are_Asked_For)
         {"two lines to a record", "x.csv", "a \t\nb,\n1\n2,\n3,\n4\n", "a V1|3; b V2|4; C3 V*|*", joined},
         {"a record too long", "x.csv", half + "\n" + half + "\n1\n2\n", "C1 V*|1; C2 V*|2", joined,
          "Error: Combined CSV line length > 262140.\n"},
-        {"a line too long", "x.csv", "a\n" + half + half, "", [] {},
+        {"a line too long", "x.csv", "a\n" + std::string(262141, '1') + "\n", "", [] {},
          "Error: Line 2 has more than 262140 characters.\n"},
         {"columns that are too many", "x.csv", "a\n1\n1,2,3\n1,2,3,4\n", "a V1|1|1; C2 V*|2|2",
          [] { request.Max_Columns = 2; },
@@ -208,6 +213,27 @@ TEST_F(Text_Reader, Settles_Types_Late)
         Column* const column = Column_At(sheet, tried.column);
         EXPECT_EQ(Render(*column, *Cell_At(column, tried.row)), tried.cell) << tried.last;
     }
+}
+
+/// A file is mapped; what has been read is let go of in steps, and may be wanted again.
+TEST_F(Text_Reader, Reads_Files_That_Change_And_That_Do_Not)
+{
+    static std::filesystem::path path;
+    path = folder_ / "x.csv";
+    std::string text;
+    for (int row = 1; row < (1 << 22) / 8; ++row)
+        text += "1234567\n";
+    std::ofstream(path) << text << "abcdefg";
+    ASSERT_TRUE(Read_CSV_File(path.c_str()));
+    EXPECT_EQ(Column_At(Current_Sheet, 1)->first_cell->Text(), "1234567");
+
+    std::ofstream(path) << text << text << text;
+    progress_hook = [](const char*, std::int64_t, std::int64_t) {
+        std::filesystem::resize_file(path, 5000000);
+    };
+    EXPECT_FALSE(Read_CSV_File(path.c_str()));
+    progress_hook = nullptr;
+    EXPECT_EQ(Messages(), "Error: Could not read all of file " + path.string() + ".\n:\n");
 }
 
 // --- The rules of cutting and typing once more, slowly ----------------------------------------------
