@@ -1,7 +1,6 @@
 // The option language: what each option takes out of a string, and what it sets.
 #include "interface/slash_options.h"
 
-#include "interface/request/request.h"
 #include "support/request_fixture.h"
 
 namespace ingester {
@@ -15,6 +14,7 @@ struct Case {
     bool (*set)(const R& r);  ///< false for a fresh request, true behind the options
 };
 
+constexpr std::array codes = {-1.5, Star_Code, 3.0};
 const std::string long_text(300, 'w');
 
 bool Is_Wide(std::string_view text, std::size_t width)
@@ -58,10 +58,7 @@ TEST_F(Slash_Options_Test, Input)
         {"a/c3", "a", [](const R& r) { return r.First_Column == 3 && r.Last_Column == 2147483647; }},
         {"a/c99999999999:", "a", [](const R& r) { return r.First_Column == 2147483647; }},
         {"a/db", "a", [](const R& r) { return r.Print_Summary && !r.Use_Title_Row; }},
-        {"a/m=-1.5,*,3,4", "a",
-         [](const R& r) {
-             return r.Instat_Missing_Codes == std::array{-1.5, Star_Code, 3.0};
-         }},
+        {"a/m=-1.5,*,3,4", "a", [](const R& r) { return r.Instat_Missing_Codes == codes; }},
         {"a/d", "a", [](const R& r) { return r.Use_Title_Row && r.Title_Row == 0; }},
         {"a/d=$3", "a", [](const R& r) { return r.Title_Row_Absolute && r.Title_Row == 3; }},
         {"a/d2013.csv", "a2013.csv", [](const R& r) { return r.Use_Title_Row && r.Title_Row == 0; }},

