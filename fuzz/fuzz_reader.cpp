@@ -18,13 +18,6 @@ namespace {
 
 std::filesystem::path scratch_folder;
 
-void Empty_Scratch_Folder()
-{
-    std::error_code ignored;
-    for (const auto& entry : std::filesystem::directory_iterator(scratch_folder, ignored))
-        std::filesystem::remove_all(entry.path(), ignored);
-}
-
 /// The choice that one character of the head makes among `count`; '0' is the first.
 std::size_t Choice(std::byte character, std::size_t count)
 {
@@ -85,7 +78,6 @@ extern "C" int LLVMFuzzerInitialize(int* /*count*/, char*** /*arguments*/)
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
     using namespace ingester;
-    static std::uint64_t inputs = 0;
     auto bytes = std::as_bytes(std::span(data, size));
     Start_Request();
     const std::string_view name = FUZZ_PREPARE(bytes);
@@ -98,7 +90,5 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         std::abort();
     }
     Free_Sheets();
-    if (++inputs % 1000 == 0)
-        Empty_Scratch_Folder();
     return 0;
 }

@@ -8,7 +8,6 @@
 
 #include <fcntl.h>
 #include <sys/mman.h>
-#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -29,7 +28,6 @@ struct Ran {
 struct Setting {
     std::string input = Crops;
     bool close_output = false;  ///< run without a standard output
-    ::rlim_t greatest_file = RLIM_INFINITY;
     const char* temp_folder = "temp";
 };
 
@@ -64,14 +62,12 @@ protected:
             ::close(input);
             return child;
         }
-        const ::rlimit limit{setting.greatest_file, setting.greatest_file};
         ::dup2(input, STDIN_FILENO);
         ::dup2(out_, STDOUT_FILENO);
         ::dup2(err_, STDERR_FILENO);
         if (setting.close_output)
             ::close(STDOUT_FILENO);
-        if (::chdir(Path("").c_str()) == 0 && ::setenv("TMPDIR", setting.temp_folder, 1) == 0
-            && ::setrlimit(RLIMIT_FSIZE, &limit) == 0)
+        if (::chdir(Path("").c_str()) == 0 && ::setenv("TMPDIR", setting.temp_folder, 1) == 0)
             ::execv(words[0], const_cast<char* const*>(words.data()));
         ::_exit(127);
     }
@@ -108,11 +104,7 @@ TEST_F(Command_Test, Converts)
 {
     const std::string head = "plot\tkind\tyield\r\n1\toats\t2.5\r\n";
     Put("few.csv", "x,y\n1,oats\n");
-    const struct {
-        Texts arguments;
-        const char* output;
-        std::string text;
-    } cases[] = {
+    const std::tuple<Texts, const char*, std::string> cases[] = {
         {{"crops.csv", "out.tab"}, "out.tab", Crops_Tab},
         {{"my data/crops 1.csv", "my data/out 1.tab"}, "my data/out 1.tab", Crops_Tab},
         {{"-", "in.tab"}, "in.tab", Crops_Tab},
@@ -149,15 +141,10 @@ TEST_F(Command_Test, Standard_Output_Gets_What_A_Comma_File_Gets)
 
 TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
 {
-    Put("empty.csv", "");
     Put("folder/odd.bin", std::string("\1\2\3\4 no text\n", 13));
     const std::string files = Files();
     const std::string many(1110, 'x');
-    const struct {
-        int status;
-        const char* said;
-        Texts arguments;
-    } cases[] = {
+    const std::tuple<int, const char*, Texts> cases[] = {
         {6, "ingester: old.tab: the file exists already", {"crops.csv", "old.tab"}},
         {6, "--force", {"crops.csv", "./old.tab", "--out-options", "/av"}},
         {6, "ingester: folder: this is a folder", {"crops.csv", "folder", "--force"}},
@@ -168,14 +155,11 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {Wrong_Command_Line, "crops.csv", {"crops.csv", "out.tab", "--in-options=/s=" + many}},
         {Wrong_Command_Line, "--sheet", {"crops.csv", "out.tab", "--sheet", many.substr(0, 281)}},
         {Wrong_Command_Line, "--range", {"crops.csv", "out.tab", "--range", many.substr(0, 281)}},
-        {Wrong_Command_Line, "OUTPUT", {"crops.csv", ""}},
         {Wrong_Command_Line, "OUTPUT", {"crops.csv"}},
         {Wrong_Command_Line, "begin with '/'", {"crops.csv", "out.tab", "--in-options", "n"}},
         {Wrong_Command_Line, "more", {"crops.csv", "out.tab", "more"}},
         {2, "no/crops.csv", {"no/crops.csv", "out.tab"}},
         {2, "no/crops.csv", {"no/crops.csv", "old.tab", "--force"}},
-        {2, "folder", {"folder", "out.tab"}},
-        {2, "empty.csv", {"empty.csv", "out.tab"}},
         {3, "folder/odd.bin", {"folder/odd.bin", "out.tab"}},
         {6, "none/deep", {"crops.csv", "none/deep/out.tab"}},
     };
@@ -195,22 +179,6 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
     const Ran homeless = Run({"crops.csv", "out.tab"}, {.temp_folder = "/nonexistent"});
     EXPECT_EQ(homeless.status, 1);
     EXPECT_NE(homeless.err.find("/nonexistent"), std::string::npos) << homeless.err;
-}
-
-TEST_F(Command_Test, An_Output_Beyond_The_Room_For_It_Is_Absent_And_An_Older_One_Stays)
-{
-    std::string large = "plot,yield\n";
-    for (int i = 0; i < 30000; ++i)
-        large += "1,2.5\n";
-    Put("large.csv", large);
-    const std::string files = Files();
-    for (const char* output : {"new.tab", "old.tab"}) {
-        const Ran ran = Run({"--force", "large.csv", output}, {.greatest_file = 65536});
-        EXPECT_EQ(ran.status, 6) << output;
-        EXPECT_NE(ran.err, "") << output;
-        EXPECT_EQ(Files(), files) << output;
-    }
-    EXPECT_EQ(Get("old.tab"), "old\r\n");
 }
 
 TEST_F(Command_Test, A_Signal_Takes_The_Temporary_Folder_Along)

@@ -31,10 +31,7 @@ TEST(Request_Text, Messages_Name_Files_As_The_User_Does_And_Keep_All_Else)
     const Sent_Name out{"out/new/x.tab", "out\\new\\x.tab"};
     const Sent_Name deep{"d/" + f + "/x.csv", "d\\" + f + "\\x.csv"};
     const Sent_Name stream{"standard output", "\\tmp\\private\\x.csv"};  // a stand-in is known as a whole
-    const struct {
-        const Sent_Name &input, &output;
-        std::string message, told;
-    } cases[] = {
+    const std::tuple<Sent_Name, Sent_Name, std::string, std::string> cases[] = {
         {in, out, "CSV data file in\\crops.csv not found.\n", "CSV data file in/crops.csv not found.\n"},
         {in, out, "directory out\\new\\ does not exist.\n", "directory out/new/ does not exist.\n"},
         {in, out, "directory out\\new does not exist.\n", "directory out/new does not exist.\n"},

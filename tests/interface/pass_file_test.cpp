@@ -14,11 +14,8 @@ using Pass_File_Test = Host_Test;
 
 TEST_F(Pass_File_Test, Each_Fault_Has_Its_Words_And_Leaves_The_File)
 {
-    const struct {
-        std::string name;
-        std::uint32_t limit;
-        std::string before;  ///< what stands before the record in the file
-    } records[] = {
+    const std::tuple<std::string, std::uint32_t, std::string> records[] = {
+        // with what stands before them
         {"Infile", 1120, Little(2.0)},
         {"Outfile", 1120, Pass_Bytes(2, {"i"})},
         {"Worksheet", 280, Pass_Bytes(3, {"i", ""})},
@@ -75,36 +72,37 @@ std::string Carrier_Bytes(std::size_t changed, std::uint32_t value, double id)
 TEST_F(Pass_File_Test, A_Carrier_Names_The_Files_By_Its_Id)
 {
     constexpr std::size_t skipped = 5;
-    std::vector<std::pair<std::string, std::string>> cases = {
-        // a carrier, and the stem of the files that it leads to
-        {Carrier_Bytes(skipped, 0, 6699.9), "IG1A2B"},
-        {Carrier_Bytes(skipped, 7, 2147483647.0), "IG7FFFFFFF"},
-        {Carrier_Bytes(7, 0xFFFFFFFE, 10.0), "IGA"},
-        {Carrier_Bytes(7, 0xFFFFFFFD, 10.0), "TxtToNum"},  // both counts cancel out
-        {Carrier_Bytes(9, 1, 10.0), "TxtToNum"},
-        {Carrier_Bytes(skipped, 7, 10.0).substr(0, 63), "TxtToNum"},
-        {"", "TxtToNum"},
+    std::vector<std::pair<std::string, std::int64_t>> cases = {
+        {Carrier_Bytes(skipped, 0, 6699.9), 6699},
+        {Carrier_Bytes(skipped, 7, 2147483647.0), 2147483647},
+        {Carrier_Bytes(7, 0xFFFFFFFE, 10.0), 10},
+        {Carrier_Bytes(7, 0xFFFFFFFD, 10.0), 0},  // both counts cancel out
+        {Carrier_Bytes(skipped, 7, 10.0).substr(0, 63), 0},
     };
     for (const double id : {2147483648.0, 0.5, -3.0, std::nan("")})
-        cases.emplace_back(Carrier_Bytes(skipped, 7, id), "TxtToNum");
-    for (const std::size_t faulty : {0U, 6U, 8U, 10U, 11U})
-        cases.emplace_back(Carrier_Bytes(faulty, faulty == 0 ? 2 : faulty == 11 ? 1 : 0, 10.0), "TxtToNum");
+        cases.emplace_back(Carrier_Bytes(skipped, 7, id), 0);
+    for (const auto& [word, value] : {std::pair(0U, 2U), {6U, 0U}, {8U, 0U}, {9U, 1U}, {10U, 0U}, {11U, 1U}})
+        cases.emplace_back(Carrier_Bytes(word, value, 10.0), 0);
+    for (const auto& [bytes, id] : cases) {
+        Put("carrier.bin", bytes);
+        EXPECT_EQ(Read_Carrier_Id(Request_Name("carrier.bin")), id);
+    }
     std::filesystem::create_directory(Path("sub"));
     std::string name = Request_Name("sub\\carrier.bin");
     for (std::size_t at = 0; (at = name.find('\\', at)) != std::string::npos; at += 2)
         name.insert(at, 1, '\\');  // as a host writes it
-    for (const auto& [bytes, stem] : cases) {
-        Put("sub/carrier.bin", bytes);
-        const bool by_id = stem != "TxtToNum";
+    for (const std::string stem : {"IG1A2B", "TxtToNum"}) {
+        const bool by_id = stem == "IG1A2B";
+        Put("sub/carrier.bin", by_id ? Carrier_Bytes(skipped, 0, 6699.9) : "");
         const std::string pass = by_id ? stem + ".tmp" : "ingester.inp";
-        const auto answer = [&, &stem = stem] {
+        const auto answer = [&] {
             INGESTER(name.data(), nullptr, static_cast<std::int32_t>(name.size()), 5);
             return Take_Answer(stem, by_id ? stem + ".out" : "ingester.out");
         };
         EXPECT_EQ(answer(), (Host_Answer{1, "Pass file " + Request_Name(pass) + " not found./n:\n"}));
         Put(pass, Pass_Bytes(2, {"", "o.tab"}));
         EXPECT_EQ(answer(), (Host_Answer{3, "Input file name is NULL or empty.\nFiles type unknown.\n:\n"}));
-        EXPECT_EQ(Files(), "sub sub/carrier.bin");
+        EXPECT_EQ(Files(), "carrier.bin sub sub/carrier.bin");
     }
 }
 
@@ -125,15 +123,9 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
 {
     using enum Add_Modes;
     const std::string folder = Request_Name("");
-    const struct {
-        const char* secondary;
-        double count;
-        std::vector<const char*> more;  ///< records behind it: lists by name in the folder
-        const char* rest;
-        Add_Modes mode;
-        std::int32_t names;  ///< read from a list; below 0 for no subset
-        std::int32_t flags;
-    } cases[] = {
+    // The record, the count, lists in records behind it; then what it leaves, the mode, and the numbers of
+    // names and flags that were read, below 0 for no subset.
+    const std::tuple<std::string, double, Texts, std::string, Add_Modes, int, int> cases[] = {
         {"", 5, {}, "", none, -1, -1},
         {"d.csv/a", 5, {}, "d.csv", append, -1, -1},
         {"/m/c/a d.csv", 5, {}, " d.csv", merge, -1, -1},
@@ -147,25 +139,27 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
         {"d.csv/a/r/s", 6, {"columns", "rows"}, "d.csv", append, 2, 3},
         {"absent/s", 5, {}, "absent", none, -1, -1},
     };
-    for (const auto& one : cases) {
-        SCOPED_TRACE(one.secondary);
+    for (const auto& [secondary, count, lists, rest, mode, names, flags] : cases) {
+        SCOPED_TRACE(secondary);
         Start_Request("t");
         Put("columns", "2\nVariate\n a \nb\nc\n");
         Put("rows", "3\n1\n0\n1\n");
-        Texts records = {"i", "o", "w", "r", *one.secondary ? folder + one.secondary : ""};
-        for (const char* const name : one.more)
-            records.push_back(folder + name);
-        const std::string bytes = Pass_Bytes(one.count, records);
+        Texts records = {"i", "o", "w", "r", secondary.empty() ? "" : folder + secondary};
+        for (const std::string& list : lists)
+            records.push_back(folder + list);
+        const std::string bytes = Pass_Bytes(count, records);
         Input_File file(std::as_bytes(std::span(bytes)));
         Pass_Request asked;
         ASSERT_TRUE(Read_Pass_File(file, asked)) << Messages();
-        EXPECT_EQ(static_cast<std::size_t>(file.Position()), bytes.size());
-        EXPECT_EQ(request.Secondary_File.view(), *one.secondary ? folder + one.rest : "");
-        EXPECT_EQ(request.Add_Mode, one.mode);
-        EXPECT_EQ(request.Subset_Columns ? request.Subset_Name_Count : -1, one.names);
-        EXPECT_EQ(request.Subset_Rows ? request.Subset_Row_Count : -1, one.flags);
-        EXPECT_EQ(std::filesystem::exists(Path("columns")), one.names < 0);
-        EXPECT_EQ(std::filesystem::exists(Path("rows")), one.flags < 0);
+        EXPECT_EQ(file.Position(), std::ssize(bytes));
+        EXPECT_EQ(request.Secondary_File.view(), secondary.empty() ? "" : folder + rest);
+        EXPECT_EQ(request.Add_Mode, mode);
+        EXPECT_EQ(request.Subset_Columns ? request.Subset_Name_Count : -1, names);
+        EXPECT_EQ(request.Subset_Rows ? request.Subset_Row_Count : -1, flags);
+        EXPECT_EQ(Files(), names < 0 && flags < 0 ? "columns rows"
+                           : names < 0            ? "columns"
+                           : flags < 0            ? "rows"
+                                                  : "");
     }
 }
 
@@ -173,12 +167,7 @@ TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
 {
     const std::string thousand(1000, 'x');
     const std::string nuls("\0\1\xFF\0\n\n\0\n\0", 9);
-    const struct {
-        std::string text;
-        Texts names;
-        bool by_number;
-        std::vector<std::int32_t> flags;
-    } cases[] = {
+    const std::tuple<std::string, Texts, bool, std::vector<std::int32_t>> cases[] = {
         {"", {}, true, {}},
         {"2", {}, true, {}},
         {"1\r\nv\r\nyield\r\nmore\r\n", {"yield"}, false, {0}},
@@ -190,17 +179,14 @@ TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
         {"2\n\n" + thousand + "y\n", {thousand, "y"}, true, {0, 0}},
         {std::string(100, ' ') + "2\nV\na\nb\n", {}, true, {}},  // the count's line is cut at 100
     };
-    for (const auto& one : cases) {
-        SCOPED_TRACE(one.text.substr(0, 30));
-        Put("list", one.text);
-        EXPECT_TRUE(Read_Column_Subset(Request_Name("list")));
-        EXPECT_EQ(request.Subset_Names, one.names);
-        EXPECT_EQ(request.Subset_By_Number, one.by_number);
-        EXPECT_EQ(Files(), "");
-        Put("list", one.text);
-        EXPECT_TRUE(Read_Row_Subset(Request_Name("list")));
-        EXPECT_EQ(request.Subset_Row_Flags, one.flags);
-        EXPECT_EQ(Files(), "");
+    for (const auto& [text, names, by_number, flags] : cases) {
+        Put("list", text);
+        EXPECT_TRUE(Read_Column_Subset(Request_Name("list")) && Files().empty());
+        EXPECT_EQ(request.Subset_Names, names);
+        EXPECT_EQ(request.Subset_By_Number, by_number) << text;
+        Put("list", text);
+        EXPECT_TRUE(Read_Row_Subset(Request_Name("list")) && Files().empty());
+        EXPECT_EQ(request.Subset_Row_Flags, flags) << text;
         EXPECT_FALSE(Read_Column_Subset(Request_Name("list")) || Read_Row_Subset(""));
     }
 }

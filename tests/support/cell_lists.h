@@ -38,16 +38,25 @@ inline void Put_Levels(Column& column, const std::vector<double>& values, const 
     return numbers;
 }
 
+/// Of all columns, the Row column's first.
+[[nodiscard]] inline Texts Names_Of(const Sheet* sheet)
+{
+    Texts names;
+    for (const Column* column = sheet->first_column; column != nullptr; column = column->next)
+        names.emplace_back(column->name.view());
+    return names;
+}
+
 /// "*" for a missing number; texts of 90 and more as their length.
 inline std::string Render(const Column& column, const Cell_Node& cell)
 {
-    const std::string text(Is_Text_Like(column.type) ? cell.Text() : "");
     char number[Number_Text_Room];
-    if (!Is_Text_Like(column.type))
-        return Is_Present(*column.sheet, cell.value.number)
-                   ? std::string(number, Print_General(number, cell.value.number, 15))
-                   : "*";
-    return text.size() < 90 ? text : std::to_string(text.size()) + " characters";
+    if (Is_Text_Like(column.type))
+        return cell.Text().size() < 90 ? std::string(cell.Text())
+                                       : std::to_string(cell.Text().size()) + " characters";
+    if (!Is_Present(*column.sheet, cell.value.number))
+        return "*";
+    return {number, Print_General(number, cell.value.number, 15)};
 }
 
 /// All columns, as "name V1|*|3; name Tx||y": the first letter of the type (L for Long Text) and the cells.

@@ -11,10 +11,10 @@ public:
     std::string Check(const Sheet& sheet);
 
 private:
-    /// What is wrong `at` a place of the part that is being looked at. Enough is enough for a reader.
+    /// What is wrong at a place of the part that is being looked at.
     void Expect(bool right, std::string_view what, std::int64_t at)
     {
-        if (!right && faults_.size() < 1000)
+        if (!right && faults_.size() < 1000)  // enough for a reader
             faults_.append(where_)
                 .append(": ")
                 .append(what)
@@ -23,23 +23,18 @@ private:
                 .append("\n");
     }
 
-    /// Walks a list of `count` nodes, shows each to `visit(node, index)` and checks its links, its length
-    /// and its remembered position. The last node.
-    template <class Node, class Visit> const Node* Check_List(const Node* first, std::int64_t count,
-                                                              const Node* cursor, std::int64_t cursor_index,
-                                                              Visit visit)
+    /// Walks a list of `count` nodes and checks its links, its length and its remembered position. The last
+    /// node.
+    template <class Node> const Node* Check_List(const Node* first, std::int64_t count,
+                                                 const Node* cursor = nullptr, std::int64_t cursor_index = -1)
     {
-        const std::string where = where_;
         const Node* before = nullptr;
         const Node* node = first;
         std::int64_t index = 0;
         for (; node != nullptr && index < count; before = node, node = node->next, ++index) {
-            where_ = where;
             Expect(node->prev == before, "no link back from node", index);
             Expect(index != cursor_index || node == cursor, "another remembered node at", index);
-            visit(*node, index);
         }
-        where_ = where;
         Expect(node == nullptr, "more nodes than", count);
         Expect(index == count, "nodes in all:", index);
         Expect(cursor_index >= -1 && cursor_index < count, "remembered is the far position", cursor_index);
@@ -50,7 +45,7 @@ private:
     void Check_Column(const Sheet& sheet, const Column& column, std::int64_t index);
 
     std::string faults_;
-    std::string where_;
+    std::string where_ = "columns";
 };
 
 void Checker::Check_Cell(const Column& column, const Cell_Node& cell, std::int64_t index)
@@ -80,34 +75,36 @@ void Checker::Check_Column(const Sheet& sheet, const Column& column, std::int64_
         rows += sheet.leading_columns - column.index;
     Expect(column.length == rows || (column.length <= 0 && rows <= 0), "has the length", column.length);
     const Cell_Node* const last =
-        Check_List(column.first_cell, std::max(column.length, 0), column.cursor_node, column.cursor_index,
-                   [&](const Cell_Node& cell, std::int64_t at) { Check_Cell(column, cell, at); });
+        Check_List(column.first_cell, std::max(column.length, 0), column.cursor_node, column.cursor_index);
     Expect(column.last_cell == last, "another last node than", column.length);
-    if (column.type != factor_column)
-        return;
-    const Level_Node* const none = nullptr;
-    Check_List(column.level_values, column.level_values_count, none, -1, [](auto&, auto) {});
-    Check_List(column.labels, column.label_count, none, -1, [&](const Level_Node& label, std::int64_t at) {
-        Expect(label.value.text != nullptr && label.Text().size() <= Text_Cell_Width, "no good label", at);
-    });
-    Expect(column.factor_kind != factor_with_levels || column.level_values_count >= column.nlevels,
+    Check_List(column.level_values, column.level_values_count);
+    Check_List(column.labels, column.label_count);
+    std::int64_t at = 0;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr && faults_.empty(); cell = cell->next)
+        Check_Cell(column, *cell, at++);
+    for (const Level_Node* label = column.labels; label != nullptr && faults_.empty(); label = label->next)
+        Expect(label->value.text != nullptr && label->Text().size() <= Text_Cell_Width,
+               "a label that is no text", 0);
+    const bool factor = column.type == factor_column;
+    Expect(!factor || column.factor_kind != factor_with_levels || column.level_values_count >= column.nlevels,
            "level values are only", column.level_values_count);
-    Expect(column.factor_kind != factor_with_labels || column.label_count >= column.nlevels,
+    Expect(!factor || column.factor_kind != factor_with_labels || column.label_count >= column.nlevels,
            "labels are only", column.label_count);
 }
 
 std::string Checker::Check(const Sheet& sheet)
 {
-    where_ = "columns";
-    const Column* const last_column =
-        Check_List(sheet.first_column, std::int64_t{sheet.column_count} + 1, sheet.cursor_column,
-                   sheet.cursor_column_index,
-                   [&](const Column& column, std::int64_t index) { Check_Column(sheet, column, index); });
+    const Column* const last_column = Check_List(sheet.first_column, std::int64_t{sheet.column_count} + 1,
+                                                 sheet.cursor_column, sheet.cursor_column_index);
     Expect(sheet.last_column == last_column, "another last node than", sheet.column_count);
     where_ = "rows";
     const Row_Node* const last_row = Check_List(sheet.first_row, sheet.rows_due ? 0 : sheet.row_count,
-                                                sheet.cursor_row, sheet.cursor_row_index, [](auto&, auto) {});
+                                                sheet.cursor_row, sheet.cursor_row_index);
     Expect(sheet.last_row == last_row, "another last node than", sheet.row_count);
+    std::int64_t index = 0;
+    for (const Column* column = sheet.first_column; column != nullptr && faults_.empty();
+         column = column->next)
+        Check_Column(sheet, *column, index++);
     return faults_;
 }
 

@@ -36,47 +36,36 @@ protected:
 
 TEST_F(Text_Writer, Lays_Out_Every_Kind_Of_Column)
 {
-    const struct {
-        const char* told;
-        bool tab_mode;
-        void (*change)();
-        const char* text;
-    } cases[] = {
+    const auto bare = [] {
+        Packed();
+        Get_Settings().csv_quote_text = 0;
+        request.No_Name_Marks = true;
+        request.Missing_Text.assign("NA");
+    };
+    const std::tuple<const char*, bool, void (*)(), const char*> cases[] = {
         {"packed commas", false, Packed,
-         "number,t,size!,dose!,plain!,day:D\r\n"
-         "1,\"say \"\"hi\"\"\",\"s\",0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\n"
-         "*,\"a,b\tc\",\"b\"\"g\",*,*,5\r\n"},
-        {"no quotes, no marks, another missing text", false,
-         [] {
-             Packed();
-             Get_Settings().csv_quote_text = 0;
-             request.No_Name_Marks = true;
-             request.Missing_Text.assign("NA");
-         },
-         "number,t,size,dose,plain,day\r\n"
-         "1,say \"hi\",s,0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\n"
-         "NA,\"a,b\tc\",b\"g,NA,NA,5\r\n"},
+         "number,t,size!,dose!,plain!,day:D\r\n1,\"say \"\"hi\"\"\",\"s\",0.5,2,3\r\n"
+         "-0.1,, ,1234567.25,1,4\r\n*,\"a,b\tc\",\"b\"\"g\",*,*,5\r\n"},
+        {"no quotes, no marks, another missing text", false, bare,
+         "number,t,size,dose,plain,day\r\n1,say \"hi\",s,0.5,2,3\r\n"
+         "-0.1,, ,1234567.25,1,4\r\nNA,\"a,b\tc\",b\"g,NA,NA,5\r\n"},
         {"padded commas", false, [] { request.CSV_Output = true; },
          "number,t,size!,dose!,plain!,day:D\r\n"
          "      1,\"say \"\"hi\"\"\" ,    \"s\",        0.5,      2,     3\r\n"
          "   -0.1,             ,       , 1234567.25,      1,     4\r\n"
          "      *,\"a,b\tc\"      , \"b\"\"g\",          *,      *,     5\r\n"},
         {"tabs, without names", true, [] { request.Omit_Header = true; },
-         "1\tsay \"hi\"\ts\t0.5\t2\t3\r\n"
-         "-0.1\t\t \t1234567.25\t1\t4\r\n"
-         "*\t\"a,b\tc\"\tb\"g\t*\t*\t5\r\n"},
+         "1\tsay \"hi\"\ts\t0.5\t2\t3\r\n-0.1\t\t \t1234567.25\t1\t4\r\n*\t\"a,b\tc\"\tb\"g\t*\t*\t5\r\n"},
         {"fixed width", false, [] { Get_Settings().csv_title = 0; },
          " number        t size!      dose! plain! day:D\r\n"
          "      1 say \"hi\"     s        0.5      2     3\r\n"
          "   -0.1                1234567.25      1     4\r\n"
          "      * a,b\tc      b\"g          *      *     5\r\n"},
     };
-    for (const auto& tried : cases) {
+    for (const auto& [told, tab_mode, change, text] : cases) {
         Start_Request("t");
-        tried.change();
-        EXPECT_EQ(Written(Mixed_Sheet(), tried.tab_mode), tried.text) << tried.told;
+        change();
+        EXPECT_EQ(Written(Mixed_Sheet(), tab_mode), text) << told;
     }
 }
 
@@ -91,16 +80,14 @@ TEST_F(Text_Writer, Justifies_Fixed_Width_Below_A_Title)
     Put_Levels(*factor, {1, 2}, {"x", "yyy"});
     factor->justify = left_side;
     Add_Cells(sheet, factor_column, "g", {"1", "*"});
-    const std::pair<const char*, const char*> cases[] = {
+    const std::pair<const char*, std::string> cases[] = {
         {"out.txt", "out.txt"}, {"out.$$$", "out"}, {"Clipboard.$$$", "trial"}, {"$Clip$.txt", "trial"}};
     for (const auto& [file, title] : cases) {
         std::string text = Written(sheet, false, file);
         std::replace_if(text.begin(), text.begin() + static_cast<long>(text.find('\n')), Is_Digit, '9');
-        EXPECT_EQ(text, "\"" + std::string(title)
-                            + " (Created by Ingester: 99:99:99 99/99/99)\"\r\n"
-                              " n   text f!       g!\r\n"
-                              " 1.5   ab x         1\r\n"
-                              " -20      yyy missing\r\n");
+        EXPECT_EQ(text, "\"" + title
+                            + " (Created by Ingester: 99:99:99 99/99/99)\"\r\n n   text f!       g!\r\n"
+                              " 1.5   ab x         1\r\n -20      yyy missing\r\n");
     }
 }
 
