@@ -1,18 +1,94 @@
 // The target of one reader: the build names its header, its entry and what prepares its options.
-#include "fuzz_readers.h"
-
 #include FUZZ_HEADER
 
-#include <cstdint>
+#include "interface/process_request.h"
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/sheet.h"
+#include "platform/files.h"
+#include "support/check_sheet.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+
+namespace ingester {
+
+namespace {
+
+std::filesystem::path scratch_folder;
+
+/// The choice that one character of the head makes among `count`; '0' is the first.
+std::size_t Choice(std::byte character, std::size_t count)
+{
+    return (std::to_integer<std::size_t>(character) & 15U) % count;
+}
+
+/// Takes all bytes as the file's.
+[[maybe_unused]] std::string_view Prepare_Nothing(std::span<const std::byte>& /*bytes*/)
+{
+    return {};
+}
+
+/// Options of delimited text, cut off the bytes: eight characters, digits and a line end in the seeds. In
+/// order: the file's name, names or none, lines a record, separators, missing text, lines of the file,
+/// texts where reading begins and ends (with lines to skip), and one for the eye. Gives the name.
+[[maybe_unused]] std::string_view Prepare_Text(std::span<const std::byte>& bytes)
+{
+    constexpr std::string_view names[] = {"fuzz.csv", "fuzz.tab", "fuzz"};
+    constexpr std::string_view separators[] = {"", ";", "| ", ",:", "\t'"};
+    constexpr std::string_view missing_texts[] = {"*", "", "NA", "-9", "a rather long text"};
+    constexpr std::string_view ranges[] = {"", "2:3", "2", "5:2", "1:2147483648", ":::"};
+    constexpr std::string_view marks[] = {"", "a", "\"", "1"};
+    constexpr std::size_t head_size = 8;
+
+    if (bytes.size() < head_size)
+        return names[0];
+    const auto head = bytes.first<head_size>();
+    bytes = bytes.subspan(head_size);
+    const std::size_t names_mode = Choice(head[1], 3);
+    request.Names_Given = names_mode == 1;
+    request.No_Names = names_mode == 2;
+    request.Lines_Per_Record = static_cast<std::int32_t>(Choice(head[2], 3)) + 1;
+    request.Custom_Separators = separators[Choice(head[3], std::size(separators))];
+    request.Missing_Input_Text = missing_texts[Choice(head[4], std::size(missing_texts))];
+    request.Cell_Range = ranges[Choice(head[5], std::size(ranges))];
+    const std::size_t mark = Choice(head[6], 2 * std::size(marks));
+    request.Start_Text = mark < std::size(marks) ? marks[mark] : std::string_view{};
+    request.End_Text = marks[mark % std::size(marks)];
+    request.Fixed_Lines = static_cast<std::int32_t>(mark);
+    request.settings.trim_cells = Choice(head[6], 16) < 2 * std::size(marks) ? 1 : 0;
+    return names[Choice(head[0], std::size(names))];
+}
+
+}  // namespace
+
+}  // namespace ingester
 
 extern "C" int LLVMFuzzerInitialize(int* /*count*/, char*** /*arguments*/)
 {
-    ingester::Start_Fuzzing();
-    return 0;
+    using namespace ingester;
+    std::string folder = std::filesystem::temp_directory_path() / "fuzz_XXXXXX";
+    if (mkdtemp(folder.data()) == nullptr || setenv("TMPDIR", folder.c_str(), 1) != 0)
+        return 1;
+    scratch_folder = folder;
+    return std::atexit([] { std::filesystem::remove_all(scratch_folder); });
 }
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
-    ingester::Fuzz_Reader(FUZZ_ENTRY, FUZZ_PREPARE, std::as_bytes(std::span(data, size)));
+    using namespace ingester;
+    auto bytes = std::as_bytes(std::span(data, size));
+    Start_Request();
+    const std::string_view name = FUZZ_PREPARE(bytes);
+    Input_File file(bytes, name);
+    static_cast<void>(FUZZ_ENTRY(file));  // refusing is as good as reading
+    Close_Message_File();
+    const std::string faults = Current_Sheet == nullptr ? "" : Check_Sheet(*Current_Sheet);
+    if (!faults.empty()) {
+        std::fputs(faults.c_str(), stderr);
+        std::abort();
+    }
+    Free_Sheets();
     return 0;
 }

@@ -2,7 +2,6 @@
 #include "interface/pass_file.h"
 
 #include "host_fixture.h"
-#include "interface/request/request.h"
 #include "interface/subset_lists.h"
 
 #include <cmath>
@@ -15,11 +14,8 @@ using Pass_File_Test = Host_Test;
 
 TEST_F(Pass_File_Test, Each_Fault_Has_Its_Words_And_Leaves_The_File)
 {
-    const struct {
-        std::string name;
-        std::uint32_t limit;
-        std::string before;  ///< what stands before the record in the file
-    } records[] = {
+    const std::tuple<std::string, std::uint32_t, std::string> records[] = {
+        // with what stands before them
         {"Infile", 1120, Little(2.0)},
         {"Outfile", 1120, Pass_Bytes(2, {"i"})},
         {"Worksheet", 280, Pass_Bytes(3, {"i", ""})},
@@ -28,46 +24,37 @@ TEST_F(Pass_File_Test, Each_Fault_Has_Its_Words_And_Leaves_The_File)
         {"Subset file", 1120, Pass_Bytes(6, {"i", "o", "w", "r", "no\\x/a/s"})},
         {"Subset rows file", 1120, Pass_Bytes(6, {"i", "o", "w", "r", "no\\x/s/r"})},
     };
-    struct Case {
-        std::string bytes;
-        std::string said;
-    };
-    std::vector<Case> cases = {
+    std::vector<std::pair<std::string, std::string>> cases = {
         {"", "Number of arguments missing.\n"},
         {Little(2.0).substr(1), "Number of arguments missing.\n"},
         {Little(6.9), "Infile type missing.\n"},
     };
     for (const double count : {1.9, 7.0, -2.0, 1e300, std::nan(""), std::numeric_limits<double>::infinity()})
-        cases.push_back({Little(count) + Record("i") + Record("o"), "Incorrect number of arguments.\n"});
-    for (const auto& record : records) {
-        const std::string& name = record.name;
+        cases.emplace_back(Pass_Bytes(count, {"i", "o"}), "Incorrect number of arguments.\n");
+    for (const auto& [name, limit, before] : records) {
         const bool odd = name == "Outfile";
-        const std::string most = std::string(record.limit, 'x');
-        cases.push_back({record.before, name + " type missing.\n"});
-        cases.push_back({record.before + Word(0).substr(1), name + " type missing.\n"});
-        cases.push_back(
-            {record.before + Word(1) + Word(1) + "x", (odd ? "Infile" : name) + " type not text.\n"});
-        cases.push_back({record.before + Word(0), name + " length missing.\n"});
-        for (const std::uint32_t length : {record.limit + 1, 0x80000000U, 0xFFFFFFFFU})
-            cases.push_back({record.before + Word(0) + Word(length) + most, name + " length invalid.\n"});
-        cases.push_back({record.before + Record(most).substr(0, 8 + record.limit - 1),
-                         (odd ? "Output file" : name) + " missing.\n"});
+        const std::string most = std::string(limit, 'x');
+        cases.emplace_back(before, name + " type missing.\n");
+        cases.emplace_back(before + Word(0).substr(1), name + " type missing.\n");
+        cases.emplace_back(before + Word(1) + Word(1) + "x", (odd ? "Infile" : name) + " type not text.\n");
+        cases.emplace_back(before + Word(0), name + " length missing.\n");
+        for (const std::uint32_t length : {limit + 1, 0x80000000U, 0xFFFFFFFFU})
+            cases.emplace_back(before + Word(0) + Word(length) + most, name + " length invalid.\n");
+        cases.emplace_back(before + Record(most).substr(0, 7 + limit),
+                           (odd ? "Output file" : name) + " missing.\n");
     }
-    cases.push_back({Little(2.0) + Record(std::string(1120, 'x')), "Outfile type missing.\n"});
-    for (const Case& one : cases) {
-        const Host_Answer answer = Call_With_Bytes(one.bytes);
-        EXPECT_EQ(answer.status, 1) << one.said;
-        EXPECT_EQ(answer.messages, one.said + ":\n");
-        EXPECT_EQ(Get(Stem() + ".inp"), one.bytes) << one.said;
-        EXPECT_EQ(Files(), Stem() + ".inp") << one.said;
+    cases.emplace_back(Pass_Bytes(2, {std::string(1120, 'x')}), "Outfile type missing.\n");
+    for (const auto& [bytes, said] : cases) {
+        EXPECT_EQ(Call_With_Bytes(bytes), (Host_Answer{1, said + ":\n"}));
+        EXPECT_EQ(Get(Stem() + ".inp"), bytes) << said;
+        EXPECT_EQ(Files(), Stem() + ".inp") << said;
     }
 }
 
 TEST_F(Pass_File_Test, A_Secondary_File_That_Cannot_Be_Fetched_Gets_No_Answer)
 {
-    const Host_Answer answer = Call({"i", "o", "", "", "http:\\\\h\\x.csv/s"});
-    EXPECT_EQ(answer.status, -1);
-    EXPECT_EQ(answer.messages, "Could not download secondary file URL:\nhttp:\\\\h\\x.csv\n:\n");
+    EXPECT_EQ(Call({"i", "o", "", "", "http:\\\\h\\x.csv/s"}),
+              (Host_Answer{-1, "Could not download secondary file URL:\nhttp:\\\\h\\x.csv\n:\n"}));
     EXPECT_EQ(Files(), Stem() + ".inp");
 }
 
@@ -85,48 +72,37 @@ std::string Carrier_Bytes(std::size_t changed, std::uint32_t value, double id)
 TEST_F(Pass_File_Test, A_Carrier_Names_The_Files_By_Its_Id)
 {
     constexpr std::size_t skipped = 5;
-    const struct {
-        std::string bytes;
-        const char* stem;  ///< of the files that it leads to
-    } cases[] = {
-        {Carrier_Bytes(skipped, 0, 6699.9), "IG1A2B"},
-        {Carrier_Bytes(skipped, 7, 2147483647.0), "IG7FFFFFFF"},
-        {Carrier_Bytes(7, 0xFFFFFFFE, 10.0), "IGA"},
-        {Carrier_Bytes(skipped, 7, 2147483648.0), "TxtToNum"},
-        {Carrier_Bytes(skipped, 7, 0.5), "TxtToNum"},
-        {Carrier_Bytes(skipped, 7, -3.0), "TxtToNum"},
-        {Carrier_Bytes(skipped, 7, std::nan("")), "TxtToNum"},
-        {Carrier_Bytes(0, 2, 10.0), "TxtToNum"},
-        {Carrier_Bytes(6, 0, 10.0), "TxtToNum"},
-        {Carrier_Bytes(8, 0, 10.0), "TxtToNum"},
-        {Carrier_Bytes(7, 0xFFFFFFFD, 10.0), "TxtToNum"},  // both counts cancel out
-        {Carrier_Bytes(9, 1, 10.0), "TxtToNum"},
-        {Carrier_Bytes(10, 0, 10.0), "TxtToNum"},
-        {Carrier_Bytes(11, 1, 10.0), "TxtToNum"},
-        {Carrier_Bytes(skipped, 7, 10.0).substr(0, 63), "TxtToNum"},
-        {"", "TxtToNum"},
+    std::vector<std::pair<std::string, std::int64_t>> cases = {
+        {Carrier_Bytes(skipped, 0, 6699.9), 6699},
+        {Carrier_Bytes(skipped, 7, 2147483647.0), 2147483647},
+        {Carrier_Bytes(7, 0xFFFFFFFE, 10.0), 10},
+        {Carrier_Bytes(7, 0xFFFFFFFD, 10.0), 0},  // both counts cancel out
+        {Carrier_Bytes(skipped, 7, 10.0).substr(0, 63), 0},
     };
+    for (const double id : {2147483648.0, 0.5, -3.0, std::nan("")})
+        cases.emplace_back(Carrier_Bytes(skipped, 7, id), 0);
+    for (const auto& [word, value] : {std::pair(0U, 2U), {6U, 0U}, {8U, 0U}, {9U, 1U}, {10U, 0U}, {11U, 1U}})
+        cases.emplace_back(Carrier_Bytes(word, value, 10.0), 0);
+    for (const auto& [bytes, id] : cases) {
+        Put("carrier.bin", bytes);
+        EXPECT_EQ(Read_Carrier_Id(Request_Name("carrier.bin")), id);
+    }
     std::filesystem::create_directory(Path("sub"));
     std::string name = Request_Name("sub\\carrier.bin");
     for (std::size_t at = 0; (at = name.find('\\', at)) != std::string::npos; at += 2)
         name.insert(at, 1, '\\');  // as a host writes it
-    for (const auto& one : cases) {
-        Put("sub/carrier.bin", one.bytes);
-        const std::string stem = one.stem;
-        const bool by_id = stem != "TxtToNum";
+    for (const std::string stem : {"IG1A2B", "TxtToNum"}) {
+        const bool by_id = stem == "IG1A2B";
+        Put("sub/carrier.bin", by_id ? Carrier_Bytes(skipped, 0, 6699.9) : "");
         const std::string pass = by_id ? stem + ".tmp" : "ingester.inp";
-        const std::string result = by_id ? stem + ".out" : "ingester.out";
-        const auto call = [&] { INGESTER(name.data(), nullptr, static_cast<std::int32_t>(name.size()), 5); };
-        call();
-        Host_Answer answer = Take_Answer(stem, result);
-        EXPECT_EQ(answer.status, 1) << stem;
-        EXPECT_EQ(answer.messages, "Pass file " + Request_Name(pass) + " not found./n:\n");
+        const auto answer = [&] {
+            INGESTER(name.data(), nullptr, static_cast<std::int32_t>(name.size()), 5);
+            return Take_Answer(stem, by_id ? stem + ".out" : "ingester.out");
+        };
+        EXPECT_EQ(answer(), (Host_Answer{1, "Pass file " + Request_Name(pass) + " not found./n:\n"}));
         Put(pass, Pass_Bytes(2, {"", "o.tab"}));
-        call();
-        answer = Take_Answer(stem, result);
-        EXPECT_EQ(answer.status, 3) << stem;
-        EXPECT_EQ(answer.messages, "Input file name is NULL or empty.\nFiles type unknown.\n:\n");
-        EXPECT_EQ(Files(), "sub");
+        EXPECT_EQ(answer(), (Host_Answer{3, "Input file name is NULL or empty.\nFiles type unknown.\n:\n"}));
+        EXPECT_EQ(Files(), "carrier.bin sub sub/carrier.bin");
     }
 }
 
@@ -135,7 +111,7 @@ TEST_F(Pass_File_Test, The_Result_Goes_Where_It_Is_Asked_For)
     const std::string name = Path("given.res") + "behind the name";
     Put(Stem() + ".inp", Pass_Bytes(2, {"none.csv", "o.tab"}));
     INGESTER("none", name.data(), 4, static_cast<std::int32_t>(Path("given.res").size()));
-    EXPECT_EQ(Take_Answer(Stem(), "given.res").status, 2);
+    EXPECT_EQ(Take_Answer(Stem(), "given.res").first, 2);
     EXPECT_EQ(Files(), "");
     Put(Stem() + ".inp", Pass_Bytes(1, {}));
     const std::string nowhere = Path("no/given.res");
@@ -147,15 +123,9 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
 {
     using enum Add_Modes;
     const std::string folder = Request_Name("");
-    const struct {
-        const char* secondary;
-        double count;
-        std::vector<const char*> more;  ///< records behind it: lists by name in the folder
-        const char* rest;
-        Add_Modes mode;
-        std::int32_t names;  ///< read from a list; below 0 for no subset
-        std::int32_t flags;
-    } cases[] = {
+    // The record, the count, lists in records behind it; then what it leaves, the mode, and the numbers of
+    // names and flags that were read, below 0 for no subset.
+    const std::tuple<std::string, double, Texts, std::string, Add_Modes, int, int> cases[] = {
         {"", 5, {}, "", none, -1, -1},
         {"d.csv/a", 5, {}, "d.csv", append, -1, -1},
         {"/m/c/a d.csv", 5, {}, " d.csv", merge, -1, -1},
@@ -169,39 +139,35 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
         {"d.csv/a/r/s", 6, {"columns", "rows"}, "d.csv", append, 2, 3},
         {"absent/s", 5, {}, "absent", none, -1, -1},
     };
-    for (const auto& one : cases) {
-        SCOPED_TRACE(one.secondary);
+    for (const auto& [secondary, count, lists, rest, mode, names, flags] : cases) {
+        SCOPED_TRACE(secondary);
         Start_Request("t");
         Put("columns", "2\nVariate\n a \nb\nc\n");
         Put("rows", "3\n1\n0\n1\n");
-        std::vector<std::string> records = {"i", "o", "w", "r", *one.secondary ? folder + one.secondary : ""};
-        for (const char* const name : one.more)
-            records.push_back(folder + name);
-        const std::string bytes = Pass_Bytes(one.count, records);
+        Texts records = {"i", "o", "w", "r", secondary.empty() ? "" : folder + secondary};
+        for (const std::string& list : lists)
+            records.push_back(folder + list);
+        const std::string bytes = Pass_Bytes(count, records);
         Input_File file(std::as_bytes(std::span(bytes)));
         Pass_Request asked;
         ASSERT_TRUE(Read_Pass_File(file, asked)) << Messages();
-        EXPECT_EQ(static_cast<std::size_t>(file.Position()), bytes.size());
-        EXPECT_EQ(request.Secondary_File.view(), *one.secondary ? folder + one.rest : "");
-        EXPECT_EQ(request.Add_Mode, one.mode);
-        EXPECT_EQ(request.Subset_Columns ? request.Subset_Name_Count : -1, one.names);
-        EXPECT_EQ(request.Subset_Rows ? request.Subset_Row_Count : -1, one.flags);
-        EXPECT_EQ(Exists("columns"), one.names < 0);
-        EXPECT_EQ(Exists("rows"), one.flags < 0);
+        EXPECT_EQ(file.Position(), std::ssize(bytes));
+        EXPECT_EQ(request.Secondary_File.view(), secondary.empty() ? "" : folder + rest);
+        EXPECT_EQ(request.Add_Mode, mode);
+        EXPECT_EQ(request.Subset_Columns ? request.Subset_Name_Count : -1, names);
+        EXPECT_EQ(request.Subset_Rows ? request.Subset_Row_Count : -1, flags);
+        EXPECT_EQ(Files(), names < 0 && flags < 0 ? "columns rows"
+                           : names < 0            ? "columns"
+                           : flags < 0            ? "rows"
+                                                  : "");
     }
 }
 
 TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
 {
-    using Names = std::vector<std::string>;
-    using Flags = std::vector<std::int32_t>;
+    const std::string thousand(1000, 'x');
     const std::string nuls("\0\1\xFF\0\n\n\0\n\0", 9);
-    const struct {
-        std::string text;
-        Names names;
-        bool by_number;
-        Flags flags;
-    } cases[] = {
+    const std::tuple<std::string, Texts, bool, std::vector<std::int32_t>> cases[] = {
         {"", {}, true, {}},
         {"2", {}, true, {}},
         {"1\r\nv\r\nyield\r\nmore\r\n", {"yield"}, false, {0}},
@@ -210,23 +176,17 @@ TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
         {"-1\nV\na\n", {}, false, {}},
         {"text\nV\na\n", {}, false, {}},
         {nuls, {}, true, {}},
-        {"2\n\n" + std::string(1500, 'x') + "\n",
-         {std::string(1000, 'x'), std::string(500, 'x')},
-         true,
-         {0, 0}},
+        {"2\n\n" + thousand + "y\n", {thousand, "y"}, true, {0, 0}},
         {std::string(100, ' ') + "2\nV\na\nb\n", {}, true, {}},  // the count's line is cut at 100
     };
-    for (const auto& one : cases) {
-        SCOPED_TRACE(one.text.substr(0, 30));
-        Put("list", one.text);
-        EXPECT_TRUE(Read_Column_Subset(Request_Name("list")));
-        EXPECT_EQ(request.Subset_Names, one.names);
-        EXPECT_EQ(request.Subset_By_Number, one.by_number);
-        EXPECT_FALSE(Exists("list"));
-        Put("list", one.text);
-        EXPECT_TRUE(Read_Row_Subset(Request_Name("list")));
-        EXPECT_EQ(request.Subset_Row_Flags, one.flags);
-        EXPECT_FALSE(Exists("list"));
+    for (const auto& [text, names, by_number, flags] : cases) {
+        Put("list", text);
+        EXPECT_TRUE(Read_Column_Subset(Request_Name("list")) && Files().empty());
+        EXPECT_EQ(request.Subset_Names, names);
+        EXPECT_EQ(request.Subset_By_Number, by_number) << text;
+        Put("list", text);
+        EXPECT_TRUE(Read_Row_Subset(Request_Name("list")) && Files().empty());
+        EXPECT_EQ(request.Subset_Row_Flags, flags) << text;
         EXPECT_FALSE(Read_Column_Subset(Request_Name("list")) || Read_Row_Subset(""));
     }
 }

@@ -4,30 +4,11 @@
 #include <sys/resource.h>
 
 #include <random>
-#include <utility>
-#include <vector>
 
 namespace ingester {
 namespace {
 
 static_assert(sizeof(Cell_Node) == 24 && sizeof(Row_Node) <= 24);
-
-TEST(Cells, Are_Linked_Across_Blocks)
-{
-    constexpr std::size_t count = Cell_Nodes_Per_Block + 2;
-    Block_Table blocks(1);
-    Cell_Node* first;
-    Cell_Node* last;
-    ASSERT_EQ(Alloc_Cell_Nodes(variate_column, count, first, last, blocks), 3U);
-    std::size_t met = 0;
-    const Cell_Node* before = nullptr;
-    for (const Cell_Node* cell = first; cell != nullptr; before = cell, cell = cell->next, ++met)
-        ASSERT_TRUE(cell->prev == before && cell->value.number == Missing_Value) << met;
-    EXPECT_EQ(met, count);
-    EXPECT_EQ(before, last);
-    EXPECT_EQ(Alloc_Cell_Nodes(variate_column, 0, first, last, blocks), 0U);
-    EXPECT_EQ(first, nullptr);
-}
 
 TEST(Cells, Texts_Stay_As_They_Were_Stored)
 {
@@ -46,7 +27,7 @@ TEST(Cells, Texts_Stay_As_They_Were_Stored)
         ASSERT_TRUE(Text_Arena::View(kept) == text && kept[text.size()] == '\0');
 }
 
-class Cells_Without_Room : public Request_Test {};
+using Cells_Without_Room = Request_Test;
 
 TEST_F(Cells_Without_Room, Leave_The_Sheet_As_It_Was)
 {

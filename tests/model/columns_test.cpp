@@ -1,7 +1,6 @@
-#include "interface/request/request.h"
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
-#include "support/request_fixture.h"
+#include "support/text.h"
 
 namespace ingester {
 namespace {
@@ -15,31 +14,28 @@ std::string Of(std::size_t count)
 
 TEST_F(Columns, Are_Named_And_Placed_By_Type)
 {
-    const struct {
-        std::int32_t sheet_type, type;
-        const char *name, *becomes;
-        std::vector<std::int32_t> index_leading_format;
-    } cases[] = {{1, 4, "1 a", "%1_a", {2, 1, 1}},
-                 {1, 4, "", "C1", {2, 1, 1}},
-                 {1, 33, "t", "t", {2, 1, 4}},
-                 {1, 2, "f", "f", {2, 1, 1}},
-                 {1, -3, "u v", "u_v", {1, 2, 4}},
-                 {1, -4, "u", "u", {1, 2, 1}},
-                 {3, 7, "1 a", "1 a", {2, 1, 1}},
-                 {4, 6, "1 a", "%1_a", {2, 1, 1}},
-                 {5, 22, "1 a", "1 a", {2, 1, 1}},
-                 {5, 2, "f g", "f_g", {2, 2, 1}},
-                 {5, 2, "vclass['classification'][1]", "C1", {2, 2, 1}}};
-    for (const auto& c : cases) {
+    // Given names become names with index, leading columns and format.
+    const std::tuple<std::int32_t, std::int32_t, const char*, const char*> cases[] = {
+        {1, 4, "1 a", "%1_a 2 1 1"},
+        {1, 4, "", "C1 2 1 1"},
+        {1, 33, "t", "t 2 1 4"},
+        {1, 2, "f", "f 2 1 1"},
+        {1, -3, "u v", "u_v 1 2 4"},
+        {1, -4, "u", "u 1 2 1"},
+        {3, 7, "1 a", "1 a 2 1 1"},
+        {4, 6, "1 a", "%1_a 2 1 1"},
+        {5, 22, "1 a", "1 a 2 1 1"},
+        {5, 2, "f g", "f_g 2 2 1"},
+        {5, 2, "vclass['classification'][1]", "C1 2 2 1"}};
+    for (const auto& [sheet_type, type, given, made] : cases) {
         Start_Request("t");
         Sheet* const sheet = New_Sheet();
-        sheet->type = c.sheet_type;
+        sheet->type = sheet_type;
         New_Column(sheet, variate_column, "first");
-        Column* const column = New_Column(sheet, c.type, c.name);
-        EXPECT_EQ(column->name, c.becomes);
-        EXPECT_EQ((std::vector{column->index, sheet->leading_columns, column->format}),
-                  c.index_leading_format)
-            << c.sheet_type << ' ' << c.type << ' ' << c.name;
+        const Column* const column = New_Column(sheet, type, given);
+        EXPECT_EQ(std::string(column->name)
+                      + Format_Text(" %i %i %i", column->index, sheet->leading_columns, column->format),
+                  made);
         EXPECT_EQ(Check_Sheet(*sheet), "");
     }
 }
@@ -48,15 +44,13 @@ TEST_F(Columns, Quoted_Suffixes_Are_Numbered_By_Stem)
 {
     Get_Settings().bracket_names = 0;
     Sheet* const sheet = New_Sheet();
-    const struct {
-        std::string given, name, extra;
-    } cases[] = {{"p['low']", "p[1]", "low"}, {"q['low']", "q[1]", "low"}, {"P['high']", "P[2]", "high"},
-                 {"a b['x']", "a_b[1]", "x"}, {"a b['y']", "a_b[2]", "y"}, {"Row['r']", "Row[1]", "r"},
-                 {"p['']", "p[3]", ""},       {"p['x'", "p['x']", ""}};
-    for (const auto& c : cases) {
-        const Column* const column = New_Column(sheet, variate_column, c.given);
-        EXPECT_EQ(column->name, c.name);
-        EXPECT_EQ(column->extra, c.extra) << c.given;
+    const char* const cases[][3] = {{"p['low']", "p[1]", "low"},   {"q['low']", "q[1]", "low"},
+                                    {"P['high']", "P[2]", "high"}, {"a b['x']", "a_b[1]", "x"},
+                                    {"Row['r']", "Row[1]", "r"},   {"p['']", "p[3]", ""},
+                                    {"p['x'", "p['x']", ""}};
+    for (const auto& [given, name, extra] : cases) {
+        const Column* const column = New_Column(sheet, variate_column, given);
+        EXPECT_TRUE(column->name == name && column->extra == extra) << given;
     }
     sheet->type = matrix_sheet;
     EXPECT_EQ(New_Column(sheet, variate_column, "p['low']")->name, "p['low']");
@@ -80,22 +74,18 @@ TEST_F(Columns, Start_With_Blank_Cells)
 TEST_F(Columns, Are_Filled_From_A_Text)
 {
     constexpr double gone = Missing_Value;
-    const struct {
-        std::int32_t type, kind;
-        const char* text;
-        double value;
-    } cases[] = {{4, 0, " 2.5x", 2.5}, {4, 0, "*", gone}, {4, 0, "", gone}, {4, 0, "1e999", gone},
-                 {4, 0, "x", gone},    {8, 0, "-3", -3},  {2, 0, "1.5", 2}, {2, 0, "-7", 1},
-                 {2, 0, "99", 3},      {2, 0, "", gone},  {2, 1, "19", 2},  {2, 1, "-100", 1},
-                 {2, 1, "b", gone},    {2, 2, "a", 2},    {2, 2, "B", 3},   {2, 2, "*", gone}};
+    const std::tuple<std::int32_t, std::int32_t, const char*, double> cases[] = {
+        {4, 0, " 2.5x", 2.5}, {4, 0, "*", gone}, {4, 0, "", gone}, {4, 0, "1e999", gone},
+        {4, 0, "x", gone},    {8, 0, "-3", -3},  {2, 0, "1.5", 2}, {2, 0, "-7", 1},
+        {2, 0, "99", 3},      {2, 0, "", gone},  {2, 1, "19", 2},  {2, 1, "-100", 1},
+        {2, 1, "b", gone},    {2, 2, "a", 2},    {2, 2, "B", 3},   {2, 2, "*", gone}};
     Sheet* const sheet = New_Sheet_With_Rows(2);
-    for (const auto& c : cases) {
-        Column* const column = New_Column(sheet, c.type, "x");
-        ASSERT_TRUE(Put_Levels(*column, {10, 20, 30}, {"A", "a", "b"}));
-        column->factor_kind = c.kind;
-        EXPECT_TRUE(Fill_Column(column, c.type, 2, 3, c.text));
-        EXPECT_EQ(column->last_cell->value.number, c.value) << c.type << ' ' << c.kind << ' ' << c.text;
-        EXPECT_FALSE(Fill_Column(column, c.type, 2, 3, c.text));
+    for (const auto& [type, kind, text, value] : cases) {
+        Column* const column = New_Column(sheet, type, "x");
+        Put_Levels(*column, {10, 20, 30}, {"A", "a", "b"});
+        column->factor_kind = kind;
+        EXPECT_TRUE(Fill_Column(column, type, 2, 3, text) && !Fill_Column(column, type, 2, 3, text));
+        EXPECT_EQ(column->last_cell->value.number, value) << type << ' ' << kind << ' ' << text;
     }
     Column* const text = New_Column(sheet, text_column, "text");
     Column* const factor = New_Column(sheet, factor_column, "no_levels");
@@ -109,6 +99,7 @@ TEST_F(Columns, Are_Filled_From_A_Text)
 
 TEST_F(Columns, Are_Added_By_The_Type_Of_The_Sheet)
 {
+    const std::string refusal = "You cannot add a column of that type to this spreadsheet.\n:\n";
     constexpr std::int32_t no = -99;
     const std::int32_t wanted[] = {-3, 2, 2, 3, 4, 1, 8};  // the first Factor at position 1, all else at 2
     const std::int32_t types[][7] = {{-3, 2, 2, 3, 4, no, no}, {-3, 5, 5, 5, 5, 5, 5},
@@ -120,18 +111,13 @@ TEST_F(Columns, Are_Added_By_The_Type_Of_The_Sheet)
             const std::int32_t type = types[sheet_type - 1][i];
             Sheet* const sheet = New_Sheet_With_Rows(1);
             sheet->type = sheet_type;
-            Column_Request asked;
-            asked.type = wanted[i];
-            asked.name = "n";
-            const Column* const column = Add_Column(sheet, asked, i == 1 ? 1 : 2, false);
+            const Column* const column =
+                Add_Column(sheet, {.type = wanted[i], .name = "n", .fill = {}}, i == 1 ? 1 : 2, false);
             EXPECT_EQ(column == nullptr ? no : column->type, type);
             EXPECT_TRUE(column == nullptr || column->name == (type == 5 || type == 7 ? "1" : "n"));
-            if (type == symmetric_matrix_column)
-                EXPECT_EQ(sheet->row_count, 2);
-            else
-                EXPECT_EQ(Check_Sheet(*sheet), "");
-            EXPECT_EQ(Messages(),
-                      type == no ? "You cannot add a column of that type to this spreadsheet.\n:\n" : "");
+            EXPECT_TRUE(type == symmetric_matrix_column ? sheet->row_count == 2
+                                                        : Check_Sheet(*sheet).empty());
+            EXPECT_EQ(Messages(), type == no ? refusal : "");
         }
 }
 
@@ -142,7 +128,7 @@ TEST_F(Columns, Bring_Their_Levels)
         {-12345, 6}, {1234567, 7}, {1e10, 12}, {0, 12}, {0.001, 6}};
     for (const auto& [value, width] : cases) {
         Column source;
-        ASSERT_TRUE(Put_Levels(source, {value, 1}, {"low", "high"}));
+        Put_Levels(source, {value, 1}, {"low", "high"});
         Column_Request asked;
         asked.type = factor_column;
         asked.nlevels = asked.level_values_count = asked.label_count = 2;
@@ -152,7 +138,7 @@ TEST_F(Columns, Bring_Their_Levels)
         asked.labels = source.labels;
         asked.fill = "HIGH";
         const Column* const labels = Add_Column(sheet, asked, 9, false);
-        EXPECT_EQ((std::vector{labels->factor_kind, labels->label_width}), (std::vector{2, 4}));
+        EXPECT_TRUE(labels->factor_kind == 2 && labels->label_width == 4);
         EXPECT_EQ(labels->first_cell->value.number, 2.0);
     }
     EXPECT_EQ(Check_Sheet(*sheet), "");
@@ -161,8 +147,8 @@ TEST_F(Columns, Bring_Their_Levels)
 TEST_F(Columns, Are_Found_By_What_Tells_Names_Apart)
 {
     Sheet* const sheet = New_Sheet();
-    for (const std::string& name : {std::string("a"), Of(32) + "yz", Of(40) + "[1]", Of(31) + "[1]",
-                                    Of(31) + "[2]", std::string("Row")})
+    for (const std::string& name :
+         Texts{"a", Of(32) + "yz", Of(40) + "[1]", Of(31) + "[1]", Of(31) + "[2]", "Row"})
         New_Column(sheet, variate_column, name);
     const std::pair<std::string, std::int32_t> cases[] = {
         {" a\t", 1}, {"A", 0}, {Of(32), 2}, {Of(33) + "[1]", 3}, {Of(31) + "[1]", 4},

@@ -1,13 +1,10 @@
 // Rows, cells and columns come and go: Sheets against plain tables that go through the same.
-#include "interface/request/request.h"
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
-#include "support/request_fixture.h"
 #include "support/text.h"
 
 #include <algorithm>
 #include <random>
-#include <utility>
 
 namespace ingester {
 namespace {
@@ -40,6 +37,7 @@ TEST_F(Sheet_Lists, Sweeps_Cost_The_Same_For_Each_Cell)
     for (std::int32_t at = middle; at < middle + 50'000; ++at)
         ASSERT_TRUE(Cell_At(column, at)->value.number == 1.0 && Delete_Row(sheet, at, false));
     EXPECT_EQ(sheet->row_count, rows);
+    EXPECT_EQ(Check_Sheet(*sheet), "");
 }
 
 TEST_F(Sheet_Lists, Rows_As_In_A_Plain_Table)
@@ -69,23 +67,26 @@ TEST_F(Sheet_Lists, Rows_As_In_A_Plain_Table)
         }
         ASSERT_EQ(Check_Sheet(*sheet), "");
         ASSERT_EQ(Numbers_Of(*numbers), plain) << "round " << round;
-        std::int32_t row_number = 0;
-        for (const Row_Node* row = sheet->first_row; row != nullptr; row = row->next) {
-            const double number = plain[static_cast<std::size_t>(row_number)];
+        for (std::int32_t row = 0; row < sheet->row_count; ++row) {
+            const double number = plain[static_cast<std::size_t>(row)];
             const bool written = number != Missing_Value;
-            ASSERT_EQ(Cell_At(texts, row_number)->Text(), written ? Format_Text("%.0f", number) : "");
-            ASSERT_EQ(row->restricted, written);
-            ASSERT_EQ(Cell_At(sheet->first_column, row_number)->value.number, row_number + 1);
-            ++row_number;
+            ASSERT_EQ(Cell_At(texts, row)->Text(), written ? Format_Text("%.0f", number) : "");
+            ASSERT_EQ(Row_At(sheet, row)->restricted, written);
+            ASSERT_EQ(Cell_At(sheet->first_column, row)->value.number, row + 1);
         }
         ASSERT_EQ(sheet->restricted_rows,
                   std::ssize(plain) - std::count(plain.begin(), plain.end(), Missing_Value));
     }
 }
 
+bool Is_Units(const std::string& name)
+{
+    return name.starts_with('u');
+}
+
 TEST_F(Sheet_Lists, Columns_As_In_A_Plain_List)
 {
-    std::vector<std::string> plain = {"Row"};
+    Texts plain = {"Row"};
     Sheet* const sheet = New_Sheet_With_Rows(1);
     for (int round = 0; round < 3000; ++round) {
         const std::int32_t leading = sheet->leading_columns;
@@ -104,25 +105,17 @@ TEST_F(Sheet_Lists, Columns_As_In_A_Plain_List)
             plain.insert(plain.begin() + to, moved);
         } else {
             const bool units = Below(8) == 0;
-            const std::string name = "c" + std::to_string(round);
-            Column_Request asked;
-            asked.type = units ? units_text_column : text_column;
-            asked.name = name;
+            const std::string name = (units ? "u" : "c") + std::to_string(round);
             const std::int32_t position = at + Below(4) - 1;
-            ASSERT_NE(Add_Column(sheet, asked, position, round % 2 == 0), nullptr);
-            const std::int32_t wanted =
-                std::clamp(round % 2 == 0 ? position + 1 : position, leading, columns);
-            plain.insert(plain.begin() + (units ? 1 : wanted), name);
+            const std::int32_t type = units ? units_text_column : text_column;
+            const std::int32_t behind = (round + 1) % 2;
+            ASSERT_NE(Add_Column(sheet, {.type = type, .name = name, .fill = {}}, position, behind == 1),
+                      nullptr);
+            plain.insert(plain.begin() + (units ? 1 : std::clamp(position + behind, leading, columns)), name);
         }
         ASSERT_EQ(Check_Sheet(*sheet), "");
-        std::vector<std::string> names;
-        std::int32_t lead = 0;
-        for (const Column* column = sheet->first_column; column != nullptr; column = column->next) {
-            names.emplace_back(column->name.view());
-            lead += column->type != text_column;
-        }
-        ASSERT_EQ(names, plain) << "round " << round;
-        ASSERT_EQ(sheet->leading_columns, lead);
+        ASSERT_EQ(Names_Of(sheet), plain) << "round " << round;
+        ASSERT_EQ(sheet->leading_columns, 1 + std::count_if(plain.begin(), plain.end(), Is_Units));
     }
 }
 
@@ -135,9 +128,7 @@ TEST_F(Sheet_Lists, A_Symmetric_Matrix_Stays_Square)
     const auto insert = [&](std::int32_t at, double value) {
         for (auto row = plain.begin() + at; row != plain.end(); ++row)
             row->insert(row->begin() + at, value);
-        plain.insert(plain.begin() + at,
-                     std::vector<double>(static_cast<std::size_t>(at) + 1, Missing_Value));
-        plain[static_cast<std::size_t>(at)].back() = value;
+        plain.emplace(plain.begin() + at, at + 1, Missing_Value)->back() = value;
     };
     for (int round = 0; round < 2000; ++round) {
         const std::int32_t at = Below(plain.size() + 1);
@@ -153,13 +144,12 @@ TEST_F(Sheet_Lists, A_Symmetric_Matrix_Stays_Square)
             insert(at, Missing_Value);
             insert(at, Missing_Value);
         } else {
-            Column_Request asked;
             const std::string fill = std::to_string(round);
-            asked.fill = fill;
-            ASSERT_NE(Add_Column(sheet, asked, sheet->leading_columns + at, false), nullptr);
+            ASSERT_NE(Add_Column(sheet, {.name = {}, .fill = fill}, sheet->leading_columns + at, false),
+                      nullptr);
             insert(at, round);
-            ASSERT_TRUE(round % 40 != 0
-                        || New_Data_Column(sheet, units_variate_column, "u", sheet->row_count) != nullptr);
+            if (round % 40 == 0)
+                New_Data_Column(sheet, units_variate_column, "u", sheet->row_count);
         }
         ASSERT_EQ(Check_Sheet(*sheet), "");
         Triangle held(plain.size());
@@ -181,8 +171,8 @@ TEST_F(Sheet_Lists, Row_Deletion_And_Insertion_Have_Limits)
     sheet->type = symmetric_matrix_sheet;
     New_Data_Column(sheet, symmetric_matrix_column, "1", 2);
     New_Data_Column(sheet, symmetric_matrix_column, "2", 1);
-    EXPECT_FALSE(Insert_Rows(sheet, 0, Greatest_Insertion + 1, true));
-    EXPECT_FALSE(Insert_Cells(sheet->first_column, 0, Greatest_Insertion + 1));
+    constexpr std::int32_t many = Greatest_Insertion + 1;
+    EXPECT_FALSE(Insert_Rows(sheet, 0, many, true) || Insert_Cells(sheet->first_column, 0, many));
     const std::string words = "Too many rows to insert.\nAt most 33 million rows can be added at one time.\n";
     EXPECT_EQ(Messages(), words + words + ":\n");
     request.Max_Columns = 3;
@@ -205,14 +195,11 @@ TEST_F(Sheet_Lists, What_Is_Empty)
     sheet->type = symmetric_matrix_sheet;
     for (std::int32_t i = 0; i < 4; ++i)
         New_Data_Column(sheet, symmetric_matrix_column, std::to_string(i + 1), 4 - i);
-    Cell_At(Column_At(sheet, 1), 2)->value.number = -1e306;  // row 2, column 0
-    Cell_At(Column_At(sheet, 2), 0)->value.number = 7;       // on the diagonal
-    EXPECT_EQ(Find_Empty_Rows(sheet, false), 2);             // 0 and 3
-    EXPECT_EQ(Find_Empty_Columns(sheet, false), 2);          // 2 and 3
-    EXPECT_EQ(Find_Empty_Rows(sheet, true), 1);
-    EXPECT_EQ(Find_Empty_Columns(sheet, true), 1);
-    EXPECT_TRUE(Delete_Empty_Columns(sheet));
-    EXPECT_EQ(sheet->row_count * 10 + sheet->column_count, 33);
+    Cell_At(Column_At(sheet, 1), 2)->value.number = -1e306;                                // row 2, column 0
+    Cell_At(Column_At(sheet, 2), 0)->value.number = 7;                                     // on the diagonal
+    EXPECT_TRUE(Find_Empty_Rows(sheet, false) == 2 && Find_Empty_Rows(sheet, true) == 1);  // 0 and 3
+    EXPECT_TRUE(Find_Empty_Columns(sheet, false) == 2 && Find_Empty_Columns(sheet, true) == 1);  // 2 and 3
+    EXPECT_TRUE(Delete_Empty_Columns(sheet) && sheet->row_count == 3 && sheet->column_count == 3);
     EXPECT_EQ(Check_Sheet(*sheet), "");
 
     Sheet* const table = New_Sheet_With_Rows(2);
@@ -235,29 +222,21 @@ TEST_F(Sheet_Lists, What_Is_Empty)
 
 TEST_F(Sheet_Lists, Rows_That_Were_Put_Off_Come_When_They_Are_Needed)
 {
-    const struct {
-        const char* name;
-        void (*need)(Sheet* sheet);
-        std::int32_t rows;
-    } cases[] = {
-        {"nobody", [](Sheet*) {}, 3},
-        {"a row", [](Sheet* sheet) { EXPECT_NE(Row_At(sheet, 2), nullptr); }, 3},
-        {"a row number", [](Sheet* sheet) { EXPECT_EQ(Cell_At(sheet->first_column, 2)->value.number, 3.0); },
-         3},
-        {"an insertion", [](Sheet* sheet) { EXPECT_TRUE(Insert_Rows(sheet, 1, 2, false)); }, 5},
-        {"an insertion behind the end", [](Sheet* sheet) { EXPECT_TRUE(Insert_Rows(sheet, 9, 1, false)); },
-         4},
-        {"a deletion", [](Sheet* sheet) { EXPECT_TRUE(Delete_Row(sheet, 0, false)); }, 2},
-        {"a search", [](Sheet* sheet) { EXPECT_EQ(Find_Empty_Rows(sheet, true), 2); }, 3},
+    const std::tuple<const char*, bool (*)(Sheet*), std::int32_t> cases[] = {
+        {"nobody", [](Sheet*) { return true; }, 3},
+        {"a row", [](Sheet* s) { return Row_At(s, 2) != nullptr; }, 3},
+        {"a row number", [](Sheet* s) { return Cell_At(s->first_column, 2)->value.number == 3.0; }, 3},
+        {"an insertion", [](Sheet* s) { return Insert_Rows(s, 1, 2, false); }, 5},
+        {"an insertion behind the end", [](Sheet* s) { return Insert_Rows(s, 9, 1, false); }, 4},
+        {"a deletion", [](Sheet* s) { return Delete_Row(s, 0, false); }, 2},
+        {"a search", [](Sheet* s) { return Find_Empty_Rows(s, true) == 2; }, 3},
     };
     for (const auto& [name, need, rows] : cases) {
-        SCOPED_TRACE(name);
         Sheet* const sheet = New_Sheet();
         Expect_Rows(sheet, 3);
         New_Data_Column(sheet, variate_column, "x", 3)->last_cell->value.number = 1;
-        need(sheet);
-        EXPECT_EQ(sheet->row_count, rows);
-        EXPECT_EQ(Check_Sheet(*sheet), "");
+        EXPECT_TRUE(need(sheet) && sheet->row_count == rows) << name;
+        EXPECT_EQ(Check_Sheet(*sheet), "") << name;
     }
 }
 

@@ -1,34 +1,11 @@
-#include "interface/request/request.h"
 #include "spreadsheet/text/text.h"
-#include "spreadsheet/text/text_test_support.h"
-#include "support/request_fixture.h"
+#include "support/cell_lists.h"
 #include "support/text.h"
 
-#include <functional>
 #include <random>
 
 namespace ingester {
 namespace {
-
-void Give_Labels(Column* factor, const Texts& labels)
-{
-    factor->nlevels = static_cast<std::int32_t>(labels.size());
-    factor->factor_kind = factor_with_labels;
-    Make_Labels(*factor, factor->nlevels);
-    Level_Node* node = factor->labels;
-    for (const std::string& label : labels) {
-        node->value.text = factor->texts.Store(label);
-        node = node->next;
-    }
-}
-
-void Give_Two_Levels(Column* factor, double first, double second)
-{
-    factor->factor_kind = factor_with_levels;
-    Make_Level_Values(*factor, 2);
-    factor->level_values->value.number = first;
-    factor->level_values->next->value.number = second;
-}
 
 /// A Sheet with every kind of column.
 Sheet* Mixed_Sheet()
@@ -36,8 +13,8 @@ Sheet* Mixed_Sheet()
     Sheet* const sheet = New_Sheet_With_Rows(3);
     Add_Cells(sheet, variate_column, "number", {"1", "-0.1", "*"});
     Add_Cells(sheet, text_column, "t", {"say \"hi\"", "", "a,b\tc"});
-    Give_Labels(Add_Cells(sheet, factor_column, "size", {"2", "*", "1"}), {"b\"g", "s"});
-    Give_Two_Levels(Add_Cells(sheet, factor_column, "dose", {"1", "2", "*"}), 0.5, 1234567.25);
+    Put_Levels(*Add_Cells(sheet, factor_column, "size", {"2", "*", "1"}), {1, 2}, {"b\"g", "s"});
+    Put_Levels(*Add_Cells(sheet, factor_column, "dose", {"1", "2", "*"}), {0.5, 1234567.25});
     Add_Cells(sheet, factor_column, "plain", {"2", "1", "*"});
     Add_Cells(sheet, variate_column, "day", {"3", "4", "5"})->format = date_format_mark;
     return sheet;
@@ -50,57 +27,45 @@ void Packed()
 
 class Text_Writer : public Request_Test {
 protected:
-    static std::string Written(Sheet* sheet, bool tab_mode = false)
+    [[nodiscard]] std::string Written(Sheet* sheet, bool tab_mode = false, const char* name = "out.txt") const
     {
-        const std::string name = Temp_Name("out.txt");
-        EXPECT_TRUE(Write_Text_File(sheet, name.c_str(), tab_mode));
-        return Content_Of(name);
+        EXPECT_TRUE(Write_Text_File(sheet, Request_Name(name).c_str(), tab_mode));
+        return Get(name);
     }
 };
 
 TEST_F(Text_Writer, Lays_Out_Every_Kind_Of_Column)
 {
-    const struct {
-        const char* told;
-        bool tab_mode;
-        std::function<void()> change;
-        const char* text;
-    } cases[] = {
+    const auto bare = [] {
+        Packed();
+        Get_Settings().csv_quote_text = 0;
+        request.No_Name_Marks = true;
+        request.Missing_Text.assign("NA");
+    };
+    const std::tuple<const char*, bool, void (*)(), const char*> cases[] = {
         {"packed commas", false, Packed,
-         "number,t,size!,dose!,plain!,day:D\r\n"
-         "1,\"say \"\"hi\"\"\",\"s\",0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\n"
-         "*,\"a,b\tc\",\"b\"\"g\",*,*,5\r\n"},
-        {"no quotes, no marks, another missing text", false,
-         [] {
-             Packed();
-             Get_Settings().csv_quote_text = 0;
-             request.No_Name_Marks = true;
-             request.Missing_Text.assign("NA");
-         },
-         "number,t,size,dose,plain,day\r\n"
-         "1,say \"hi\",s,0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\n"
-         "NA,\"a,b\tc\",b\"g,NA,NA,5\r\n"},
+         "number,t,size!,dose!,plain!,day:D\r\n1,\"say \"\"hi\"\"\",\"s\",0.5,2,3\r\n"
+         "-0.1,, ,1234567.25,1,4\r\n*,\"a,b\tc\",\"b\"\"g\",*,*,5\r\n"},
+        {"no quotes, no marks, another missing text", false, bare,
+         "number,t,size,dose,plain,day\r\n1,say \"hi\",s,0.5,2,3\r\n"
+         "-0.1,, ,1234567.25,1,4\r\nNA,\"a,b\tc\",b\"g,NA,NA,5\r\n"},
         {"padded commas", false, [] { request.CSV_Output = true; },
          "number,t,size!,dose!,plain!,day:D\r\n"
          "      1,\"say \"\"hi\"\"\" ,    \"s\",        0.5,      2,     3\r\n"
          "   -0.1,             ,       , 1234567.25,      1,     4\r\n"
          "      *,\"a,b\tc\"      , \"b\"\"g\",          *,      *,     5\r\n"},
         {"tabs, without names", true, [] { request.Omit_Header = true; },
-         "1\tsay \"hi\"\ts\t0.5\t2\t3\r\n"
-         "-0.1\t\t \t1234567.25\t1\t4\r\n"
-         "*\t\"a,b\tc\"\tb\"g\t*\t*\t5\r\n"},
+         "1\tsay \"hi\"\ts\t0.5\t2\t3\r\n-0.1\t\t \t1234567.25\t1\t4\r\n*\t\"a,b\tc\"\tb\"g\t*\t*\t5\r\n"},
         {"fixed width", false, [] { Get_Settings().csv_title = 0; },
          " number        t size!      dose! plain! day:D\r\n"
          "      1 say \"hi\"     s        0.5      2     3\r\n"
          "   -0.1                1234567.25      1     4\r\n"
          "      * a,b\tc      b\"g          *      *     5\r\n"},
     };
-    for (const auto& tried : cases) {
+    for (const auto& [told, tab_mode, change, text] : cases) {
         Start_Request("t");
-        tried.change();
-        EXPECT_EQ(Written(Mixed_Sheet(), tried.tab_mode), tried.text) << tried.told;
+        change();
+        EXPECT_EQ(Written(Mixed_Sheet(), tab_mode), text) << told;
     }
 }
 
@@ -112,20 +77,17 @@ TEST_F(Text_Writer, Justifies_Fixed_Width_Below_A_Title)
     Add_Cells(sheet, variate_column, "n", {"1.5", "-20"})->justify = left_side;
     Add_Cells(sheet, text_column, "text", {"ab", ""})->justify = right_side;
     Column* const factor = Add_Cells(sheet, factor_column, "f", {"1", "2"});
-    Give_Labels(factor, {"x", "yyy"});
+    Put_Levels(*factor, {1, 2}, {"x", "yyy"});
     factor->justify = left_side;
     Add_Cells(sheet, factor_column, "g", {"1", "*"});
-    const std::pair<const char*, const char*> cases[] = {
+    const std::pair<const char*, std::string> cases[] = {
         {"out.txt", "out.txt"}, {"out.$$$", "out"}, {"Clipboard.$$$", "trial"}, {"$Clip$.txt", "trial"}};
     for (const auto& [file, title] : cases) {
-        EXPECT_TRUE(Write_Text_File(sheet, Temp_Name(file).c_str(), false));
-        std::string text = Content_Of(Temp_Name(file));
+        std::string text = Written(sheet, false, file);
         std::replace_if(text.begin(), text.begin() + static_cast<long>(text.find('\n')), Is_Digit, '9');
-        EXPECT_EQ(text, "\"" + std::string(title)
-                            + " (Created by Ingester: 99:99:99 99/99/99)\"\r\n"
-                              " n   text f!       g!\r\n"
-                              " 1.5   ab x         1\r\n"
-                              " -20      yyy missing\r\n");
+        EXPECT_EQ(text, "\"" + title
+                            + " (Created by Ingester: 99:99:99 99/99/99)\"\r\n n   text f!       g!\r\n"
+                              " 1.5   ab x         1\r\n -20      yyy missing\r\n");
     }
 }
 
@@ -141,7 +103,7 @@ TEST_F(Text_Writer, Prints_Numbers_By_Formats_When_Asked)
         column->format = format;
         column->decimals = decimals;
     }
-    Give_Two_Levels(Add_Cells(sheet, factor_column, "f", {"2"}), 0, 1234567.891);
+    Put_Levels(*Add_Cells(sheet, factor_column, "f", {"2"}), {0, 1234567.891});
     EXPECT_EQ(Written(sheet), "1234567.891,1234567.891,1234567.891,1234567.891,1234567.891\r\n");
     request.Use_Formats = true;
     EXPECT_EQ(Written(sheet), "1234567.89,1.235e+06,1234567.89,1.23457e+06,1.23457e+06\r\n");
@@ -161,7 +123,7 @@ TEST_F(Text_Writer, Knows_Matrices_And_Margins)
     Sheet* const table = New_Sheet_With_Rows(2);
     table->type = table_sheet;
     table->has_margins = 1;
-    Give_Labels(Add_Cells(table, factor_column, "f", {"1", "2"}), {"x"});
+    Put_Levels(*Add_Cells(table, factor_column, "f", {"1", "2"}), {1}, {"x"});
     EXPECT_EQ(Written(table), "     f!\r\n      x\r\n Margin\r\n");
 }
 
@@ -184,13 +146,13 @@ TEST_F(Text_Writer, Breaks_Lines_That_Are_Too_Long)
 TEST_F(Text_Writer, Fails_Where_Nothing_Can_Be_Written)
 {
     Sheet* const sheet = New_Sheet_With_Rows(1);
-    const std::string name = Temp_Name("x");
-    EXPECT_FALSE(Write_Text_File(nullptr, name.c_str(), false));
-    EXPECT_FALSE(Write_Text_File(sheet, name.c_str(), false));
-    EXPECT_FALSE(File_Exists(name));
+    const std::string name = Request_Name("x");
+    EXPECT_FALSE(Write_Text_File(nullptr, name.c_str(), false)
+                 || Write_Text_File(sheet, name.c_str(), false));
+    EXPECT_EQ(Files(), "");
     Add_Cells(sheet, variate_column, "n", {"1"});
-    EXPECT_FALSE(Write_Text_File(sheet, (name + "\\x").c_str(), false));
-    EXPECT_FALSE(Write_Text_File(sheet, "/dev/full", false));
+    EXPECT_FALSE(Write_Text_File(sheet, (name + "\\x").c_str(), false)
+                 || Write_Text_File(sheet, "/dev/full", false));
 }
 
 TEST_F(Text_Writer, What_Is_Written_Reads_Back_Equal)
@@ -199,30 +161,30 @@ TEST_F(Text_Writer, What_Is_Written_Reads_Back_Equal)
     std::mt19937 random(11);
     for (int round = 0; round < 3000; ++round) {
         Start_Request("t");
-        const bool tab_mode = random() % 2 == 0;
         request.CSV_Output = true;
         request.Packed_Csv_Output = random() % 2 == 0;
         Get_Settings().csv_quote_text = static_cast<std::int16_t>(random() % 2);
-        Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(1 + random() % 4));
+        const std::size_t rows = 1 + random() % 4;
+        Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(rows));
         for (std::size_t columns = 1 + random() % 3, i = 0; i < columns; ++i) {
-            Texts numbers;
-            Texts texts = {"text "};
-            for (std::int32_t row = 0; row < sheet->row_count; ++row) {
-                numbers.push_back(random() % 5 == 0 ? "*" : Format_Text("-%lu.%lu", random(), random()));
+            Texts numbers(rows);
+            Texts texts(rows);
+            texts[0] = "text ";
+            for (std::size_t row = 0; row < rows; ++row) {
+                numbers[row] = random() % 5 == 0 ? "*" : Format_Text("-%lu.%lu", random(), random());
                 for (std::size_t length = random() % 9; length > 0; --length)
-                    texts.back() += letters[random() % letters.size()];
-                texts.back() = Trim_Copy(texts.back());
-                texts.emplace_back();
+                    texts[row] += letters[random() % letters.size()];
+                texts[row] = Trim_Copy(texts[row]);
             }
-            texts.pop_back();
             Add_Cells(sheet, variate_column, "n" + std::to_string(i), numbers);
             Add_Cells(sheet, text_column, "t" + std::to_string(i), texts);
         }
         const std::string expected = Render(sheet);
-        const std::string name = Temp_Name(tab_mode ? "x.tab" : "x.csv");
-        ASSERT_TRUE(Write_Text_File(sheet, name.c_str(), tab_mode));
-        ASSERT_TRUE(Read_CSV_File(name.c_str()));
-        ASSERT_EQ(Render(Current_Sheet), expected) << Content_Of(name);
+        const bool tab_mode = random() % 2 == 0;
+        const char* const name = tab_mode ? "x.tab" : "x.csv";
+        const std::string written = Written(sheet, tab_mode, name);
+        ASSERT_TRUE(Read_CSV_File(Request_Name(name).c_str()));
+        ASSERT_EQ(Render(Current_Sheet), expected) << written;
     }
 }
 
