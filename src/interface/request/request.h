@@ -86,6 +86,7 @@ struct Request_Globals {
     Fixed_Text<20> Custom_Separators;
     Fixed_Text<60> Pointer_Name;
     Fixed_Text<Short_Name_Width> Date_Base_Text;
+    Fixed_Text<Short_Name_Width> Title_Text;  ///< printed by the host in front of a script's data
 
     // Output options.
     Fixed_Text<90> Missing_Text = "*";
