@@ -54,6 +54,7 @@ constexpr Status_Sentence Status_Sentences[] = {
     {INGESTER_NOTHING_SELECTED, Blamed::input, "no columns or rows were selected"},
     {INGESTER_QTL_FAILED, Blamed::input, "the QTL file could not be converted"},
     {INGESTER_QTL_OPTIONS, Blamed::input, "these options do not fit a QTL file"},
+    {INGESTER_MERGE_FAILED, Blamed::request, "the tables could not be merged"},
     {INGESTER_DOWNLOAD_FAILED, Blamed::input, "the download failed"},
 };
 
@@ -155,7 +156,8 @@ void Write_Text_Record(Output_File& file, std::string_view text)
     file.Write(text);
 }
 
-bool Write_Pass_File(const Conversion& conversion, const std::string& name)
+/// The strings of the request, in the order of the pass file.
+std::vector<std::string> Request_Records(const Conversion& conversion)
 {
     const Command_Options& options = conversion.options;
     const std::string& output = conversion.output.request;
@@ -165,6 +167,12 @@ bool Write_Pass_File(const Conversion& conversion, const std::string& name)
         records.push_back(options.sheet);
     if (!options.range.empty())
         records.push_back(options.range);
+    return records;
+}
+
+bool Write_Pass_File(const Conversion& conversion, const std::string& name)
+{
+    const std::vector<std::string> records = Request_Records(conversion);
     Output_File file;
     if (!file.Open_Scratch(name))
         return false;
@@ -172,6 +180,14 @@ bool Write_Pass_File(const Conversion& conversion, const std::string& name)
     for (const std::string& record : records)
         Write_Text_Record(file, record);
     return file.Close();
+}
+
+void Print_Request(const Conversion& conversion)
+{
+    constexpr const char* names[] = {"Infile", "Outfile", "Worksheet", "Cell range"};
+    const char* const* name = names;
+    for (const std::string& record : Request_Records(conversion))
+        std::printf("%s: %s\n", *name++, record.c_str());
 }
 
 int Read_Status(const std::string& name)
@@ -267,6 +283,10 @@ int Run_Command(const Command_Options& options)
         Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name)};
     if (!Request_Can_Carry(conversion))
         return Unusable_Arguments;
+    if (options.dry_run) {
+        Print_Request(conversion);
+        return INGESTER_SUCCESS;
+    }
     if (!Output_May_Be_Written(conversion))
         return INGESTER_OUTPUT_FAILED;
     if (conversion.From_Standard_Input() && !Copy_Standard_Input(conversion.input.request)) {

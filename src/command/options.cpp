@@ -1,10 +1,15 @@
 #include "command/options.h"
 
 #include <CLI/CLI.hpp>
+#include <array>
+#include <cstdio>
 
 namespace ingester {
 
 namespace {
+
+/// The exit status for values that no request can carry: among the codes of wrong command lines.
+constexpr int Wrong_Values = 105;
 
 constexpr const char* Description = "Converts a table from one file format to another.\n"
                                     "The input's content decides how it is read, the output's extension how "
@@ -21,10 +26,14 @@ constexpr const char* Examples = R"(Examples:
       replaces an older yields.tab
   ingester --range 3:40 field.txt field.csv
       lines 3 to 40 of the text; the first of them may hold the names
-  ingester --in-options '/csv=2/n' long.csv long.tab
+  ingester --lines-per-record 2 --no-names long.csv long.tab
       two lines make one record, and no line holds names
-  ingester --in-options '/x=NA' --out-options '/mv=.' field.csv other.csv
+  ingester --missing NA --write-missing . field.csv other.csv
       NA means missing in the input; missing cells are written as a point
+  ingester --in-options '/x=NA' --out-options '/mv=.' field.csv other.csv
+      the same, in the option language of requests
+  ingester formats
+      the formats that are read and written
 
 Exit status: 0 when the output is complete; 1 to 19 when a request failed, as messages on standard
 error say (6: the output; 7: the table has no rows); above 100 when the command line is wrong.)";
@@ -37,6 +46,20 @@ std::string Check_Not_Empty(const std::string& text)
 std::string Check_Slash_Options(const std::string& text)
 {
     return text.empty() || text.front() == '/' ? "" : "options begin with '/', as in '/csv=2/n'";
+}
+
+/// Behind those that were written as they stand: a pointer's name takes all that follows it.
+bool Add_Named_Options(Command_Options& options)
+{
+    const std::string fault = Fault_Of_Options(options.named_input_options);
+    const std::string& told = fault.empty() ? Fault_Of_Options(options.named_output_options) : fault;
+    if (!told.empty()) {
+        std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", told.c_str());
+        return false;
+    }
+    options.input_options += Spell_Options(options.named_input_options);
+    options.output_options += Spell_Options(options.named_output_options);
+    return true;
 }
 
 }  // namespace
@@ -67,11 +90,18 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
     app.add_flag("--padded", options.padded, "Comma text with blanks that keep its columns in line");
     app.add_flag("-f,--force", options.force, "Replace an output that exists");
     app.add_flag("-q,--quiet", options.quiet, "Show no progress");
+    app.add_flag("--dry-run", options.dry_run, "Print the request that would be sent, and stop");
+    const std::array input_tables = {Genotype_Options(), Input_Options()};
+    const std::array output_tables = {Output_Options()};
+    Offer_Named_Options(app, "Options of the input", input_tables, options.named_input_options);
+    Offer_Named_Options(app, "Options of the output", output_tables, options.named_output_options);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& end) {
         return app.exit(end);
     }
+    if (!Add_Named_Options(options))
+        return Wrong_Values;
     return std::nullopt;
 }
 

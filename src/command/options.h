@@ -1,6 +1,8 @@
 // The command line.
 #pragma once
 
+#include "command/named_options.h"
+
 #include <optional>
 #include <string>
 
@@ -16,7 +18,10 @@ struct Command_Options {
     std::string range;
     std::string input_options;  ///< in the option language of requests, such as "/csv=2/n"
     std::string output_options;
-    bool padded = false;  ///< comma text keeps its columns under each other
+    Given_Options named_input_options;  ///< added to `input_options` when the line is parsed
+    Given_Options named_output_options;
+    bool dry_run = false;  ///< show the request, don't send it
+    bool padded = false;   ///< comma text keeps its columns under each other
     bool force = false;
     bool quiet = false;
 };

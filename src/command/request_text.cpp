@@ -1,5 +1,8 @@
 #include "command/request_text.h"
 
+#include "interface/paths.h"
+#include "interface/request/request.h"
+#include "interface/slash_options.h"
 #include "platform/folders.h"
 #include "support/text.h"
 
@@ -13,55 +16,8 @@ namespace ingester {
 
 namespace {
 
-constexpr std::string_view Url_Starts[] = {"ftp:", "http:", "https:", "file:"};
-
-/// Texts that the library replaces wherever they stand in a name.
-constexpr std::string_view Path_Tokens[] = {
-    "%TMP%",     "%TEMP%",         "%TABDIR%",     "%DATA%",     "%EXAMPLES%",
-    "%PROCLIB%", "%SYSTEMADDINS%", "%USERADDINS%", "%TABDIR32%", "%TABDIR64%",
-};
-
-/// How the value of an option ends: there is none, at the next "/", or at a quote that it began with.
-enum class Value_Form : std::uint8_t { none, bare, quoted };
-
-struct Output_Option {
-    std::string_view key;
-    Value_Form form;
-    bool adds;  ///< to the output
-};
-
-/// Those that add to the output, and those cut out before them that could be taken for one, or whose
-/// value could hold one; in the order in which a request is searched for them.
-constexpr Output_Option Output_Options[] = {
-    {"/rewrite=", Value_Form::bare, false}, {"/mv=", Value_Form::quoted, false},
-    {"/av", Value_Form::none, false},       {"/a", Value_Form::none, true},
-    {"/x=", Value_Form::quoted, false},     {"/r", Value_Form::none, true},
-    {"/!=", Value_Form::quoted, false},     {"/@", Value_Form::none, true},
-    {"/&", Value_Form::none, true},         {"/^", Value_Form::none, true},
-    {"/%", Value_Form::none, true},
-};
-
 /// Messages cut no name shorter than this.
 constexpr std::size_t Shortest_Cut = 100;
-
-/// `name` is fetched, not opened.
-bool Is_Url(std::string_view name)
-{
-    return std::ranges::any_of(Url_Starts,
-                               [name](std::string_view start) { return Starts_Ignoring_Case(name, start); });
-}
-
-/// Where the value that begins at `at` ends.
-std::size_t Value_End(std::string_view options, std::size_t at, Value_Form form)
-{
-    if (form == Value_Form::none || at >= options.size())
-        return at;
-    if (form == Value_Form::quoted && options[at] == '=')
-        ++at;
-    if (form == Value_Form::quoted && at < options.size() && (options[at] == '"' || options[at] == '\''))
-        return std::min(options.find(options[at], at + 1), options.size() - 1) + 1;
-    return std::min(options.find('/', at), options.size());
-}
 
 /// One text that a message may hold, and what it becomes.
 struct Spelling {
@@ -129,31 +85,20 @@ std::string Fault_Of_Name(std::string_view native)
                "rename the file, or give it another name by a link";
     if (Is_Url(native))
         return {};
-    for (const std::string_view token : Path_Tokens)
-        if (Find_Ignoring_Case(native, token) != std::string_view::npos)
-            return std::string("a request puts a folder in the place of ")
-                .append(token)
-                .append("; rename the file or its folder, or use a link");
-    const std::size_t first_end = native.find('/');
-    if (native.starts_with('%') && first_end != std::string_view::npos && first_end > 1
-        && native[first_end - 1] == '%')
-        return std::string(
-            "a request takes the first part for a variable of the environment; put ./ in front");
+    if (Holds_Path_Token(Request_Path(native)))
+        return "a request puts a folder in the place of a name between per cent signs; "
+               "rename the file or its folder, or use a link";
     return {};
 }
 
 bool Options_Add_To_Output(std::string_view options)
 {
     std::string rest(options);
-    for (const Output_Option& option : Output_Options) {
-        const std::size_t at = rest.find(option.key);
-        if (at == std::string::npos)
-            continue;
-        if (option.adds)
-            return true;
-        rest.erase(at, Value_End(rest, at + option.key.size(), option.form) - at);
-    }
-    return false;
+    const Reflow_Order reflow = Take_Reflow_Order(rest);
+    Cut_Options(Output_Options(), rest);
+    const bool adds = !reflow.asked && (request.Add_To_Output || request.Add_Mode != Add_Modes::none);
+    request = Request_Globals{};
+    return adds;
 }
 
 std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)

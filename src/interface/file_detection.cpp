@@ -1,46 +1,21 @@
 #include "interface/file_detection.h"
 
+#include "interface/detection_tests.h"
 #include "interface/request/messages.h"
 #include "platform/files.h"
-
-#include <array>
+#include "platform/gzip_file.h"
 
 namespace ingester {
 
 namespace {
 
-/// What the tests look at: the name, and the head of the file, with zeros behind a short one.
-struct Detection_Head {
-    std::string_view name;
-    std::array<std::uint8_t, 200> bytes{};
-};
-
-/// Text by its first bytes. A NUL behind a line end is the end of a short file.
-bool Looks_Like_Text(const Detection_Head& head)
+std::int32_t Code_Of_Head(const Detection_Head& head)
 {
-    constexpr std::size_t sniffed = 55;
-    bool line_end_seen = false;
-    for (std::size_t i = 0; i < sniffed; ++i) {
-        const std::uint8_t byte = head.bytes[i];
-        if (byte == '\r' || byte == '\n')
-            line_end_seen = true;
-        else if (byte == 0 && line_end_seen)
-            return true;
-        else if ((byte < 32 && byte != '\t' && byte != '\f') || byte >= 128)
-            return false;
-    }
-    return true;
+    for (const Detection_Test& test : All_Detection_Tests())
+        if (test.Matches(head))
+            return test.code;
+    return unknown_file;
 }
-
-struct Detection_Test {
-    std::int32_t code;
-    bool (*matches)(const Detection_Head& head);
-};
-
-/// The first match decides.
-constexpr Detection_Test Detection_Tests[] = {
-    {plain_text_file, Looks_Like_Text},
-};
 
 std::int32_t Unreadable(std::string_view why)
 {
@@ -48,24 +23,47 @@ std::int32_t Unreadable(std::string_view why)
     return unreadable_file;
 }
 
+std::int32_t Unknown(std::string_view why)
+{
+    Report_Message(why);
+    return unknown_file;
+}
+
 }  // namespace
 
 std::int32_t Detect_File_Type(std::string_view file_name)
 {
-    if (file_name.empty()) {
-        Report_Message("Input file name is NULL or empty.\n");
-        return unknown_file;
-    }
+    if (file_name.empty())
+        return Unknown("Input file name is NULL or empty.\n");
     Input_File file;
     if (!file.Open(file_name))
         return Unreadable("Input file could not be opened.\n");
     Detection_Head head{file_name};
-    if (file.Read(head.bytes.data(), head.bytes.size()) == 0)
-        return Unreadable("Input file is empty.\n");
-    for (const Detection_Test& test : Detection_Tests)
-        if (test.matches(head))
-            return test.code;
-    return unknown_file;
+    head.length = file.Read_Head(head.bytes.data(), head.bytes.size());
+    return head.length == 0 ? Unreadable("Input file is empty.\n") : Code_Of_Head(head);
+}
+
+std::int32_t Detect_Compressed_File_Type(std::string_view file_name)
+{
+    constexpr std::size_t looked_at = 100;
+    Gzip_File file;
+    if (!file.Open(file_name))
+        return Unknown("Cannot open compressed file.\n");
+    Detection_Head head{file_name};
+    head.length = file.Read(head.bytes.data(), looked_at);
+    if (!file.Close())
+        return Unknown("Cannot close compressed file.\n");
+    return Code_Of_Head(head);
+}
+
+bool Looks_Like_Cornell(std::string_view file_name)
+{
+    Input_File file;
+    Detection_Head head{file_name};
+    if (!file.Open(file_name))
+        return false;  // silent by design: no such file is one of them
+    head.length = file.Read_Head(head.bytes.data(), head.bytes.size());
+    return Looks_Like_Cornell(head);
 }
 
 }  // namespace ingester

@@ -1,9 +1,11 @@
 #include "interface/format_drivers.h"
 
+#include "interface/compressed_files.h"
 #include "interface/file_detection.h"
-#include "interface/request/request.h"
 #include "spreadsheet/text/text.h"
 #include "support/text.h"
+
+#include <algorithm>
 
 namespace ingester {
 
@@ -25,69 +27,120 @@ bool Write_Tabs(Sheet* sheet, const char* file_name)
     return Write_Text_File(sheet, file_name, true);
 }
 
-constexpr Input_Driver Input_Drivers[] = {
+constexpr Format_Driver Format_Drivers[] = {
+    {spreadsheet_file, "Tabulon Spreadsheet", nullptr, ".tss"},
+    {2, "Lotus 1-2-3 worksheet"},
+    {3, "dBase table", nullptr, ".dbf", nullptr, 511},
+    {script_file, "command script", nullptr, ".gen"},
+    {workbook_file, "Excel workbook", nullptr, ".xls", nullptr, 255},
+    {text_file, "comma text", nullptr, ".csv", Write_Text},
+    {text_file, "fixed-width text", nullptr, "", Write_Text},
+    {7, "Minitab worksheet"},
+    {8, "Quattro worksheet", nullptr, ".wq1", nullptr, 255},
+    {9, "Paradox table"},
+    {10, "SAS Version 6 data set"},
+    {13, "S-Plus data object"},
+    {14, "S-Plus dump of a data frame", nullptr, ".sdd"},
+    {15, "Instat worksheet", nullptr, ".wor", nullptr, 224},
+    {16, "binary dictionary with data"},
+    {17, "field records"},
+    {18, "Gauss data", nullptr, ".fmt"},
+    {20, "MATLAB Level 4 matrix", nullptr, ".mat"},
+    {21, "Systat"},
+    {22, "SPSS system file"},
+    {23, "Stata data set"},
     {plain_text_file, "delimited or other plain text", Read_Plain_Text},
+    {26, "Shapefile"},
+    {27, "MapInfo interchange"},
+    {28, "SAS transport", nullptr, ".tpt"},
+    {tab_text_file, "text with tabs", nullptr, ".tab", Write_Tabs},
+    {30, "RTF table", nullptr, ".rtf"},
+    {31, "HTML table", nullptr, ".htm .html"},
+    {32, "Windows bitmap", nullptr, ".bmp"},
+    {33, "WAVE sound"},
+    {35, "Statistica, first generation"},
+    {36, "Statistica, second generation"},
+    {37, "SAS data set", nullptr, ".ssd .sas7bdat .ssd01"},
+    {38, "Minitab portable worksheet"},
+    {39, "WEKA ARFF", nullptr, ".arf .arff"},
+    {40, "Visualist Tablet", nullptr, ".vtb"},
+    {41, "S-Plus dump"},
+    {r_data_file, "R data", nullptr, ".rda .rdata"},
+    {r_text_file, "R data in text form"},
+    {44, "SPSS system file of the early form"},
+    {45, "SPSS portable"},
+    {46, "data set read through the bridge"},
+    {47, "data set read through the bridge"},
+    {49, "NMR phase file"},
+    {50, "Affymetrix CEL, binary"},
+    {51, "Affymetrix CDF, binary"},
+    {52, "Affymetrix CHP, binary"},
+    {53, "Affymetrix CEL, text"},
+    {54, "Affymetrix CDF, text"},
+    {55, "GeneChip sequences"},
+    {compressed_file, "gzip, of any format here", Read_Compressed_File},
+    {book_file, "Tabulon Book", nullptr, ".tbk", nullptr, 10000000},
+    {xml_workbook_file, "Excel 2007 workbook", nullptr, ".xlsx .xlsm"},
+    {60, "JPEG image", nullptr, ".jpg"},
+    {61, "TIFF image", nullptr, ".tif .tiff"},
+    {62, "GIF image", nullptr, ".gif"},
+    {63, "PNG image", nullptr, ".png"},
+    {64, "PSD image", nullptr, ".psd"},
+    {65, "Windows metafile", nullptr, ".emf"},
+    {66, "other images"},
+    {open_document_file, "OpenDocument spreadsheet", nullptr, ".ods", nullptr, 255},
+    {68, "Statistica, third generation"},
+    {69, "Affymetrix generic CEL"},
+    {70, "Affymetrix generic CHP"},
+    {71, "StatGraphics"},
+    {72, "Cornell Ecology", nullptr, ".cep"},
+    {qtl_locus_file, "QTL locus file"},
+    {74, "QTL quantitative data"},
+    {75, "CSPro dictionary"},
+    {76, "MATLAB file, through the bridge"},
+    {77, "EViews workfile, through the bridge"},
+    {78, "Stata XML data set, through the bridge"},
+    {79, "RATS data, through the bridge"},
+    {80, "gretl data, through the bridge"},
+    {81, "compressed data, through the bridge"},
+    {82, "triple-s survey, through the bridge"},
 };
 
-constexpr std::int32_t Columns = Default_Max_Columns;
+/// Of outputs whose extension says nothing.
+constexpr const Format_Driver& Fixed_Width_Text =
+    *std::ranges::find_if(Format_Drivers, [](const Format_Driver& driver) {
+        return driver.code == text_file && driver.extensions.empty();
+    });
 
-constexpr Output_Driver Output_Drivers[] = {
-    {".xlsx", 59, "Excel 2007 workbook", nullptr, Columns},
-    {".xlsm", 59, "Excel 2007 workbook", nullptr, Columns},
-    {".gen", script_file, "command script", nullptr, Columns},
-    {".tss", spreadsheet_file, "Tabulon Spreadsheet", nullptr, Columns},
-    {".tbk", book_file, "Tabulon Book", nullptr, 10000000},
-    {".fmt", 18, "Gauss data", nullptr, Columns},
-    {".xls", 5, "Excel workbook", nullptr, 255},
-    {".wor", 15, "Instat worksheet", nullptr, 224},
-    {".dbf", 3, "dBase table", nullptr, 511},
-    {".wq1", 8, "Quattro worksheet", nullptr, 255},
-    {".sdd", 14, "S-Plus dump", nullptr, Columns},
-    {".mat", 20, "MATLAB Level 4 matrix", nullptr, Columns},
-    {".tab", tab_text_file, "text with tabs", Write_Tabs, Columns},
-    {".tpt", 28, "SAS transport", nullptr, Columns},
-    {".rtf", 30, "RTF table", nullptr, Columns},
-    {".htm", 31, "HTML table", nullptr, Columns},
-    {".html", 31, "HTML table", nullptr, Columns},
-    {".arf", 39, "WEKA ARFF", nullptr, Columns},
-    {".arff", 39, "WEKA ARFF", nullptr, Columns},
-    {".vtb", 40, "Visualist Tablet", nullptr, Columns},
-    {".rda", 42, "R data", nullptr, Columns},
-    {".rdata", 42, "R data", nullptr, Columns},
-    {".csv", text_file, "comma text", Write_Text, Columns},
-    {".bmp", 32, "Windows bitmap", nullptr, Columns},
-    {".jpg", 60, "image", nullptr, Columns},
-    {".tif", 61, "image", nullptr, Columns},
-    {".tiff", 61, "image", nullptr, Columns},
-    {".gif", 62, "image", nullptr, Columns},
-    {".png", 63, "image", nullptr, Columns},
-    {".psd", 64, "image", nullptr, Columns},
-    {".emf", 65, "image", nullptr, Columns},
-    {".ods", 67, "OpenDocument spreadsheet", nullptr, 255},
-    {".cep", 72, "Cornell Ecology", nullptr, Columns},
-    {".ssd", 37, "SAS data set", nullptr, Columns},
-    {".sas7bdat", 37, "SAS data set", nullptr, Columns},
-    {".ssd01", 37, "SAS data set", nullptr, Columns},
-};
-
-constexpr Output_Driver Fixed_Width_Text = {"", text_file, "fixed-width text", Write_Text, Columns};
+static_assert(std::ranges::is_sorted(Format_Drivers, {}, &Format_Driver::code));
 
 }  // namespace
 
-Reader Reader_Of(std::int32_t code)
+std::span<const Format_Driver> All_Formats()
 {
-    for (const Input_Driver& driver : Input_Drivers)
-        if (driver.code == code)
-            return driver.read;
-    return nullptr;
+    return Format_Drivers;
 }
 
-const Output_Driver& Output_Driver_Of(std::string_view file_name)
+const Format_Driver& Output_Driver_Of(std::string_view file_name)
 {
-    for (const Output_Driver& driver : Output_Drivers)
-        if (Ends_Ignoring_Case(file_name, driver.extension))
+    for (const Format_Driver& driver : Format_Drivers)
+        if (Ends_With_One_Of(file_name, driver.extensions))
             return driver;
     return Fixed_Width_Text;
+}
+
+const Format_Driver& Output_Driver_Of(std::int32_t code)
+{
+    const auto* const found = std::ranges::find(Format_Drivers, code, &Format_Driver::code);
+    return found == std::end(Format_Drivers) ? Fixed_Width_Text : *found;
+}
+
+bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string_view source_name)
+{
+    request.Current_File_Name = request.Source_Url.empty() ? source_name : request.Source_Url.view();
+    const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
+    const bool readable = found != std::end(Format_Drivers) && found->read != nullptr;
+    return readable && found->read(file_name.c_str());
 }
 
 }  // namespace ingester

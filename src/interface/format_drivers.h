@@ -2,6 +2,7 @@
 // format by name.
 #pragma once
 
+#include "interface/request/request.h"
 #include "model/sheet.h"
 
 #include <cstdint>
@@ -14,27 +15,29 @@ namespace ingester {
 using Reader = bool (*)(const char* file_name);
 using Writer = bool (*)(Sheet* sheet, const char* file_name);
 
-/// A format that is read, under the code that detection gives it.
-struct Input_Driver {
+/// One format. Detection gives inputs their code, the extension gives it to outputs. A format that this
+/// build knows by name only has neither `read` nor `write`.
+struct Format_Driver {
     std::int32_t code;
     std::string_view name;
-    Reader read;
+    Reader read = nullptr;
+    std::string_view extensions = {};  ///< of outputs, with blanks between them
+    Writer write = nullptr;
+    std::int32_t max_columns = Default_Max_Columns;  ///< of outputs
 };
 
-/// A format that is written, chosen by the output's extension. `write` is null for those that this
-/// build knows by name only.
-struct Output_Driver {
-    std::string_view extension;
-    std::int32_t code;
-    std::string_view name;
-    Writer write;
-    std::int32_t max_columns;
-};
+/// All formats, by code.
+[[nodiscard]] std::span<const Format_Driver> All_Formats();
 
-/// The reader of a code, or null.
-[[nodiscard]] Reader Reader_Of(std::int32_t code);
+/// The format of an output, by the name's extension; fixed-width text for an unknown one.
+[[nodiscard]] const Format_Driver& Output_Driver_Of(std::string_view file_name);
 
-/// The driver of an output name; fixed-width text for an unknown extension.
-[[nodiscard]] const Output_Driver& Output_Driver_Of(std::string_view file_name);
+/// The format of an output code.
+[[nodiscard]] const Format_Driver& Output_Driver_Of(std::int32_t code);
+
+/// Reads a file of a known type. Messages name it by `source_name`, or by the URL that it was fetched
+/// from. False when no Sheet was made; formats without a reader give it without a message.
+[[nodiscard]] bool Read_Data_File(const std::string& file_name, std::int32_t type,
+                                  std::string_view source_name);
 
 }  // namespace ingester

@@ -1,6 +1,10 @@
 #include "interface/selection.h"
 
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "support/text.h"
 
 namespace ingester {
 
@@ -20,6 +24,47 @@ bool Delete_Empty_Rows(Sheet* sheet)
             ++index;
     }
     return true;
+}
+
+namespace {
+
+/// Opens a list file, or one of its name in the temporary folder.
+bool Open_Var_File(Output_File& file, std::string_view file_name)
+{
+    return file.Open(file_name)
+           || file.Open(Get_Temp_Folder().append(With_Extension(File_Part_Of(file_name), ".VAR")));
+}
+
+}  // namespace
+
+bool Keep_Column_Range(Sheet* sheet, std::int32_t first, std::int32_t last)
+{
+    if (first > last)
+        return Fail("Error: First column to be kept must be <= Last column.\n");
+    if (last > sheet->column_count && last != Every_Column)
+        Report_Message_Long("Note: Data contains fewer columns than the specified last column %li.\n", last);
+    if (first > sheet->column_count)
+        return Fail("Error: Data contains fewer columns than first column to be kept.\n");
+    Keep_Columns(sheet, first, last);
+    return true;
+}
+
+bool Write_Var_File(const Sheet& sheet, std::string_view file_name)
+{
+    Output_File file(Output_File::small_buffer);
+    if (!Open_Var_File(file, file_name))
+        return false;  // silent by design: the list is an extra, the output stands
+    const bool named_columns = sheet.type == vector_sheet || sheet.type == scalar_sheet
+                               || (sheet.type == table_sheet && sheet.table_ways == 1);
+    if (!named_columns) {
+        file.Write(Format_Text("1\n%s\n", sheet.structure_name.c_str()));
+        return file.Close();
+    }
+    file.Write(Format_Text("%li\n", static_cast<long>(sheet.column_count)));
+    for (const Column* column = sheet.first_column; column != nullptr; column = column->next)
+        if (column->type != row_column)
+            file.Write(Format_Text("%s\n", column->name.c_str()));
+    return file.Close();
 }
 
 }  // namespace ingester

@@ -251,38 +251,71 @@ Taken Take_Rest_As_Pointer(std::string_view text, std::size_t at)
 
 using R = Request_Globals;
 
+// How the command line offers an option.
+
+constexpr Named_Option Flag(std::string_view name)
+{
+    return {name};
+}
+
+constexpr Named_Option Bare(std::string_view name, std::string_view value, std::string_view join = "=")
+{
+    return {name, Value_Form::bare, value, join};
+}
+
+constexpr Named_Option Quoted(std::string_view name, std::string_view value)
+{
+    return {name, Value_Form::quoted, value};
+}
+
+constexpr Named_Option Optional(std::string_view name, std::string_view value, std::string_view join = "=")
+{
+    return {name, Value_Form::optional, value, join};
+}
+
+constexpr Slash_Option Genotype_Table[] = {
+    {"/rqtl", Set<&R::Qtl_Request, true>, "genotype files may be read", Flag("qtl")},
+    {"/map", Take_Map_File, "map file of a genotype file", {"map", Value_Form::path, "FILE"}},
+};
+
 constexpr Slash_Option Input_Table[] = {
-    {"/rqtl", Set<&R::Qtl_Request, true>, "genotype files may be read"},
-    {"/map", Take_Map_File, "map file of a genotype file"},
-    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing"},
+    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT")},
     {"/g=", Take_Delete_Marker, "version number in the host's scratch names"},
-    {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column"},
-    {"/a", Set<&R::Keep_Probe_Statistics, false>, "leave out statistics of microarray probes"},
-    {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks"},
-    {"/csv", Take_Lines_Per_Record, "lines that make one record of a text"},
-    {"/c", Take_Column_Range, "columns to keep, first:last"},
-    {"/db", Set<&R::Print_Summary, true>, "print a summary of the columns"},
-    {"/m", Take_Missing_Codes, "up to three numbers that mean missing"},
-    {"/d", Take_Title_Row, "row of column descriptions in a grid"},
-    {"/f", Set<&R::Keep_Long_Labels, true>, "keep long factor labels"},
-    {"/h", Take_Prefix<&Settings::header_prefix>, "prefix of a name made from a number"},
-    {"/o", Take_Column_Prefix, "prefix of automatic column names"},
-    {"/k", Set<&R::Keep_Empty_Columns, true>, "keep empty columns"},
-    {"/l", Take_Flag_And_Number<&R::Log_Book, &R::Log_Book_Range>, "the grid is a log book"},
-    {"/n", Set<&R::No_Names, true>, "there is no row of names"},
-    {"/#", Set_Setting<&Settings::bracket_names, 0>, "keep quoted suffixes of names as text"},
-    {"/y", Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>, "there is a row of names"},
-    {"/tr", Take_Transpose, "transpose; N: without names"},
-    {"/t", Take_Text_Number_Mode, "how texts become numbers, 0 to 4"},
-    {"/i", Set_Setting<&Settings::ignore_value_case, 1>, "labels differ in more than case"},
-    {"/r", Set<&R::Reverse_Labels, true>, "swap values and labels"},
-    {"/u", Set_Setting<&Settings::auto_factors, 0>, "factor levels stay in the order of the data"},
-    {"/v", Set<&R::Use_Var_File, true>, "rename and retype columns by a list file"},
-    {"/w", Set<&R::List_Sheets_Only, true>, "only list the sheets"},
-    {"/s", Take_Text<&R::Start_Text, true>, "data begin at the line that starts so"},
-    {"/e", Take_Text<&R::End_Text, true>, "data end before the line that starts so"},
-    {"/z=", Take_Text<&R::Custom_Separators>, "separators of fields"},
-    {"/p=", Take_Rest_As_Pointer, "name of a pointer to the columns"},
+    {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column",
+     Bare("skip-lines", "N")},
+    {"/a", Set<&R::Keep_Probe_Statistics, false>, "leave out statistics of microarray probes",
+     Flag("no-probe-statistics")},
+    {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks", Flag("keep-blanks")},
+    {"/csv", Take_Lines_Per_Record, "lines that make one record of a text", Bare("lines-per-record", "N")},
+    {"/c", Take_Column_Range, "columns to keep, first:last", Bare("columns", "FIRST:LAST")},
+    {"/db", Set<&R::Print_Summary, true>, "print a summary of the columns", Flag("print-summary")},
+    {"/m", Take_Missing_Codes, "up to three numbers that mean missing", Bare("missing-codes", "A,B,C")},
+    {"/d", Take_Title_Row, "row of column descriptions in a grid", Optional("description-row", "[$]N")},
+    {"/f", Set<&R::Keep_Long_Labels, true>, "keep long factor labels", Flag("keep-long-labels")},
+    {"/h", Take_Prefix<&Settings::header_prefix>, "prefix of a name made from a number",
+     Bare("header-prefix", "TEXT")},
+    {"/o", Take_Column_Prefix, "prefix of automatic column names", Bare("column-prefix", "TEXT")},
+    {"/k", Set<&R::Keep_Empty_Columns, true>, "keep empty columns", Flag("keep-empty-columns")},
+    {"/l", Take_Flag_And_Number<&R::Log_Book, &R::Log_Book_Range>, "the grid is a log book",
+     Optional("log-book", "N")},
+    {"/n", Set<&R::No_Names, true>, "there is no row of names", Flag("no-names")},
+    {"/#", Set_Setting<&Settings::bracket_names, 0>, "keep quoted suffixes of names as text",
+     Flag("text-suffixes")},
+    {"/y", Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>, "there is a row of names",
+     Optional("names", "ROW")},
+    {"/tr", Take_Transpose, "transpose; N: without names", Optional("transpose", "N")},
+    {"/t", Take_Text_Number_Mode, "how texts become numbers, 0 to 4", Bare("text-numbers", "MODE")},
+    {"/i", Set_Setting<&Settings::ignore_value_case, 1>, "labels differ in more than case",
+     Flag("ignore-label-case")},
+    {"/r", Set<&R::Reverse_Labels, true>, "swap values and labels", Flag("reverse-labels")},
+    {"/u", Set_Setting<&Settings::auto_factors, 0>, "factor levels stay in the order of the data",
+     Flag("levels-as-found")},
+    {"/v", Set<&R::Use_Var_File, true>, "rename and retype columns by a list file", Flag("column-list")},
+    {"/w", Set<&R::List_Sheets_Only, true>, "only list the sheets", Flag("list-sheets")},
+    {"/s", Take_Text<&R::Start_Text, true>, "data begin at the line that starts so", Quoted("start", "TEXT")},
+    {"/e", Take_Text<&R::End_Text, true>, "data end before the line that starts so", Quoted("end", "TEXT")},
+    {"/z=", Take_Text<&R::Custom_Separators>, "separators of fields", Quoted("separators", "TEXT")},
+    {"/p=", Take_Rest_As_Pointer, "name of a pointer to the columns", Bare("pointer", "NAME")},
 };
 
 // --- Output ------------------------------------------------------------------------------------
@@ -297,7 +330,9 @@ Taken Take_Missing_Text(std::string_view text, std::size_t at)
 Taken Take_Add(std::string_view text, std::size_t at)
 {
     request.Add_To_Output = true;
-    return Take_Name<&R::Output_Sheet_Name>(text, Behind_Equals(text, at));
+    const Taken end = Take_Name<&R::Output_Sheet_Name>(text, Behind_Equals(text, at));
+    request.Add_Sheet_Given = !request.Output_Sheet_Name.empty();
+    return end;
 }
 
 /// The same name, when "/a" gave none.
@@ -425,43 +460,49 @@ Taken Take_No_Effect(std::string_view, std::size_t at)
 }
 
 constexpr Slash_Option Output_Table[] = {
-    {"/mv=", Take_Missing_Text, "how a missing value prints"},
-    {"/av", Set<&R::Write_Via_Temp, false>, "write over an existing output directly"},
-    {"/*", Set<&R::No_Return, true>, "no RETURN in the script"},
-    {"/a", Take_Add, "add the sheet to an existing book, under this name"},
-    {"/x=", Take_Sheet_Name, "name of the sheet"},
-    {"/b", Set<&R::End_With_Break, true>, "the script ends with ENDBREAK"},
-    {"/c", Set<&R::Keep_As_Columns, false>, "images and sound in one piece"},
-    {"/d", Set<&R::Use_Formats, true>, "numbers print by their columns' formats"},
-    {"/e", Set_Setting<&Settings::delete_empty_rows, 0>, "keep empty rows"},
-    {"/f", Set<&R::Fixed_Number_Text, true>, "decimals are found from the data"},
-    {"/g", Set<&R::Table_Grid, true>, "grid lines in tables of pages"},
+    {"/mv=", Take_Missing_Text, "how a missing value prints", Quoted("write-missing", "TEXT")},
+    {"/av", Set<&R::Write_Via_Temp, false>, "write over an existing output directly", Flag("write-in-place")},
+    {"/*", Set<&R::No_Return, true>, "no RETURN in the script", Flag("no-return")},
+    {"/a", Take_Add, "add the sheet to an existing book, under this name", Quoted("add-sheet", "NAME")},
+    {"/x=", Take_Sheet_Name, "name of the sheet", Quoted("sheet-name", "NAME")},
+    {"/b", Set<&R::End_With_Break, true>, "the script ends with ENDBREAK", Flag("end-with-break")},
+    {"/c", Set<&R::Keep_As_Columns, false>, "images and sound in one piece", Flag("images-whole")},
+    {"/d", Set<&R::Use_Formats, true>, "numbers print by their columns' formats", Flag("use-formats")},
+    {"/e", Set_Setting<&Settings::delete_empty_rows, 0>, "keep empty rows", Flag("keep-empty-rows")},
+    {"/f", Set<&R::Fixed_Number_Text, true>, "decimals are found from the data", Flag("find-decimals")},
+    {"/g", Set<&R::Table_Grid, true>, "grid lines in tables of pages", Flag("grid")},
     {"/h", Take_Packed, "comma text without padding"},
-    {"/i", Set<&R::Excel_Dates_As_Text, true>, "dates as text in workbooks"},
-    {"/jl", Take_Justify<0>, "tables of pages at the left"},
-    {"/jr", Take_Justify<1>, "tables of pages at the right"},
-    {"/jc", Take_Justify<2>, "tables of pages in the middle"},
-    {"/l=", Take_Log_Book_Lines, "lines of a log book"},
-    {"/m", Take_Matrix, "a table of numbers goes out as a Matrix"},
-    {"/n", Take_No_Header, "no line of names"},
-    {"/o", Set<&R::Replace_Book_Data, true>, "replace the data of a sheet in a book"},
-    {"/p", Set<&R::Write_Var_List, true>, "write a list of the columns beside the output"},
-    {"/q", Set<&R::Quiet_Read, true>, "the script reads without printing"},
-    {"/r", Take_Replace, "replace the sheet of this name"},
+    {"/i", Set<&R::Excel_Dates_As_Text, true>, "dates as text in workbooks", Flag("dates-as-text")},
+    {"/jl", Take_Justify<0>, "tables of pages at the left", Flag("justify-left")},
+    {"/jr", Take_Justify<1>, "tables of pages at the right", Flag("justify-right")},
+    {"/jc", Take_Justify<2>, "tables of pages in the middle", Flag("justify-centre")},
+    {"/l=", Take_Log_Book_Lines, "lines of a log book", Bare("log-book-lines", "N")},
+    {"/m", Take_Matrix, "a table of numbers goes out as a Matrix", Optional("matrix", "NAME")},
+    {"/n", Take_No_Header, "no line of names", Flag("no-header")},
+    {"/o", Set<&R::Replace_Book_Data, true>, "replace the data of a sheet in a book", Flag("replace-data")},
+    {"/p", Set<&R::Write_Var_List, true>, "write a list of the columns beside the output",
+     Flag("write-column-list")},
+    {"/q", Set<&R::Quiet_Read, true>, "the script reads without printing", Flag("quiet-read")},
+    {"/r", Take_Replace, "replace the sheet of this name", Quoted("replace-sheet", "NAME")},
     {"/s", Take_No_Effect, "no effect"},
-    {"/-", Set_Setting<&Settings::csv_quote_text, 0>, "texts without quotes"},
-    {"/t", Set<&R::R_Text_Output, true>, "R data in their text form"},
-    {"/u", Set<&R::No_Name_Marks, true>, "no type marks behind names"},
+    {"/-", Set_Setting<&Settings::csv_quote_text, 0>, "texts without quotes", Flag("no-quotes")},
+    {"/t", Set<&R::R_Text_Output, true>, "R data in their text form", Flag("r-text")},
+    {"/u", Set<&R::No_Name_Marks, true>, "no type marks behind names", Flag("no-name-marks")},
     {"/v=", Take_Script_Version, "version of the script language"},
-    {"/w", Set<&R::Table_Look, true>, "workbooks with a table's look"},
-    {"/z", Set_Setting<&Settings::csv_title, 0>, "no title line in fixed-width text"},
+    {"/w", Set<&R::Table_Look, true>, "workbooks with a table's look", Flag("table-look")},
+    {"/z", Set_Setting<&Settings::csv_title, 0>, "no title line in fixed-width text", Flag("no-title")},
     {"/.", Set<&R::R_Dot_Names, true>, "no effect"},
-    {"/7", Set<&R::Excel_97, true>, "workbooks of the 1997 form"},
-    {"/!=", Take_Name<&R::Merge_Sheet_Name>, "sheet of the output that is updated"},
-    {"/@", Take_Append, "append to the existing output; N: unsorted; then the keys"},
-    {"/&", Take_Concatenate, "put columns behind those of the existing output; U: replace equal names"},
-    {"/^", Take_Source_Key, "the same, with a column that names the source"},
-    {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M"},
+    {"/7", Set<&R::Excel_97, true>, "workbooks of the 1997 form", Flag("excel-97")},
+    {"/!=", Take_Name<&R::Merge_Sheet_Name>, "sheet of the output that is updated",
+     Quoted("update-sheet", "NAME")},
+    {"/@", Take_Append, "append to the existing output; N: unsorted; then the keys",
+     Optional("append", "KEY[,WITH]", ",")},
+    {"/&", Take_Concatenate, "put columns behind those of the existing output; U: replace equal names",
+     Optional("concatenate", "U", "")},
+    {"/^", Take_Source_Key, "the same, with a column that names the source",
+     Bare("concatenate-source", "KEY[,WITH]", "")},
+    {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M",
+     Optional("merge", "[N][U][N|M]")},
 };
 
 /// A key that another begins with must be searched behind it, or it would cut the other short.
@@ -474,10 +515,16 @@ template <std::size_t Count> constexpr bool No_Key_Hides_A_Later_One(const Slash
     return true;
 }
 
+static_assert(No_Key_Hides_A_Later_One(Genotype_Table));
 static_assert(No_Key_Hides_A_Later_One(Input_Table));
 static_assert(No_Key_Hides_A_Later_One(Output_Table));
 
 }  // namespace
+
+std::span<const Slash_Option> Genotype_Options()
+{
+    return Genotype_Table;
+}
 
 std::span<const Slash_Option> Input_Options()
 {
@@ -499,6 +546,25 @@ void Cut_Options(std::span<const Slash_Option> options, std::string& text)
         text.erase(start, end - start);
     }
     text = std::string(Trim_Copy(text));
+}
+
+Reflow_Order Take_Reflow_Order(std::string& outfile)
+{
+    constexpr std::string_view key = "/rewrite=";
+    constexpr long most = 2147483647;
+    Reflow_Order order;
+    const std::size_t at = outfile.find(key);
+    if (at == std::string::npos)
+        return order;
+    const std::size_t number = at + key.size();
+    const std::size_t end = std::min(outfile.find_first_not_of("0123456789", number), outfile.size());
+    order.asked = true;
+    order.has_number = end > number;
+    order.fields = static_cast<std::int32_t>(
+        std::min(Leading_Integer(std::string_view(outfile).substr(number, end - number)), most));
+    outfile.erase(at, end - at);
+    outfile = std::string(Trim_Copy(outfile));
+    return order;
 }
 
 }  // namespace ingester

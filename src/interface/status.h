@@ -22,6 +22,9 @@ enum class Request_Status : std::int32_t {
     rename_failed = INGESTER_RENAME_FAILED,
     zip_unsupported = INGESTER_ZIP_UNSUPPORTED,
     nothing_selected = INGESTER_NOTHING_SELECTED,
+    qtl_failed = INGESTER_QTL_FAILED,
+    qtl_options = INGESTER_QTL_OPTIONS,
+    merge_failed = INGESTER_MERGE_FAILED,
     download_failed = INGESTER_DOWNLOAD_FAILED,
 };
 

@@ -452,6 +452,32 @@ bool Delete_Column(Column* column, bool keep_square)
     return true;
 }
 
+void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last)
+{
+    if (sheet == nullptr)
+        return;
+    if (sheet->type == symmetric_matrix_sheet) {
+        for (Column* column = sheet->last_column; column != nullptr;) {
+            Column* const before = column->prev;
+            if (column->type != row_column && (column->index < first || column->index > last))
+                Delete_Column(column, true);
+            column = before;
+        }
+        return;
+    }
+    for (Column *column = sheet->first_column, *next; column != nullptr; column = next) {
+        next = column->next;
+        if (column->type == row_column || (column->index >= first && column->index <= last))
+            continue;
+        Unlink(sheet->first_column, sheet->last_column, column);
+        Count_Column(*sheet, *column, -1);
+        delete column;
+    }
+    Renumber_Columns(*sheet);
+    if (sheet->label_state == 0)
+        Number_Matrix_Columns(sheet);
+}
+
 bool Delete_Empty_Columns(Sheet* sheet)
 {
     if (sheet == nullptr)

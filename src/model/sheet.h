@@ -238,6 +238,9 @@ bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to);
 /// Takes a Column out of its Sheet and frees it; on a Symmetric Matrix with its row.
 bool Delete_Column(Column* column, bool keep_square);
 bool Delete_Empty_Columns(Sheet* sheet);
+/// Deletes the columns whose index is below `first` or above `last`; never the `Row` column. Of a
+/// Symmetric Matrix their rows go as well.
+void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last);
 
 /// Frees the cells of a list: kind 90 the level values, 91 the labels, all others the cells.
 void Free_Cell_Nodes(Column* column, std::int32_t kind);

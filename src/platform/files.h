@@ -39,6 +39,8 @@ public:
     /// Up to `count` bytes; fewer only at the end, or after a fault (see `Failed`).
     [[nodiscard]] std::size_t Read(void* target, std::size_t count);
     [[nodiscard]] bool Read_Exactly(void* target, std::size_t count) { return Read(target, count) == count; }
+    /// As `Read`, from the start of the file and nothing beyond: a look at a file that others will read.
+    [[nodiscard]] std::size_t Read_Head(void* target, std::size_t count);
     template <class T> [[nodiscard]] bool Read_Little(T& value)
     {
         std::byte bytes[sizeof(T)];

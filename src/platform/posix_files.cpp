@@ -120,6 +120,15 @@ std::size_t Input_File::Read(void* target, std::size_t count)
     return done;
 }
 
+std::size_t Input_File::Read_Head(void* target, std::size_t count)
+{
+    if (descriptor_ < 0)
+        return Read(target, count);
+    const std::size_t done = Read_Directly(target, count);
+    position_ += static_cast<std::int64_t>(done);
+    return done;
+}
+
 int Input_File::Peek()
 {
     if (descriptor_ < 0)

@@ -7,6 +7,7 @@
 #include <ctime>
 
 #include <sys/stat.h>
+#include <sys/statvfs.h>
 #include <unistd.h>
 
 namespace ingester {
@@ -90,6 +91,14 @@ bool Folder_Exists(std::string_view name)
 {
     struct stat facts;
     return Look_At(name, facts) && S_ISDIR(facts.st_mode);
+}
+
+std::uint64_t Free_Space(std::string_view folder)
+{
+    struct statvfs space;
+    if (::statvfs(Native_Path(folder).c_str(), &space) != 0)
+        return 0;
+    return std::uint64_t{space.f_bavail} * space.f_frsize;
 }
 
 bool Is_Special_File(std::string_view name)

@@ -64,6 +64,18 @@ namespace ingester {
     return text.size() >= end.size() && Equal_Ignoring_Case(text.substr(text.size() - end.size()), end);
 }
 
+/// Ends with one of `ends`, which have a blank between them.
+[[nodiscard]] constexpr bool Ends_With_One_Of(std::string_view text, std::string_view ends)
+{
+    while (!ends.empty()) {
+        const std::size_t blank = ends.find(' ');
+        if (Ends_Ignoring_Case(text, ends.substr(0, blank)))
+            return true;
+        ends.remove_prefix(blank == std::string_view::npos ? ends.size() : blank + 1);
+    }
+    return false;
+}
+
 /// Where `wanted` first stands in `text`, or npos.
 [[nodiscard]] constexpr std::size_t Find_Ignoring_Case(std::string_view text, std::string_view wanted)
 {

@@ -24,8 +24,18 @@ constexpr double Star_Code = -1e307;
 constexpr std::size_t Long_Name_Width = 1120;
 constexpr std::size_t Short_Name_Width = 280;
 
-/// Everything a request sets. A fresh value is assigned at the start of each, so nothing lingers.
-struct Request_Globals {
+/// The last column of a range without an end.
+constexpr std::int32_t Every_Column = 2147483647;
+
+/// What one request leaves to the next in the same process: the host counts on it.
+struct Lasting_Globals {
+    std::int32_t Text_Number_Mode = 3;  ///< how texts become numbers, 0 to 4
+    bool Keep_As_Columns = true;        ///< images and sound become columns
+    std::int32_t Max_Columns = Default_Max_Columns;
+};
+
+/// Everything else a request sets. A fresh value is assigned at the start of each, so nothing lingers.
+struct Request_Globals : Lasting_Globals {
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
     Fixed_Text<Short_Name_Width> Cell_Range;
@@ -47,20 +57,19 @@ struct Request_Globals {
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
-    std::int32_t Max_Columns = Default_Max_Columns;
-    bool Names_Kept_As_They_Stand = false;  ///< `Make_Valid_Name` leaves names alone
+    Fixed_Text<60> Return_Delete_Marker = "T181D";  ///< starts the host's scratch names
+    bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone
 
     // Input options.
     bool Qtl_Request = false;
     bool Qtl_Map_Given = false;
     Fixed_Text<Short_Name_Width> Qtl_Map_File;
     Fixed_Text<80> Missing_Input_Text = "*";
-    Fixed_Text<60> Return_Delete_Marker;
     std::int32_t Fixed_Lines = -1;
     bool Keep_Probe_Statistics = true;
     std::int32_t Lines_Per_Record = 1;
     std::int32_t First_Column = 0;
-    std::int32_t Last_Column = 2147483647;
+    std::int32_t Last_Column = Every_Column;
     bool Print_Summary = false;
     std::array<double, 3> Instat_Missing_Codes{};  ///< `Star_Code` for "*"
     std::int32_t Instat_Missing_Code_Count = 0;
@@ -76,7 +85,6 @@ struct Request_Globals {
     std::int32_t Names_Row = 0;
     bool Transpose = false;
     bool Transpose_Names = true;
-    std::int32_t Text_Number_Mode = 3;
     bool Reverse_Labels = false;
     bool Use_Var_File = false;
     Fixed_Text<Long_Name_Width> Var_File_Name;
@@ -93,9 +101,9 @@ struct Request_Globals {
     bool Write_Via_Temp = true;
     bool No_Return = false;
     bool Add_To_Output = false;
+    bool Add_Sheet_Given = false;  ///< `/a` came with a name
     Fixed_Text<Short_Name_Width> Output_Sheet_Name;
     bool End_With_Break = false;
-    bool Keep_As_Columns = true;
     bool Use_Formats = false;
     bool Fixed_Number_Text = false;
     bool Table_Grid = false;
@@ -121,12 +129,15 @@ struct Request_Globals {
     bool CSV_Output = false;
     Fixed_Text<Short_Name_Width> Merge_Sheet_Name;
     bool Keep_Sorted = true;
+    Fixed_Text<Long_Name_Width> Add_File_Name;  ///< the output that is added to, in full
     Fixed_Text<60> Merge_Key;
     Fixed_Text<60> Merge_With;
     bool Unique_Rows = false;
     bool Source_Key_Given = false;
     std::int32_t Merge_Key_Count = 0;
     std::int32_t Merge_Fill = 2;
+    std::vector<std::string> Merge_Keys;       ///< of a list file: keys in the output
+    std::vector<std::string> Merge_With_Keys;  ///< the keys in the input that go with them
 
     Settings settings;
 };

@@ -1,0 +1,323 @@
+// Stages that take the two strings apart and find out what they name.
+#include "interface/file_detection.h"
+#include "interface/paths.h"
+#include "interface/pipeline/stages.h"
+#include "interface/request/request.h"
+#include "interface/slash_options.h"
+#include "model/sheet.h"
+#include "platform/files.h"
+#include "spreadsheet/text/text.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <iterator>
+#include <limits>
+
+namespace ingester {
+
+Request_Run::~Request_Run()
+{
+    if (downloaded)
+        Delete_File(infile);
+    if (map_downloaded)
+        Delete_File(request.Qtl_Map_File);
+    if (writing && (temp_output != outfile || !output_was_there))
+        Delete_File(temp_output);
+}
+
+Request_Status Refuse_Path_Tokens(Request_Run& run)
+{
+    if (Holds_Path_Token(run.infile) || Holds_Path_Token(run.outfile))
+        return Stop(Request_Status::not_imported,
+                    "Names of folders between per cent signs are not available in this version.\n");
+    return Done;
+}
+
+Request_Status Cut_Genotype_Options(Request_Run& run)
+{
+    Cut_Options(Genotype_Options(), run.infile);
+    return Done;
+}
+
+Request_Status Fetch_Map(Request_Run& run)
+{
+    std::string map(request.Qtl_Map_File.view());
+    std::string source_url;
+    if (!Fetch_Url(map, "MAP", source_url, run.map_downloaded))
+        return Stop(Request_Status::download_failed, "Could not download map file URL:\n%.500s\n",
+                    map.c_str());
+    request.Qtl_Map_File = map;
+    return Done;
+}
+
+Request_Status Reflow_Lines(Request_Run& run)
+{
+    const Reflow_Order order = Take_Reflow_Order(run.outfile);
+    run.finished = order.asked;
+    if (!order.has_number)
+        return Done;
+    for (const Stage stage : {Fetch_Input, Refuse_Same_File, Name_Temporary_Output})
+        if (const Request_Status status = stage(run); status != Done)
+            return status;
+    run.writing = true;
+    if (Reflow_Lines_By_Fields(run.infile.c_str(), run.temp_output.c_str(), order.fields))
+        return Replace_Old_Output(run);
+    Report_Message("Output file not written.\n");  // in words alone: the status is always the same
+    return Done;
+}
+
+Request_Status Cut_Input_Options(Request_Run& run)
+{
+    Cut_Options(Input_Options(), run.infile);
+    return Done;
+}
+
+Request_Status Fetch_Input(Request_Run& run)
+{
+    std::string source_url;
+    if (!Fetch_Url(run.infile, "IN", source_url, run.downloaded))
+        return Stop(Request_Status::download_failed, "Could not download input URL:\n%.500s\n",
+                    run.infile.c_str());
+    request.Source_Url = source_url;
+    return Done;
+}
+
+/// The list file stands beside the input, or under its name in the temporary folder.
+Request_Status Name_Var_File(Request_Run& run)
+{
+    if (!request.Use_Var_File)
+        return Done;
+    std::string name = With_Extension(run.infile, ".VAR");
+    if (!File_Exists(name))
+        name = Get_Temp_Folder().append(File_Part_Of(name));
+    request.Var_File_Name = name;
+    return Done;
+}
+
+namespace {
+
+/// Names that stand for the clipboard, which must not become files on the way.
+constexpr std::string_view Clipboard_Inputs[] = {"clipboard", "clipboard.tab", "clipboard.csv",
+                                                 "clipboard.rda"};
+constexpr std::string_view Clipboard_Output_Start = "clipboard.";
+constexpr std::string_view Clipboard_Output_Extensions[] = {".csv", ".tab", ".txt", ".gen", ".rda"};
+
+Request_Status Stop_At_Clipboard()
+{
+    return Stop(Request_Status::clipboard_failed, "Using the clipboard is not available in this version.\n");
+}
+
+}  // namespace
+
+Request_Status Refuse_Clipboard_Input(Request_Run& run)
+{
+    for (const std::string_view name : Clipboard_Inputs)
+        if (Equal_Ignoring_Case(run.infile, name))
+            return Stop_At_Clipboard();
+    return Done;
+}
+
+Request_Status Refuse_Clipboard_Output(Request_Run& run)
+{
+    if (!Starts_Ignoring_Case(run.outfile, Clipboard_Output_Start))
+        return Done;
+    for (const std::string_view extension : Clipboard_Output_Extensions)
+        if (Ends_Ignoring_Case(run.outfile, extension))
+            return Stop_At_Clipboard();
+    return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
+}
+
+Request_Status Find_Source_Base_Name(Request_Run& run)
+{
+    const std::string_view source = run.downloaded ? request.Source_Url.view() : std::string_view(run.infile);
+    std::string_view name = File_Part_Of(source);
+    name = name.substr(0, Extension_Start(name));
+    if (name.empty() || name == "$Std_In$")
+        name = "std_in";
+    else if (Equal_Ignoring_Case(name, "clipboard"))
+        name = "clipbrd";
+    request.Source_Base_Name = name;
+    return Done;
+}
+
+Request_Status Detect_Input(Request_Run& run)
+{
+    run.input_code = request.Qtl_Map_Given ? qtl_locus_file : Detect_File_Type(run.infile);
+    run.genotype = run.input_code == qtl_locus_file;
+    if (run.genotype && !request.Qtl_Request)
+        return Stop(Request_Status::qtl_options, "Incorrect options for QTL file.\n");
+    switch (run.input_code) {
+    case unreadable_file:
+        return Stop(Request_Status::input_unreadable, "Trial files not supported.\n");
+    case unknown_file:
+        return Stop(Request_Status::input_unknown, "Files type unknown.\n");
+    case zip_file:
+        return Stop(Request_Status::zip_unsupported, "Zip files unsupported.\n");
+    default:
+        return Done;
+    }
+}
+
+Request_Status Cut_Output_Options(Request_Run& run)
+{
+    if (run.outfile.empty())
+        run.outfile = "Ingester.TBK";
+    Cut_Options(Output_Options(), run.outfile);
+    if (request.Add_Mode != Add_Modes::none)
+        request.Add_File_Name = run.outfile;
+    if (request.Replace_Sheet_Asked && request.Output_Sheet_Name.empty())
+        return Stop(Request_Status::not_imported, "SHEETNAME must be provided with METHOD=replace.\n");
+    return Done;
+}
+
+namespace {
+
+/// Adds "key" or "key=with" to the two lists.
+void Take_Merge_Keys(std::string_view line)
+{
+    const std::size_t equals = std::min(line.find('='), line.size());
+    const std::string_view key = Trim_Copy(line.substr(0, equals));
+    const std::string_view with = equals < line.size() ? Trim_Copy(line.substr(equals + 1)) : key;
+    request.Merge_Keys.emplace_back(key);
+    request.Merge_With_Keys.emplace_back(with);
+}
+
+}  // namespace
+
+/// The list file of a merge stands beside the input; its first line counts the keys.
+Request_Status Read_Merge_Keys(Request_Run& run)
+{
+    constexpr std::size_t longest_line = 1024;
+    if (request.Merge_Key_Count < 1)
+        return Done;
+    std::string name =
+        With_Extension(run.downloaded ? request.Source_Url.view() : std::string_view(run.infile), ".mrg");
+    std::string source_url;
+    bool downloaded = false;
+    if (!Fetch_Url(name, "MRG", source_url, downloaded))
+        return Stop(Request_Status::download_failed, "Could not download merge file URL:\n%.500s\n",
+                    name.c_str());
+    Input_File file;
+    std::string line;
+    if (file.Open(name) && file.Read_Line(line, longest_line))
+        request.Merge_Key_Count = std::min<std::int32_t>(
+            request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
+    while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
+        Take_Merge_Keys(line);
+    file.Close();
+    if (downloaded)
+        Delete_File(name);
+    if (request.Merge_Keys.empty())
+        return Stop(Request_Status::merge_failed, "Merge columns not found in files.\n");
+    return Done;
+}
+
+Request_Status Choose_Output(Request_Run& run)
+{
+    run.output = &Output_Driver_Of(run.outfile);
+    if (run.output->code == r_data_file && request.R_Text_Output)
+        run.output = &Output_Driver_Of(r_text_file);
+    run.output_code = run.output->code;
+    request.CSV_Output = run.output_code == text_file && !run.output->extensions.empty();
+    request.Max_Columns = static_cast<std::int32_t>(
+        std::min<std::int64_t>(std::int64_t{run.output->max_columns} + std::max(request.First_Column - 1, 0),
+                               std::numeric_limits<std::int32_t>::max()));
+    if (run.output->write == nullptr)
+        return Stop(Request_Status::output_failed, "Writing %s is not available in this version.\n",
+                    std::string(run.output->name).c_str());
+    return Done;
+}
+
+Request_Status Refuse_Same_File(Request_Run& run)
+{
+    if (Equal_Ignoring_Case(run.infile, run.outfile) || Same_File(run.infile, run.outfile))
+        return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
+    return Done;
+}
+
+/// Formats that hold any text as the name of a column take the names as they are.
+Request_Status Keep_Names_As_They_Stand(Request_Run& run)
+{
+    constexpr std::int32_t free_names[] = {
+        2, workbook_file, 8, 30, 31, xml_workbook_file, open_document_file};
+    request.Names_Kept_As_They_Stand =
+        (request.No_Name_Marks || request.Use_Var_File)
+        && std::ranges::find(free_names, run.output_code) != std::end(free_names);
+    return Done;
+}
+
+/// What the host asks for itself has to come back with the shape that it sent.
+Request_Status Know_Host_Scratch_File(Request_Run& run)
+{
+    run.host_scratch = Is_Host_Scratch_File(run.outfile);
+    if (run.host_scratch) {
+        Get_Settings().delete_empty_rows = 0;
+        request.Keep_Empty_Columns = true;
+    }
+    return Done;
+}
+
+Request_Status Require_Output_Folder(Request_Run& run)
+{
+    const std::string folder(Folder_Of(run.outfile));
+    if (!folder.empty() && !Folder_Exists(folder))
+        return Stop(Request_Status::output_failed, "Output directory %s does not exist.\n", folder.c_str());
+    return Done;
+}
+
+Request_Status Take_Sheet_Of_Output(Request_Run&)
+{
+    const bool updates = request.Add_Mode == Add_Modes::append || request.Add_Mode == Add_Modes::concatenate
+                         || request.Source_Key_Given;
+    if (updates && !request.Merge_Sheet_Name.empty() && request.Worksheet_Name.empty())
+        request.Worksheet_Name = request.Merge_Sheet_Name;
+    return Done;
+}
+
+/// A list of sheets is made of names alone.
+Request_Status Switch_Off_For_List(Request_Run&)
+{
+    if (!request.List_Sheets_Only)
+        return Done;
+    request.Add_Mode = Add_Modes::none;
+    request.Add_To_Output = false;
+    request.Subset_Columns = request.Subset_Rows = false;
+    request.Keep_Empty_Columns = false;
+    request.Transpose = false;
+    request.Source_Key_Given = false;
+    request.Fixed_Number_Text = false;
+    request.Output_Matrix = false;
+    Get_Settings().delete_empty_rows = 0;
+    return Done;
+}
+
+namespace {
+
+/// An operation that an option asks for and that no stage here carries out yet.
+struct Missing_Operation {
+    bool (*asked)(const Request_Run& run);
+    const char* name;
+};
+
+constexpr Missing_Operation Missing_Operations[] = {
+    {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
+    {[](const Request_Run&) { return request.Subset_Columns || request.Subset_Rows; }, "Keeping a subset"},
+    {[](const Request_Run&) { return request.Transpose; }, "Transposing"},
+    {[](const Request_Run&) { return request.Use_Var_File; }, "Renaming columns by a list file"},
+    {[](const Request_Run&) { return request.Add_Mode != Add_Modes::none || request.Add_To_Output; },
+     "Adding to an existing output"},
+    {[](const Request_Run&) { return request.Print_Summary; }, "Printing a summary"},
+};
+
+}  // namespace
+
+Request_Status Refuse_Missing_Operations(Request_Run& run)
+{
+    for (const Missing_Operation& operation : Missing_Operations)
+        if (operation.asked(run))
+            return Stop(Request_Status::not_imported, "%s is not available in this version.\n",
+                        operation.name);
+    return Done;
+}
+
+}  // namespace ingester

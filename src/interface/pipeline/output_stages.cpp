@@ -1,0 +1,65 @@
+// Stages that write the Sheet and put the new file in the place of an old one.
+#include "interface/file_detection.h"
+#include "interface/pipeline/stages.h"
+#include "interface/request/request.h"
+#include "interface/selection.h"
+#include "model/output_forms.h"
+#include "model/sheet.h"
+
+namespace ingester {
+
+/// An existing output is written beside itself, so that it stays whole until the new one is.
+Request_Status Name_Temporary_Output(Request_Run& run)
+{
+    run.output_was_there = File_Exists(run.outfile);
+    // A device or a pipe takes the text itself; a rename would put a file in its place.
+    request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there && !Is_Special_File(run.outfile);
+    run.temp_output = run.outfile;
+    if (!request.Write_Via_Temp || request.Add_To_Output)
+        return Done;
+    run.temp_output = With_Extension(run.outfile, ".$$$");
+    if (Same_File(run.temp_output, run.infile))
+        return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
+    Delete_File(run.temp_output);  // a link of that name would lead the text elsewhere
+    return Done;
+}
+
+/// The host's own structures: one row of numbers is Scalars, and a table of numbers is a Matrix when
+/// that is asked for.
+Request_Status Make_Output_Form(Request_Run& run)
+{
+    const bool host_file = run.output_code == spreadsheet_file || run.output_code == book_file;
+    const bool from_host_file = run.input_code == spreadsheet_file || run.input_code == book_file;
+    if (host_file && !from_host_file)
+        Vector_To_Scalars(Current_Sheet);
+    if (request.Output_Matrix && (host_file || run.output_code == script_file))
+        Vector_To_Matrix(Current_Sheet, request.Output_Matrix_Name);
+    return Done;
+}
+
+Request_Status Write_Output(Request_Run& run)
+{
+    run.writing = true;
+    if (run.output->write(Current_Sheet, run.temp_output.c_str()))
+        return Done;
+    if (request.Add_To_Output && !request.Add_Sheet_Given)
+        return Stop(Request_Status::inexact_sheet, "Could add data to Excel file.\n");
+    return Stop(Request_Status::output_failed, "Output file not written.\n");
+}
+
+Request_Status Write_Column_List(Request_Run& run)
+{
+    if (request.Write_Var_List)
+        Write_Var_File(*Current_Sheet, With_Extension(run.outfile, ".$V$"));
+    return Done;
+}
+
+Request_Status Replace_Old_Output(Request_Run& run)
+{
+    if (run.temp_output != run.outfile && !Replace_File(run.temp_output, run.outfile))
+        return Stop(Request_Status::rename_failed, "Could not rename temporary file.\n");
+    run.writing = false;
+    return Done;
+}
+
+}  // namespace ingester

@@ -1,0 +1,136 @@
+// Stages that make the Sheet and bring it into the shape that the output gets.
+#include "interface/file_detection.h"
+#include "interface/pipeline/stages.h"
+#include "interface/request/request.h"
+#include "interface/selection.h"
+#include "model/names.h"
+#include "model/output_forms.h"
+#include "model/sheet.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace ingester {
+
+namespace {
+
+/// The host's own files are narrowed while they are read, so that nothing may be left of them.
+void Tell_No_Import(const Request_Run& run)
+{
+    const bool host_file = run.input_code == spreadsheet_file || run.input_code == book_file;
+    if (!host_file)
+        Report_Message("No data could be imported.\n");
+    else if (request.Subset_Columns)
+        Report_Message("No columns selected from input file (i.e. no matches to specified names).\n");
+    else if (request.Subset_Rows)
+        Report_Message("No rows selected from input file (i.e. no matches to specified rows).\n");
+}
+
+}  // namespace
+
+Request_Status Read_Input(Request_Run& run)
+{
+    if (!Read_Data_File(run.infile, run.input_code, run.infile)) {
+        Tell_No_Import(run);
+        return Request_Status::not_imported;
+    }
+    if (Current_Sheet == nullptr)
+        return Stop(Request_Status::no_data, "Data could not be read from input file.\n");
+    return Done;
+}
+
+/// A name that was asked for goes to the Sheet; else the Sheet's own goes to the output.
+Request_Status Name_Output_Sheet(Request_Run& run)
+{
+    constexpr std::string_view automatic = "Sheet";
+    Sheet& sheet = *Current_Sheet;
+    const bool kept =
+        !sheet.sheet_name.empty() && !(run.host_scratch && sheet.sheet_name.view().starts_with(automatic));
+    if (!request.Output_Sheet_Name.empty())
+        sheet.sheet_name = request.Output_Sheet_Name;
+    else if (kept && (request.Add_Mode == Add_Modes::none || !request.Source_Key_Given))
+        request.Output_Sheet_Name = sheet.sheet_name;
+    return Done;
+}
+
+namespace {
+
+/// Inputs whose readers list their sheets themselves.
+bool Has_Sheet_List(std::int32_t code)
+{
+    constexpr std::int32_t listed[] = {book_file, workbook_file,   xml_workbook_file, open_document_file,
+                                       8,         /* Quattro */ 40 /* Tablet */};
+    return std::ranges::find(listed, code) != std::end(listed);
+}
+
+}  // namespace
+
+/// A file of one sheet gives a list of one.
+Request_Status List_Sheets(Request_Run& run)
+{
+    if (!request.List_Sheets_Only || Has_Sheet_List(run.input_code))
+        return Done;
+    const std::string name(Current_Sheet->sheet_name.empty() ? "Sheet1" : Current_Sheet->sheet_name.view());
+    Sheet* const list = New_Sheet_With_Rows(1);
+    Column* const column = New_Data_Column(list, text_column, "Worksheets", 1);
+    if (column == nullptr)
+        return Request_Status::no_data;
+    Set_Text(*column, *column->first_cell, name);
+    Compute_Column_Width(column);
+    return Done;
+}
+
+Request_Status Drop_Empty_Columns(Request_Run& run)
+{
+    request.Current_File_Name = run.outfile;
+    if (request.Keep_Empty_Columns)
+        return Done;
+    Delete_Empty_Columns(Current_Sheet);
+    if (Current_Sheet->column_count < 1)
+        return Stop(Request_Status::no_data, "All columns in the input file are empty.\n");
+    return Done;
+}
+
+Request_Status Note_Source(Request_Run& run)
+{
+    Current_Sheet->source_file = run.downloaded ? request.Source_Url.view() : std::string_view(run.infile);
+    return Done;
+}
+
+Request_Status Keep_Range_Of_Columns(Request_Run&)
+{
+    if (request.First_Column <= 0 && request.Last_Column >= Current_Sheet->column_count)
+        return Done;
+    if (!Keep_Column_Range(Current_Sheet, request.First_Column, request.Last_Column))
+        return Stop(Request_Status::not_imported, "Could not remove columns.\n");
+    return Done;
+}
+
+Request_Status Make_Names_Unique(Request_Run& run)
+{
+    constexpr std::int32_t told_by_name[] = {spreadsheet_file, script_file, book_file, r_text_file};
+    if (std::ranges::find(told_by_name, run.output_code) != std::end(told_by_name))
+        Make_Column_Names_Unique(Current_Sheet);
+    return Done;
+}
+
+Request_Status Drop_Empty_Rows(Request_Run&)
+{
+    if (Get_Settings().delete_empty_rows == 0)
+        return Done;
+    Delete_Empty_Rows(Current_Sheet);
+    if (Current_Sheet->row_count < 1)
+        return Stop(Request_Status::no_data,
+                    "All rows in the input file are empty.\nUse KEEPEMTPY=rows to return the empty rows.\n");
+    return Done;
+}
+
+Request_Status Find_Fixed_Decimals(Request_Run&)
+{
+    if (request.Fixed_Number_Text)
+        Find_Decimals(Current_Sheet);
+    return Done;
+}
+
+}  // namespace ingester
