@@ -93,8 +93,11 @@ std::string Fault_Of(const Given_Options& all, const Given_Option& given)
         return "the value is empty";
     if (!Is_Quoted(given) && value.find('/') != std::string_view::npos)
         return "this value can't hold a '/', which begins an option";
-    if (Is_Quoted(given) && value.find('\'') != std::string_view::npos
-        && (value.find('"') != std::string_view::npos || given.option->key == "/mv="))
+    // The text for missing values is the one that knows a single quote only.
+    const bool single = value.find('\'') != std::string_view::npos;
+    if (Is_Quoted(given) && single && given.option->key == "/mv=")
+        return "this value can't hold a single quote";
+    if (Is_Quoted(given) && single && value.find('"') != std::string_view::npos)
         return "this value can't hold both kinds of quotes";
     if (const Slash_Option* const other = Option_In_Value(all, given))
         return std::string("this value can't hold '")

@@ -20,7 +20,9 @@ constexpr const char* Examples = R"(Examples:
       comma text becomes tab-separated text
   ingester crops.csv - | head
       comma text on standard output
-  zcat crops.csv.gz | ingester - crops.tab
+  ingester crops.csv.gz crops.tab
+      compressed input is read as what it holds
+  sort crops.txt | ingester - crops.tab
       the table comes from standard input
   ingester --force yields.csv yields.tab
       replaces an older yields.tab

@@ -102,6 +102,7 @@ private:
 
 TEST_F(Command_Test, Converts)
 {
+    const std::string tail = Crops_Tab.substr(Crops_Tab.find("2\trye"));
     const std::string head = "plot\tkind\tyield\r\n1\toats\t2.5\r\n";
     Put("few.csv", "x,y\n1,oats\n");
     const std::tuple<Texts, const char*, std::string> cases[] = {
@@ -111,6 +112,11 @@ TEST_F(Command_Test, Converts)
         {{"few.csv", "few.tab", "--in-options", "/b/n"}, "few.tab", "C1\tC2\r\nx\ty\r\n1\toats\r\n"},
         {{"--out-options=/mv=NA", "crops.csv", "na.tab"}, "na.tab", head + "2\trye\tNA\r\n3\tbarley\t4\r\n"},
         {{"--range", "1:2", "crops.csv", "r.tab"}, "r.tab", head},
+        {{"crops.csv", "c.tab", "--columns", "2:2", "--no-header"}, "c.tab", "oats\r\nrye\r\nbarley\r\n"},
+        {{"few.csv", "y.tab", "--no-names", "--write-missing=it is"},
+         "y.tab",
+         "C1\tC2\r\nx\ty\r\n1\toats\r\n"},
+        {{"crops.csv", "m.tab", "--missing", "oats"}, "m.tab", "plot\tkind\tyield\r\n1\t\t2.5\r\n" + tail},
         {{"--force", "crops.csv", "old.tab"}, "old.tab", Crops_Tab},
     };
     for (const auto& [arguments, output, text] : cases) {
@@ -139,6 +145,22 @@ TEST_F(Command_Test, Standard_Output_Gets_What_A_Comma_File_Gets)
     EXPECT_TRUE(Run({"--version"}).out.starts_with("ingester "));
 }
 
+TEST_F(Command_Test, Tells_What_It_Would_Send_And_What_It_Can)
+{
+    const Ran dry =
+        Run({"--dry-run", "my data/crops 1.csv", "new.gen", "--missing", "N'A", "--names=4", "--append=a,b",
+             "--start", "it is", "--map", "in/a.map", "--quiet-read", "--range", "2:3"});
+    EXPECT_EQ(dry.status, 0);
+    EXPECT_EQ(dry.out, "Infile: my data\\crops 1.csv/map='in\\a.map'/x=\"N'A\"/y=4/s='it is'\n"
+                       "Outfile: new.gen/q/@,a,b\nWorksheet: \nCell range: 2:3\n");
+    const Ran formats = Run({"formats"});
+    EXPECT_NE(formats.out.find("comma text                           -      yes     .csv\n"),
+              std::string::npos);
+    EXPECT_NE(Run({"formats", "--all"}).out.find("\nShapefile "), std::string::npos);
+    EXPECT_NE(Run({"formats", "--json"}).out.find("\"extensions\": [\".htm\", \".html\"]"),
+              std::string::npos);
+}
+
 TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
 {
     Put("folder/odd.bin", std::string("\1\2\3\4 no text\n", 13));
@@ -158,6 +180,14 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {Wrong_Command_Line, "OUTPUT", {"crops.csv"}},
         {Wrong_Command_Line, "begin with '/'", {"crops.csv", "out.tab", "--in-options", "n"}},
         {Wrong_Command_Line, "more", {"crops.csv", "out.tab", "more"}},
+        {Wrong_Command_Line,
+         "--start: this value can't hold '/b'",
+         {"crops.csv", "out.tab", "--start", "a/b"}},
+        {Wrong_Command_Line, "both kinds of quotes", {"crops.csv", "out.tab", "--missing", "'\""}},
+        {Wrong_Command_Line, "can't hold a '/'", {"crops.csv", "out.tab", "--columns", "1/2"}},
+        {Wrong_Command_Line,
+         "--separators: the value is empty",
+         {"crops.csv", "out.tab", "--separators", ""}},
         {2, "no/crops.csv", {"no/crops.csv", "out.tab"}},
         {2, "no/crops.csv", {"no/crops.csv", "old.tab", "--force"}},
         {3, "folder/odd.bin", {"folder/odd.bin", "out.tab"}},

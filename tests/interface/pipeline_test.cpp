@@ -2,6 +2,7 @@
 #include "host_fixture.h"
 
 #include <csignal>
+#include <random>
 
 #include <fcntl.h>
 #include <sys/resource.h>
@@ -59,6 +60,7 @@ TEST_F(Pipeline_Test, Converts)
     const std::string nul_words = "Warning: 1 NUL characters in the text were read as blanks.\n:\n";
     const std::string empty_words = "Warning: All rows in the input file are empty.\n"
                                     "Use KEEPEMTPY=rows to return the empty rows.\n:\n";
+    const std::string few_words = "Note: Data contains fewer columns than the specified last column 9.\n:\n";
     const struct {
         std::string input, in, out, written, text, said = {};
         int status = 0;
@@ -67,6 +69,11 @@ TEST_F(Pipeline_Test, Converts)
         {Crops, "c.csv", "O.TAB/mv=NA/n", "O.TAB", "1\toats\t2.5\r\n2\trye\tNA\r\n"},
         {Crops, "c.csv", "o.csv/n", "o.csv", "    1,\"oats\" ,   2.5\r\n    2,\"rye\"  ,     *\r\n"},
         {Crops, "c.csv", "o.xyz/z/n", "o.xyz", "    1 oats   2.5\r\n    2 rye      *\r\n"},
+        {Crops, "c.csv/w/tr", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
+        {Crops, "c.csv/c=2", "o.tab", "o.tab", "kind\tyield\r\noats\t2.5\r\nrye\t*\r\n"},
+        {Crops, "c.csv/c=2:2", "o.tab", "o.tab", "kind\r\noats\r\nrye\r\n"},
+        {Crops, "c.csv/c=3:9", "o.tab/e", "o.tab", "yield\r\n2.5\r\n*\r\n", few_words},
+        {"a,b\n1.25,2\n3,1e9\n", "c.csv", "o.tab/f/d", "o.tab", "a\tb\r\n1.25\t2\r\n3.00\t1000000000\r\n"},
         {sparse, "c.csv", "o.tab", "o.tab", "a\r\n1\r\n3\r\n"},
         {sparse, "c.csv/k", "o.tab/e", "o.tab", "a\tb\r\n1\t*\r\n*\t*\r\n3\t*\r\n"},
         {"a,b\n,\n,\n", "c.csv/k", "o.tab", "o.tab", "a\tb\r\n*\t*\r\n", empty_words},
@@ -85,10 +92,12 @@ TEST_F(Pipeline_Test, Converts)
 
 TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
 {
-    const Texts files = {"c.csv",         Crops,       "o.tab",      "old",           "o.$$$",
-                         Crops,           "empty.csv", "",           "void.csv",      "a,b\n,\n,\n",
-                         "names.csv",     "a,b\n",     "binary.csv", "a,b\n1,\x01\n", "accents.csv",
-                         "a,\xE9\n1,2\n", "short.csv", "a,b,c"};
+    const Texts files = {"c.csv",      Crops,           "o.tab",       "old",
+                         "o.$$$",      Crops,           "empty.csv",   "",
+                         "void.csv",   "a,b\n,\n,\n",   "names.csv",   "a,b\n",
+                         "binary.csv", "a,b\n1,\x01\n", "accents.csv", "a,\xE9\n1,2\n",
+                         "short.csv",  "a,b,c",         "zip.zip",     "PK\3\4",
+                         "c.loc",      Crops,           "c.mrg",       "2\n"};
     for (std::size_t i = 0; i < files.size(); i += 2)
         Put(files[i], files[i + 1]);
     std::filesystem::create_directory(Path("folder.csv"));
@@ -99,6 +108,8 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
     const std::string unknown = "Files type unknown.\n";
     const std::string same = "Input and output files are the same.\n";
     const std::string missing = " is not available in this version.\n";
+    const std::string unavailable = " not available in this version.\n";
+    const std::string removed = "Could not remove columns.\n";
     const std::tuple<Texts, int, std::string> cases[] = {
         {{f + "none.csv", f + "o.tab"}, 2, unopened},
         {{f + "folder.csv", f + "o.tab"}, 2, unopened},
@@ -119,9 +130,25 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv", f + "no\\o.tab"}, 6, "Output directory " + f + "no\\ does not exist.\n"},
         {{f + "c.csv", f + "c.csv\\o.tab"}, 6, "Output directory " + f + "c.csv\\ does not exist.\n"},
         {{f + "c.csv", f + "folder.csv"}, 6, "Output file not written.\n"},
-        {{f + "c.csv", f + "o.DBF"}, 6, "Files with the extension .dbf can't be written in this version.\n"},
-        {{f + "c.csv", ""}, 6, "Files with the extension .tbk can't be written in this version.\n"},
+        {{f + "c.csv", f + "o.DBF"}, 6, "Writing dBase table" + missing},
+        {{f + "c.csv", ""}, 6, "Writing Tabulon Book" + missing},
         {{f + "c.csv", f + "o.tab/r"}, 5, "SHEETNAME must be provided with METHOD=replace.\n"},
+        {{f + "%TEMP%\\c.csv", f + "o.tab"}, 5, "Names of folders between per cent signs are" + unavailable},
+        {{f + "zip.zip", f + "o.tab"}, 11, "Zip files unsupported.\n"},
+        {{f + "c.csv/map", f + "o.tab"}, 16, "Incorrect options for QTL file.\n"},
+        {{f + "c.loc", f + "o.tab"}, 16, "Incorrect options for QTL file.\n"},
+        {{f + "c.loc/rqtl", f + "o.tab"}, 5, "Reading genotype files" + missing},
+        {{f + "c.csv/map=ftp:x", f + "o.tab"}, 19, "Could not download map file URL:\nftp:x\n"},
+        {{f + "c.csv", f + "o.tab/%=2"}, 17, "Merge columns not found in files.\n"},
+        {{f + "c.csv/c=3:2", f + "o.tab"},
+         5,
+         "Error: First column to be kept must be <= Last column.\n" + removed},
+        {{f + "c.csv/c=4", f + "o.tab"},
+         5,
+         "Error: Data contains fewer columns than first column to be kept.\n" + removed},
+        {{f + "c.csv/csv=0/w/v", f + "o.tab"},
+         5,
+         "CSV number of lines per record (0) is invalid.\nRenaming columns by a list file" + missing},
         {{f + "c.csv/tr", f + "o.tab"}, 5, "Transposing" + missing},
         {{f + "c.csv", f + "o.tab/@,k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
@@ -138,6 +165,17 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
     }
     EXPECT_EQ(Call({f + "c.csv", "o.tab", "", "", f + "empty.csv/s"}),
               (Host_Answer{5, "Keeping a subset" + missing + ":\n"}));
+}
+
+TEST_F(Pipeline_Test, A_List_Of_The_Columns_Is_Written_Beside_The_Output)
+{
+    Put("c.csv", Crops);
+    std::filesystem::create_directory(Path("o.$V$"));
+    EXPECT_EQ(Convert("c.csv", "o.tab/p").first, 0);
+    EXPECT_EQ(Get("o.VAR"), "3\nplot\nkind\nyield\n") << "the list may go to the temporary folder";
+    std::filesystem::remove(Path("o.$V$"));
+    EXPECT_EQ(Convert("c.csv", "o.tab/p").first, 0);
+    EXPECT_EQ(Get("o.$V$"), "3\nplot\nkind\nyield\n");
 }
 
 TEST_F(Pipeline_Test, An_Old_Output_Is_Replaced_Whole)
@@ -206,6 +244,54 @@ TEST_F(Pipeline_Test, Calls_Follow_Each_Other_Without_Leftovers)
     }
     EXPECT_EQ(Descriptors(), descriptors);
     EXPECT_EQ(Files(), "c.csv o.tab");
+}
+
+/// A thousand requests, each in a process of its own first and then all in this one: nothing of a request
+/// reaches the next.
+TEST_F(Pipeline_Test, Requests_In_One_Process_Are_Those_Of_Many)
+{
+    constexpr std::string_view inputs[] = {"c.csv", "d.csv", "none.csv", "empty.csv"};
+    constexpr std::string_view ins[] = {"/n", "/x=1", "/c=2:3", "/k", "/b",   "/o=V", "/z=;", "/lt=1",
+                                        "/w", "/u",   "/csv=2", "/y", "/s=1", "/e=2", "/tr",  "/#"};
+    constexpr std::string_view outs[] = {"/n", "/mv=NA", "/d", "/f", "/e", "/h",
+                                         "/-", "/u",     "/z", "/m", "/av"};
+    constexpr std::string_view endings[] = {".tab", ".csv", ".txt"};
+    Put("c.csv", Crops);
+    Put("d.csv", "a!,b:2\n 1.50,\n,\n'x y',1e10\n");
+    Put("empty.csv", "a,b\n,\n");
+    std::minstd_rand random;
+    const auto some = [&](auto& options) {
+        std::string text;
+        for (auto count = random() % 4; count > 0; --count)
+            text += options[random() % std::size(options)];
+        return text;
+    };
+    std::vector<std::pair<std::string, std::string>> requests;
+    for (int i = 0; i < 1000; ++i)
+        requests.emplace_back(std::string(inputs[random() % 4]) + some(ins),
+                              std::string("o") + std::string(endings[random() % 3]) + "/z" + some(outs));
+    const auto run = [&](const std::pair<std::string, std::string>& strings) {
+        const auto [status, messages] = Convert(strings.first, strings.second);
+        const std::string output = "o" + strings.second.substr(1, 4);
+        const std::string all = std::to_string(status) + messages + Get(output);
+        std::filesystem::remove(Path(output));
+        return all;
+    };
+    for (std::size_t i = 0; i < requests.size(); ++i) {
+        if (const ::pid_t child = ::fork(); child == 0) {
+            Put("answer" + std::to_string(i), run(requests[i]));
+            ::_exit(0);
+        } else {
+            ::waitpid(child, nullptr, 0);
+        }
+    }
+    int succeeded = 0;
+    for (std::size_t i = 0; i < requests.size(); ++i) {
+        const std::string all = run(requests[i]);
+        succeeded += all.starts_with('0') ? 1 : 0;
+        EXPECT_EQ(all, Get("answer" + std::to_string(i))) << requests[i].first << " " << requests[i].second;
+    }
+    EXPECT_GT(succeeded, 200);
 }
 
 TEST_F(Pipeline_Test, Hostile_Texts_End_In_Good_Time)

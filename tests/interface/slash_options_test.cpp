@@ -3,6 +3,8 @@
 
 #include "support/request_fixture.h"
 
+#include <random>
+
 namespace ingester {
 namespace {
 
@@ -34,12 +36,19 @@ protected:
     }
 };
 
-TEST_F(Slash_Options_Test, Input)
+TEST_F(Slash_Options_Test, Genotype)
 {
     const Case cases[] = {
         {"a.loc/rqtl", "a.loc", [](const R& r) { return r.Qtl_Request && !r.Reverse_Labels; }},
-        {"a.loc/n/map", "a.loc", [](const R& r) { return r.Qtl_Map_File == "a.map" && r.No_Names; }},
+        {"a.loc/n/map", "a.loc/n", [](const R& r) { return r.Qtl_Map_File == "a.map" && !r.No_Names; }},
         {"a.loc/map='b/c.map'", "a.loc", [](const R& r) { return r.Qtl_Map_File == "b/c.map"; }},
+    };
+    Check(Genotype_Options(), cases);
+}
+
+TEST_F(Slash_Options_Test, Input)
+{
+    const Case cases[] = {
         {"a/x=NA/n", "a", [](const R& r) { return r.Missing_Input_Text == "NA" && r.No_Names; }},
         {"a/x=\"/b", "a", [](const R& r) { return r.Missing_Input_Text == "/b" && r.settings.trim_cells; }},
         {"a/x=" + long_text, "a", [](const R& r) { return Is_Wide(r.Missing_Input_Text, 80); }},
@@ -137,6 +146,34 @@ TEST_F(Slash_Options_Test, Output)
     };
     Check(Output_Options(), cases);
     EXPECT_EQ(Messages(), "");
+}
+
+/// Strings of option keys in any number and order, with unclosed quotes and values of every length: what is
+/// left is no longer than what was given, and no value exceeds its width.
+TEST_F(Slash_Options_Test, Hostile_Strings_End_In_A_Defined_Request)
+{
+    constexpr std::string_view filling[] = {"=", "'", "\"", "`", "/", " ",        ",",
+                                            "9", "N", "U",  ":", "$", "wwwwwwwww"};
+    std::minstd_rand random;
+    for (int round = 0; round < 3000; ++round) {
+        Start_Request("t");
+        for (const auto options : {Genotype_Options(), Input_Options(), Output_Options()}) {
+            std::string text;
+            while (text.size() < 1120 && random() % 100 != 0)
+                text.append(random() % 2 == 0 ? options[random() % options.size()].key
+                                              : filling[random() % std::size(filling)]);
+            const std::size_t given = text.size();
+            Cut_Options(options, text);
+            ASSERT_LE(text.size(), given);
+        }
+        ASSERT_GE(request.Lines_Per_Record, 1);
+        ASSERT_LE(request.Text_Number_Mode, 4);
+        ASSERT_LE(request.Merge_Key_Count, 9);
+        ASSERT_LE(request.Instat_Missing_Code_Count, 3);
+    }
+    std::string slashes(1120, '/');
+    Cut_Options(Input_Options(), slashes);
+    EXPECT_EQ(slashes.size(), 1120U);
 }
 
 }  // namespace

@@ -59,7 +59,7 @@ Request_Status Reflow_Lines(Request_Run& run)
     for (const Stage stage : {Fetch_Input, Refuse_Same_File, Name_Temporary_Output})
         if (const Request_Status status = stage(run); status != Done)
             return status;
-    run.writing = true;
+    Begin_Writing(run);
     if (Reflow_Lines_By_Fields(run.infile.c_str(), run.temp_output.c_str(), order.fields))
         return Replace_Old_Output(run);
     Report_Message("Output file not written.\n");  // in words alone: the status is always the same

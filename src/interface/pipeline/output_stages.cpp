@@ -20,7 +20,6 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     run.temp_output = With_Extension(run.outfile, ".$$$");
     if (Same_File(run.temp_output, run.infile))
         return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
-    Delete_File(run.temp_output);  // a link of that name would lead the text elsewhere
     return Done;
 }
 
@@ -37,9 +36,16 @@ Request_Status Make_Output_Form(Request_Run& run)
     return Done;
 }
 
-Request_Status Write_Output(Request_Run& run)
+void Begin_Writing(Request_Run& run)
 {
     run.writing = true;
+    if (run.temp_output != run.outfile)
+        Delete_File(run.temp_output);  // a link of that name would lead the text elsewhere
+}
+
+Request_Status Write_Output(Request_Run& run)
+{
+    Begin_Writing(run);
     if (run.output->write(Current_Sheet, run.temp_output.c_str()))
         return Done;
     if (request.Add_To_Output && !request.Add_Sheet_Given)

@@ -90,6 +90,8 @@ Request_Status Find_Fixed_Decimals(Request_Run& run);
 
 Request_Status Make_Output_Form(Request_Run& run);
 Request_Status Write_Output(Request_Run& run);
+/// From here on the file that the writer writes is ours, and goes when the request fails.
+void Begin_Writing(Request_Run& run);
 Request_Status Write_Column_List(Request_Run& run);
 Request_Status Replace_Old_Output(Request_Run& run);
 
