@@ -13,6 +13,7 @@ protected:
     void SetUp() override
     {
         Folder_Test::SetUp();
+        request = Request_Globals{};  // with what outlives requests
         Start_Request("t");
     }
     void TearDown() override

@@ -31,7 +31,6 @@ constexpr std::int32_t Every_Column = 2147483647;
 struct Lasting_Globals {
     std::int32_t Text_Number_Mode = 3;  ///< how texts become numbers, 0 to 4
     bool Keep_As_Columns = true;        ///< images and sound become columns
-    std::int32_t Max_Columns = Default_Max_Columns;
 };
 
 /// Everything else a request sets. A fresh value is assigned at the start of each, so nothing lingers.
@@ -57,6 +56,7 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
+    std::int32_t Max_Columns = Default_Max_Columns;
     Fixed_Text<60> Return_Delete_Marker = "T181D";  ///< starts the host's scratch names
     bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone
 
