@@ -107,6 +107,7 @@ bool Take_Secondary_File(std::string text, Pass_Request& asked)
     if (text.empty())
         return true;
     Cut_Secondary_Markers(text);
+    Expand_Path_Tokens(text, Get_Temp_Folder());
     std::string source_url;
     bool downloaded = false;
     if (!Fetch_Url(text, "SEC", source_url, downloaded)) {
@@ -129,6 +130,7 @@ bool Take_Column_Subset(Pass_File& pass)
         list = request.Secondary_File.view();
     else if (pass.Count() > 5 && !pass.Read_Text(Subset_Words, list))
         return false;
+    Expand_Path_Tokens(list, Get_Temp_Folder());
     request.Subset_Columns = Read_Column_Subset(list);
     return true;
 }

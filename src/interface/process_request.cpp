@@ -1,5 +1,6 @@
 #include "interface/process_request.h"
 
+#include "interface/paths.h"
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "model/sheet.h"
@@ -10,7 +11,7 @@ namespace {
 
 /// Every stage, in the order in which they act; the first that doesn't succeed ends the request.
 constexpr Stage Stages[] = {
-    Refuse_Path_Tokens,
+    Expand_Tokens,
     Cut_Genotype_Options,
     Fetch_Map,
     Reflow_Lines,
@@ -65,6 +66,7 @@ void Start_Request(std::string_view stem)
     static_cast<Lasting_Globals&>(fresh) = request;
     request = std::move(fresh);
     request.Scratch_Stem = stem;
+    request.Return_Delete_Marker = Host_Delete_Marker();
     Free_Sheets();
     Init_Library();
     Start_Message_File();

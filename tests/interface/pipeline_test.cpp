@@ -108,7 +108,6 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
     const std::string unknown = "Files type unknown.\n";
     const std::string same = "Input and output files are the same.\n";
     const std::string missing = " is not available in this version.\n";
-    const std::string unavailable = " not available in this version.\n";
     const std::string removed = "Could not remove columns.\n";
     const std::tuple<Texts, int, std::string> cases[] = {
         {{f + "none.csv", f + "o.tab"}, 2, unopened},
@@ -133,7 +132,6 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv", f + "o.DBF"}, 6, "Writing dBase table" + missing},
         {{f + "c.csv", ""}, 6, "Writing Tabulon Book" + missing},
         {{f + "c.csv", f + "o.tab/r"}, 5, "SHEETNAME must be provided with METHOD=replace.\n"},
-        {{f + "%TEMP%\\c.csv", f + "o.tab"}, 5, "Names of folders between per cent signs are" + unavailable},
         {{f + "zip.zip", f + "o.tab"}, 11, "Zip files unsupported.\n"},
         {{f + "c.csv/map", f + "o.tab"}, 16, "Incorrect options for QTL file.\n"},
         {{f + "c.loc", f + "o.tab"}, 16, "Incorrect options for QTL file.\n"},

@@ -25,11 +25,12 @@ Request_Run::~Request_Run()
         Delete_File(temp_output);
 }
 
-Request_Status Refuse_Path_Tokens(Request_Run& run)
+Request_Status Expand_Tokens(Request_Run& run)
 {
-    if (Holds_Path_Token(run.infile) || Holds_Path_Token(run.outfile))
-        return Stop(Request_Status::not_imported,
-                    "Names of folders between per cent signs are not available in this version.\n");
+    const std::string temp = Get_Temp_Folder();
+    Expand_Path_Tokens(run.infile, temp);
+    Expand_Path_Tokens(run.outfile, temp);
+    request.Allow_HTML = Read_Host_Setting("Spreadsheet", "Allow HTML Formatting", 0, 1, 0) != 0;
     return Done;
 }
 
@@ -87,9 +88,9 @@ Request_Status Name_Var_File(Request_Run& run)
 {
     if (!request.Use_Var_File)
         return Done;
-    std::string name = With_Extension(run.infile, ".VAR");
+    std::string name = Find_Companion(With_Extension(run.infile, ".VAR"));
     if (!File_Exists(name))
-        name = Get_Temp_Folder().append(File_Part_Of(name));
+        name = Find_Companion(Get_Temp_Folder().append(File_Part_Of(name)));
     request.Var_File_Name = name;
     return Done;
 }
@@ -199,7 +200,7 @@ Request_Status Read_Merge_Keys(Request_Run& run)
                     name.c_str());
     Input_File file;
     std::string line;
-    if (file.Open(name) && file.Read_Line(line, longest_line))
+    if (file.Open(Find_Companion(name)) && file.Read_Line(line, longest_line))
         request.Merge_Key_Count = std::min<std::int32_t>(
             request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
     while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))

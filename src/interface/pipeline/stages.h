@@ -50,7 +50,7 @@ Request_Status Stop(Request_Status status, const char* words, Arguments... argum
 
 // --- From the two strings to the files they name -------------------------------------------------
 
-Request_Status Refuse_Path_Tokens(Request_Run& run);
+Request_Status Expand_Tokens(Request_Run& run);
 Request_Status Cut_Genotype_Options(Request_Run& run);
 Request_Status Fetch_Map(Request_Run& run);
 /// "/rewrite=n" in the Outfile: no table, but lines joined until they hold n fields.
