@@ -1,5 +1,6 @@
 #include "interface/format_drivers.h"
 
+#include "hostfiles/script/script.h"
 #include "interface/file_detection.h"
 #include "interface/request/request.h"
 #include "spreadsheet/text/text.h"
@@ -34,7 +35,7 @@ constexpr std::int32_t Columns = Default_Max_Columns;
 constexpr Output_Driver Output_Drivers[] = {
     {".xlsx", 59, "Excel 2007 workbook", nullptr, Columns},
     {".xlsm", 59, "Excel 2007 workbook", nullptr, Columns},
-    {".gen", script_file, "command script", nullptr, Columns},
+    {".gen", script_file, "command script", Write_Host_Script, Columns},
     {".tss", spreadsheet_file, "Tabulon Spreadsheet", nullptr, Columns},
     {".tbk", book_file, "Tabulon Book", nullptr, 10000000},
     {".fmt", 18, "Gauss data", nullptr, Columns},
