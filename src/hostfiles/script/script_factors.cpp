@@ -119,6 +119,12 @@ void Write_Long_Form(Column& column, std::int32_t length, Script_Buffer& script)
 
 }  // namespace
 
+std::string Factor_Name(const Column& column)
+{
+    return column.name.empty() ? Format_Text("F%li", static_cast<long>(column.index))
+                               : std::string(column.name);
+}
+
 void Write_Factor_Declaration(Column& column, std::int32_t length, Script_Buffer& script)
 {
     Settle_Count(column.level_values_count, column.nlevels);
@@ -128,9 +134,7 @@ void Write_Factor_Declaration(Column& column, std::int32_t length, Script_Buffer
         Write_Short_Form(column, length, script);
     else
         Write_Long_Form(column, length, script);
-    Write_Statement(column.name.empty() ? Format_Text("] F%li", static_cast<long>(column.index))
-                                        : Format_Text("] %s", column.name.c_str()),
-                    script);
+    Write_Statement("] " + Factor_Name(column), script);
     Write_Attributes(column, Small_Words, script);
     Write_Statement("\n", script);
 }

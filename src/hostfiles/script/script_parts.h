@@ -28,6 +28,9 @@ bool Write_Column_Script(Column& column, Script_Buffer& script);
 /// Declares a Factor with its levels, for `length` units.
 void Write_Factor_Declaration(Column& column, std::int32_t length, Script_Buffer& script);
 
+/// What the declaration calls it.
+[[nodiscard]] std::string Factor_Name(const Column& column);
+
 /// Restricts the columns to the included rows, or frees them from an older restriction.
 void Write_Restrictions(Sheet& sheet, Script_Buffer& script);
 

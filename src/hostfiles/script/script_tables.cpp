@@ -65,7 +65,7 @@ std::string Declare_Row_Factor(const Sheet& sheet, const Table_Shape& shape, Scr
     if (first == nullptr || first->type != factor_column)
         return Make_Up_Factor("_tfc_", shape.rows, script);
     Write_Factor_Declaration(*first, 0, script);
-    return std::string(first->name);
+    return Factor_Name(*first);
 }
 
 std::vector<std::string> Declare_Leading_Factors(const Sheet& sheet, Script_Buffer& script)
@@ -75,7 +75,7 @@ std::vector<std::string> Declare_Leading_Factors(const Sheet& sheet, Script_Buff
         if (column->type != factor_column)
             continue;
         Write_Factor_Declaration(*column, 0, script);
-        names.emplace_back(column->name);
+        names.push_back(Factor_Name(*column));
     }
     return names;
 }
@@ -84,12 +84,15 @@ std::vector<std::string> Declare_Leading_Factors(const Sheet& sheet, Script_Buff
 bool Tell_Levels_Apart(const Sheet& sheet, const Table_Shape& shape)
 {
     std::vector<double> values;
-    for (const Column* column : shape.columns)
-        if (column->type == table_column)
-            values.push_back(column->table_margin_value);
+    for (const Column* column : shape.columns) {
+        if (column->type != table_column)
+            continue;
+        if (!Is_Present(sheet, column->table_margin_value))
+            return false;
+        values.push_back(column->table_margin_value);
+    }
     std::sort(values.begin(), values.end());
-    return !values.empty() && Is_Present(sheet, values.front())
-           && std::adjacent_find(values.begin(), values.end()) == values.end();
+    return std::adjacent_find(values.begin(), values.end()) == values.end();
 }
 
 bool Any_Column_Changed(const Table_Shape& shape)
@@ -103,9 +106,7 @@ bool Take_Levels(Column& factor, const Table_Shape& shape)
 {
     const Sheet& sheet = *factor.sheet;
     const std::int32_t state = sheet.label_state;
-    const bool numbered =
-        state == labels_by_level || state == labels_by_level_and_text || state == labels_by_position;
-    const bool valued = numbered && Tell_Levels_Apart(sheet, shape);
+    const bool valued = state != labels_by_text && Tell_Levels_Apart(sheet, shape);
     const bool labelled = state >= labels_by_text || (state == labels_by_level && !valued);
     if ((valued && !Make_Level_Values(factor, factor.nlevels))
         || (labelled && !Make_Labels(factor, factor.nlevels)))
