@@ -28,7 +28,7 @@ std::int32_t made_up_factors = 0;
 
 std::string Make_Up_Factor(const char* name_start, std::int64_t levels, Script_Buffer& script)
 {
-    const std::string name = name_start + std::to_string(++made_up_factors);
+    std::string name = name_start + std::to_string(++made_up_factors);
     Write_Statement("FACTOR [modify=yes;", script);
     Write_Statement(Format_Text("levels=%li] %s\n", static_cast<long>(levels), name.c_str()), script);
     return name;
