@@ -1,6 +1,7 @@
 // Times one read of delimited text into a Sheet and, if asked, one write of the Sheet as comma
-// text. Prints "name value" lines: seconds, counts and bytes.
+// text or as a command script. Prints "name value" lines: seconds, counts and bytes.
 
+#include "hostfiles/script/script.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
@@ -52,8 +53,8 @@ template <class Work> bool Time(const char* name, Work work)
 int main(int count, char** arguments)
 {
     const std::string_view form = count == 4 ? arguments[3] : "packed";
-    if ((count != 2 && count != 4) || (form != "packed" && form != "padded")) {
-        std::fputs("usage: time_text FILE [OUTPUT packed|padded]\n", stderr);
+    if ((count != 2 && count != 4) || (form != "packed" && form != "padded" && form != "script")) {
+        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script]\n", stderr);
         return 2;
     }
     Start_Request();
@@ -72,8 +73,10 @@ int main(int count, char** arguments)
         request.Packed_Csv_Output = form == "packed";
         request.settings.csv_title = 0;
         Current_Sheet->settings.csv_title = 0;
-        const bool written =
-            Time("write_seconds", [&] { return Write_Text_File(Current_Sheet, arguments[2], false); });
+        const bool written = Time("write_seconds", [&] {
+            return form == "script" ? Write_Host_Script(Current_Sheet, arguments[2])
+                                    : Write_Text_File(Current_Sheet, arguments[2], false);
+        });
         Print_Memory("after_write");
         if (!written) {
             Close_Message_File();

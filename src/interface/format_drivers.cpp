@@ -1,5 +1,6 @@
 #include "interface/format_drivers.h"
 
+#include "hostfiles/script/script.h"
 #include "interface/compressed_files.h"
 #include "interface/file_detection.h"
 #include "spreadsheet/text/text.h"
@@ -31,7 +32,7 @@ constexpr Format_Driver Format_Drivers[] = {
     {spreadsheet_file, "Tabulon Spreadsheet", nullptr, ".tss"},
     {2, "Lotus 1-2-3 worksheet"},
     {3, "dBase table", nullptr, ".dbf", nullptr, 511},
-    {script_file, "command script", nullptr, ".gen"},
+    {script_file, "command script", nullptr, ".gen", Write_Host_Script},
     {workbook_file, "Excel workbook", nullptr, ".xls", nullptr, 255},
     {text_file, "comma text", nullptr, ".csv", Write_Text},
     {text_file, "fixed-width text", nullptr, "", Write_Text},

@@ -1,0 +1,414 @@
+#include "hostfiles/script/script.h"
+
+#include "hostfiles/script/script_parser.h"
+#include "hostfiles/script/script_text.h"
+#include "support/cell_lists.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <cmath>
+#include <random>
+#include <regex>
+
+namespace ingester {
+namespace {
+
+class Script : public Request_Test {
+protected:
+    [[nodiscard]] std::string Written(Sheet* sheet) const
+    {
+        EXPECT_TRUE(Write_Host_Script(sheet, Request_Name("out.gen").c_str()));
+        return Get("out.gen");
+    }
+};
+
+Sheet* Sheet_Of(std::int32_t type, std::int32_t rows, const char* name = "")
+{
+    Sheet* const sheet = New_Sheet_With_Rows(rows);
+    sheet->type = type;
+    sheet->structure_name = name;
+    return sheet;
+}
+
+Column* Describe(Column* column, std::int32_t decimals, const char* extra, std::int32_t date_format = 0)
+{
+    column->decimals = decimals;
+    column->extra = extra;
+    column->format = date_format > 0 ? date_format_mark : column->format;
+    column->date_format = date_format;
+    return column;
+}
+
+std::vector<double> Count_To(int count)
+{
+    std::vector<double> values;
+    for (int value = 1; value <= count; ++value)
+        values.push_back(value);
+    return values;
+}
+
+TEST_F(Script, Numbers_Are_Those_The_Host_Reads)
+{
+    const double greatest = std::nextafter(9.99999e307, HUGE_VAL);
+    const std::tuple<double, double, bool, const char*> cases[] = {
+        {1e9, Missing_Value, false, "1000000000"},
+        {1e10, Missing_Value, false, "1.000000000000e+10"},
+        {-1000000000.5, Missing_Value, false, "-1.000000000500e+09"},
+        {0.1 + 0.2, Missing_Value, false, "0.3"},
+        {-1e-300, Missing_Value, false, "-1e-300"},
+        {9.99999e307, Missing_Value, false, "9.999990000000e+307"},
+        {greatest, Missing_Value, false, "9.99999E+307"},
+        {HUGE_VAL, Missing_Value, true, "9.99999E+307"},
+        {-HUGE_VAL, Missing_Value, false, "*"},
+        {std::nan(""), Missing_Value, true, "*"},
+        {Missing_Value, Missing_Value, true, "*"},
+        {-1e306, Missing_Value, false, "-1.000000000000e+306"},
+        {59, Missing_Value, true, "109572"},
+        {60.5, Missing_Value, true, "109572.5"},
+        {-1, Missing_Value, true, "*"},
+        {99, 99, true, "*"},
+    };
+    for (const auto& [value, missing, date, expected] : cases) {
+        char text[Number_Text_Room];
+        const std::string_view printed(
+            text, static_cast<std::size_t>(Format_Script_Number(text, value, missing, date) - text));
+        EXPECT_EQ(printed, expected);
+    }
+}
+
+/// One of each kind, spelled out.
+TEST_F(Script, A_Vector_To_The_Letter)
+{
+    Sheet* const sheet = Sheet_Of(vector_sheet, 3);
+    sheet->source_file = "C:\\in\"put.csv";
+    Describe(Add_Cells(sheet, variate_column, "v", {"1", "*", "2.50"}), 2, "it's \"so\"");
+    Describe(Add_Cells(sheet, variate_column, "day", {"1", "60", "*"}), -1, "", 4);
+    Describe(Add_Cells(sheet, variate_column, "host", {"1", "2", "3"}), -1, "", 10)->date_form = 1;
+    Describe(Add_Cells(sheet, text_column, "t", {"a", "", "b'c"}), 0, "x");
+    Describe(Add_Cells(sheet, long_text_column, "l", {"a\\b", "", "c"}), 0, "");
+    Column* const factor = Add_Cells(sheet, factor_column, "f", {"2", "*", "1"});
+    Put_Levels(*factor, {10, 20}, {"low", "it's"});
+    Describe(factor, 0, "dose", 2);
+    Add_Cells(sheet, factor_column, "p", {"1", "1", "2"});
+    Add_Cells(sheet, units_text_column, "id", {"a", "b", "c"});
+    sheet->restriction_active = sheet->modified = 1;
+    Row_At(sheet, 1)->restricted = 1;
+    request.Title_Text = "The `title'";
+    request.Pointer_Name = "all";
+    EXPECT_EQ(Written(sheet), R"("Data taken from File: C:\in""put.csv"
+
+DELETE [Redefine=yes] _stitle_ : TEXT _stitle_ : READ [print=*] _stitle_
+'The ``title''':
+PRINT [IPrint=*] _stitle_; Just=Left
+DELETE [redefine=yes] id,v,day,host,t,l,f,p
+TEXT [nvalues=3] id
+READ id
+'a' 'b' 'c' :
+UNITS id
+VARIATE [nvalues=3] v; decimals=2; extra='it''s ""so""'
+READ v
+1 * 2.5 :
+VARIATE [nvalues=3] day; drep=4
+READ day
+109514 109572 * :
+VARIATE [nvalues=3] host; drep=10
+READ host
+1 2 3 :
+TEXT [nvalues=3] t; extra='x'
+READ t
+'a' '' 'b''c' :
+TEXT [nvalues=3] l
+READ l
+'a\\b'
+''
+'c'
+:
+FACTOR [modify=yes;nvalues=3;levels=!(109523,109533);labels=!t('low','it''s')\
+] f; decimals=0; extra='dose'; drep=2
+READ f; frepresentation=ordinal
+2* 1:
+FACTOR [modify=yes;nvalues=3;levels=2] p
+READ p; frepresentation=ordinal
+112:
+DELETE [redefine=yes] _rest_
+READ [print=*;setnvalues=y] _rest_
+1 0 1 :
+RESTRICT id,v,day,host,t,l,f,p; _rest_
+DELETE [redefine=yes] all
+POINTER all; !p(id,v,day,host,t,l,f,p)
+
+RETURN [CLOSE=yes]
+
+)");
+    EXPECT_EQ(sheet->modified, 0);
+}
+
+TEST_F(Script, The_Request_Chooses_Endings_And_Quiet_Reading)
+{
+    const auto quiet = [] { request.Quiet_Read = request.No_Return = true; };
+    const auto marked = [] { request.Return_Delete_Marker = "out", request.No_Return = true; };
+    const std::tuple<void (*)(), const char*, const char*> cases[] = {
+        {quiet, "READ [print=*] v\n* :\nRESTRICT v\n", "\n"},
+        {marked, "READ v\n* :\nRESTRICT v\n", "RETURN [CLOSE=yes;DELETE=yes]\n\n"},
+        {[] { request.Return_Delete_Marker = "other"; }, "READ v\n* :\nRESTRICT v\n",
+         "RETURN [CLOSE=yes]\n\n"},
+        {[] { request.End_With_Break = true; }, "READ v\n* :\nRESTRICT v\n", "ENDBREAK\n\n"},
+    };
+    for (const auto& [ask, reading, ending] : cases) {
+        Start_Request("t");
+        ask();
+        Sheet* const sheet = Sheet_Of(vector_sheet, 1);
+        Add_Cells(sheet, variate_column, "v", {"*"});
+        EXPECT_EQ(Written(sheet),
+                  std::string("DELETE [redefine=yes] v\nVARIATE [nvalues=1] v\n") + reading + ending);
+    }
+}
+
+/// A Table with the levels of its columns in `levels`.
+Sheet* Table_Of(std::int32_t ways, const Texts& factors, const std::vector<double>& levels)
+{
+    Sheet* const sheet = Sheet_Of(table_sheet, 4, ways > 1 ? "tab" : "");
+    sheet->table_ways = ways;
+    for (const std::string& name : factors) {
+        Column* const factor = Add_Cells(sheet, factor_column, name, {"1", "2", "3", "4"});
+        Put_Levels(*factor, {2, 4, 6, 8});
+        Free_Cell_Nodes(factor, label_nodes);
+    }
+    int value = 0;
+    for (const double level : levels) {
+        Texts cells;
+        for (int row = 0; row < 4; ++row)
+            cells.push_back(std::to_string(++value));
+        Add_Cells(sheet, table_column, Format_Text("c%i", value / 4), cells)->table_margin_value = level;
+    }
+    Describe(Column_At(sheet, static_cast<std::int32_t>(factors.size()) + 1), 1, "yield");
+    return sheet;
+}
+
+Sheet* Matrix_Of(std::int32_t type, std::int32_t label_state, const Texts& names)
+{
+    const auto rows = static_cast<std::int32_t>(type == symmetric_matrix_sheet ? names.size() : 2);
+    Sheet* const sheet = Sheet_Of(type, rows, "m");
+    sheet->label_state = label_state;
+    for (std::size_t i = 0; i < names.size(); ++i)
+        Add_Cells(sheet, type == matrix_sheet ? matrix_column : symmetric_matrix_column, names[i],
+                  type == matrix_sheet || i == 1 ? Texts{"1", "*"}
+                  : i == 0                       ? Texts{"4", "5", "6"}
+                                                 : Texts{"9"});
+    Describe(sheet->last_column, 3, "");
+    Describe(sheet->first_column->next, 2, "all", 3);
+    return sheet;
+}
+
+TEST_F(Script, Every_Structure_Comes_Back)
+{
+    const auto with_units = [](Sheet* sheet, std::int32_t type, const Texts& units) {
+        Describe(Add_Cells(sheet, type, "u", units), 0, "rows", type == units_text_column ? 0 : 1);
+        return sheet;
+    };
+    const auto labelled = [](Sheet* sheet, std::int32_t state, const char* name) {
+        sheet->label_state = state;
+        sheet->row_label_name = name;
+        sheet->column_label_name = "across";
+        return sheet;
+    };
+    const auto with_margin = [](Sheet* sheet) {
+        sheet->has_margins = 1;
+        Add_Cells(sheet, table_margin_column, "Margin", {"7", "8", "9", "0"});
+        return sheet;
+    };
+    const auto diagonal = [](std::int32_t rows) {
+        Sheet* const sheet = Sheet_Of(diagonal_matrix_sheet, rows);
+        Describe(New_Data_Column(sheet, diagonal_matrix_column, "d", rows), 1, "diag");
+        return sheet;
+    };
+    const auto scalars = [] {
+        Sheet* const sheet = Sheet_Of(scalar_sheet, 1);
+        Describe(Add_Cells(sheet, scalar_column, "s", {"2"}), 1, "one", 4);
+        Add_Cells(sheet, scalar_column, "", {"*"})->name = "";
+        return sheet;
+    };
+    const auto empty_columns = [&] {
+        Sheet* const sheet = Sheet_Of(vector_sheet, 0);
+        Describe(New_Data_Column(sheet, variate_column, "v", 0), 3, "x", 2);
+        Describe(New_Data_Column(sheet, text_column, "t", 0), 0, "y");
+        New_Data_Column(sheet, factor_column, "f", 0);
+        New_Data_Column(sheet, units_text_column, "u", 0);
+        return sheet;
+    };
+    const std::tuple<const char*, Sheet*, std::string> cases[] = {
+        {"columns of no rows", empty_columns(),
+         "TEXT u values=*: \nVARIATE v values=* extra=x drep=2: \nTEXT t values=* extra=y: \n"
+         "FACTOR f modify=yes nvalues=* levels=2: \nRESTRICT u,v,t,f\n"},
+        {"scalars", scalars(), "SCALAR s value=109515 decimals=1 extra=one drep=4: \nSCALAR C2 value=*: \n"},
+        {"matrix by position", Matrix_Of(matrix_sheet, 0, {"1", "2"}),
+         "MATRIX m rows=2 columns=2 decimals=2 extra=all drep=3: 109514|1|*|*\n"},
+        {"matrix with numbers",
+         with_units(Matrix_Of(matrix_sheet, 1, {"5", "7.5"}), units_variate_column, {"1", "2"}),
+         "MATRIX m rows=109514,109515, extra=rows drep=1 columns=5,7.5 decimals=2 extra=all drep=3: "
+         "109514|1|*|*\n"},
+        {"matrix with texts",
+         with_units(Matrix_Of(matrix_sheet, 2, {"a'", "b"}), units_text_column, {"x", "y"}),
+         "MATRIX m rows=x,y, extra=rows columns=a',b decimals=2 extra=all drep=3: 109514|1|*|*\n"},
+        {"names that are no numbers", Matrix_Of(matrix_sheet, 1, {"5", "b"}),
+         "MATRIX m rows=2 columns=5,b decimals=2 extra=all drep=3: 109514|1|*|*\n"},
+        {"matrix of no rows", Sheet_Of(matrix_sheet, 0, "no"), "MATRIX no: \n"},
+        {"symmetric", Matrix_Of(symmetric_matrix_sheet, 0, {"1", "2", "3"}),
+         "SYMMETRICMATRIX m rows=3 decimals=2 extra=all drep=3: 109517|109518|1|109519|*|9\n"},
+        {"symmetric with names", Matrix_Of(symmetric_matrix_sheet, 2, {"a", "b", "c"}),
+         "SYMMETRICMATRIX m rows=a,b,c decimals=2 extra=all drep=3: 109517|109518|1|109519|*|9\n"},
+        {"symmetric of no rows", Sheet_Of(symmetric_matrix_sheet, 0, "no"), "SYMMETRICMATRIX no: \n"},
+        {"diagonal", with_units(diagonal(2), units_text_column, {"x", "y"}),
+         "DIAGONALMATRIX d rows=x,y, extra=rows decimals=1 extra=diag: *|*\n"},
+        {"diagonal of no rows", diagonal(0), "DIAGONALMATRIX d: \n"},
+        {"one way", Table_Of(1, {"row"}, {0, 0}),
+         "FACTOR row modify=yes levels=2,4,6,8: \nTABLE c1 class=row margins=no decimals=1 "
+         "extra=yield: 1|2|3|4\n"
+         "TABLE c2 class=row margins=no: 5|6|7|8\n"},
+        {"one way without a factor", with_margin(Table_Of(1, {}, {0})),
+         "FACTOR _tfc_# modify=yes levels=3: \nTABLE c1 class=_tfc_# margins=no decimals=1 extra=yield: "
+         "1|2|3\n"},
+        {"two ways", Table_Of(2, {}, {0, 0}),
+         "FACTOR _tfc_# modify=yes levels=4: \nFACTOR _tf1_# modify=yes levels=2: \n"
+         "TABLE tab class=_tfc_#,_tf1_# margins=no decimals=1 extra=yield: 1|5|2|6|3|7|4|8\n"},
+        {"two ways with levels", with_margin(labelled(Table_Of(2, {"row"}, {3, 1.5}), 1, "col")),
+         "FACTOR row modify=yes levels=2,4,6,8: \nFACTOR col modify=yes levels=3,1.5 extra=across: \n"
+         "TABLE tab class=row,col margins=no decimals=1 extra=yield: 1|5|2|6|3|7\n"},
+        {"levels that are the same", labelled(Table_Of(2, {"row"}, {3, 3}), 1, ""),
+         "FACTOR row modify=yes levels=2,4,6,8: \nFACTOR _tf1_# modify=yes levels=2 labels=c1,c2 "
+         "extra=across: \n"
+         "TABLE tab class=row,_tf1_# margins=no decimals=1 extra=yield: 1|5|2|6|3|7|4|8\n"},
+        {"three ways with margins", with_margin(labelled(Table_Of(3, {"a", "b"}, {5, 6}), 3, "c")),
+         "FACTOR a modify=yes levels=2,4,6,8: \nFACTOR b modify=yes levels=2,4,6,8: \n"
+         "FACTOR c modify=yes levels=5,6 labels=c1,c2 extra=across: \n"
+         "TABLE tab class=a,b,c margins=yes decimals=1 extra=yield: 1|5|7|2|6|8|3|7|9|4|8|0\n"},
+    };
+    const std::regex made_up("(_tf[c1]_)[0-9]+");  // how many there were before doesn't matter
+    for (const auto& [what, sheet, expected] : cases)
+        EXPECT_EQ(std::regex_replace(Run_Script(Written(sheet)), made_up, "$1#"),
+                  expected + "RETURN close=yes\n")
+            << what;
+}
+
+TEST_F(Script, Factors_Of_Many_Levels_Are_Declared_In_The_Long_Form)
+{
+    for (const auto& [levels, values, labels, long_form] : {std::tuple{21, true, true, false},
+                                                            {22, true, true, true},
+                                                            {42, true, false, false},
+                                                            {43, true, false, true},
+                                                            {42, false, true, false},
+                                                            {43, false, true, true},
+                                                            {5000, false, false, false}}) {
+        Sheet* const sheet = Sheet_Of(vector_sheet, 1);
+        Column* const factor = Add_Cells(sheet, factor_column, "f", {"7"});
+        Put_Levels(*factor, Count_To(levels), Texts(static_cast<std::size_t>(levels)));
+        if (!values)
+            Free_Cell_Nodes(factor, level_value_nodes);
+        if (!labels)
+            Free_Cell_Nodes(factor, label_nodes);
+        request.Quiet_Read = long_form;
+        std::string expected = "FACTOR f modify=yes nvalues=1";
+        if (!values && !long_form)
+            expected += " levels=" + std::to_string(levels);
+        for (int level = 1; level <= (values ? levels : 0); ++level)
+            expected.append(level == 1 ? " levels=" : ",").append(std::to_string(level));
+        for (int level = 1; level <= (labels ? levels : 0); ++level)
+            expected.append(level == 1 ? " labels=" : ",").append(long_form ? "<Null>" : "");
+        EXPECT_EQ(Run_Script(Written(sheet)),
+                  expected + (long_form ? " quiet" : "") + ": 7\nRESTRICT f\nRETURN close=yes\n");
+        EXPECT_EQ(Get("out.gen").find("#_") != std::string::npos, long_form) << levels;
+    }
+}
+
+TEST_F(Script, Lines_Break_Where_The_Host_Reads_On)
+{
+    Sheet* const sheet = Sheet_Of(vector_sheet, 12);
+    const std::string sixty(59, 'n');
+    for (const char* last : {"a", "b", "c"})
+        Add_Cells(sheet, variate_column, sixty + last, Texts(12, "123456.5"));
+    const std::string script = Written(sheet);
+    EXPECT_TRUE(script.starts_with("DELETE [redefine=yes] \\\n" + sixty + "a\\\n," + sixty + "b\\\n," + sixty
+                                   + "c\nVARIATE [nvalues=\\\n12] " + sixty + "a\nREAD " + sixty + "a\n"));
+    const std::string eight = "123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 ";
+    EXPECT_NE(script.find("\n" + eight + "\n123456.5 123456.5 123456.5 123456.5 :\n"), script.npos) << script;
+    EXPECT_EQ(Run_Script(script).find("FAULT"), std::string::npos) << Run_Script(script);
+}
+
+TEST_F(Script, Hostile_Texts_Come_Back_Whole)
+{
+    std::mt19937 random(5);
+    const auto hostile = [&](std::size_t most) {
+        std::string text(random() % (most + 1), ' ');
+        for (char& c : text)
+            c = "it's \"a\\b`\x01\n\xE9 :"[random() % 15];
+        return text;
+    };
+    /// As it must come back.
+    const auto received = [](std::string_view text, std::size_t limit) {
+        std::string kept(text.substr(0, limit));
+        std::ranges::replace_if(
+            kept, [](char c) { return c == '\n' || c == '\x01'; }, ' ');
+        return kept;
+    };
+    for (int round = 0; round < 300; ++round) {
+        Start_Request("t");
+        Sheet* const sheet = Sheet_Of(vector_sheet, 1 + round % 20);
+        sheet->source_file = hostile(280);
+        request.Title_Text = "x" + hostile(280);
+        std::string expected = "TEXT _stitle_: " + received(request.Title_Text, 180) + "\n";
+        for (const std::int32_t type : {text_column, long_text_column, factor_column}) {
+            const std::string name = std::string(random() % 60, 'n') + "c";
+            Column* const column =
+                New_Data_Column(sheet, type, name + std::to_string(type), sheet->row_count);
+            Describe(column, -1, ("x" + hostile(80)).c_str());
+            const bool factor = type == factor_column;
+            Texts labels(1 + random() % 60);
+            for (std::string& label : labels)
+                label = hostile(250) + "x";
+            if (factor)
+                Put_Levels(*column, Count_To(static_cast<int>(labels.size())), labels);
+            Free_Cell_Nodes(column, level_value_nodes);
+            expected.append(factor ? "FACTOR " : "TEXT ").append(column->name);
+            expected += Format_Text("%s nvalues=%i", factor ? " modify=yes" : "", column->length);
+            if (factor && labels.size() <= 42)
+                expected += Format_Text(" levels=%zu", labels.size());
+            for (const std::string& label : labels)
+                if (factor)
+                    expected.append(&label == labels.data() ? " labels=" : ",").append(received(label, 90));
+            expected += " extra=" + received(column->extra, 80) + ": ";
+            for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
+                const std::string text = hostile(type == text_column ? 90 : 10000);
+                const std::size_t level = random() % (labels.size() + 1);
+                if (factor)
+                    cell->value.number = static_cast<double>(level);
+                else
+                    cell->value.text = column->texts.Store(text);
+                expected += cell == column->first_cell || factor ? "" : "|";
+                expected += !factor ? received(text, 10000) : level == 0 ? "*" : std::to_string(level);
+            }
+            expected += "\n";
+        }
+        const std::string found = Run_Script(Written(sheet));
+        ASSERT_EQ(found.substr(0, expected.size()), expected) << Get("out.gen");
+        ASSERT_EQ(found.find("FAULT"), found.npos) << found.substr(found.find("FAULT"));
+    }
+}
+
+TEST_F(Script, Fails_Where_Nothing_Can_Be_Declared_Or_Written)
+{
+    const std::string name = Request_Name("x.gen");
+    EXPECT_FALSE(Write_Host_Script(nullptr, name.c_str()));
+    EXPECT_FALSE(Write_Host_Script(Sheet_Of(0, 1), name.c_str())
+                 || Write_Host_Script(Sheet_Of(7, 1), name.c_str()));
+    EXPECT_EQ(Files(), "");
+    for (const std::int32_t type : {vector_sheet, diagonal_matrix_sheet, table_sheet, scalar_sheet})
+        EXPECT_FALSE(Write_Host_Script(Sheet_Of(type, 1), name.c_str())) << type;
+    Sheet* const sheet = Sheet_Of(vector_sheet, 1);
+    Column* const column = Add_Cells(sheet, variate_column, "v", {"1"});
+    EXPECT_FALSE(Write_Host_Script(sheet, "/dev/full") || Write_Host_Script(sheet, (name + "\\x").c_str()));
+    column->type = table_column;
+    EXPECT_FALSE(Write_Host_Script(sheet, name.c_str()));
+}
+
+}  // namespace
+}  // namespace ingester
