@@ -1,6 +1,7 @@
 // The exported functions: a request's files are found, read, answered and cleared away.
 #include "ingester/ingester.h"
 
+#include "interface/float_faults.h"
 #include "interface/pass_file.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
@@ -168,6 +169,7 @@ std::int32_t INGESTER(const char* pass_name, const char* result_name, std::int32
                       std::int32_t result_name_length)
 {
     using namespace ingester;
+    const Fault_Guard guard(Report_Float_Fault);
     try {
         Run_Call(Argument_Name(pass_name, pass_name_length), Argument_Name(result_name, result_name_length));
     } catch (const std::exception&) {

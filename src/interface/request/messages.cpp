@@ -1,11 +1,14 @@
 #include "interface/request/messages.h"
 
 #include "interface/request/request.h"
+#include "platform/faults.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 
+#include <array>
 #include <memory>
 #include <string>
+#include <utility>
 
 namespace ingester {
 
@@ -13,6 +16,14 @@ namespace {
 
 /// The open message file; null before the first message and after the last.
 std::unique_ptr<Output_File> message_file;
+
+/// Its native path, for whoever can't make one.
+std::array<char, 4096> message_path{};
+
+/// What a survived fault has to say, until there is time for it.
+std::string_view words_of_fault;
+
+constexpr std::string_view End_Mark = ":\n";
 
 std::string Message_File_Name()
 {
@@ -24,7 +35,11 @@ std::string Message_File_Name()
 void Start_Message_File()
 {
     message_file.reset();
-    Delete_File(Message_File_Name());
+    words_of_fault = {};
+    const std::string name = Message_File_Name();
+    Delete_File(name);
+    const std::string path = Native_Path(name);
+    message_path[path.copy(message_path.data(), message_path.size() - 1)] = '\0';
 }
 
 void Report_Message(std::string_view text)
@@ -59,11 +74,31 @@ bool Fail(std::string_view text)
     return false;
 }
 
+void Report_In_Fault(std::string_view text, bool ending)
+{
+    if (!ending) {
+        words_of_fault = text;
+        return;
+    }
+    if (message_file != nullptr) {
+        message_file->Write(text);
+        message_file->Write(End_Mark);
+        static_cast<void>(message_file->Close());
+    } else if (!text.empty()) {
+        std::array<char, 200> whole{};
+        std::size_t length = text.copy(whole.data(), whole.size() - End_Mark.size());
+        length += End_Mark.copy(whole.data() + length, End_Mark.size());
+        Write_Scratch_In_Fault(message_path.data(), {whole.data(), length});
+    }
+}
+
 void Close_Message_File()
 {
+    if (!words_of_fault.empty())
+        Report_Message(std::exchange(words_of_fault, {}));
     if (message_file == nullptr)
         return;
-    message_file->Write(":\n");
+    message_file->Write(End_Mark);
     static_cast<void>(message_file->Close());  // silent by design: see above
     message_file.reset();
 }

@@ -27,6 +27,10 @@ template <class First, class... Rest> bool Fail(const char* format, First first,
 /// Ends the request's messages: closes the file, behind the mark the host looks for.
 void Close_Message_File();
 
+/// Reports from inside the handler of a signal: kernel calls only, no heap. With `ending` the file is
+/// closed as well, as `Close_Message_File` does; without, `text` (a literal) is told at the request's end.
+void Report_In_Fault(std::string_view text, bool ending);
+
 /// Forgets the message file of an earlier request and removes the one that `<temp><stem>.ERR` names.
 void Start_Message_File();
 
