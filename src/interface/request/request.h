@@ -49,6 +49,7 @@ struct Request_Globals {
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int32_t Max_Columns = Default_Max_Columns;
     bool Names_Kept_As_They_Stand = false;  ///< `Make_Valid_Name` leaves names alone
+    bool Number_Warnings_Begun = false;     ///< the title over texts that were read as numbers is written
 
     // Input options.
     bool Qtl_Request = false;
