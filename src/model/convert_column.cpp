@@ -1,6 +1,7 @@
 #include "model/convert_column.h"
 
 #include "model/factors.h"
+#include "model/text_columns.h"
 
 #include <algorithm>
 #include <iterator>
@@ -90,6 +91,10 @@ constexpr Conversion Conversions[] = {
     {units_text_column, text_column,
      [](Column& column, const Label_Rules&) { return Units_Text_To_Text(&column); }},
     {units_text_column, factor_column, To_Labels},
+    {units_text_column, variate_column,
+     [](Column& column, const Label_Rules&) {
+         return Units_Text_To_Text(&column) && Text_Column_To_Number(&column);
+     }},
     {factor_column, units_variate_column,
      [](Column& column, const Label_Rules&) {
          return Head_Is_Free(column) && Factor_To_Variate(&column, false) && Variate_To_Units(&column);
@@ -105,6 +110,8 @@ constexpr Conversion Conversions[] = {
     {variate_column, factor_column, To_Levels},
     {variate_column, units_variate_column,
      [](Column& column, const Label_Rules&) { return Variate_To_Units(&column); }},
+    {text_column, variate_column,
+     [](Column& column, const Label_Rules&) { return Text_Column_To_Number(&column); }},
     {text_column, factor_column, To_Labels},
     {text_column, units_text_column,
      [](Column& column, const Label_Rules&) { return Text_To_Units(&column); }},

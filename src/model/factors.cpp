@@ -29,6 +29,58 @@ template <class Key> struct Gathering {
     std::vector<std::uint32_t> numbers;
 };
 
+std::size_t Cells_Of(const Column& column)
+{
+    return static_cast<std::size_t>(std::max(column.length, 0));
+}
+
+/// Numbers the keys of a column's rows, a batch at a time.
+template <class Key, class Rules> class Key_Numberer {
+    using Distinct = Distinct_Keys<Key, Rules>;
+
+public:
+    explicit Key_Numberer(const Column& column) { gathered_.numbers.resize(Cells_Of(column)); }
+
+    void Take(std::size_t row, const Key& key)
+    {
+        keys_[waiting_] = key;
+        rows_[waiting_] = row;
+        if (++waiting_ == keys_.size())
+            Number_Waiting();
+    }
+
+    void Put(std::size_t row, std::uint32_t number) { gathered_.numbers[row] = number; }
+
+    /// 0 for a row without a key, or whose key waits.
+    [[nodiscard]] std::uint32_t Number_Of_Row(std::size_t row) const { return gathered_.numbers[row]; }
+
+    /// Distinct keys so far, those that wait not counted.
+    [[nodiscard]] std::size_t Count() const { return distinct_.Keys().size(); }
+
+    [[nodiscard]] Gathering<Key> Finish()
+    {
+        Number_Waiting();
+        gathered_.keys = distinct_.Take_Keys();
+        return std::move(gathered_);
+    }
+
+private:
+    void Number_Waiting()
+    {
+        std::array<std::uint32_t, Distinct::batch> numbers;
+        distinct_.Number_Keys_Of(keys_.data(), waiting_, numbers.data());
+        for (std::size_t i = 0; i < waiting_; ++i)
+            gathered_.numbers[rows_[i]] = numbers[i];
+        waiting_ = 0;
+    }
+
+    Distinct distinct_;
+    Gathering<Key> gathered_;
+    std::array<Key, Distinct::batch> keys_;
+    std::array<std::size_t, Distinct::batch> rows_;
+    std::size_t waiting_ = 0;
+};
+
 /// The level number of each key number, when level i + 1 is key `order[i]`.
 std::vector<double> Levels_Of_Numbers(const std::vector<std::uint32_t>& order, double missing)
 {
@@ -55,11 +107,6 @@ void Put_Level_Numbers(Column& column, const std::vector<std::uint32_t>& numbers
         cell->value.number = levels[*number++];
     column.cursor_node = nullptr;
     column.cursor_index = -1;
-}
-
-std::size_t Cells_Of(const Column& column)
-{
-    return static_cast<std::size_t>(std::max(column.length, 0));
 }
 
 std::int32_t Levels_Without_Data(std::int32_t wanted_levels)
@@ -110,26 +157,29 @@ bool Take_Numbers_As_Levels(Column& column)
 
 /// Which of two faults too many values are: with this many distinct ones in the first half of a column
 /// whose levels are sorted, it counts as one of many values throughout.
-constexpr std::size_t Many_Values = 37;
+constexpr std::uint32_t Many_Values = 37;
+
+bool Fail_Of_Many_Values(const Column& column, std::size_t limit, const std::vector<std::uint32_t>& numbers)
+{
+    const auto half = numbers.begin() + static_cast<std::ptrdiff_t>(numbers.size() / 2);
+    const bool many = column.sheet->settings.auto_factors != 0 && limit >= Many_Values
+                      && std::find(numbers.begin(), half, Many_Values) != half;
+    return Fail(many ? "Cannot convert this Variate to a Factor: too many distinct values.\n"
+                     : "Cannot convert this variate to a factor: too many distinct values.\n");
+}
 
 bool Gather_Values(const Column& column, std::size_t limit, Gathering<double>& gathered)
 {
-    Distinct_Keys<double, Number_Keys> distinct;
-    const bool sorted = column.sheet->settings.auto_factors != 0;
-    const auto half = Cells_Of(column) / 2;
-    bool many = false;
-    gathered.numbers.reserve(Cells_Of(column));
-    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        const double value = cell->value.number;
-        gathered.numbers.push_back(Is_Present(*column.sheet, value) ? distinct.Number_Of(value) : 0);
-        const std::size_t count = distinct.Keys().size();
-        if (count > limit)
-            return Fail(many ? "Cannot convert this Variate to a Factor: too many distinct values.\n"
-                             : "Cannot convert this variate to a factor: too many distinct values.\n");
-        many = many || (sorted && count >= Many_Values && gathered.numbers.size() <= half);
+    Key_Numberer<double, Number_Keys> numberer(column);
+    std::size_t row = 0;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next, ++row) {
+        if (Is_Present(*column.sheet, cell->value.number))
+            numberer.Take(row, cell->value.number);
+        if (numberer.Count() > limit)
+            break;
     }
-    gathered.keys = distinct.Take_Keys();
-    return true;
+    gathered = numberer.Finish();
+    return gathered.keys.size() <= limit || Fail_Of_Many_Values(column, limit, gathered.numbers);
 }
 
 /// Levels 1, 2, ..., n say nothing that the cells don't.
@@ -187,48 +237,59 @@ namespace {
 
 // --- Text to Factor ------------------------------------------------------------------------------
 
-/// The numbers of texts met of late, by where they are stored: cells with equal texts often share one.
-class Recent_Places {
+/// A text met of late, by where it is stored: cells with equal texts often share one.
+struct Recent_Text {
+    const char* stored = nullptr;
+    std::uint32_t number = 0;  ///< 0 until it is known
+    std::size_t row = 0;       ///< the first that held it
+};
+
+class Recent_Texts {
 public:
-    [[nodiscard]] std::uint32_t& Number_At(const char* stored)
+    /// The entry of `stored`, which is a cell of `row`.
+    [[nodiscard]] Recent_Text& Of(const char* stored, std::size_t row)
     {
-        auto& [place, number] = entries_[std::bit_cast<std::uintptr_t>(stored) * 0x9E3779B97F4A7C15U >> 55];
-        if (place != stored) {
-            place = stored;
-            number = 0;
-        }
-        return number;
+        Recent_Text& entry = entries_[std::bit_cast<std::uintptr_t>(stored) * 0x9E3779B97F4A7C15U >> 55];
+        if (entry.stored != stored)
+            entry = {stored, 0, row};
+        return entry;
     }
 
 private:
-    std::array<std::pair<const char*, std::uint32_t>, 512> entries_{};
+    std::array<Recent_Text, 512> entries_{};
 };
 
 template <class Rules>
 bool Gather_Texts(const Column& column, bool trim, std::size_t limit, Gathering<std::string_view>& gathered)
 {
-    Distinct_Keys<std::string_view, Rules> distinct;
-    Recent_Places recent;
-    gathered.numbers.reserve(Cells_Of(column));
-    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        std::uint32_t& number = recent.Number_At(cell->value.text);
-        if (number == 0) {
-            const std::string_view whole = cell->Text();
-            const std::string_view text =
-                trim ? Trim_Copy(whole, Long_Label_Width) : whole.substr(0, Long_Label_Width);
-            if (!text.empty())
-                number = distinct.Number_Of(text);
-            if (distinct.Keys().size() > limit)
-                return Fail("Cannot convert this text to a factor: too many distinct labels.\n");
+    Key_Numberer<std::string_view, Rules> numberer(column);
+    Recent_Texts recent;
+    std::size_t row = 0;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next, ++row) {
+        if (cell->value.text == nullptr)
+            continue;
+        Recent_Text& met = recent.Of(cell->value.text, row);
+        if (met.number == 0)
+            met.number = numberer.Number_Of_Row(met.row);
+        if (met.number != 0) {
+            numberer.Put(row, met.number);
+            continue;
         }
-        gathered.numbers.push_back(number);
+        const std::string_view whole = cell->Text();
+        const std::string_view text =
+            trim ? Trim_Copy(whole, Long_Label_Width) : whole.substr(0, Long_Label_Width);
+        if (!text.empty())
+            numberer.Take(row, text);
+        if (numberer.Count() > limit)
+            break;
     }
-    gathered.keys = distinct.Take_Keys();
-    return true;
+    gathered = numberer.Finish();
+    return gathered.keys.size() <= limit
+           || Fail("Cannot convert this text to a factor: too many distinct labels.\n");
 }
 
-/// A label's place in the order of appearance, with its first characters where a comparison sees them
-/// without a walk to the text.
+/// A label's place in the order of appearance, with the first characters by which labels differ, where
+/// a comparison sees them without a walk to the text.
 struct Label_Place {
     std::uint64_t start;
     std::uint32_t key;
@@ -251,13 +312,23 @@ std::uint64_t Start_Of(std::string_view text, bool by_case_free)
     return start;
 }
 
+/// Characters that all labels begin with.
+std::size_t Shared_Start(const std::vector<std::string_view>& keys)
+{
+    std::size_t shared = keys.empty() ? 0 : keys.front().size();
+    for (const std::string_view key : keys)
+        shared = std::min(shared, Common_Start(key, keys.front()));
+    return shared;
+}
+
 void Sort_Labels(const std::vector<std::string_view>& keys, bool by_case_free,
                  std::vector<std::uint32_t>& order)
 {
+    const std::size_t shared = Shared_Start(keys);
     std::vector<Label_Place> places;
     places.reserve(order.size());
     for (const std::uint32_t key : order)
-        places.push_back({Start_Of(keys[key], by_case_free), key});
+        places.push_back({Start_Of(keys[key].substr(shared), by_case_free), key});
     std::sort(places.begin(), places.end(), [&](const Label_Place& a, const Label_Place& b) {
         if (a.start != b.start)
             return a.start < b.start;

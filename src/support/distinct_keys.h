@@ -3,6 +3,7 @@
 
 #include "support/text.h"
 
+#include <array>
 #include <bit>
 #include <chrono>
 #include <cstddef>
@@ -24,6 +25,7 @@ namespace ingester {
 
 /// Numbers that are equal as numbers are: both zeros are one.
 struct Number_Keys {
+    static void Prefetch(double) {}
     [[nodiscard]] static bool Equal(double a, double b) { return a == b; }
     [[nodiscard]] static std::uint64_t Hash(double key, std::uint64_t seed)
     {
@@ -33,6 +35,7 @@ struct Number_Keys {
 
 /// Texts equal byte for byte.
 struct Exact_Keys {
+    static void Prefetch(std::string_view key) { __builtin_prefetch(key.data()); }
     [[nodiscard]] static bool Equal(std::string_view a, std::string_view b) { return a == b; }
     [[nodiscard]] static std::uint64_t Hash(std::string_view key, std::uint64_t seed)
     {
@@ -50,6 +53,7 @@ struct Exact_Keys {
 
 /// Texts equal but for the case of ASCII letters.
 struct Case_Free_Keys {
+    static void Prefetch(std::string_view key) { __builtin_prefetch(key.data()); }
     [[nodiscard]] static bool Equal(std::string_view a, std::string_view b)
     {
         return Equal_Ignoring_Case(a, b);
@@ -72,18 +76,20 @@ template <class Key, class Rules> class Distinct_Keys {
 public:
     Distinct_Keys() : slots_(first_slots) {}
 
-    /// The number of `key`, from 1; a key not met before gets the next one.
-    [[nodiscard]] std::uint32_t Number_Of(const Key& key)
+    /// Keys that are looked up in one go.
+    static constexpr std::size_t batch = 16;
+
+    /// Gives each of `count` keys, a batch at most, its number, from 1; keys not met before get the
+    /// next ones.
+    void Number_Keys_Of(const Key* keys, std::size_t count, std::uint32_t* numbers)
     {
-        const auto hash = static_cast<std::uint32_t>(Rules::Hash(key, seed_) >> 32);
-        const std::size_t mask = slots_.size() - 1;
-        for (std::size_t at = hash & mask;; at = (at + 1) & mask) {
-            const Slot& slot = slots_[at];
-            if (slot.number == 0)
-                return Add(key, hash, at);
-            if (slot.hash == hash && Rules::Equal(keys_[slot.number - 1], key))
-                return slot.number;
-        }
+        std::array<std::uint32_t, batch> hashes;
+        for (std::size_t i = 0; i < count; ++i)
+            hashes[i] = static_cast<std::uint32_t>(Rules::Hash(keys[i], seed_) >> 32);
+        if (slots_.size() > near_slots)
+            Bring_Near(hashes.data(), count);
+        for (std::size_t i = 0; i < count; ++i)
+            numbers[i] = Number_Of(keys[i], hashes[i]);
     }
 
     [[nodiscard]] const std::vector<Key>& Keys() const { return keys_; }
@@ -97,11 +103,38 @@ private:
         std::uint32_t number = 0;  ///< 0: free
     };
     static constexpr std::size_t first_slots = 128;
+    static constexpr std::size_t near_slots = 4096;  ///< of a table that stays in a near cache
 
     [[nodiscard]] static std::uint64_t New_Seed(const void* table)
     {
         const auto now = std::chrono::steady_clock::now().time_since_epoch().count();
         return Mix_Words(static_cast<std::uint64_t>(now), std::bit_cast<std::uintptr_t>(table));
+    }
+
+    /// In a large table each step of a look-up waits for memory, so all of a batch take it together.
+    void Bring_Near(const std::uint32_t* hashes, std::size_t count) const
+    {
+        for (std::size_t i = 0; i < count; ++i)
+            __builtin_prefetch(&slots_[Home_Of(hashes[i])]);
+        for (std::size_t i = 0; i < count; ++i)
+            if (const std::uint32_t number = slots_[Home_Of(hashes[i])].number; number != 0)
+                __builtin_prefetch(&keys_[number - 1]);
+        for (std::size_t i = 0; i < count; ++i)
+            if (const std::uint32_t number = slots_[Home_Of(hashes[i])].number; number != 0)
+                Rules::Prefetch(keys_[number - 1]);
+    }
+
+    [[nodiscard]] std::size_t Home_Of(std::uint32_t hash) const { return hash & (slots_.size() - 1); }
+
+    [[nodiscard]] std::uint32_t Number_Of(const Key& key, std::uint32_t hash)
+    {
+        for (std::size_t at = Home_Of(hash);; at = Home_Of(static_cast<std::uint32_t>(at + 1))) {
+            const Slot& slot = slots_[at];
+            if (slot.number == 0)
+                return Add(key, hash, at);
+            if (slot.hash == hash && Rules::Equal(keys_[slot.number - 1], key))
+                return slot.number;
+        }
     }
 
     std::uint32_t Add(const Key& key, std::uint32_t hash, std::size_t at)
