@@ -4,6 +4,8 @@
 #include "model/sheet.h"
 #include "platform/folders.h"
 
+#include <array>
+
 namespace ingester {
 
 namespace {
@@ -29,41 +31,42 @@ constexpr std::int64_t Days_Before_Month(std::int64_t month)
     return (month * Month_Tenths + 5) / 10;
 }
 
-constexpr std::int64_t First_Century = 16;
-constexpr std::int32_t Two_Digit_Years = 100;  // below, a year is one of the 1900s
+struct Month_Facts {
+    std::int16_t length;
+    std::int16_t days_before;  ///< since the year began
+};
 
-bool Is_Calendar_Day(std::int32_t day, std::int32_t month, std::int32_t year)
-{
-    constexpr std::int32_t lengths[] = {31, 29, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    return month >= 1 && month <= 12 && day >= 1 && day <= lengths[month - 1]
-           && (month != 2 || day != 29 || year % 4 == 0);
-}
+/// By month; January and February are the last two of the year before.
+constexpr auto Months = [] {
+    constexpr std::int16_t lengths[] = {31, 29, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    std::array<Month_Facts, 13> months{};
+    for (std::size_t month = 1; month <= 12; ++month)
+        months[month] = {lengths[month - 1], static_cast<std::int16_t>(Days_Before_Month(
+                                                 static_cast<std::int64_t>((month + 9) % 12)))};
+    return months;
+}();
+
+constexpr std::int32_t First_Year = 1600;
+constexpr std::int32_t Two_Digit_Years = 100;  // below, a year is one of the 1900s
 
 }  // namespace
 
 double Date_To_Number(std::int32_t day, std::int32_t month, std::int32_t year, std::int32_t form)
 {
-    if (!Is_Calendar_Day(day, month, year))
+    if (month < 1 || month > 12 || day < 1 || day > Months[static_cast<std::size_t>(month)].length
+        || (day == 29 && month == 2 && year % 4 != 0))
         return Missing_Value;
-    std::int64_t century = year >= Two_Digit_Years ? year / 100 - First_Century : 3;
-    std::int64_t y = year >= Two_Digit_Years ? year % 100 : year;
-    std::int64_t m = month - 3;
-    if (century < 0)
+    std::int32_t years = year >= Two_Digit_Years ? year - First_Year : year + 300;
+    if (years < 0)
         return 0.0;
-    if (m < 0) {
-        --y;
-        m = month + 9;
-    }
-    if (y < 0) {
-        y += 100;
-        --century;
-    }
-    const std::int64_t count =
-        Days_Before_Century(century) + Days_Before_Month(m) + Days_Before_Year(y) + day;
+    years -= month < 3 ? 1 : 0;
+    const std::int32_t century = (years + 100) / 100 - 1;
+    const std::int64_t count = Days_Before_Century(century) + Days_Before_Year(years - 100 * century)
+                               + Months[static_cast<std::size_t>(month)].days_before + day;
     const auto value = static_cast<double>(count);
     if (form != 0 || count <= 1)
         return value;
-    if (day == 29 && month == 2 && century == 2 && y == 99)  // 1900, which has none but in serials
+    if (day == 29 && month == 2 && years == 299)  // 1900, which has none but in serials
         return False_Serial;
     const double serial = value - Serial_Offset;
     return serial <= False_Serial ? serial - 1.0 : serial;
@@ -83,7 +86,7 @@ Calendar_Date Number_To_Date(std::int64_t number, std::int32_t form)
         Serial_To_Day_Count(value, 0.0);
         number = static_cast<std::int64_t>(value);
     }
-    std::int64_t century = 4 * number / Century_Quarters;
+    const std::int64_t century = 4 * number / Century_Quarters;
     std::int64_t rest = number - Days_Before_Century(century);
     std::int64_t year = 4 * rest / Year_Quarters;
     rest -= Days_Before_Year(year);
@@ -98,7 +101,7 @@ Calendar_Date Number_To_Date(std::int64_t number, std::int32_t form)
         --month;
         day += 29;
     }
-    return {day, month, (century + First_Century) * 100 + year};
+    return {day, month, First_Year + century * 100 + year};
 }
 
 double Today_Number(std::int32_t form)

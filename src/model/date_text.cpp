@@ -35,6 +35,23 @@ struct Text_Layout {
     Joint joint;
     Reading reading;
     std::uint64_t formats;  ///< the codes that read so, a bit each
+    bool numbers = false;   ///< the parts are three numbers apart, at these places:
+    std::uint8_t day = 0;
+    std::uint8_t month = 0;
+    std::uint8_t year = 0;
+
+    constexpr Text_Layout(std::string_view the_parts, Joint the_joint, Reading the_reading,
+                          std::uint64_t the_formats)
+        : parts(the_parts), joint(the_joint), reading(the_reading), formats(the_formats)
+    {
+        numbers = joint == Joint::apart && parts.size() == 3
+                  && parts.find_first_not_of("dmy") == std::string_view::npos;
+        if (!numbers)
+            return;
+        day = static_cast<std::uint8_t>(parts.find('d'));
+        month = static_cast<std::uint8_t>(parts.find('m'));
+        year = static_cast<std::uint8_t>(parts.find('y'));
+    }
 };
 
 template <class... Format> constexpr std::uint64_t Bits(Format... formats)
@@ -69,13 +86,16 @@ constexpr Text_Layout Text_Layouts[] = {
     {"", Joint::apart, Reading::day_number, Bits(40)},
 };
 
-/// The layout of each code; null where there is none.
+static_assert(std::size(Text_Layouts) == No_Layout);
+
+/// By code.
 constexpr auto Layout_By_Format = [] {
-    std::array<const Text_Layout*, Greatest_Date_Format + 1> table{};
-    for (const Text_Layout& layout : Text_Layouts)
+    std::array<std::size_t, Greatest_Date_Format + 1> table{};
+    table.fill(No_Layout);
+    for (std::size_t layout = 0; layout < std::size(Text_Layouts); ++layout)
         for (std::size_t format = 0; format < table.size(); ++format)
-            if ((layout.formats >> format & 1) != 0)
-                table[format] = &layout;
+            if ((Text_Layouts[layout].formats >> format & 1) != 0)
+                table[format] = layout;
     return table;
 }();
 
@@ -115,38 +135,35 @@ struct Cut_Text {
 
 constexpr std::int32_t Too_Great = 100'000'000;  // for a part; numbers grow no further
 
-void Cut_At_Separators(std::string_view text, Cut_Text& cut)
+inline void Cut_At_Separators(std::string_view text, Cut_Text& cut)
 {
+    constexpr std::ptrdiff_t most_digits = 9;
     const char* at = text.data();
     const char* const last = at + text.size();
     cut.date = text;
     cut.count = 0;
     cut.colon = false;
     cut.words = false;
-    for (;;) {
+    for (;; ++at) {
         const char* const first = at;
-        std::int32_t number = 0;
-        bool digits = true;
-        for (; at != last && !(Is_Separator(*at) && cut.count < Most_Pieces); ++at) {
-            if (Is_Digit(*at)) [[likely]] {
-                if (number < Too_Great)
-                    number = number * 10 + (*at - '0');
-            } else {
-                digits = false;
+        std::uint32_t digits = 0;  // of more than fit, the rest is of no interest
+        for (; at != last && Is_Digit(*at); ++at)
+            digits = digits * 10 + static_cast<std::uint32_t>(*at - '0');
+        std::int32_t number = at - first > most_digits ? Too_Great : static_cast<std::int32_t>(digits);
+        if (at == first || (at != last && !Is_Separator(*at)) || cut.count == Most_Pieces) [[unlikely]] {
+            for (; at != last && !(Is_Separator(*at) && cut.count < Most_Pieces); ++at)
                 cut.colon = cut.colon || *at == ':';
-            }
+            number = -1;
+            cut.words = true;
         }
-        digits = digits && at != first;
-        cut.words = cut.words || !digits;
-        cut.pieces[cut.count++] = {first, static_cast<std::size_t>(at - first), digits ? number : -1};
+        cut.pieces[cut.count++] = {first, static_cast<std::size_t>(at - first), number};
         if (at == last)
             return;
-        ++at;
     }
 }
 
 /// Cuts a trimmed text; a time goes by itself.
-void Cut(std::string_view text, Cut_Text& cut)
+inline void Cut(std::string_view text, Cut_Text& cut)
 {
     cut.whole = text;
     cut.time = {};
@@ -278,7 +295,7 @@ bool Take_Parts_Together(const Text_Layout& layout, std::string_view text, bool 
 }
 
 /// The value of a date's parts; false for a day that there isn't.
-bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
+inline bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
 {
     if (!In_Range(date.day, 1, 31) || !In_Range(date.month, 1, 12) || !Is_Year(date.year))
         return false;
@@ -342,17 +359,36 @@ bool Read_Time(std::string_view text, bool strict, bool marker_allowed, std::int
 
 constexpr std::int32_t Hours_A_Day = 24;
 
-/// A date, with the time behind it if there is one.
-bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict, double& value)
+bool Take_Parts(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
 {
-    Date_Parts date;
     const bool together =
         layout.joint == Joint::together || (layout.joint == Joint::either && cut.count == 1);
-    if (together ? (strict && cut.count != 1) || !Take_Parts_Together(layout, cut.date, strict, date)
-                 : !Take_Parts_Apart(layout, cut, strict, date))
+    if (!together)
+        return Take_Parts_Apart(layout, cut, strict, date);
+    return (!strict || cut.count == 1) && Take_Parts_Together(layout, cut.date, strict, date);
+}
+
+/// The usual case, in short: three numbers and nothing else.
+inline bool Take_Numbers(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
+{
+    const Piece& day = cut.pieces[layout.day];
+    const Piece& month = cut.pieces[layout.month];
+    const Piece& year = cut.pieces[layout.year];
+    date = {day.number, month.number, year.number};
+    return !strict || (day.size <= 2 && month.size <= 2 && year.size <= 4);
+}
+
+/// A date, with the time behind it if there is one.
+inline bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                      double& value)
+{
+    Date_Parts date;
+    if (layout.numbers && !cut.words && cut.count == 3) [[likely]] {
+        if (!Take_Numbers(layout, cut, strict, date) || !Value_Of(date, form, value))
+            return false;
+    } else if (!Take_Parts(layout, cut, strict, date) || !Value_Of(date, form, value)) {
         return false;
-    if (!Value_Of(date, form, value))
-        return false;
+    }
     if (cut.time.empty())
         return !strict || layout.reading == Reading::date;
     double time;
@@ -362,8 +398,8 @@ bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form
     return true;
 }
 
-bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
-                    double& value)
+inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                           double& value)
 {
     switch (layout.reading) {
     case Reading::date:
@@ -438,6 +474,12 @@ bool Says_No_Date(std::string_view trimmed)
 
 }  // namespace
 
+std::size_t Date_Layout_Of(std::int32_t format)
+{
+    return In_Range(format, 1, Greatest_Date_Format) ? Layout_By_Format[static_cast<std::size_t>(format)]
+                                                     : No_Layout;
+}
+
 bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::int32_t format,
                   double missing, bool strict)
 {
@@ -445,14 +487,12 @@ bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::
     value = missing;
     if (Says_No_Date(text))
         return true;
-    const Text_Layout* const layout = In_Range(format, 1, Greatest_Date_Format)
-                                          ? Layout_By_Format[static_cast<std::size_t>(format)]
-                                          : nullptr;
+    const std::size_t layout = Date_Layout_Of(format);
     double read;
-    if (layout != nullptr) {
+    if (layout != No_Layout) {
         Cut_Text cut;
         Cut(text, cut);
-        if (Read_By_Layout(*layout, cut, form, strict, read)) {
+        if (Read_By_Layout(Text_Layouts[layout], cut, form, strict, read)) {
             value = read;
             return true;
         }
@@ -463,22 +503,24 @@ bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::
     return true;
 }
 
-Strict_Readings Read_By_All_Formats(std::string_view text, std::int32_t form)
+Strict_Readings Read_By_All_Layouts(std::string_view text, std::int32_t form)
 {
     text = Trim_Copy(text, Text_Cell_Width);
     if (Says_No_Date(text))
-        return {~std::uint64_t{0}, 0, true};
+        return {.blank = true};
     Strict_Readings readings{};
     Cut_Text cut;
     Cut(text, cut);
     for (std::uint64_t left = Possible.Of(cut); left != 0; left &= left - 1) {
-        const Text_Layout& layout = Text_Layouts[std::countr_zero(left)];
+        const int layout = std::countr_zero(left);
         double value;
-        if (!Read_By_Layout(layout, cut, form, true, value))
+        if (!Read_By_Layout(Text_Layouts[layout], cut, form, true, value))
             continue;
-        readings.good |= layout.formats;
-        readings.negative |= value < 0.0 ? layout.formats : 0;
+        const std::uint64_t bit = std::uint64_t{1} << layout;
+        readings.good |= bit;
+        readings.negative |= value < 0.0 ? bit : 0;
     }
+    readings.colon = cut.colon || !cut.time.empty();
     return readings;
 }
 

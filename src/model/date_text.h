@@ -1,6 +1,7 @@
 // Dates out of texts, by the layouts of the display codes.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string_view>
 
@@ -16,13 +17,18 @@ constexpr std::int32_t Greatest_Date_Format = 42;
 bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::int32_t format,
                   double missing, bool strict);
 
-/// What the strict reading of one text says under all codes at once: a bit a code.
+/// Codes that read alike share a layout, by number from 0; `No_Layout` is that of a code without one.
+constexpr std::size_t No_Layout = 24;
+[[nodiscard]] std::size_t Date_Layout_Of(std::int32_t format);
+
+/// What the strict reading says of one text under all layouts at once.
 struct Strict_Readings {
-    std::uint64_t good;      ///< codes whose layout the text has
-    std::uint64_t negative;  ///< those of them whose day number is negative
-    bool blank;              ///< no text, or one that begins with "*": good by any code
+    std::uint64_t good = 0;      ///< layouts that the text has, a bit each
+    std::uint64_t negative = 0;  ///< those of them whose day number is negative
+    bool colon = false;          ///< there is a time in it
+    bool blank = false;          ///< no text, or one that begins with "*", which has any layout
 };
-[[nodiscard]] Strict_Readings Read_By_All_Formats(std::string_view text, std::int32_t form);
+[[nodiscard]] Strict_Readings Read_By_All_Layouts(std::string_view text, std::int32_t form);
 
 /// The month, 1 to 12, of a three-letter name or of a whole one, in any case; 0 for none. A strict name
 /// stands alone; otherwise any text that begins with the three letters, or with the name, will do.

@@ -72,11 +72,13 @@ namespace {
 
 /// How the cells of a column read.
 struct Date_Counts {
-    std::array<std::int64_t, 64> hits{};  ///< by code; blank cells read by any
+    std::array<std::int64_t, No_Layout + 1> hits{};  ///< by layout; blank cells have any
     std::int64_t cells = 0;
     std::int64_t blanks = 0;
-    std::uint64_t negative = 0;  ///< codes by which a day number was negative
+    std::uint64_t negative = 0;  ///< layouts by which a day number was negative
     bool colon = false;
+
+    [[nodiscard]] std::int64_t Hits(std::int32_t format) const { return hits[Date_Layout_Of(format)]; }
 };
 
 constexpr std::int64_t Sample_Size = 100;
@@ -88,14 +90,11 @@ Date_Counts Count_Readings(const Column& column, bool sample)
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
         if (sample && counts.cells - counts.blanks == Sample_Size)
             break;
-        const std::string_view text = cell->Text();
-        const Strict_Readings readings = Read_By_All_Formats(text, column.date_form);
+        const Strict_Readings readings = Read_By_All_Layouts(cell->Text(), column.date_form);
         ++counts.cells;
         counts.blanks += readings.blank ? 1 : 0;
         counts.negative |= readings.negative;
-        counts.colon = counts.colon || text.find(':') != std::string_view::npos;
-        if (readings.blank)
-            continue;
+        counts.colon = counts.colon || readings.colon;
         for (std::uint64_t good = readings.good; good != 0; good &= good - 1)
             ++counts.hits[static_cast<std::size_t>(std::countr_zero(good))];
     }
@@ -120,7 +119,7 @@ std::int32_t Best_Format(const Date_Counts& counts, const Date_Format_Search& se
     for (std::int32_t format = 1; format <= last; ++format) {
         if (Is_Passed_Over(format, search))
             continue;
-        const std::int64_t hits = counts.hits[static_cast<std::size_t>(format)];
+        const std::int64_t hits = counts.Hits(format);
         const bool shows_time = counts.colon && format >= date_time_format && best < date_time_format;
         if (hits > most || (hits == most && (format == search.wanted || shows_time)))
             best = format;
@@ -145,14 +144,14 @@ std::int32_t Find_Date_Format(const Column* column, const Date_Format_Search& se
         return 0;
     const Date_Counts counts = Count_Readings(*column, search.sample);
     const std::int32_t best = Best_Format(counts, search);
-    const std::int64_t hits = counts.hits[static_cast<std::size_t>(best)];
+    const std::int64_t hits = counts.Hits(best);
     std::int32_t found = best;
     if (search.sample)
         found = Is_Dated_Sample(hits - counts.blanks, counts.cells - counts.blanks, search.has_default) ? best
                                                                                                         : 0;
     else if (hits <= 2 && hits != counts.cells)
         found = search.wanted;
-    return (counts.negative >> found & 1) != 0 ? -found : found;
+    return (counts.negative >> Date_Layout_Of(found) & 1) != 0 ? -found : found;
 }
 
 namespace {
