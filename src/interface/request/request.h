@@ -50,6 +50,9 @@ struct Request_Globals {
     std::int32_t Max_Columns = Default_Max_Columns;
     bool Names_Kept_As_They_Stand = false;  ///< `Make_Valid_Name` leaves names alone
     bool Number_Warnings_Begun = false;     ///< the title over texts that were read as numbers is written
+    bool Date_Warnings_Begun = false;       ///< the same for dates
+    std::int32_t Current_Date_Form = 0;     ///< of dates that have no Column, as `Column::date_form`
+    std::int32_t Current_Date_Format = 1;   ///< their display code
 
     // Input options.
     bool Qtl_Request = false;
