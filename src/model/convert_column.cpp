@@ -83,6 +83,11 @@ bool To_Text(Column& column, const Label_Rules&)
     return Variate_To_Text(&column);
 }
 
+bool To_Numbers(Column& column, const Label_Rules&)
+{
+    return Text_Column_To_Number(&column);
+}
+
 constexpr Conversion Conversions[] = {
     {units_variate_column, variate_column,
      [](Column& column, const Label_Rules&) { return Units_Variate_To_Variate(&column); }},
@@ -91,10 +96,7 @@ constexpr Conversion Conversions[] = {
     {units_text_column, text_column,
      [](Column& column, const Label_Rules&) { return Units_Text_To_Text(&column); }},
     {units_text_column, factor_column, To_Labels},
-    {units_text_column, variate_column,
-     [](Column& column, const Label_Rules&) {
-         return Units_Text_To_Text(&column) && Text_Column_To_Number(&column);
-     }},
+    {units_text_column, variate_column, To_Numbers},
     {factor_column, units_variate_column,
      [](Column& column, const Label_Rules&) {
          return Head_Is_Free(column) && Factor_To_Variate(&column, false) && Variate_To_Units(&column);
@@ -110,8 +112,7 @@ constexpr Conversion Conversions[] = {
     {variate_column, factor_column, To_Levels},
     {variate_column, units_variate_column,
      [](Column& column, const Label_Rules&) { return Variate_To_Units(&column); }},
-    {text_column, variate_column,
-     [](Column& column, const Label_Rules&) { return Text_Column_To_Number(&column); }},
+    {text_column, variate_column, To_Numbers},
     {text_column, factor_column, To_Labels},
     {text_column, units_text_column,
      [](Column& column, const Label_Rules&) { return Text_To_Units(&column); }},

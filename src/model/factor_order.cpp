@@ -17,7 +17,7 @@ constexpr std::size_t Most_Ordered_Labels = 16;
 
 using Name_List = std::array<std::string_view, Most_Ordered_Labels>;  // ended by empty names
 
-/// As users write them: two names of each of the eight-letter winds are unusual, but meant.
+/// As data spells them: "NEE" and its like are meant so.
 constexpr Name_List Compass_Names = {"N", "NNE", "NE", "NEE", "E", "SEE", "SE", "SSE",
                                      "S", "SSW", "SW", "SWW", "W", "NWW", "NW", "NNW"};
 constexpr Name_List Season_Names = {"Winter", "Spring", "Summer", "Autumn"};

@@ -9,7 +9,9 @@
 
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <cmath>
+#include <cstdint>
 #include <numeric>
 #include <string_view>
 #include <utility>
@@ -182,6 +184,17 @@ bool Gather_Values(const Column& column, std::size_t limit, Gathering<double>& g
     return gathered.keys.size() <= limit || Fail_Of_Many_Values(column, limit, gathered.numbers);
 }
 
+void Sort_Values(const std::vector<double>& keys, std::vector<std::uint32_t>& order)
+{
+    std::vector<std::pair<double, std::uint32_t>> places;  // a comparison finds its values at hand
+    places.reserve(order.size());
+    for (const std::uint32_t key : order)
+        places.emplace_back(keys[key], key);
+    std::sort(places.begin(), places.end());
+    std::transform(places.begin(), places.end(), order.begin(),
+                   [](const auto& place) { return place.second; });
+}
+
 /// Levels 1, 2, ..., n say nothing that the cells don't.
 bool Are_Positions(const std::vector<double>& keys, const std::vector<std::uint32_t>& order)
 {
@@ -222,8 +235,7 @@ bool Variate_To_Factor(Column* column, bool make_levels, std::int32_t wanted_lev
     const std::vector<double>& keys = gathered.keys;
     std::vector<std::uint32_t> order = Order_Of_Appearance(keys.size());
     if (column->sheet->settings.auto_factors != 0)
-        std::sort(order.begin(), order.end(),
-                  [&](std::uint32_t a, std::uint32_t b) { return keys[a] < keys[b]; });
+        Sort_Values(keys, order);
     const std::vector<double> levels = Levels_Of_Numbers(order, column->sheet->missing_value);
     if (!Keep_Level_Values(*column, keys, order))
         return false;

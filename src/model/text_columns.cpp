@@ -20,7 +20,7 @@ namespace {
 /// The cells of a text-like column are numbers now: the texts go.
 void Become_Variate(Column& column)
 {
-    column.type = variate_column;
+    Set_Column_Type(column, variate_column);
     column.nlevels = 0;
     column.text_cell_width = Text_Cell_Width;
     column.texts = Text_Arena{};

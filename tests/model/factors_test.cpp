@@ -6,6 +6,7 @@
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
 
+#include <cmath>
 #include <map>
 
 namespace ingester {
@@ -225,6 +226,9 @@ TEST_F(Factors, Every_Pair_Of_Types)
         EXPECT_EQ(Convert_Column(column, from, to, false, true), told != nullptr) << before;
         EXPECT_EQ(Told(column), told != nullptr ? told : before);
     }
+    Column* const endless = number();
+    endless->last_cell->value.number = HUGE_VAL;
+    EXPECT_TRUE(Variate_To_Text(endless) && endless->last_cell->Text() == "inf");
     Column* const first = units_text();
     Column* const second = New_Data_Column(first->sheet, variate_column, "y", 3);
     EXPECT_FALSE(Convert_Column(second, variate_column, units_variate_column, false, true));
