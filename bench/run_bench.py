@@ -54,6 +54,17 @@ table.to_csv(sys.argv[2], index=False)
 print("read_seconds %.6f\\nwrite_seconds %.6f" % (read, time.perf_counter() - start))
 """
 
+# Texts that become a Factor: rows, and how many different ones there are.
+FACTORS = {"factor-40": (5_000_000, 40), "factor-1000000": (5_000_000, 1_000_000)}
+FACTOR_GOAL = 1.0
+
+R_FACTOR_SCRIPT = """
+x <- readLines(commandArgs(TRUE)[1])
+seconds <- system.time(f <- factor(x))[["elapsed"]]
+sum <- sum(as.numeric(as.integer(f)) * (seq_along(x) %% 1000))
+cat(sprintf("factor_seconds %.6f\\nlevels %d\\nsum %.0f\\n", seconds, nlevels(f), sum))
+"""
+
 
 class Peer:
     """Another program that reads and writes the same files."""
@@ -212,11 +223,41 @@ def show(kind, data, peers, found, goals):
     sys.stdout.flush()
 
 
+def run_factors(build, kind, scale, pairs):
+    """Our conversion of texts to a Factor and R's factor(), in turn; their levels must agree."""
+    rows, labels = FACTORS[kind]
+    rows = max(int(rows * scale), 1)
+    data = os.path.join("build/bench/data", "%s-%d.csv" % (kind, rows))
+    os.makedirs(os.path.dirname(data), exist_ok=True)
+    program = [os.path.join(build, "bench/time_factor"), data, str(rows), str(labels)]
+    script = shutil.which("Rscript")
+    os.environ["LC_ALL"] = "C"  # both sort by bytes
+    found = Measures()
+    for _ in range(pairs):
+        ours = run(program)
+        found.add("ours", ours["factor_seconds"])
+        if script is None:
+            continue
+        theirs = run([script, "--vanilla", "-e", R_FACTOR_SCRIPT, data])
+        if (ours["levels"], ours["sum"]) != (theirs["levels"], theirs["sum"]):
+            sys.exit("bench: our levels of %s are not R's" % data)
+        found.add("R", theirs["factor_seconds"])
+        found.add("ratio", theirs["factor_seconds"] / max(ours["factor_seconds"], 1e-6))
+    print("\n%s: %d texts, %d of them different" % (kind, rows, int(ours["levels"])))
+    print("  ours           %.3f s" % found["ours"])
+    if script is None:
+        print("  R factor()     skipped: not installed")
+    else:
+        print("  R factor()     %.3f s   %.2fx%s" % (found["R"], found["ratio"],
+                                                    goal_text(found["ratio"], FACTOR_GOAL)))
+    sys.stdout.flush()
+
+
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--build", default="build/release", help="folder of the built programs")
     parser.add_argument("--rows-scale", type=float, default=1.0, help="part of the rows, for a quick run")
-    parser.add_argument("--only", choices=sorted(WORKLOADS), action="append", help="this workload; repeatable")
+    parser.add_argument("--only", choices=sorted(WORKLOADS) + sorted(FACTORS), action="append", help="this workload; repeatable")
     parser.add_argument("--pairs", type=int, default=5, help="paired runs (default %(default)s)")
     options = parser.parse_args()
 
@@ -232,7 +273,10 @@ def main():
     for peer in peers:
         print("%s: %s" % (peer.name, peer.version or "skipped: not installed"))
     with tempfile.TemporaryDirectory(prefix="ingester-bench-", dir=out_root) as folder:
-        for kind in options.only or WORKLOADS:
+        for kind in options.only or list(WORKLOADS) + list(FACTORS):
+            if kind in FACTORS:
+                run_factors(options.build, kind, options.rows_scale, max(options.pairs, 1))
+                continue
             rows, columns, goals = WORKLOADS[kind]
             rows = max(int(rows * options.rows_scale), 1)
             data = make_data(programs["make_data"], "build/bench/data", kind, rows, columns)

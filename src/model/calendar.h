@@ -12,8 +12,31 @@ namespace ingester {
 /// What a day count is ahead of the serial of the same day, from 1 March 1900 on.
 constexpr double Serial_Offset = 109512.0;
 
-/// Serials below are those in front of the false 29 February 1900; they lag by one more.
-constexpr double First_True_Serial = 60.0;
+/// The false 29 February 1900. Serials below it lag by one more.
+constexpr double False_Serial = 60.0;
+
+constexpr double Seconds_A_Day = 86400.0;
+
+struct Calendar_Date {
+    std::int64_t day;
+    std::int64_t month;
+    std::int64_t year;
+};
+
+/// The day number of a date in a form, or `Missing_Value` for a day that no calendar has. Years of two
+/// digits are those of the 1900s; every fourth year has a 29 February. Serials of dates in front of 1900
+/// are negative.
+[[nodiscard]] double Date_To_Number(std::int32_t day, std::int32_t month, std::int32_t year,
+                                    std::int32_t form);
+
+/// The same in the request's `Current_Date_Form`.
+[[nodiscard]] double Date_To_Number(std::int32_t day, std::int32_t month, std::int32_t year);
+
+/// The date of a whole day number that is not negative.
+[[nodiscard]] Calendar_Date Number_To_Date(std::int64_t number, std::int32_t form);
+
+/// The date and time of now.
+[[nodiscard]] double Today_Number(std::int32_t form);
 
 /// Turns a serial into the day count of the same moment; a negative one becomes `missing`.
 void Serial_To_Day_Count(double& value, double missing);

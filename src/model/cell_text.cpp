@@ -1,6 +1,7 @@
 #include "model/cell_text.h"
 
 #include "interface/request/request.h"
+#include "model/date_text.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -30,6 +31,17 @@ double Cell_Number(std::string_view text, double missing)
 }
 
 namespace {
+
+/// The number that `text` is, or the date in a column of dates.
+double Number_Or_Date(const Column& column, std::string_view text)
+{
+    const double missing = column.sheet->missing_value;
+    if (column.format != date_format_mark)
+        return Cell_Number(text, missing);
+    double value;
+    static_cast<void>(Text_To_Date(text, value, column.date_form, column.date_format, missing, false));
+    return std::min(value, Greatest_Number);
+}
 
 /// The tests by which a text finds a label, tried in this order over all labels.
 constexpr bool (*Label_Tests[])(std::string_view label, std::string_view text) = {
@@ -80,7 +92,7 @@ double Level_Of_Text(const Column& column, std::string_view text)
     if (column.factor_kind == factor_with_labels) {
         level = text.empty() ? 0 : Label_Of_Text(column, text);
     } else {
-        const double value = Cell_Number(text, missing);
+        const double value = Number_Or_Date(column, text);
         level = value > missing ? Nearest_Level(column, value) : 0;
     }
     return level > 0 ? level : missing;
@@ -100,7 +112,7 @@ void Set_Cell_From_Text(Column& column, Cell_Node& cell, std::string_view text)
     else if (text.empty() || text.front() == '*' || Is_Missing_Text(text))
         cell.value.number = missing;
     else
-        cell.value.number = Cell_Number(text, missing);
+        cell.value.number = Number_Or_Date(column, text);
 }
 
 bool Set_Cell_From_Text(Column* column, std::int32_t row, std::string_view text)

@@ -12,7 +12,7 @@ namespace ingester {
 [[nodiscard]] bool Is_Missing_Text(std::string_view text);
 
 /// Puts `text` into a cell by its column's type: text is kept up to the cell's width, a Factor takes
-/// the level that the text names, anything else the number that it is, or the missing value.
+/// the level that the text names, anything else the number or the date that it is, or the missing value.
 void Set_Cell_From_Text(Column& column, Cell_Node& cell, std::string_view text);
 
 /// The same by row number, from 0. False where there is no such cell.

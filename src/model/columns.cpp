@@ -426,6 +426,20 @@ bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to)
     return Unlink_Column(column) && Insert_Column_At(sheet, column, to);
 }
 
+void Set_Column_Type(Column& column, std::int32_t type)
+{
+    Sheet& sheet = *column.sheet;
+    const std::int32_t index = column.index;
+    const bool leading = Is_Leading(sheet, type);
+    if (Is_Leading(sheet, column.type) == leading) {
+        column.type = type;
+        return;
+    }
+    Unlink_Column(&column);
+    column.type = type;
+    Insert_Column_At(&sheet, &column, leading ? 1 : std::max(index, sheet.leading_columns));
+}
+
 void Number_Matrix_Columns(Sheet* sheet)
 {
     if (sheet == nullptr)

@@ -1,5 +1,7 @@
 #include "model/number_format.h"
 
+#include "interface/request/request.h"
+#include "model/date_format.h"
 #include "support/number_text.h"
 
 #include <algorithm>
@@ -37,6 +39,8 @@ char* Format_Number(char* target, double value, std::int32_t format, std::int32_
         return Print_Exponent(target, value, decimals < 1 ? Default_Digits : decimals);
     case fixed_format:
         return Print_Fixed(target, value, decimals < 0 ? Default_Digits : decimals);
+    case date_format_mark:
+        return Format_Date_Time(target, value, request.Current_Date_Form, request.Current_Date_Format);
     default:
         return Print_General(target, value, Default_Digits);
     }
@@ -44,6 +48,8 @@ char* Format_Number(char* target, double value, std::int32_t format, std::int32_
 
 char* Format_Cell_Number(char* target, const Column& column, double value)
 {
+    if (column.format == date_format_mark && Is_Present(*column.sheet, value))
+        return Format_Date_Time(target, value, column.date_form, column.date_format);
     return Format_Number(target, value, column.format, column.decimals, column.sheet->missing_value);
 }
 

@@ -8,11 +8,12 @@
 
 namespace ingester {
 
-/// Prints `value` by a format code and its decimals; a value not above `missing` prints "*".
+/// Prints `value` by a format code and its decimals; a value not above `missing` prints "*". Dates print
+/// in the request's `Current_Date_Form` and `Current_Date_Format`.
 /// `target` has `Number_Text_Room`. Returns the end of the text.
 char* Format_Number(char* target, double value, std::int32_t format, std::int32_t decimals, double missing);
 
-/// The printed form of a present number of `column`, or "*".
+/// The printed form of a present number of `column`, a date in the column's own form, or "*".
 char* Format_Cell_Number(char* target, const Column& column, double value);
 
 /// What cell `level` of a Factor prints as: its label, level value or number. Valid until `target`

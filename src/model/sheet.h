@@ -235,6 +235,9 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
 bool Unlink_Column(Column* column);
 bool Insert_Column_At(Sheet* sheet, Column* column, std::int32_t index);
 bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to);
+/// Changes a type that the cells already fit. A Column that begins or ceases to be a leading one goes
+/// to the head or behind it.
+void Set_Column_Type(Column& column, std::int32_t type);
 /// Takes a Column out of its Sheet and frees it; on a Symmetric Matrix with its row.
 bool Delete_Column(Column* column, bool keep_square);
 bool Delete_Empty_Columns(Sheet* sheet);

@@ -1,10 +1,18 @@
 #include "support/text.h"
 
+#include <algorithm>
 #include <cstdarg>
 #include <cstdio>
 #include <limits>
 
 namespace ingester {
+
+void Copy_Trimmed(char* target, std::string_view text, std::size_t limit, bool zero_fill)
+{
+    text = Trim_Copy(text, limit);
+    char* const end = std::copy(text.begin(), text.end(), target);
+    std::fill(end, zero_fill ? target + limit + 1 : end + 1, '\0');
+}
 
 long Leading_Integer(std::string_view text)
 {

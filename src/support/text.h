@@ -44,6 +44,9 @@ namespace ingester {
     return text.substr(0, limit);
 }
 
+/// The same into `target`, which has room for `limit` and a NUL; clears what is left of it if asked to.
+void Copy_Trimmed(char* target, std::string_view text, std::size_t limit, bool zero_fill);
+
 [[nodiscard]] constexpr bool Equal_Ignoring_Case(std::string_view a, std::string_view b)
 {
     if (a.size() != b.size())

@@ -1,5 +1,7 @@
 #include "support/check_sheet.h"
 
+#include "model/factors.h"
+
 #include <cmath>
 
 namespace ingester {
@@ -83,7 +85,7 @@ void Checker::Check_Column(const Sheet& sheet, const Column& column, std::int64_
     for (const Cell_Node* cell = column.first_cell; cell != nullptr && faults_.empty(); cell = cell->next)
         Check_Cell(column, *cell, at++);
     for (const Level_Node* label = column.labels; label != nullptr && faults_.empty(); label = label->next)
-        Expect(label->value.text != nullptr && label->Text().size() <= Text_Cell_Width,
+        Expect(label->value.text != nullptr && label->Text().size() <= Long_Label_Width,
                "a label that is no text", 0);
     const bool factor = column.type == factor_column;
     Expect(!factor || column.factor_kind != factor_with_levels || column.level_values_count >= column.nlevels,
@@ -105,6 +107,14 @@ std::string Checker::Check(const Sheet& sheet)
     for (const Column* column = sheet.first_column; column != nullptr && faults_.empty();
          column = column->next)
         Check_Column(sheet, *column, index++);
+    where_ = "head";
+    std::int32_t leading = 0;
+    for (const Column* column = sheet.first_column; column != nullptr && faults_.empty();
+         column = column->next)
+        if (column->type <= row_column)
+            Expect(column->index == leading++, "data stands before leading column", column->index);
+    Expect(!faults_.empty() || sheet.type != vector_sheet || sheet.leading_columns == leading,
+           "leading columns in all:", leading);
     return faults_;
 }
 

@@ -59,6 +59,10 @@ struct Request_Globals : Lasting_Globals {
     std::int32_t Max_Columns = Default_Max_Columns;
     Fixed_Text<60> Return_Delete_Marker = "T181D";  ///< starts the host's scratch names
     bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone
+    bool Number_Warnings_Begun = false;    ///< the title over texts that were read as numbers is written
+    bool Date_Warnings_Begun = false;      ///< the same for dates
+    std::int32_t Current_Date_Form = 0;    ///< of dates that have no Column, as `Column::date_form`
+    std::int32_t Current_Date_Format = 1;  ///< their display code
 
     // Input options.
     bool Qtl_Request = false;

@@ -3,7 +3,9 @@
 #include "interface/request/request.h"
 #include "model/cell_appender.h"
 #include "model/cell_text.h"
+#include "model/date_format.h"
 #include "model/names.h"
+#include "model/text_columns.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/number_text.h"
 #include "support/progress.h"
@@ -65,7 +67,7 @@ private:
     void Limit_Rows();
     void Start_Column(Column& column, const Cell_Appender& cells);
     void Fill_Names();
-    void Name_Column(Column& column, std::string_view text);
+    void Name_Column(std::size_t index, std::string_view text);
     bool Fill_Rows();
     void Finish_Rows(const char* last_line);
     void Report_Oddities() const;
@@ -82,6 +84,7 @@ private:
     bool Add_Late_Column();
     bool Row_Is_Acceptable(const char* line);
     void Tell_Progress();
+    void Make_Dates();
 
     Sheet& sheet_;
     Text_Shape& shape_;
@@ -129,8 +132,12 @@ void Sheet_Filler::Start_Column(Column& column, const Cell_Appender& cells)
     columns_.push_back({&column, cells, filling});
 }
 
-void Sheet_Filler::Name_Column(Column& column, std::string_view text)
+void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
 {
+    Column& column = *columns_[index].column;
+    Column_Scan& scan = shape_.types[index];
+    scan.make_date = Find_Ignoring_Case(text, ":D") != std::string_view::npos;
+    scan.make_time = !scan.make_date && Find_Ignoring_Case(text, ":T") != std::string_view::npos;
     column.name = Make_Valid_Name(Strip_Name_Mark(text));
     Use_Bracket_Text(column);
 }
@@ -145,7 +152,7 @@ void Sheet_Filler::Fill_Names()
         if (index >= columns_.size())
             Refuse_Extra_Columns();
         else if (!name.empty() || content.quote != '\0')
-            Name_Column(*columns_[index].column, name);
+            Name_Column(index, name);
         ++index;
     } while (walker_.Has_More());
 }
@@ -364,6 +371,23 @@ void Sheet_Filler::Redo_Rows(const char* first_row)
         Redo_Row();
 }
 
+/// Marked columns: texts are read as dates or times, numbers are such already.
+void Sheet_Filler::Make_Dates()
+{
+    for (std::size_t index = 0; index < columns_.size(); ++index) {
+        const Column_Scan& scan = shape_.types[index];
+        Column& column = *columns_[index].column;
+        if (!scan.make_date && !scan.make_time)
+            continue;
+        if (Text_Column_To_Date(&column, scan.make_time))
+            continue;
+        column.format = date_format_mark;
+        column.date_format = scan.make_time ? time_format : day_month_year_format;
+        if (request.Date_Base_Text.empty())
+            column.date_form = 1;
+    }
+}
+
 bool Sheet_Filler::Fill()
 {
     walker_.Go_To(walker_.First_Line());
@@ -374,6 +398,7 @@ bool Sheet_Filler::Fill()
         return false;
     Report_Oddities();
     Redo_Rows(first_row);
+    Make_Dates();
     return sheet_.row_count > 0;
 }
 

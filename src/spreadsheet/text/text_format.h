@@ -156,7 +156,9 @@ constexpr std::int32_t Undecided_Type = 99;
 /// A column as the scan sees it.
 struct Column_Scan {
     std::int32_t type = Undecided_Type;
-    bool make_factor = false;  ///< marked for a Factor: the final type is negated
+    bool make_factor = false;  ///< marked: becomes a Factor when it is filled
+    bool make_date = false;    ///< marked for dates
+    bool make_time = false;    ///< marked for times
 };
 
 /// The shape of a text, or of the lines of it that were looked at.

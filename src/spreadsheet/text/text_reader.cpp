@@ -1,5 +1,6 @@
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "model/factors.h"
 #include "model/names.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
@@ -37,6 +38,21 @@ std::string_view Separators_Of(const Text_Buffer& buffer, bool tab_file, bool cs
     return buffer.Holds(',') || buffer.Holds(';') ? ",;" : "";
 }
 
+/// Columns that are marked for it become Factors. One of too many levels stays what it is.
+void Make_Factors(Sheet& sheet, const Text_Shape& shape, const Text_Scan_Options& options)
+{
+    Column* column = sheet.first_column->next;
+    for (const Column_Scan& scan : shape.types) {
+        if (column == nullptr)
+            break;
+        if (scan.make_factor && Is_Text_Like(column->type))
+            Text_To_Factor(column, false, options.trim_cells, 0);
+        else if (scan.make_factor)
+            Variate_To_Factor(column, true, 0);
+        column = column->next;
+    }
+}
+
 /// One trailing mark of a name has done its work when the types are set.
 void Cut_Type_Marks(Sheet& sheet)
 {
@@ -65,6 +81,7 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     Current_Sheet = earlier;
     if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image))
         return false;
+    Make_Factors(*sheet, shape, options);
     Cut_Type_Marks(*sheet);
     Make_Column_Names_Unique(sheet);
     Current_Sheet = sheet;

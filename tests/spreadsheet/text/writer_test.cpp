@@ -44,23 +44,24 @@ TEST_F(Text_Writer, Lays_Out_Every_Kind_Of_Column)
     };
     const std::tuple<const char*, bool, void (*)(), const char*> cases[] = {
         {"packed commas", false, Packed,
-         "number,t,size!,dose!,plain!,day:D\r\n1,\"say \"\"hi\"\"\",\"s\",0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\n*,\"a,b\tc\",\"b\"\"g\",*,*,5\r\n"},
+         "number,t,size!,dose!,plain!,day:D\r\n1,\"say \"\"hi\"\"\",\"s\",0.5,2,03/01/00\r\n"
+         "-0.1,, ,1234567.25,1,04/01/00\r\n*,\"a,b\tc\",\"b\"\"g\",*,*,05/01/00\r\n"},
         {"no quotes, no marks, another missing text", false, bare,
-         "number,t,size,dose,plain,day\r\n1,say \"hi\",s,0.5,2,3\r\n"
-         "-0.1,, ,1234567.25,1,4\r\nNA,\"a,b\tc\",b\"g,NA,NA,5\r\n"},
+         "number,t,size,dose,plain,day\r\n1,say \"hi\",s,0.5,2,03/01/00\r\n"
+         "-0.1,, ,1234567.25,1,04/01/00\r\nNA,\"a,b\tc\",b\"g,NA,NA,05/01/00\r\n"},
         {"padded commas", false, [] { request.CSV_Output = true; },
          "number,t,size!,dose!,plain!,day:D\r\n"
-         "      1,\"say \"\"hi\"\"\" ,    \"s\",        0.5,      2,     3\r\n"
-         "   -0.1,             ,       , 1234567.25,      1,     4\r\n"
-         "      *,\"a,b\tc\"      , \"b\"\"g\",          *,      *,     5\r\n"},
+         "      1,\"say \"\"hi\"\"\" ,    \"s\",        0.5,      2, 03/01/00\r\n"
+         "   -0.1,             ,       , 1234567.25,      1, 04/01/00\r\n"
+         "      *,\"a,b\tc\"      , \"b\"\"g\",          *,      *, 05/01/00\r\n"},
         {"tabs, without names", true, [] { request.Omit_Header = true; },
-         "1\tsay \"hi\"\ts\t0.5\t2\t3\r\n-0.1\t\t \t1234567.25\t1\t4\r\n*\t\"a,b\tc\"\tb\"g\t*\t*\t5\r\n"},
+         "1\tsay \"hi\"\ts\t0.5\t2\t03/01/00\r\n-0.1\t\t "
+         "\t1234567.25\t1\t04/01/00\r\n*\t\"a,b\tc\"\tb\"g\t*\t*\t05/01/00\r\n"},
         {"fixed width", false, [] { Get_Settings().csv_title = 0; },
-         " number        t size!      dose! plain! day:D\r\n"
-         "      1 say \"hi\"     s        0.5      2     3\r\n"
-         "   -0.1                1234567.25      1     4\r\n"
-         "      * a,b\tc      b\"g          *      *     5\r\n"},
+         " number        t size!      dose! plain!    day:D\r\n"
+         "      1 say \"hi\"     s        0.5      2 03/01/00\r\n"
+         "   -0.1                1234567.25      1 04/01/00\r\n"
+         "      * a,b\tc      b\"g          *      * 05/01/00\r\n"},
     };
     for (const auto& [told, tab_mode, change, text] : cases) {
         Start_Request("t");

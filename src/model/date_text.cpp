@@ -1,0 +1,545 @@
+#include "model/date_text.h"
+
+#include "interface/request/settings.h"
+#include "model/calendar.h"
+#include "model/date_format.h"
+#include "model/sheet.h"
+#include "support/number_text.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <array>
+#include <bit>
+
+namespace ingester {
+
+namespace {
+
+enum class Reading : std::uint8_t {
+    date,        ///< a time may follow
+    date_time,   ///< a time follows
+    time,        ///< the time of a day
+    hours,       ///< a time of any number of hours
+    seconds,     ///< a number of seconds
+    day_number,  ///< the number itself
+};
+
+enum class Joint : std::uint8_t { apart, together, either };
+
+/// The parts of a text in their order: d day, m month, y year, Y a year of four digits, n a day of one or
+/// two digits, N a month's short name, L its long one, B either name, A either or a number, w a weekday.
+/// Parts that stand apart are divided by a separator; those together have two characters (N three) or
+/// what is left.
+struct Text_Layout {
+    std::string_view parts;
+    Joint joint;
+    Reading reading;
+    std::uint64_t formats;  ///< the codes that read so, a bit each
+    bool numbers = false;   ///< the parts are three numbers apart, at these places:
+    std::uint8_t day = 0;
+    std::uint8_t month = 0;
+    std::uint8_t year = 0;
+
+    constexpr Text_Layout(std::string_view the_parts, Joint the_joint, Reading the_reading,
+                          std::uint64_t the_formats)
+        : parts(the_parts), joint(the_joint), reading(the_reading), formats(the_formats)
+    {
+        numbers = joint == Joint::apart && parts.size() == 3
+                  && parts.find_first_not_of("dmy") == std::string_view::npos;
+        if (!numbers)
+            return;
+        day = static_cast<std::uint8_t>(parts.find('d'));
+        month = static_cast<std::uint8_t>(parts.find('m'));
+        year = static_cast<std::uint8_t>(parts.find('y'));
+    }
+};
+
+template <class... Format> constexpr std::uint64_t Bits(Format... formats)
+{
+    return (... | (std::uint64_t{1} << formats));
+}
+
+constexpr Text_Layout Text_Layouts[] = {
+    {"dmy", Joint::apart, Reading::date, Bits(1, 2, 3, 4)},
+    {"dmy", Joint::together, Reading::date, Bits(5, 6)},
+    {"dNy", Joint::together, Reading::date, Bits(7, 8)},
+    {"dNy", Joint::apart, Reading::date, Bits(9, 10, 13, 14)},
+    {"nNy", Joint::together, Reading::date, Bits(11, 12)},
+    {"dLy", Joint::apart, Reading::date, Bits(15, 16)},
+    {"ymd", Joint::together, Reading::date, Bits(17)},
+    {"Ymd", Joint::together, Reading::date, Bits(18)},
+    {"ymd", Joint::apart, Reading::date, Bits(19, 20, 27)},
+    {"mdy", Joint::together, Reading::date, Bits(21, 22)},
+    {"mdy", Joint::apart, Reading::date, Bits(23, 24)},
+    {"Ndy", Joint::either, Reading::date, Bits(25, 26)},
+    {"wdAy", Joint::apart, Reading::date, Bits(28)},
+    {"w", Joint::apart, Reading::date, Bits(29)},
+    {"Ny", Joint::either, Reading::date, Bits(30)},
+    {"y", Joint::apart, Reading::date, Bits(31, 32)},
+    {"dmy", Joint::apart, Reading::date_time, Bits(33)},
+    {"ymd", Joint::apart, Reading::date_time, Bits(34)},
+    {"dBy", Joint::apart, Reading::date_time, Bits(35)},
+    {"", Joint::apart, Reading::time, Bits(36)},
+    {"", Joint::apart, Reading::time, Bits(37)},
+    {"", Joint::apart, Reading::hours, Bits(38)},
+    {"", Joint::apart, Reading::seconds, Bits(39)},
+    {"", Joint::apart, Reading::day_number, Bits(40)},
+};
+
+static_assert(std::size(Text_Layouts) == No_Layout);
+
+/// By code.
+constexpr auto Layout_By_Format = [] {
+    std::array<std::size_t, Greatest_Date_Format + 1> table{};
+    table.fill(No_Layout);
+    for (std::size_t layout = 0; layout < std::size(Text_Layouts); ++layout)
+        for (std::size_t format = 0; format < table.size(); ++format)
+            if ((Text_Layouts[layout].formats >> format & 1) != 0)
+                table[format] = layout;
+    return table;
+}();
+
+constexpr std::uint64_t Marked_Formats = Bits(marked_date_time_format, marked_time_format);
+
+bool Is_Marked(const Text_Layout& layout)
+{
+    return (layout.formats & Marked_Formats) != 0;
+}
+
+constexpr bool Is_Separator(char c)
+{
+    return c == '/' || c == '-' || c == ' ';
+}
+
+/// What stands between two separators.
+struct Piece {
+    const char* first = nullptr;
+    std::size_t size = 0;
+    std::int32_t number = 0;  ///< when it is digits throughout, at least one; else below 0
+
+    [[nodiscard]] std::string_view Text() const { return {first, size}; }
+};
+
+constexpr std::size_t Most_Pieces = 4;  // of any layout
+
+/// A text cut once for all layouts.
+struct Cut_Text {
+    std::string_view whole;
+    std::string_view date;  ///< the whole, or what stands in front of the time
+    std::string_view time;  ///< what stands behind the blank before the first colon, if anything does
+    std::array<Piece, Most_Pieces + 1> pieces;  ///< of the date; the last is what all others leave
+    std::size_t count;
+    bool colon;  ///< one stands in the pieces
+    bool words;  ///< a piece is no number
+};
+
+constexpr std::int32_t Too_Great = 100'000'000;  // for a part; numbers grow no further
+
+inline void Cut_At_Separators(std::string_view text, Cut_Text& cut)
+{
+    constexpr std::ptrdiff_t most_digits = 9;
+    const char* at = text.data();
+    const char* const last = at + text.size();
+    cut.date = text;
+    cut.count = 0;
+    cut.colon = false;
+    cut.words = false;
+    for (;; ++at) {
+        const char* const first = at;
+        std::uint32_t digits = 0;  // of more than fit, the rest is of no interest
+        for (; at != last && Is_Digit(*at); ++at)
+            digits = digits * 10 + static_cast<std::uint32_t>(*at - '0');
+        std::int32_t number = at - first > most_digits ? Too_Great : static_cast<std::int32_t>(digits);
+        if (at == first || (at != last && !Is_Separator(*at)) || cut.count == Most_Pieces) [[unlikely]] {
+            for (; at != last && !(Is_Separator(*at) && cut.count < Most_Pieces); ++at)
+                cut.colon = cut.colon || *at == ':';
+            number = -1;
+            cut.words = true;
+        }
+        cut.pieces[cut.count++] = {first, static_cast<std::size_t>(at - first), number};
+        if (at == last)
+            return;
+    }
+}
+
+/// Cuts a trimmed text; a time goes by itself.
+inline void Cut(std::string_view text, Cut_Text& cut)
+{
+    cut.whole = text;
+    cut.time = {};
+    Cut_At_Separators(text, cut);
+    if (!cut.colon)
+        return;
+    const std::size_t blank = text.rfind(' ', text.find(':'));
+    if (blank == std::string_view::npos)
+        return;
+    Cut_At_Separators(Trim_Copy(text.substr(0, blank)), cut);
+    cut.time = text.substr(blank + 1);
+}
+
+/// A number at the start of `text`, or nothing but digits; below 0 for none.
+std::int32_t Read_Number(std::string_view text, bool strict)
+{
+    if (text.empty() || !(strict ? std::all_of(text.begin(), text.end(), Is_Digit) : Is_Digit(text.front())))
+        return -1;
+    return static_cast<std::int32_t>(std::min<long>(Leading_Integer(text), Too_Great));
+}
+
+struct Date_Parts {
+    std::int32_t day = 1;
+    std::int32_t month = 1;
+    std::int32_t year = 0;
+};
+
+std::int32_t Weekday_Of(std::string_view text)
+{
+    const auto& names = Get_Settings().day_names;
+    for (std::size_t day = 1; day <= 7; ++day)
+        if (Equal_Ignoring_Case(text, names[day]))
+            return static_cast<std::int32_t>(day);
+    return 0;
+}
+
+std::int32_t Month_From_Any(std::string_view text, bool strict)
+{
+    const std::int32_t month = Month_From_Name(text, strict);
+    return month != 0 ? month : Month_From_Short(text, strict);
+}
+
+bool In_Range(std::int32_t value, std::int32_t least, std::int32_t most)
+{
+    return value >= least && value <= most;
+}
+
+bool Is_Year(std::int32_t year)
+{
+    return In_Range(year, 0, 99) || In_Range(year, 1600, 9999);
+}
+
+/// Takes one part out of what stands for it.
+bool Take_Part(char part, const Piece& piece, bool strict, Date_Parts& date)
+{
+    const std::int32_t number = piece.number >= 0 || strict ? piece.number : Read_Number(piece.Text(), false);
+    const auto fits = [&](std::size_t digits) { return !strict || piece.size <= digits; };
+    switch (part) {
+    case 'd':
+    case 'n':
+        date.day = number;
+        return fits(2) && In_Range(number, 1, 31);
+    case 'm':
+        date.month = number;
+        return fits(2) && In_Range(number, 1, 12);
+    case 'y':
+    case 'Y':
+        date.year = number;
+        return fits(4) && Is_Year(number);
+    case 'N':
+        return (date.month = Month_From_Short(piece.Text(), strict)) != 0;
+    case 'L':
+        return (date.month = Month_From_Name(piece.Text(), strict)) != 0;
+    case 'A':
+        if (number >= 0)
+            return Take_Part('m', piece, strict, date);
+        [[fallthrough]];
+    case 'B':
+        return (date.month = Month_From_Any(piece.Text(), strict)) != 0;
+    default:  // a weekday says nothing in a date, and by itself stands for the day that begins the serials
+        date.day = Weekday_Of(piece.Text());
+        return date.day != 0;
+    }
+}
+
+bool Take_Parts_Apart(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
+{
+    const std::size_t count = layout.parts.size();
+    if (strict ? cut.count != count : cut.count < count)
+        return false;
+    for (std::size_t i = 0; i < count; ++i)
+        if (!Take_Part(layout.parts[i], cut.pieces[i], strict, date))
+            return false;
+    return true;
+}
+
+/// How many characters a part takes of `text` where no separators tell.
+std::size_t Width_Of_Part(char part, bool first, std::string_view text)
+{
+    switch (part) {
+    case 'N':
+        return 3;
+    case 'n':
+        return text.size() > 1 && Is_Digit(text[1]) ? 2 : 1;
+    case 'Y':
+        return 4;
+    case 'y':
+        return !first ? text.size() : text.size() == 8 ? 4 : 2;
+    default:
+        return 2;
+    }
+}
+
+bool Take_Parts_Together(const Text_Layout& layout, std::string_view text, bool strict, Date_Parts& date)
+{
+    bool first = true;
+    for (const char part : layout.parts) {
+        const std::size_t width = Width_Of_Part(part, first, text);
+        if (text.size() < width || (part == 'y' && width != 4 && (width < 2 || (strict && width != 2))))
+            return false;
+        const std::string_view own = text.substr(0, width);
+        const Piece piece = {own.data(), width, Read_Number(own, true)};
+        if (!Take_Part(part, piece, strict, date))
+            return false;
+        text.remove_prefix(width);
+        first = false;
+    }
+    return text.empty() || !strict;
+}
+
+/// The value of a date's parts; false for a day that there isn't.
+inline bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
+{
+    if (!In_Range(date.day, 1, 31) || !In_Range(date.month, 1, 12) || !Is_Year(date.year))
+        return false;
+    value = Date_To_Number(date.day, date.month, date.year, form);
+    return value != Missing_Value;
+}
+
+/// Cuts "am", "pm" or their first letter off the end; gives the letter, small, or NUL.
+char Cut_Marker(std::string_view& text)
+{
+    const std::size_t digits = text.find_last_of("0123456789.:");
+    const std::string_view marker = Trim_Copy(text.substr(digits + 1));
+    const char letter = marker.empty() ? '\0' : To_Lower(marker.front());
+    if ((letter != 'a' && letter != 'p')
+        || (marker.size() != 1 && !(marker.size() == 2 && To_Lower(marker.back()) == 'm')))
+        return '\0';
+    text = text.substr(0, digits + 1);
+    return letter;
+}
+
+/// The letter that tells the half of the day in a text with other words; small, or NUL.
+char Find_Marker(std::string_view text)
+{
+    const std::size_t at = text.find_first_of("aApP");
+    return at == std::string_view::npos ? '\0' : To_Lower(text[at]);
+}
+
+/// Reads "h:mm", "h:mm:ss" or "h:mm:ss.cc" as a part of a day, or as more of it.
+bool Read_Time(std::string_view text, bool strict, bool marker_allowed, std::int32_t most_hours,
+               double& value)
+{
+    char marker = '\0';
+    if (!strict)
+        marker = Find_Marker(text);
+    else if (marker_allowed)
+        marker = Cut_Marker(text);
+    if (strict && text.find_first_not_of("0123456789:.") != std::string_view::npos)
+        return false;
+    const std::size_t colon = text.find(':');
+    if (colon == std::string_view::npos)
+        return false;
+    const std::size_t second_colon = std::min(text.find(':', colon + 1), text.size());
+    std::int32_t hours = Read_Number(text.substr(0, colon), true);
+    const std::int32_t minutes = Read_Number(text.substr(colon + 1, second_colon - colon - 1), strict);
+    double seconds = 0.0;
+    if (second_colon < text.size()) {
+        const Parsed_Number parsed = Parse_Number(text.data() + second_colon + 1, text.data() + text.size());
+        if (parsed.status != Number_Status::good || (strict && parsed.end != text.data() + text.size()))
+            return false;
+        seconds = parsed.value;
+    }
+    if (!In_Range(hours, 0, most_hours) || !In_Range(minutes, 0, 60) || !(seconds >= 0.0 && seconds <= 60.0))
+        return false;
+    if (marker == 'p' && hours < 12)
+        hours += 12;
+    else if (marker == 'a' && hours == 12)
+        hours = 0;
+    value = ((seconds / 60.0 + minutes) / 60.0 + hours) / 24.0;
+    return true;
+}
+
+constexpr std::int32_t Hours_A_Day = 24;
+
+bool Take_Parts(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
+{
+    const bool together =
+        layout.joint == Joint::together || (layout.joint == Joint::either && cut.count == 1);
+    if (!together)
+        return Take_Parts_Apart(layout, cut, strict, date);
+    return (!strict || cut.count == 1) && Take_Parts_Together(layout, cut.date, strict, date);
+}
+
+/// The usual case, in short: three numbers and nothing else.
+inline bool Take_Numbers(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
+{
+    const Piece& day = cut.pieces[layout.day];
+    const Piece& month = cut.pieces[layout.month];
+    const Piece& year = cut.pieces[layout.year];
+    date = {day.number, month.number, year.number};
+    return !strict || (day.size <= 2 && month.size <= 2 && year.size <= 4);
+}
+
+/// A date, with the time behind it if there is one.
+inline bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                      double& value)
+{
+    Date_Parts date;
+    if (layout.numbers && !cut.words && cut.count == 3) [[likely]] {
+        if (!Take_Numbers(layout, cut, strict, date) || !Value_Of(date, form, value))
+            return false;
+    } else if (!Take_Parts(layout, cut, strict, date) || !Value_Of(date, form, value)) {
+        return false;
+    }
+    if (cut.time.empty())
+        return !strict || layout.reading == Reading::date;
+    double time;
+    if (!Read_Time(cut.time, strict, Is_Marked(layout), Hours_A_Day, time))
+        return false;
+    value += time;
+    return true;
+}
+
+inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                           double& value)
+{
+    switch (layout.reading) {
+    case Reading::date:
+    case Reading::date_time:
+        return Read_Date(layout, cut, form, strict, value);
+    case Reading::time:
+        return Read_Time(cut.whole, strict, Is_Marked(layout), Hours_A_Day, value);
+    case Reading::hours:
+        return Read_Time(cut.whole, strict, false, Too_Great - 1, value);
+    case Reading::seconds:
+        if (!Whole_Number_Text(cut.whole, value) || value < 0.0)
+            return false;
+        value /= Seconds_A_Day;
+        return true;
+    case Reading::day_number:
+        return Whole_Number_Text(cut.whole, value) && value >= 0.0;
+    }
+    return false;
+}
+
+/// Layouts that a text may have when read strictly, by the shape of the text: a bit a layout. All others
+/// would fail in the end.
+class Possible_Layouts {
+public:
+    constexpr Possible_Layouts()
+    {
+        for (std::size_t words = 0; words < 2; ++words)
+            for (std::size_t count = 1; count <= Most_Pieces + 1; ++count)
+                for (std::size_t i = 0; i < std::size(Text_Layouts); ++i)
+                    if (May_Have(Text_Layouts[i], count, words != 0))
+                        table_[words][count] |= std::uint64_t{1} << i;
+    }
+
+    [[nodiscard]] constexpr std::uint64_t Of(const Cut_Text& cut) const
+    {
+        return table_[cut.words ? 1 : 0][cut.count];
+    }
+
+private:
+    static constexpr bool May_Have(const Text_Layout& layout, std::size_t count, bool words)
+    {
+        if (layout.reading != Reading::date && layout.reading != Reading::date_time)
+            return words || count == 1;  // a time has colons, a number a point or an exponent
+        const bool apart = layout.joint != Joint::together && layout.parts.size() == count;
+        const bool together = layout.joint != Joint::apart && count == 1;
+        return (apart || together) && words == (layout.parts.find_first_of("NLBw") != std::string_view::npos);
+    }
+
+    std::array<std::array<std::uint64_t, Most_Pieces + 2>, 2> table_{};
+};
+
+constexpr Possible_Layouts Possible;
+
+/// The last resort: six digits or more in front of something else, or a day number.
+bool Read_Without_Layout(std::string_view text, std::int32_t form, double& value)
+{
+    constexpr std::size_t day_and_month = 4;
+    const std::size_t end = text.find_first_of("/-:,\\ ");
+    if (end == std::string_view::npos)
+        return Whole_Number_Text(text, value) && value > 0.0;
+    if (end <= day_and_month)
+        return false;
+    const Date_Parts date = {Read_Number(text.substr(0, 2), false), Read_Number(text.substr(2, 2), false),
+                             Read_Number(text.substr(day_and_month, end - day_and_month), false)};
+    return Value_Of(date, form, value);
+}
+
+bool Says_No_Date(std::string_view trimmed)
+{
+    return trimmed.empty() || trimmed.front() == '*';
+}
+
+}  // namespace
+
+std::size_t Date_Layout_Of(std::int32_t format)
+{
+    return In_Range(format, 1, Greatest_Date_Format) ? Layout_By_Format[static_cast<std::size_t>(format)]
+                                                     : No_Layout;
+}
+
+bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::int32_t format,
+                  double missing, bool strict)
+{
+    text = Trim_Copy(text, Text_Cell_Width);
+    value = missing;
+    if (Says_No_Date(text))
+        return true;
+    const std::size_t layout = Date_Layout_Of(format);
+    double read;
+    if (layout != No_Layout) {
+        Cut_Text cut;
+        Cut(text, cut);
+        if (Read_By_Layout(Text_Layouts[layout], cut, form, strict, read)) {
+            value = read;
+            return true;
+        }
+    }
+    if (strict || !Read_Without_Layout(text, form, read))
+        return false;
+    value = read;
+    return true;
+}
+
+Strict_Readings Read_By_All_Layouts(std::string_view text, std::int32_t form)
+{
+    text = Trim_Copy(text, Text_Cell_Width);
+    if (Says_No_Date(text))
+        return {.blank = true};
+    Strict_Readings readings{};
+    Cut_Text cut;
+    Cut(text, cut);
+    for (std::uint64_t left = Possible.Of(cut); left != 0; left &= left - 1) {
+        const int layout = std::countr_zero(left);
+        double value;
+        if (!Read_By_Layout(Text_Layouts[layout], cut, form, true, value))
+            continue;
+        const std::uint64_t bit = std::uint64_t{1} << layout;
+        readings.good |= bit;
+        readings.negative |= value < 0.0 ? bit : 0;
+    }
+    readings.colon = cut.colon || !cut.time.empty();
+    return readings;
+}
+
+std::int32_t Month_From_Short(std::string_view text, bool strict)
+{
+    const auto& names = Get_Settings().month_abbreviations;
+    for (std::size_t month = 1; month <= 12; ++month)
+        if (strict ? Equal_Ignoring_Case(text, names[month]) : Starts_Ignoring_Case(text, names[month]))
+            return static_cast<std::int32_t>(month);
+    return 0;
+}
+
+std::int32_t Month_From_Name(std::string_view text, bool strict)
+{
+    const auto& names = Get_Settings().month_names;
+    for (std::size_t month = 1; month <= 12; ++month)
+        if (strict ? Equal_Ignoring_Case(text, names[month]) : Starts_Ignoring_Case(text, names[month]))
+            return static_cast<std::int32_t>(month);
+    return 0;
+}
+
+}  // namespace ingester

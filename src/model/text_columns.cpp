@@ -1,0 +1,209 @@
+#include "model/text_columns.h"
+
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/calendar.h"
+#include "model/cell_text.h"
+#include "model/date_format.h"
+#include "model/date_text.h"
+#include "model/text_number.h"
+
+#include <algorithm>
+#include <array>
+#include <bit>
+#include <string>
+
+namespace ingester {
+
+namespace {
+
+/// The cells of a text-like column are numbers now: the texts go.
+void Become_Variate(Column& column)
+{
+    Set_Column_Type(column, variate_column);
+    column.nlevels = 0;
+    column.text_cell_width = Text_Cell_Width;
+    column.texts = Text_Arena{};
+    Mark_Column_Changed(&column, true);
+}
+
+/// The words in front of the first warning of their kind.
+void Begin_Warnings(bool& begun, std::string_view title)
+{
+    if (!begun)
+        Report_Message(title);
+    begun = true;
+}
+
+void Warn_Of_Number(const Column& column, long row, std::string_view text, double number)
+{
+    Begin_Warnings(request.Number_Warnings_Begun, "Text to Number Conversion Warnings\n \n");
+    const std::string words(text);
+    if (Is_Present(*column.sheet, number))
+        Fail("Column %s Row %4li: %s read as %.12g\n", column.name.c_str(), row, words.c_str(), number);
+    else
+        Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, words.c_str());
+}
+
+}  // namespace
+
+bool Text_Column_To_Number(Column* column)
+{
+    if (column == nullptr || !Is_Text_Like(column->type))
+        return false;
+    const double missing = column->sheet->missing_value;
+    long row = 0;
+    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
+        const std::string_view text = cell->Text();
+        ++row;
+        double number = missing;
+        bool changed = false;
+        if (!text.empty() && !Is_Missing_Text(text))
+            number = Text_To_Number(text, missing, changed);
+        if (changed)
+            Warn_Of_Number(*column, row, text, number);
+        cell->value.number = number;
+    }
+    Become_Variate(*column);
+    return true;
+}
+
+namespace {
+
+/// How the cells of a column read.
+struct Date_Counts {
+    std::array<std::int64_t, No_Layout + 1> hits{};  ///< by layout; blank cells have any
+    std::int64_t cells = 0;
+    std::int64_t blanks = 0;
+    std::uint64_t negative = 0;  ///< layouts by which a day number was negative
+    bool colon = false;
+
+    [[nodiscard]] std::int64_t Hits(std::int32_t format) const { return hits[Date_Layout_Of(format)]; }
+};
+
+constexpr std::int64_t Sample_Size = 100;
+
+/// Blank cells say nothing and widen a sample.
+Date_Counts Count_Readings(const Column& column, bool sample)
+{
+    Date_Counts counts;
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
+        if (sample && counts.cells - counts.blanks == Sample_Size)
+            break;
+        const Strict_Readings readings = Read_By_All_Layouts(cell->Text(), column.date_form);
+        ++counts.cells;
+        counts.blanks += readings.blank ? 1 : 0;
+        counts.negative |= readings.negative;
+        counts.colon = counts.colon || readings.colon;
+        for (std::uint64_t good = readings.good; good != 0; good &= good - 1)
+            ++counts.hits[static_cast<std::size_t>(std::countr_zero(good))];
+    }
+    for (std::int64_t& hits : counts.hits)
+        hits += counts.blanks;
+    return counts;
+}
+
+bool Is_Passed_Over(std::int32_t format, const Date_Format_Search& search)
+{
+    if (search.sample)
+        return format == year_format || format == year_format + 1;
+    return search.time_mode && format < time_format;
+}
+
+/// The code with most hits. The order in which codes are tried decides among equals.
+std::int32_t Best_Format(const Date_Counts& counts, const Date_Format_Search& search)
+{
+    const std::int32_t last = search.time_mode ? seconds_format : marked_time_format;
+    std::int32_t best = 0;
+    std::int64_t most = -1;
+    for (std::int32_t format = 1; format <= last; ++format) {
+        if (Is_Passed_Over(format, search))
+            continue;
+        const std::int64_t hits = counts.Hits(format);
+        const bool shows_time = counts.colon && format >= date_time_format && best < date_time_format;
+        if (hits > most || (hits == most && (format == search.wanted || shows_time)))
+            best = format;
+        most = std::max(most, hits);
+        if (format >= search.wanted && hits == counts.cells)
+            break;
+    }
+    return best;
+}
+
+/// Whether so many texts of a sample are dates that the others are put up with.
+bool Is_Dated_Sample(std::int64_t hits, std::int64_t texts, bool has_default)
+{
+    return hits > 0 && (hits == texts || has_default || (texts >= Sample_Size && 100 * hits > 95 * texts));
+}
+
+}  // namespace
+
+std::int32_t Find_Date_Format(const Column* column, const Date_Format_Search& search)
+{
+    if (column == nullptr || !Is_Text_Like(column->type))
+        return 0;
+    const Date_Counts counts = Count_Readings(*column, search.sample);
+    const std::int32_t best = Best_Format(counts, search);
+    const std::int64_t hits = counts.Hits(best);
+    std::int32_t found = best;
+    if (search.sample)
+        found = Is_Dated_Sample(hits - counts.blanks, counts.cells - counts.blanks, search.has_default) ? best
+                                                                                                        : 0;
+    else if (hits <= 2 && hits != counts.cells)
+        found = search.wanted;
+    return (counts.negative >> Date_Layout_Of(found) & 1) != 0 ? -found : found;
+}
+
+namespace {
+
+/// What a text that isn't in its column's layout is tried as, in this order.
+constexpr std::int32_t Other_Date_Formats[] = {35, 33, 10, 16, 8,  12, 14, 26, 34,
+                                               2,  4,  6,  27, 24, 22, 20, 19, 18};
+constexpr std::int32_t Other_Time_Formats[] = {36, 37, 38, 39};
+
+bool Read_Date_Cell(std::string_view text, std::int32_t format, double missing, double& value)
+{
+    const auto read_strictly = [&](std::int32_t other) {
+        return Text_To_Date(text, value, 1, other, missing, true);
+    };
+    if (Text_To_Date(text, value, 1, format, missing, false))
+        return true;
+    if (format >= time_format && format <= seconds_format)
+        return std::ranges::any_of(Other_Time_Formats, read_strictly);
+    return std::ranges::any_of(Other_Date_Formats, read_strictly);
+}
+
+void Warn_Of_Date(const Column& column, long row, std::string_view text)
+{
+    Begin_Warnings(request.Date_Warnings_Begun, "Text to Date Conversion Warnings\n \n");
+    Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, std::string(text).c_str());
+}
+
+}  // namespace
+
+bool Text_Column_To_Date(Column* column, bool time_mode)
+{
+    if (column == nullptr || !Is_Text_Like(column->type))
+        return false;
+    const std::int32_t usual = time_mode ? time_format : 1;
+    const std::int32_t format =
+        std::abs(Find_Date_Format(column, {.wanted = usual, .has_default = true, .time_mode = time_mode}));
+    const double missing = column->sheet->missing_value;
+    long row = 0;
+    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
+        const std::string_view text = cell->Text();
+        ++row;
+        double value;
+        if (!Read_Date_Cell(text, format, missing, value))
+            Warn_Of_Date(*column, row, text);
+        cell->value.number = value;
+    }
+    Become_Variate(*column);
+    column->format = date_format_mark;
+    column->date_format = format;
+    column->date_form = 1;
+    column->decimals = -1;
+    return true;
+}
+
+}  // namespace ingester
