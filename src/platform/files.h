@@ -1,6 +1,7 @@
 // Files: RAII, large reads, typed reads. Names are request names, native ones will do as well.
 #pragma once
 
+#include "platform/folders.h"
 #include "support/byte_fields.h"
 
 #include <cstddef>
@@ -34,6 +35,8 @@ public:
     /// Bytes in all; 0 where that isn't known before they are read.
     [[nodiscard]] std::int64_t Size() const;
     [[nodiscard]] std::int64_t Position() const { return position_; }
+    /// When the file was last written. False for bytes in memory.
+    [[nodiscard]] bool Write_Time(Local_Time& time) const;
     [[nodiscard]] bool Seek(std::int64_t position);
 
     /// Up to `count` bytes; fewer only at the end, or after a fault (see `Failed`).

@@ -53,9 +53,10 @@ bool Delete_File(std::string_view name) noexcept;
 /// `name` with its extension replaced, or added.
 [[nodiscard]] std::string With_Extension(std::string_view name, std::string_view extension);
 
-/// The hour, minute, second, month (1 to 12), day and year of now, in local time.
+/// The hour, minute, second, month (1 to 12), day and year of a moment, in local time.
 struct Local_Time {
     int hour, minute, second, month, day, year;
+    int millisecond = 0;
 };
 [[nodiscard]] Local_Time Local_Time_Now();
 

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <ctime>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -47,6 +48,23 @@ std::int64_t Input_File::Size() const
         return static_cast<std::int64_t>(memory_.size());
     struct stat facts;
     return ::fstat(descriptor_, &facts) == 0 && S_ISREG(facts.st_mode) ? facts.st_size : 0;
+}
+
+bool Input_File::Write_Time(Local_Time& time) const
+{
+    struct stat facts;
+    std::tm parts{};
+    if (descriptor_ < 0 || ::fstat(descriptor_, &facts) != 0
+        || ::localtime_r(&facts.st_mtim.tv_sec, &parts) == nullptr)
+        return false;
+    time = {parts.tm_hour,
+            parts.tm_min,
+            parts.tm_sec,
+            parts.tm_mon + 1,
+            parts.tm_mday,
+            parts.tm_year + 1900,
+            static_cast<int>(facts.st_mtim.tv_nsec / 1000000)};
+    return true;
 }
 
 bool Input_File::Seek(std::int64_t position)

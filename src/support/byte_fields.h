@@ -58,6 +58,21 @@ template <class T, std::endian order = std::endian::little> inline void Put_Numb
     std::memcpy(bytes, &word, sizeof word);
 }
 
+/// The same in an order that is known only when the file is read.
+template <class T> [[nodiscard]] inline T Number_At(const void* bytes, std::endian order)
+{
+    return order == std::endian::little ? Number_At<T, std::endian::little>(bytes)
+                                        : Number_At<T, std::endian::big>(bytes);
+}
+
+/// Turns numbers that were read as they stand from `order` into this machine's.
+template <class T> void Turn_Native(std::span<T> numbers, std::endian order)
+{
+    if (order != std::endian::native)
+        for (T& number : numbers)
+            number = Number_At<T>(&number, order);
+}
+
 /// A number at a fixed offset of a record. Layouts are structs of these, shared by reader and writer.
 template <class T, std::endian order> struct Byte_Field {
     std::size_t offset;
