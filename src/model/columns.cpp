@@ -98,9 +98,17 @@ bool Is_Units(std::int32_t type)
     return type == units_text_column || type == units_variate_column;
 }
 
+bool Is_Any_Matrix(const Sheet& sheet)
+{
+    return sheet.type == matrix_sheet || sheet.type == symmetric_matrix_sheet
+           || sheet.type == diagonal_matrix_sheet;
+}
+
+/// Long texts in a Matrix are those of its units.
 bool Is_Leading(const Sheet& sheet, std::int32_t type)
 {
-    return type == row_column || Is_Units(type) || (type == factor_column && sheet.type == table_sheet);
+    return type == row_column || Is_Units(type) || (type == factor_column && sheet.type == table_sheet)
+           || (type == long_text_column && Is_Any_Matrix(sheet));
 }
 
 void Renumber_Columns(Sheet& sheet)
@@ -428,6 +436,10 @@ bool Move_Column(Sheet* sheet, std::int32_t from, std::int32_t to)
 
 void Set_Column_Type(Column& column, std::int32_t type)
 {
+    if (!Is_Units(column.type) && !Is_Units(type)) {
+        column.attached_text.clear();  // what it computes is of the old type
+        column.attached_mode = 0;
+    }
     Sheet& sheet = *column.sheet;
     const std::int32_t index = column.index;
     const bool leading = Is_Leading(sheet, type);
@@ -449,6 +461,20 @@ void Number_Matrix_Columns(Sheet* sheet)
             column->name = std::to_string(column->index - sheet->leading_columns + 1);
 }
 
+namespace {
+
+/// Ends a Column that is in no list any more.
+void Free_Column(Sheet& sheet, Column* column)
+{
+    if (sheet.has_colour_sources != 0)
+        for (Column* other = sheet.first_column; other != nullptr; other = other->next)
+            if (other->colour_source == column)
+                other->colour_source = nullptr;
+    delete column;
+}
+
+}  // namespace
+
 bool Delete_Column(Column* column, bool keep_square)
 {
     if (column == nullptr || column->sheet == nullptr)
@@ -458,7 +484,7 @@ bool Delete_Column(Column* column, bool keep_square)
     const bool symmetric = column->type == symmetric_matrix_column;
     if (!Unlink_Column(column))
         return false;
-    delete column;
+    Free_Column(*sheet, column);
     if (symmetric && keep_square)
         Delete_Row(sheet, row, false);
     if (sheet->label_state == 0)
@@ -485,7 +511,7 @@ void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last)
             continue;
         Unlink(sheet->first_column, sheet->last_column, column);
         Count_Column(*sheet, *column, -1);
-        delete column;
+        Free_Column(*sheet, column);
     }
     Renumber_Columns(*sheet);
     if (sheet->label_state == 0)
@@ -511,7 +537,7 @@ bool Delete_Empty_Columns(Sheet* sheet)
         // Without the renumbering of `Delete_Column`: a wide sheet may lose thousands.
         Unlink(sheet->first_column, sheet->last_column, empty);
         Count_Column(*sheet, *empty, -1);
-        delete empty;
+        Free_Column(*sheet, empty);
     }
     Renumber_Columns(*sheet);
     if (sheet->label_state == 0)

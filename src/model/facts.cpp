@@ -131,6 +131,22 @@ std::int32_t Measure_Factor(Column& column)
 
 }  // namespace
 
+std::int32_t Compute_Text_Width(Column* column)
+{
+    if (column == nullptr)
+        return 0;
+    if (Is_Text_Like(column->type))
+        return column->nlevels = Widest_Text(column->first_cell);
+    if (column->type != factor_column)
+        return Widest_Number(*column, column->first_cell);
+    if (column->factor_kind == plain_factor)
+        return Measure_Factor(*column) + 1;
+    std::int32_t widest = Measure_Factor(*column);
+    if (column->sheet->has_margins != 0)
+        widest = std::max(widest, static_cast<std::int32_t>(column->sheet->margin_label.size()));
+    return column->label_width = widest;
+}
+
 void Compute_Column_Width(Column* column)
 {
     constexpr std::int32_t least_text_width = 2;

@@ -158,7 +158,10 @@ bool Delete_Row(Sheet* sheet, std::int32_t index, bool keep_square)
     Remove_Cell(sheet->first_column, sheet->first_column->length - 1);
     for (Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
         const std::int32_t first_row = First_Row_Of(*column);
-        if (index >= first_row && column->length > sheet->row_count - first_row)
+        // A Symmetric Matrix whose column went may have lost the cell with it.
+        const bool gone =
+            column->type == symmetric_matrix_column && column->length <= sheet->row_count - first_row;
+        if (index >= first_row && !gone)
             Remove_Cell(column, index - first_row);
     }
     sheet->current_row = std::min(sheet->current_row, sheet->row_count - 1);

@@ -6,6 +6,7 @@
 
 #include "interface/request/settings.h"
 #include "model/cells.h"
+#include "model/host_fields.h"
 #include "support/fixed_text.h"
 
 #include <cstdint>
@@ -75,7 +76,7 @@ enum Factor_Kind : std::int32_t { plain_factor = 0, factor_with_levels = 1, fact
 
 struct Sheet;
 
-struct Column {
+struct Column : Column_Host_Fields {
     Column* next = nullptr;
     Column* prev = nullptr;
     std::int32_t type = variate_column;
@@ -116,7 +117,7 @@ struct Column {
     Block_Table level_blocks;
 };
 
-struct Sheet {
+struct Sheet : Sheet_Host_Fields {
     std::int32_t type = vector_sheet;
     Column* first_column = nullptr;
     Column* last_column = nullptr;
@@ -139,7 +140,7 @@ struct Sheet {
     std::int32_t row_count = 0;
     std::int32_t restricted_rows = 0;
     std::int32_t leading_columns = 0;  ///< columns at the head that are not data
-    std::int32_t current_column = 0;
+    std::int32_t current_column = 1;
     std::int32_t current_row = 0;
     std::int32_t top_row = 0;
     std::int32_t table_ways = 0;
@@ -307,6 +308,10 @@ bool Make_Labels(Column& column, std::int32_t count);
 
 /// The level (from 1) whose value is nearest to `value`; 0 without level values.
 [[nodiscard]] std::int32_t Nearest_Level(const Column& column, double value);
+
+/// The widest cell as a host's file counts it: of texts the longest, kept in `nlevels`; of a Factor the
+/// longest label or printed level, kept in `label_width`, and never less than the margin's label.
+std::int32_t Compute_Text_Width(Column* column);
 
 /// Sets `width` (and `nlevels` of text, `label_width` of labels) from what the cells print as.
 void Compute_Column_Width(Column* column);
