@@ -1,6 +1,7 @@
 #include "interface/format_drivers.h"
 
 #include "hostfiles/script/script.h"
+#include "hostfiles/tss/tss.h"
 #include "interface/compressed_files.h"
 #include "interface/file_detection.h"
 #include "spreadsheet/text/text.h"
@@ -29,7 +30,7 @@ bool Write_Tabs(Sheet* sheet, const char* file_name)
 }
 
 constexpr Format_Driver Format_Drivers[] = {
-    {spreadsheet_file, "Tabulon Spreadsheet", nullptr, ".tss"},
+    {spreadsheet_file, "Tabulon Spreadsheet", Read_TSS_File, ".tss", Write_TSS_File},
     {2, "Lotus 1-2-3 worksheet"},
     {3, "dBase table", nullptr, ".dbf", nullptr, 511},
     {script_file, "command script", nullptr, ".gen", Write_Host_Script},

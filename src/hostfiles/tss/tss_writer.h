@@ -1,0 +1,59 @@
+// What the steps of the writer hand to each other.
+#pragma once
+
+#include "hostfiles/shared/host_sheet.h"
+#include "hostfiles/tss/tss_format.h"
+#include "platform/files.h"
+
+#include <cstdint>
+#include <string_view>
+
+namespace ingester {
+
+/// The stream that the file is written to.
+class TSS_Sink {
+public:
+    explicit TSS_Sink(Output_File& file) : file_(&file) {}
+
+    [[nodiscard]] bool Failed() const { return file_->Failed(); }
+
+    void Put(std::int32_t value) { file_->Write_Little(value); }
+    void Put(double value) { file_->Write_Little(value); }
+    void Put_Bytes(std::string_view bytes) { file_->Write(bytes); }
+    void Put_Text(std::string_view text)
+    {
+        Put(static_cast<std::int32_t>(text.size()));
+        Put_Bytes(text);
+    }
+    template <class Record, class... Fields>
+    void Put(const Record& record, const std::tuple<Fields...>& layout)
+    {
+        std::apply([&](const auto&... field) { (Put(record.*field.member), ...); }, layout);
+    }
+
+private:
+    Output_File* file_;
+};
+
+/// A number as files hold it.
+[[nodiscard]] inline double Number_In_File(double value, const Sheet& sheet)
+{
+    return !Is_Surely_Present(value) && Is_Missing_In_File(value, sheet.missing_value) ? Missing_Value
+                                                                                       : value;
+}
+
+/// A Table whose columns are labelled: one of two or more ways.
+[[nodiscard]] inline bool Is_Many_Way_Table(const Sheet& sheet)
+{
+    return sheet.type == table_sheet && sheet.table_ways >= 2;
+}
+
+/// Writes the record of a column.
+void Write_TSS_Column(Column& column, TSS_Sink& sink);
+
+/// The bits of the head, for the records that `Write_Auxiliary_Records` will write.
+[[nodiscard]] std::uint32_t Present_Flags_Of(const Sheet& sheet);
+
+void Write_Auxiliary_Records(Sheet& sheet, TSS_Sink& sink);
+
+}  // namespace ingester
