@@ -378,6 +378,13 @@ inline bool Take_Numbers(const Text_Layout& layout, const Cut_Text& cut, bool st
     return !strict || (day.size <= 2 && month.size <= 2 && year.size <= 4);
 }
 
+bool Is_Day_Number(std::string_view text, double& value)
+{
+    const bool number = Whole_Number_Text(text, value);
+    value = std::min(value, Greatest_Number);
+    return number;
+}
+
 /// A date, with the time behind it if there is one.
 inline bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
                       double& value)
@@ -415,7 +422,7 @@ inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::
         value /= Seconds_A_Day;
         return true;
     case Reading::day_number:
-        return Whole_Number_Text(cut.whole, value) && value >= 0.0;
+        return Is_Day_Number(cut.whole, value) && value >= 0.0;
     }
     return false;
 }
@@ -459,7 +466,7 @@ bool Read_Without_Layout(std::string_view text, std::int32_t form, double& value
     constexpr std::size_t day_and_month = 4;
     const std::size_t end = text.find_first_of("/-:,\\ ");
     if (end == std::string_view::npos)
-        return Whole_Number_Text(text, value) && value > 0.0;
+        return Is_Day_Number(text, value) && value > 0.0;
     if (end <= day_and_month)
         return false;
     const Date_Parts date = {Read_Number(text.substr(0, 2), false), Read_Number(text.substr(2, 2), false),
