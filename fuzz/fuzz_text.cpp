@@ -43,7 +43,7 @@ void Must(bool holds, const char* what)
     Must(strictly || strict == Missing_Value, "no date has a value");
     Must(!strictly || (loosely && loose == strict), "a strict date reads otherwise");
     Must(loose <= Greatest_Number && loose >= Missing_Value, "a date is beyond all numbers");
-    const Strict_Readings readings = Read_By_All_Layouts(text, form);
+    const Strict_Readings readings = Read_By_All_Layouts(text);
     const std::size_t layout = Date_Layout_Of(format);
     Must(readings.blank || layout == No_Layout || (readings.good >> layout & 1) == (strictly ? 1 : 0),
          "all layouts at once say otherwise");

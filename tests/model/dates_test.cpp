@@ -244,13 +244,13 @@ TEST_F(Dates, Texts_Read_By_Code)
         EXPECT_EQ(Read(date.text, date.format, false), date.loosely != nullptr ? date.loosely : date.strictly)
             << date.text;
         // All layouts at once say what each says by itself.
-        const Strict_Readings readings = Read_By_All_Layouts(date.text, 1);
+        const Strict_Readings readings = Read_By_All_Layouts(date.text);
         for (std::int32_t format = 1; format <= 40; ++format)
             EXPECT_EQ(readings.good >> Date_Layout_Of(format) & 1, Read(date.text, format, true) != "no")
                 << date.text << " by " << format;
     }
     for (const char* blank : {"", "  ", "*", "*x"})
-        EXPECT_TRUE(Read(blank, 2, true) == "*" && Read_By_All_Layouts(blank, 1).blank);
+        EXPECT_TRUE(Read(blank, 2, true) == "*" && Read_By_All_Layouts(blank).blank);
     EXPECT_EQ(Read(std::string(10000, '1'), 2, false), "1.11111111111111e+89");
     EXPECT_EQ(Month_From_Short("Sept", false) + Month_From_Name("may", true), 9 + 5);
     EXPECT_EQ(Month_From_Short("Sept", true) + Month_From_Name("Ma", false), 0);
