@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Measures the text reader and writer, and how texts become dates, alone and against the peers that are installed.
+"""Measures text tables and dates, alone and against the peers that are installed.
 
 Every number is the median of paired runs: ours and a peer's take turns, each in a process of its
 own, and a ratio is the median of the ratios of neighbours. "1.50x" says that the peer took 1.5

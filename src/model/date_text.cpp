@@ -299,7 +299,7 @@ bool Take_Parts_Together(const Text_Layout& layout, std::string_view text, bool 
 /// The value of a date's parts; false for a day that there isn't.
 inline bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
 {
-    if (!In_Range(date.day, 1, 31) || !In_Range(date.month, 1, 12) || !Is_Year(date.year))
+    if (!Is_Year(date.year))
         return false;
     value = Date_To_Number(date.day, date.month, date.year, form);
     return value != Missing_Value;
