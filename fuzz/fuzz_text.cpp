@@ -1,6 +1,9 @@
 // The targets of functions that take a text: the build names the one that is tried. The first bytes of
 // an input choose how the function is called.
+#include "interface/detection_tests.h"
+#include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "interface/slash_options.h"
 #include "model/date_format.h"
 #include "model/date_text.h"
 #include "model/sheet.h"
@@ -8,6 +11,7 @@
 #include "support/number_text.h"
 #include "support/text.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 
@@ -61,6 +65,32 @@ void Must(bool holds, const char* what)
     double whole;
     if (!changed)
         Must(Whole_Number_Text(Trim_Copy(text), whole) && whole == number, "a number was changed unseen");
+}
+
+/// The head: which of the request's strings it is.
+[[maybe_unused]] void Try_Options(std::string_view head, std::string_view text)
+{
+    request = Request_Globals{};
+    const std::span<const Slash_Option> tables[] = {Genotype_Options(), Input_Options(), Output_Options()};
+    std::string rest(text);
+    static_cast<void>(Take_Reflow_Order(rest));
+    Cut_Options(tables[Choice(head[0], 3)], rest);
+    Must(rest.size() <= text.size(), "options leave more than there was");
+    Must(request.Text_Number_Mode >= 0 && request.Text_Number_Mode <= 4, "no such mode");
+    Must(request.Lines_Per_Record >= 1, "a record of no lines");
+    Must(request.Merge_Key_Count >= 0 && request.Merge_Key_Count <= 9, "too many keys");
+    Close_Message_File();
+}
+
+/// The head of the file, behind its name and a line end.
+[[maybe_unused]] void Try_Detection(std::string_view, std::string_view text)
+{
+    const std::size_t line = std::min(text.find('\n'), text.size());
+    Detection_Head head{text.substr(0, line)};
+    text.remove_prefix(std::min(line + 1, text.size()));
+    head.length = text.copy(head.bytes.data(), head.bytes.size());
+    const std::int32_t code = Code_Of_Head(head);
+    Must(code >= 0 && code <= 82, "no such type of file");
 }
 
 }  // namespace

@@ -275,9 +275,12 @@ static_assert(Magics_Fit(Detection_Tests));
 
 }  // namespace
 
-std::span<const Detection_Test> All_Detection_Tests()
+std::int32_t Code_Of_Head(const Detection_Head& head)
 {
-    return Detection_Tests;
+    for (const Detection_Test& test : Detection_Tests)
+        if (test.Matches(head))
+            return test.code;
+    return unknown_file;
 }
 
 }  // namespace ingester

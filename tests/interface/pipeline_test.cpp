@@ -152,7 +152,8 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv", f + "o.tab/@,k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
         {{"Clipboard.csv", "o.tab"}, 9, "Read Error: Cannot open clipboard for read.\n"},
-        {{f + "c.csv", "clipboard.tab"}, 9,
+        {{f + "c.csv", "clipboard.tab"},
+         9,
          "Copy Error: Cannot open clipboard for write.\nCould not put data on the clipboard.\n"},
         {{f + "c.csv", "clipboard.xls"}, 6, "Clipboard format not supported.\n"},
     };
