@@ -133,6 +133,7 @@ struct Cut_Text {
     bool words;  ///< a piece is no number
 
     [[nodiscard]] constexpr bool Has_Time() const { return colon || !time.empty(); }
+    [[nodiscard]] constexpr bool Is_Three_Numbers() const { return count == 3 && !words && time.empty(); }
 };
 
 constexpr std::int32_t Too_Great = 100'000'000;  // for a part; numbers grow no further
@@ -212,6 +213,8 @@ bool In_Range(std::int32_t value, std::int32_t least, std::int32_t most)
 {
     return value >= least && value <= most;
 }
+
+constexpr std::int32_t First_Serial_Year = 1900;  // dates in front of it have no serials
 
 bool Is_Year(std::int32_t year)
 {
@@ -414,23 +417,25 @@ bool Read_Otherwise(const Text_Layout& layout, const Cut_Text& cut, std::int32_t
     return false;
 }
 
-/// The usual date, in short: three numbers and nothing else.
-inline bool Read_Numbers(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
-                         double& value)
+/// The parts of the usual date, three numbers and nothing else, in the order of a layout.
+inline Date_Parts Numbers_Of(const Text_Layout& layout, const Cut_Text& cut)
 {
-    const Piece& day = cut.pieces[layout.day];
-    const Piece& month = cut.pieces[layout.month];
-    const Piece& year = cut.pieces[layout.year];
-    return (!strict || (day.size <= 2 && month.size <= 2 && year.size <= 4))
-           && Value_Of({day.number, month.number, year.number}, form, value);
+    return {cut.pieces[layout.day].number, cut.pieces[layout.month].number, cut.pieces[layout.year].number};
+}
+
+/// Whether a strict reading takes numbers of so many digits.
+inline bool Are_Short_Enough(const Text_Layout& layout, const Cut_Text& cut)
+{
+    return cut.pieces[layout.day].size <= 2 && cut.pieces[layout.month].size <= 2
+           && cut.pieces[layout.year].size <= 4;
 }
 
 inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
                            double& value)
 {
-    const bool usual = layout.numbers && cut.count == 3 && !cut.words && cut.time.empty();
-    return usual ? Read_Numbers(layout, cut, form, strict, value)
-                 : Read_Otherwise(layout, cut, form, strict, value);
+    if (!layout.numbers || !cut.Is_Three_Numbers())
+        return Read_Otherwise(layout, cut, form, strict, value);
+    return (!strict || Are_Short_Enough(layout, cut)) && Value_Of(Numbers_Of(layout, cut), form, value);
 }
 
 /// Layouts that a text may have when read strictly, by the shape of the text: a bit a layout. All others
@@ -529,15 +534,53 @@ bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::
     return true;
 }
 
+namespace {
+
+/// The layouts of three numbers apart.
+constexpr auto Number_Layouts = [] {
+    std::array<std::size_t, 3> layouts{};
+    std::size_t count = 0;
+    for (std::size_t i = 0; i < std::size(Text_Layouts); ++i)
+        if (Text_Layouts[i].numbers)
+            layouts[count++] = i;
+    return layouts;
+}();
+
+/// All orders of three numbers. Whether a day can be a month as well changes from cell to cell, so nothing
+/// branches on it.
+inline Strict_Readings Read_Numbers_By_All(const Cut_Text& cut)
+{
+    Strict_Readings readings;
+    for (const std::size_t i : Number_Layouts) {
+        const Text_Layout& layout = Text_Layouts[i];
+        const Date_Parts date = Numbers_Of(layout, cut);
+        if (!Are_Short_Enough(layout, cut) || !Is_Year(date.year))
+            continue;
+        const auto good = static_cast<std::uint64_t>(Is_Calendar_Day(date.day, date.month, date.year));
+        const auto early = static_cast<std::uint64_t>(date.year >= 100 && date.year < First_Serial_Year);
+        readings.good |= good << i;
+        readings.early |= (good & early) << i;
+    }
+    if (readings.good != 0) {
+        const Date_Parts date = Numbers_Of(Text_Layouts[std::countr_zero(readings.good)], cut);
+        readings.value = Date_To_Number(date.day, date.month, date.year, 1);
+    }
+    return readings;
+}
+
+}  // namespace
+
 Strict_Readings Read_By_All_Layouts(std::string_view text)
 {
     constexpr double first_day = Serial_Offset + 1.0;  // of the serials
     text = Trim_Copy(text, Text_Cell_Width);
     if (Says_No_Date(text))
         return {.blank = true};
-    Strict_Readings readings;
     Cut_Text cut;
     Cut(text, cut);
+    if (cut.Is_Three_Numbers())
+        return Read_Numbers_By_All(cut);
+    Strict_Readings readings;
     for (std::uint64_t left = Possible.Of(cut); left != 0; left &= left - 1) {
         const Text_Layout& layout = Text_Layouts[std::countr_zero(left)];
         double value;
