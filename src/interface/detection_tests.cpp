@@ -39,8 +39,10 @@ bool Looks_Like_Cornell(const Detection_Head& head)
             return false;
     }
     const std::size_t first_end = text.find('\n');
-    if (first_end == std::string_view::npos
-        || Trim_Copy(text.substr(0, first_end)).size() > longest_first_line)
+    if (first_end == std::string_view::npos)
+        return false;
+    const std::size_t first_length = first_end > 0 && text[first_end - 1] == '\r' ? first_end - 1 : first_end;
+    if (first_length > longest_first_line)
         return false;
     const std::size_t open = text.find('(', first_end);
     return open != std::string_view::npos && text.find(')', open) != std::string_view::npos;

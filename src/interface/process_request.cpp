@@ -19,6 +19,7 @@ constexpr Stage Stages[] = {
     Fetch_Input,
     Name_Var_File,
     Take_Clipboard_Input,
+    Keep_Stream,
     Find_Source_Base_Name,
     Detect_Input,
     Cut_Output_Options,

@@ -160,11 +160,15 @@ std::int32_t Best_Format(const Date_Counts& counts, const Date_Format_Search& se
         if (Is_Passed_Over(format, search))
             continue;
         const std::int64_t hits = counts.Hits(format);
-        const bool shows_time = counts.colon && format >= date_time_format && best < date_time_format;
+        // The crossed markers of one code would mislead where a plain one takes every cell as well.
+        const bool misleads = format == marked_date_time_format && hits == counts.cells;
+        const bool shows_time =
+            counts.colon && format >= date_time_format && best < date_time_format && !misleads;
         if (hits > most || (hits == most && (format == search.wanted || shows_time)))
             best = format;
         most = std::max(most, hits);
-        if (format >= search.wanted && hits == counts.cells)
+        // Where a time was seen, a code that drops it may not end the search.
+        if (format >= search.wanted && hits == counts.cells && (!counts.colon || format >= date_time_format))
             break;
     }
     return best;

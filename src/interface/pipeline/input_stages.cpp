@@ -18,7 +18,7 @@ namespace ingester {
 
 Request_Run::~Request_Run()
 {
-    if (downloaded || clipboard_input)
+    if (downloaded || clipboard_input || kept_stream)
         Delete_File(infile);
     if (map_downloaded)
         Delete_File(request.Qtl_Map_File);
@@ -107,10 +107,26 @@ Request_Status Take_Clipboard_Input(Request_Run& run)
     return Read_Clipboard_To_File(run.infile) ? Done : Request_Status::clipboard_failed;
 }
 
+/// A pipe or a device can be read once; what comes out of it is kept until the reader has it.
+Request_Status Keep_Stream(Request_Run& run)
+{
+    if (!Is_Special_File(run.infile))
+        return Done;
+    const std::string copy = Get_Temp_Folder()
+                                 .append("IN")
+                                 .append(request.Scratch_Stem)
+                                 .append(run.infile.substr(Extension_Start(run.infile)));
+    if (!Copy_File(run.infile, copy))
+        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
+    run.source_name = run.infile;
+    run.infile = copy;
+    run.kept_stream = true;
+    return Done;
+}
+
 Request_Status Find_Source_Base_Name(Request_Run& run)
 {
-    const std::string_view source = run.downloaded ? request.Source_Url.view() : std::string_view(run.infile);
-    std::string_view name = File_Part_Of(source);
+    std::string_view name = File_Part_Of(run.Source());
     name = name.substr(0, Extension_Start(name));
     if (name.empty() || name == "$Std_In$")
         name = "std_in";
@@ -286,6 +302,9 @@ Request_Status Switch_Off_For_List(Request_Run&)
     request.Source_Key_Given = false;
     request.Fixed_Number_Text = false;
     request.Output_Matrix = false;
+    request.Print_Summary = false;
+    request.First_Column = 0;
+    request.Last_Column = Every_Column;
     Get_Settings().delete_empty_rows = 0;
     return Done;
 }

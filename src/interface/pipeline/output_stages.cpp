@@ -23,6 +23,8 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     if (!request.Write_Via_Temp || request.Add_To_Output)
         return Done;
     run.temp_output = With_Extension(run.outfile, ".$$$");
+    if (run.temp_output == run.outfile)
+        run.temp_output += ".$$$";
     if (Same_File(run.temp_output, run.infile))
         return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
     return Done;

@@ -4,6 +4,7 @@
 
 #include "interface/format_drivers.h"
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
 #include "interface/status.h"
 #include "platform/folders.h"
 
@@ -19,6 +20,8 @@ struct Request_Run {
     std::string temp_output;  ///< where the writer writes
     bool downloaded = false;  ///< `infile` is the copy of a fetched input
     bool clipboard_input = false;
+    bool kept_stream = false;  ///< `infile` is the copy of what a pipe gave
+    std::string source_name;   ///< the pipe's own name
     bool clipboard_output = false;
     bool map_downloaded = false;
     bool genotype = false;      ///< the input goes the road of genotype files
@@ -29,6 +32,14 @@ struct Request_Run {
     std::int32_t input_code = 0;
     std::int32_t output_code = 0;
     const Format_Driver* output = nullptr;
+
+    /// The name that the user knows the input by.
+    [[nodiscard]] std::string_view Source() const
+    {
+        if (downloaded)
+            return request.Source_Url;
+        return kept_stream ? source_name : infile;
+    }
 
     Request_Run() = default;
     Request_Run(const Request_Run&) = delete;
@@ -61,6 +72,7 @@ Request_Status Cut_Input_Options(Request_Run& run);
 Request_Status Fetch_Input(Request_Run& run);
 Request_Status Name_Var_File(Request_Run& run);
 Request_Status Take_Clipboard_Input(Request_Run& run);
+Request_Status Keep_Stream(Request_Run& run);
 Request_Status Find_Source_Base_Name(Request_Run& run);
 Request_Status Detect_Input(Request_Run& run);
 Request_Status Cut_Output_Options(Request_Run& run);
