@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Measures the text reader and writer and the script writer, alone and against the peers that are installed.
+"""Measures text tables, scripts, Factors and dates, alone and against the peers that are installed.
 
 Every number is the median of paired runs: ours and a peer's take turns, each in a process of its
 own, and a ratio is the median of the ratios of neighbours. "1.50x" says that the peer took 1.5
@@ -27,6 +27,13 @@ WORKLOADS = {
     "text": (5_000_000, 1, {}),
 }
 
+# Texts in memory that become dates: rows, the form of their texts here and in R.
+DATE_WORKLOADS = {
+    "dates-iso": (5_000_000, "iso", "%Y-%m-%d"),
+    "dates-dmy": (5_000_000, "dmy", "%d/%m/%Y"),
+}
+DATE_GOAL = 5.0
+
 # Beyond the image of the file, for numbers.
 GREATEST_BYTES_A_CELL = 26
 
@@ -41,6 +48,12 @@ taken <- function(work) system.time(work)[["elapsed"]]
 r <- taken(d <- fread(a[1], nThread = 1, showProgress = FALSE))
 w <- taken(fwrite(d, a[2], nThread = 1, showProgress = FALSE))
 cat(sprintf("read_seconds %.6f\\nwrite_seconds %.6f\\n", r, w))
+"""
+
+R_DATE_SCRIPT = """
+a <- commandArgs(TRUE)
+texts <- format(as.Date("1900-01-01") + (seq_len(as.integer(a[1])) - 1L) %% 40000L, a[2])
+cat(sprintf("convert_seconds %.6f\\n", system.time(as.Date(texts, format = a[2]))[["elapsed"]]))
 """
 
 PANDAS_SCRIPT = """
@@ -253,15 +266,40 @@ def run_factors(build, kind, scale, pairs):
     sys.stdout.flush()
 
 
+def show_dates(kind, program, pairs, scale):
+    """Our conversion, which finds the format by itself, and R's, which is told it, in turn."""
+    rows, form, r_format = DATE_WORKLOADS[kind]
+    rows = max(int(rows * scale), 1)
+    found = Measures()
+    peer = Peer("R", "as.Date", "", ["Rscript", "-e", R_DATE_SCRIPT],
+                ["Rscript", "-e", "cat(as.character(getRversion()))"])
+    for _ in range(pairs):
+        ours = run([program, str(rows), form])["convert_seconds"]
+        found.add("ours", ours)
+        if peer.version:
+            theirs = run([*peer.command, str(rows), r_format])["convert_seconds"]
+            found.add("theirs", theirs)
+            found.add("ratio", theirs / max(ours, 1e-6))
+    print("\n%s: %d texts\n  ours           %.3f s" % (kind, rows, found["ours"]))
+    if peer.version:
+        print("  R %s, as.Date  %.3f s   %.2fx%s"
+              % (peer.version, found["theirs"], found["ratio"], goal_text(found["ratio"], DATE_GOAL)))
+    else:
+        print("  R: skipped: not installed")
+    sys.stdout.flush()
+
+
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--build", default="build/release", help="folder of the built programs")
     parser.add_argument("--rows-scale", type=float, default=1.0, help="part of the rows, for a quick run")
-    parser.add_argument("--only", choices=sorted(WORKLOADS) + sorted(FACTORS), action="append", help="this workload; repeatable")
+    parser.add_argument("--only", choices=sorted(WORKLOADS | FACTORS | DATE_WORKLOADS),
+                        action="append", help="this workload; repeatable")
     parser.add_argument("--pairs", type=int, default=5, help="paired runs (default %(default)s)")
     options = parser.parse_args()
 
-    programs = {"make_data": "bench/make_data", "time_text": "bench/time_text", "ingester": "ingester"}
+    programs = {"make_data": "bench/make_data", "time_text": "bench/time_text",
+                "time_dates": "bench/time_dates", "ingester": "ingester"}
     programs = {name: os.path.join(options.build, path) for name, path in programs.items()}
     peers = find_peers()
     memory_folder = "/dev/shm"
@@ -273,9 +311,12 @@ def main():
     for peer in peers:
         print("%s: %s" % (peer.name, peer.version or "skipped: not installed"))
     with tempfile.TemporaryDirectory(prefix="ingester-bench-", dir=out_root) as folder:
-        for kind in options.only or list(WORKLOADS) + list(FACTORS):
+        for kind in options.only or WORKLOADS | FACTORS | DATE_WORKLOADS:
             if kind in FACTORS:
                 run_factors(options.build, kind, options.rows_scale, max(options.pairs, 1))
+                continue
+            if kind in DATE_WORKLOADS:
+                show_dates(kind, programs["time_dates"], max(options.pairs, 1), options.rows_scale)
                 continue
             rows, columns, goals = WORKLOADS[kind]
             rows = max(int(rows * options.rows_scale), 1)

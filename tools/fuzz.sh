@@ -13,7 +13,7 @@ build_targets() {
 
 case ${1:-} in
     --build) build_targets fuzz_readers; exit ;;
-    --list) sed -n 's/^fuzz_reader(\([a-z0-9_]*\) .*/\1/p' fuzz/CMakeLists.txt; exit ;;
+    --list) sed -n 's/^fuzz_[a-z]*(\([a-z0-9_]*\) .*/\1/p' fuzz/CMakeLists.txt; exit ;;
     '' | -*) sed -n '2,4s/^# //p' "$0" >&2; exit 2 ;;
 esac
 

@@ -11,6 +11,12 @@ echo
 echo "== Input: $input"
 cat "$input"
 
+script=$folder/crops.gen
+echo
+echo "== ingester $input crops.gen: the script that the host runs"
+"$ingester" "$input" "$script"
+cat "$script"
+
 for format in tab; do
     output=$folder/crops.$format
     echo

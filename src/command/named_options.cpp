@@ -1,5 +1,7 @@
 #include "command/named_options.h"
 
+#include "interface/paths.h"
+#include "interface/request/request.h"
 #include "platform/folders.h"
 #include "support/text.h"
 
@@ -84,6 +86,15 @@ const Slash_Option* Option_In_Value(const Given_Options& all, const Given_Option
     return nullptr;
 }
 
+/// Whether the option takes all that it is given; the rest would stay in the name of the file.
+bool Is_Taken_Whole(const Given_Option& given)
+{
+    const std::string text = Spelled(given);
+    const std::size_t end = given.option->take(text, given.option->key.size());
+    request = Request_Globals{};
+    return end == text.size();
+}
+
 std::string Fault_Of(const Given_Options& all, const Given_Option& given)
 {
     const std::string_view value = given.value;
@@ -99,6 +110,10 @@ std::string Fault_Of(const Given_Options& all, const Given_Option& given)
         return "this value can't hold a single quote";
     if (Is_Quoted(given) && single && value.find('"') != std::string_view::npos)
         return "this value can't hold both kinds of quotes";
+    if (Holds_Path_Token(value) || value.find("/rewrite=") != std::string_view::npos)
+        return "this value holds a name between per cent signs or '/rewrite=', which a request acts on";
+    if (!Is_Taken_Whole(given))
+        return "this value is not of the form that the option takes";
     if (const Slash_Option* const other = Option_In_Value(all, given))
         return std::string("this value can't hold '")
             .append(other->key)
@@ -133,6 +148,14 @@ std::string Fault_Of_Options(const Given_Options& given)
     for (const Given_Option& one : given)
         if (std::string fault = Fault_Of(given, one); !fault.empty())
             return std::string("--").append(one.option->named.name).append(": ").append(fault);
+    return {};
+}
+
+std::string_view Key_Given_Twice(std::string_view text, const Given_Options& given)
+{
+    for (const Given_Option& one : given)
+        if (one.given && text.find(one.option->key) != std::string_view::npos)
+            return one.option->key;
     return {};
 }
 

@@ -33,4 +33,7 @@ void Offer_Named_Options(CLI::App& app, const char* group,
 /// Why the option language can't carry the value of one of them, and what to do; empty when it can.
 [[nodiscard]] std::string Fault_Of_Options(const Given_Options& given);
 
+/// The key of a given option that stands in `text` as well, in the option language; empty for none.
+[[nodiscard]] std::string_view Key_Given_Twice(std::string_view text, const Given_Options& given);
+
 }  // namespace ingester

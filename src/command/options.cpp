@@ -59,6 +59,13 @@ bool Add_Named_Options(Command_Options& options)
         std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", told.c_str());
         return false;
     }
+    for (const auto& [text, named] : {std::pair(&options.input_options, &options.named_input_options),
+                                      std::pair(&options.output_options, &options.named_output_options)})
+        if (const std::string_view key = Key_Given_Twice(*text, *named); !key.empty()) {
+            std::fprintf(stderr, "ingester: %s is given twice, in the option language and by its name\n",
+                         std::string(key).c_str());
+            return false;
+        }
     options.input_options += Spell_Options(options.named_input_options);
     options.output_options += Spell_Options(options.named_output_options);
     return true;

@@ -83,6 +83,8 @@ std::string Fault_Of_Name(std::string_view native)
     if (Native_Path(Request_Path(native)) != native)
         return "a request reads the backslash in this name as the end of a folder's name; "
                "rename the file, or give it another name by a link";
+    if (Trim_Copy(native) != native)
+        return "a request drops blanks at the ends of a name; rename the file, or use a link";
     if (Is_Url(native))
         return {};
     if (Holds_Path_Token(Request_Path(native)))

@@ -39,8 +39,10 @@ bool Looks_Like_Cornell(const Detection_Head& head)
             return false;
     }
     const std::size_t first_end = text.find('\n');
-    if (first_end == std::string_view::npos
-        || Trim_Copy(text.substr(0, first_end)).size() > longest_first_line)
+    if (first_end == std::string_view::npos)
+        return false;
+    const std::size_t first_length = first_end > 0 && text[first_end - 1] == '\r' ? first_end - 1 : first_end;
+    if (first_length > longest_first_line)
         return false;
     const std::size_t open = text.find('(', first_end);
     return open != std::string_view::npos && text.find(')', open) != std::string_view::npos;
@@ -275,9 +277,12 @@ static_assert(Magics_Fit(Detection_Tests));
 
 }  // namespace
 
-std::span<const Detection_Test> All_Detection_Tests()
+std::int32_t Code_Of_Head(const Detection_Head& head)
 {
-    return Detection_Tests;
+    for (const Detection_Test& test : Detection_Tests)
+        if (test.Matches(head))
+            return test.code;
+    return unknown_file;
 }
 
 }  // namespace ingester

@@ -6,7 +6,6 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <span>
 #include <string_view>
 
 namespace ingester {
@@ -43,8 +42,8 @@ struct Detection_Test {
     [[nodiscard]] bool Matches(const Detection_Head& head) const;
 };
 
-/// All tests, from the most specific to the least: the first match decides.
-[[nodiscard]] std::span<const Detection_Test> All_Detection_Tests();
+/// The code of the first test that matches, from the most specific to the least; 0 for none.
+[[nodiscard]] std::int32_t Code_Of_Head(const Detection_Head& head);
 
 /// Whether the name has an extension of ecological data, and the head a Fortran format in its second line.
 [[nodiscard]] bool Looks_Like_Cornell(const Detection_Head& head);

@@ -9,14 +9,6 @@ namespace ingester {
 
 namespace {
 
-std::int32_t Code_Of_Head(const Detection_Head& head)
-{
-    for (const Detection_Test& test : All_Detection_Tests())
-        if (test.Matches(head))
-            return test.code;
-    return unknown_file;
-}
-
 std::int32_t Unreadable(std::string_view why)
 {
     Report_Message(why);

@@ -18,12 +18,12 @@ constexpr Stage Stages[] = {
     Cut_Input_Options,
     Fetch_Input,
     Name_Var_File,
-    Refuse_Clipboard_Input,
+    Take_Clipboard_Input,
+    Keep_Stream,
     Find_Source_Base_Name,
     Detect_Input,
     Cut_Output_Options,
     Read_Merge_Keys,
-    Refuse_Clipboard_Output,
     Choose_Output,
     Refuse_Same_File,
     Keep_Names_As_They_Stand,
@@ -47,6 +47,7 @@ constexpr Stage Stages[] = {
     Make_Output_Form,
     Write_Output,
     Write_Column_List,
+    Fill_Clipboard,
     Replace_Old_Output,
 };
 

@@ -39,7 +39,7 @@ bool Open_Var_File(Output_File& file, std::string_view file_name)
 
 bool Keep_Column_Range(Sheet* sheet, std::int32_t first, std::int32_t last)
 {
-    if (first > last)
+    if (first > last || last < 1)
         return Fail("Error: First column to be kept must be <= Last column.\n");
     if (last > sheet->column_count && last != Every_Column)
         Report_Message_Long("Note: Data contains fewer columns than the specified last column %li.\n", last);

@@ -31,19 +31,13 @@ constexpr std::int64_t Days_Before_Month(std::int64_t month)
     return (month * Month_Tenths + 5) / 10;
 }
 
-struct Month_Facts {
-    std::int16_t length;
-    std::int16_t days_before;  ///< since the year began
-};
-
 /// By month; January and February are the last two of the year before.
-constexpr auto Months = [] {
-    constexpr std::int16_t lengths[] = {31, 29, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
-    std::array<Month_Facts, 13> months{};
+constexpr auto Days_Before = [] {
+    std::array<std::int32_t, 13> days{};
     for (std::size_t month = 1; month <= 12; ++month)
-        months[month] = {lengths[month - 1], static_cast<std::int16_t>(Days_Before_Month(
-                                                 static_cast<std::int64_t>((month + 9) % 12)))};
-    return months;
+        days[month] =
+            static_cast<std::int32_t>(Days_Before_Month(static_cast<std::int64_t>((month + 9) % 12)));
+    return days;
 }();
 
 constexpr std::int32_t First_Year = 1600;
@@ -53,8 +47,7 @@ constexpr std::int32_t Two_Digit_Years = 100;  // below, a year is one of the 19
 
 double Date_To_Number(std::int32_t day, std::int32_t month, std::int32_t year, std::int32_t form)
 {
-    if (month < 1 || month > 12 || day < 1 || day > Months[static_cast<std::size_t>(month)].length
-        || (day == 29 && month == 2 && year % 4 != 0))
+    if (!Is_Calendar_Day(day, month, year))
         return Missing_Value;
     std::int32_t years = year >= Two_Digit_Years ? year - First_Year : year + 300;
     if (years < 0)
@@ -62,7 +55,7 @@ double Date_To_Number(std::int32_t day, std::int32_t month, std::int32_t year, s
     years -= month < 3 ? 1 : 0;
     const std::int32_t century = (years + 100) / 100 - 1;
     const std::int64_t count = Days_Before_Century(century) + Days_Before_Year(years - 100 * century)
-                               + Months[static_cast<std::size_t>(month)].days_before + day;
+                               + Days_Before[static_cast<std::size_t>(month)] + day;
     const auto value = static_cast<double>(count);
     if (form != 0 || count <= 1)
         return value;

@@ -5,6 +5,7 @@
 // The fraction of either is the time of day.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 
 namespace ingester {
@@ -22,6 +23,16 @@ struct Calendar_Date {
     std::int64_t month;
     std::int64_t year;
 };
+
+/// Whether a month has such a day; every fourth year has a 29 February.
+[[nodiscard]] inline bool Is_Calendar_Day(std::int32_t day, std::int32_t month, std::int32_t year)
+{
+    constexpr std::int8_t lengths[] = {0, 31, 29, 31, 30, 31, 30, 31, 31, 30, 31, 30, 31};
+    const std::size_t known = month >= 0 && month <= 12 ? static_cast<std::size_t>(month) : 0;
+    const auto fits = static_cast<unsigned>(day >= 1) & static_cast<unsigned>(day <= lengths[known]);
+    const bool leap_day = day == 29 && month == 2;
+    return fits != 0 && !(leap_day && year % 4 != 0);
+}
 
 /// The day number of a date in a form, or `Missing_Value` for a day that no calendar has. Years of two
 /// digits are those of the 1900s; every fourth year has a 29 February. Serials of dates in front of 1900

@@ -40,7 +40,7 @@ double Number_Or_Date(const Column& column, std::string_view text)
         return Cell_Number(text, missing);
     double value;
     static_cast<void>(Text_To_Date(text, value, column.date_form, column.date_format, missing, false));
-    return std::min(value, Greatest_Number);
+    return value;
 }
 
 /// The tests by which a text finds a label, tried in this order over all labels.

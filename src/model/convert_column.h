@@ -16,7 +16,8 @@ bool Units_Text_To_Text(Column* column);
 bool Variate_To_Units(Column* column);
 bool Text_To_Units(Column* column);
 
-/// The one entry for all pairs: whether the Column, which is of type `from`, now is of type `to`.
+/// The one entry for all pairs: whether the Column, which is of type `from`, now is of type `to`
+/// (texts that are too wide for Text make it Long Text).
 /// Nothing happens in a Sheet that is read only, to a protected Column, and for a pair without a way.
 bool Convert_Column(Column* column, std::int32_t from, std::int32_t to, bool by_case_free, bool trim);
 

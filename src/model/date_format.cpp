@@ -2,6 +2,7 @@
 
 #include "interface/request/settings.h"
 #include "model/calendar.h"
+#include "model/sheet.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -148,12 +149,12 @@ char* Format_Date_Time(char* target, double value, std::int32_t form, std::int32
 {
     if (!(value >= 0.0))
         return Put(target, "*");
-    if (value > Greatest_Day)
-        return Print_General(target, value, 15);
     if (format == seconds_format)
-        return Print_Fixed(target, value * Seconds_A_Day, 3);
+        return Print_Fixed(target, std::min(value * Seconds_A_Day, Greatest_Number), 3);
     if (format == plain_format)
         return Print_General(target, value, 6);
+    if (value > Greatest_Day)
+        return Print_General(target, value, 15);
     const bool known = format > 0 && format < static_cast<std::int32_t>(Layout_Limit);
     const std::string_view layout = known ? Layout_Table[static_cast<std::size_t>(format)] : Other_Layout;
     Moment moment = Take_Apart(value, form, known && format >= date_time_format);

@@ -44,7 +44,7 @@ struct Text_Layout {
                           std::uint64_t the_formats)
         : parts(the_parts), joint(the_joint), reading(the_reading), formats(the_formats)
     {
-        numbers = joint == Joint::apart && parts.size() == 3
+        numbers = reading == Reading::date && joint == Joint::apart && parts.size() == 3
                   && parts.find_first_not_of("dmy") == std::string_view::npos;
         if (!numbers)
             return;
@@ -131,6 +131,9 @@ struct Cut_Text {
     std::size_t count;
     bool colon;  ///< one stands in the pieces
     bool words;  ///< a piece is no number
+
+    [[nodiscard]] constexpr bool Has_Time() const { return colon || !time.empty(); }
+    [[nodiscard]] constexpr bool Is_Three_Numbers() const { return count == 3 && !words && time.empty(); }
 };
 
 constexpr std::int32_t Too_Great = 100'000'000;  // for a part; numbers grow no further
@@ -210,6 +213,8 @@ bool In_Range(std::int32_t value, std::int32_t least, std::int32_t most)
 {
     return value >= least && value <= most;
 }
+
+constexpr std::int32_t First_Serial_Year = 1900;  // dates in front of it have no serials
 
 bool Is_Year(std::int32_t year)
 {
@@ -297,7 +302,7 @@ bool Take_Parts_Together(const Text_Layout& layout, std::string_view text, bool 
 /// The value of a date's parts; false for a day that there isn't.
 inline bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
 {
-    if (!In_Range(date.day, 1, 31) || !In_Range(date.month, 1, 12) || !Is_Year(date.year))
+    if (!Is_Year(date.year))
         return false;
     value = Date_To_Number(date.day, date.month, date.year, form);
     return value != Missing_Value;
@@ -368,27 +373,19 @@ bool Take_Parts(const Text_Layout& layout, const Cut_Text& cut, bool strict, Dat
     return (!strict || cut.count == 1) && Take_Parts_Together(layout, cut.date, strict, date);
 }
 
-/// The usual case, in short: three numbers and nothing else.
-inline bool Take_Numbers(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
+bool Is_Day_Number(std::string_view text, double& value)
 {
-    const Piece& day = cut.pieces[layout.day];
-    const Piece& month = cut.pieces[layout.month];
-    const Piece& year = cut.pieces[layout.year];
-    date = {day.number, month.number, year.number};
-    return !strict || (day.size <= 2 && month.size <= 2 && year.size <= 4);
+    const bool number = Whole_Number_Text(text, value);
+    value = std::min(value, Greatest_Number);
+    return number;
 }
 
 /// A date, with the time behind it if there is one.
-inline bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
-                      double& value)
+bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict, double& value)
 {
     Date_Parts date;
-    if (layout.numbers && !cut.words && cut.count == 3) [[likely]] {
-        if (!Take_Numbers(layout, cut, strict, date) || !Value_Of(date, form, value))
-            return false;
-    } else if (!Take_Parts(layout, cut, strict, date) || !Value_Of(date, form, value)) {
+    if (!Take_Parts(layout, cut, strict, date) || !Value_Of(date, form, value))
         return false;
-    }
     if (cut.time.empty())
         return !strict || layout.reading == Reading::date;
     double time;
@@ -398,8 +395,8 @@ inline bool Read_Date(const Text_Layout& layout, const Cut_Text& cut, std::int32
     return true;
 }
 
-inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
-                           double& value)
+bool Read_Otherwise(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                    double& value)
 {
     switch (layout.reading) {
     case Reading::date:
@@ -415,9 +412,30 @@ inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::
         value /= Seconds_A_Day;
         return true;
     case Reading::day_number:
-        return Whole_Number_Text(cut.whole, value) && value >= 0.0;
+        return Is_Day_Number(cut.whole, value) && value >= 0.0;
     }
     return false;
+}
+
+/// The parts of the usual date, three numbers and nothing else, in the order of a layout.
+inline Date_Parts Numbers_Of(const Text_Layout& layout, const Cut_Text& cut)
+{
+    return {cut.pieces[layout.day].number, cut.pieces[layout.month].number, cut.pieces[layout.year].number};
+}
+
+/// Whether a strict reading takes numbers of so many digits.
+inline bool Are_Short_Enough(const Text_Layout& layout, const Cut_Text& cut)
+{
+    return cut.pieces[layout.day].size <= 2 && cut.pieces[layout.month].size <= 2
+           && cut.pieces[layout.year].size <= 4;
+}
+
+inline bool Read_By_Layout(const Text_Layout& layout, const Cut_Text& cut, std::int32_t form, bool strict,
+                           double& value)
+{
+    if (!layout.numbers || !cut.Is_Three_Numbers())
+        return Read_Otherwise(layout, cut, form, strict, value);
+    return (!strict || Are_Short_Enough(layout, cut)) && Value_Of(Numbers_Of(layout, cut), form, value);
 }
 
 /// Layouts that a text may have when read strictly, by the shape of the text: a bit a layout. All others
@@ -426,29 +444,42 @@ class Possible_Layouts {
 public:
     constexpr Possible_Layouts()
     {
-        for (std::size_t words = 0; words < 2; ++words)
-            for (std::size_t count = 1; count <= Most_Pieces + 1; ++count)
-                for (std::size_t i = 0; i < std::size(Text_Layouts); ++i)
-                    if (May_Have(Text_Layouts[i], count, words != 0))
-                        table_[words][count] |= std::uint64_t{1} << i;
+        for (const bool colon : {false, true})
+            for (const bool words : {false, true})
+                for (std::size_t count = 1; count <= Most_Pieces + 1; ++count)
+                    for (std::size_t i = 0; i < std::size(Text_Layouts); ++i)
+                        if (May_Have(Text_Layouts[i], colon, words, count))
+                            table_[colon][words][count] |= std::uint64_t{1} << i;
     }
 
     [[nodiscard]] constexpr std::uint64_t Of(const Cut_Text& cut) const
     {
-        return table_[cut.words ? 1 : 0][cut.count];
+        return table_[cut.Has_Time()][cut.words][cut.count];
     }
 
 private:
-    static constexpr bool May_Have(const Text_Layout& layout, std::size_t count, bool words)
+    static constexpr bool May_Have(const Text_Layout& layout, bool colon, bool words, std::size_t count)
     {
-        if (layout.reading != Reading::date && layout.reading != Reading::date_time)
-            return words || count == 1;  // a time has colons, a number a point or an exponent
+        switch (layout.reading) {
+        case Reading::time:
+        case Reading::hours:
+            return colon;
+        case Reading::seconds:
+        case Reading::day_number:
+            return !colon && (words || count == 1);  // words for a point or an exponent
+        case Reading::date_time:
+            if (!colon)
+                return false;
+            break;
+        case Reading::date:
+            break;
+        }
         const bool apart = layout.joint != Joint::together && layout.parts.size() == count;
         const bool together = layout.joint != Joint::apart && count == 1;
         return (apart || together) && words == (layout.parts.find_first_of("NLBw") != std::string_view::npos);
     }
 
-    std::array<std::array<std::uint64_t, Most_Pieces + 2>, 2> table_{};
+    std::array<std::array<std::array<std::uint64_t, Most_Pieces + 2>, 2>, 2> table_{};
 };
 
 constexpr Possible_Layouts Possible;
@@ -459,7 +490,7 @@ bool Read_Without_Layout(std::string_view text, std::int32_t form, double& value
     constexpr std::size_t day_and_month = 4;
     const std::size_t end = text.find_first_of("/-:,\\ ");
     if (end == std::string_view::npos)
-        return Whole_Number_Text(text, value) && value > 0.0;
+        return Is_Day_Number(text, value) && value > 0.0;
     if (end <= day_and_month)
         return false;
     const Date_Parts date = {Read_Number(text.substr(0, 2), false), Read_Number(text.substr(2, 2), false),
@@ -503,24 +534,66 @@ bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::
     return true;
 }
 
-Strict_Readings Read_By_All_Layouts(std::string_view text, std::int32_t form)
+namespace {
+
+/// The layouts of three numbers apart.
+constexpr auto Number_Layouts = [] {
+    std::array<std::size_t, 3> layouts{};
+    std::size_t count = 0;
+    for (std::size_t i = 0; i < std::size(Text_Layouts); ++i)
+        if (Text_Layouts[i].numbers)
+            layouts[count++] = i;
+    return layouts;
+}();
+
+/// All orders of three numbers. Whether a day can be a month as well changes from cell to cell, so nothing
+/// branches on it.
+inline Strict_Readings Read_Numbers_By_All(const Cut_Text& cut)
 {
+    Strict_Readings readings;
+    for (const std::size_t i : Number_Layouts) {
+        const Text_Layout& layout = Text_Layouts[i];
+        const Date_Parts date = Numbers_Of(layout, cut);
+        if (!Are_Short_Enough(layout, cut) || !Is_Year(date.year))
+            continue;
+        const auto good = static_cast<std::uint64_t>(Is_Calendar_Day(date.day, date.month, date.year));
+        const auto early = static_cast<std::uint64_t>(date.year >= 100 && date.year < First_Serial_Year);
+        readings.good |= good << i;
+        readings.early |= (good & early) << i;
+    }
+    if (readings.good != 0) {
+        const Date_Parts date = Numbers_Of(Text_Layouts[std::countr_zero(readings.good)], cut);
+        readings.value = Date_To_Number(date.day, date.month, date.year, 1);
+    }
+    return readings;
+}
+
+}  // namespace
+
+Strict_Readings Read_By_All_Layouts(std::string_view text)
+{
+    constexpr double first_day = Serial_Offset + 1.0;  // of the serials
     text = Trim_Copy(text, Text_Cell_Width);
     if (Says_No_Date(text))
         return {.blank = true};
-    Strict_Readings readings{};
     Cut_Text cut;
     Cut(text, cut);
+    if (cut.Is_Three_Numbers())
+        return Read_Numbers_By_All(cut);
+    Strict_Readings readings;
     for (std::uint64_t left = Possible.Of(cut); left != 0; left &= left - 1) {
-        const int layout = std::countr_zero(left);
+        const Text_Layout& layout = Text_Layouts[std::countr_zero(left)];
         double value;
-        if (!Read_By_Layout(Text_Layouts[layout], cut, form, true, value))
+        if (!Read_By_Layout(layout, cut, 1, true, value))
             continue;
-        const std::uint64_t bit = std::uint64_t{1} << layout;
+        const std::uint64_t bit = left & (~left + 1);
+        if (readings.good == 0)
+            readings.value = value;
         readings.good |= bit;
-        readings.negative |= value < 0.0 ? bit : 0;
+        if (value < first_day && !layout.parts.empty())
+            readings.early |= bit;
     }
-    readings.colon = cut.colon || !cut.time.empty();
+    readings.colon = cut.Has_Time();
     return readings;
 }
 

@@ -23,12 +23,13 @@ constexpr std::size_t No_Layout = 24;
 
 /// What the strict reading says of one text under all layouts at once.
 struct Strict_Readings {
-    std::uint64_t good = 0;      ///< layouts that the text has, a bit each
-    std::uint64_t negative = 0;  ///< those of them whose day number is negative
-    bool colon = false;          ///< there is a time in it
-    bool blank = false;          ///< no text, or one that begins with "*", which has any layout
+    std::uint64_t good = 0;   ///< layouts that the text has, a bit each
+    std::uint64_t early = 0;  ///< those of them by which it is a date in front of 1900
+    double value = 0.0;       ///< by the first of the good ones, in day counts
+    bool colon = false;       ///< there is a time in it
+    bool blank = false;       ///< no text, or one that begins with "*", which has any layout
 };
-[[nodiscard]] Strict_Readings Read_By_All_Layouts(std::string_view text, std::int32_t form);
+[[nodiscard]] Strict_Readings Read_By_All_Layouts(std::string_view text);
 
 /// The month, 1 to 12, of a three-letter name or of a whole one, in any case; 0 for none. A strict name
 /// stands alone; otherwise any text that begins with the three letters, or with the name, will do.

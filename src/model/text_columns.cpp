@@ -12,6 +12,7 @@
 #include <array>
 #include <bit>
 #include <string>
+#include <vector>
 
 namespace ingester {
 
@@ -75,28 +76,67 @@ struct Date_Counts {
     std::array<std::int64_t, No_Layout + 1> hits{};  ///< by layout; blank cells have any
     std::int64_t cells = 0;
     std::int64_t blanks = 0;
-    std::uint64_t negative = 0;  ///< layouts by which a day number was negative
+    std::uint64_t early = 0;  ///< layouts by which there were dates in front of 1900
     bool colon = false;
 
     [[nodiscard]] std::int64_t Hits(std::int32_t format) const { return hits[Date_Layout_Of(format)]; }
 };
 
+/// The cells as they were read while counting, as long as all have the first layout of the first of them.
+/// In most columns that is all cells, and none has to be read again.
+class Remembered_Dates {
+public:
+    explicit Remembered_Dates(const Column& column)
+        : missing_(column.sheet->missing_value), length_(static_cast<std::size_t>(column.length))
+    {
+        values_.reserve(length_);
+    }
+
+    void Take(const Strict_Readings& readings)
+    {
+        if (!whole_)
+            return;
+        const std::uint64_t first = readings.good & (~readings.good + 1);
+        if (!readings.blank && layout_ == 0)
+            layout_ = first;
+        whole_ = readings.blank || (first == layout_ && first != 0);
+        values_.push_back(readings.blank ? missing_ : readings.value);
+    }
+
+    /// All values, if each is what its cell is in the layout of `format`; else null.
+    [[nodiscard]] const double* Values_By(std::int32_t format) const
+    {
+        return whole_ && values_.size() == length_ && (layout_ >> Date_Layout_Of(format) & 1) != 0
+                   ? values_.data()
+                   : nullptr;
+    }
+
+private:
+    double missing_;
+    std::size_t length_;
+    std::uint64_t layout_ = 0;
+    bool whole_ = true;
+    std::vector<double> values_;
+};
+
 constexpr std::int64_t Sample_Size = 100;
 
 /// Blank cells say nothing and widen a sample.
-Date_Counts Count_Readings(const Column& column, bool sample)
+Date_Counts Count_Readings(const Column& column, bool sample, Remembered_Dates* remembered)
 {
     Date_Counts counts;
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
         if (sample && counts.cells - counts.blanks == Sample_Size)
             break;
-        const Strict_Readings readings = Read_By_All_Layouts(cell->Text(), column.date_form);
+        const Strict_Readings readings = Read_By_All_Layouts(cell->Text());
         ++counts.cells;
         counts.blanks += readings.blank ? 1 : 0;
-        counts.negative |= readings.negative;
+        counts.early |= readings.early;
         counts.colon = counts.colon || readings.colon;
         for (std::uint64_t good = readings.good; good != 0; good &= good - 1)
             ++counts.hits[static_cast<std::size_t>(std::countr_zero(good))];
+        if (remembered != nullptr)
+            remembered->Take(readings);
     }
     for (std::int64_t& hits : counts.hits)
         hits += counts.blanks;
@@ -120,11 +160,15 @@ std::int32_t Best_Format(const Date_Counts& counts, const Date_Format_Search& se
         if (Is_Passed_Over(format, search))
             continue;
         const std::int64_t hits = counts.Hits(format);
-        const bool shows_time = counts.colon && format >= date_time_format && best < date_time_format;
+        // The crossed markers of one code would mislead where a plain one takes every cell as well.
+        const bool misleads = format == marked_date_time_format && hits == counts.cells;
+        const bool shows_time =
+            counts.colon && format >= date_time_format && best < date_time_format && !misleads;
         if (hits > most || (hits == most && (format == search.wanted || shows_time)))
             best = format;
         most = std::max(most, hits);
-        if (format >= search.wanted && hits == counts.cells)
+        // Where a time was seen, a code that drops it may not end the search.
+        if (format >= search.wanted && hits == counts.cells && (!counts.colon || format >= date_time_format))
             break;
     }
     return best;
@@ -136,22 +180,26 @@ bool Is_Dated_Sample(std::int64_t hits, std::int64_t texts, bool has_default)
     return hits > 0 && (hits == texts || has_default || (texts >= Sample_Size && 100 * hits > 95 * texts));
 }
 
+/// What the counts say to a search, without the sign.
+std::int32_t Found_Format(const Date_Counts& counts, const Date_Format_Search& search)
+{
+    const std::int32_t best = Best_Format(counts, search);
+    const std::int64_t hits = counts.Hits(best);
+    if (!search.sample)
+        return hits > 2 || hits == counts.cells ? best : search.wanted;
+    return Is_Dated_Sample(hits - counts.blanks, counts.cells - counts.blanks, search.has_default) ? best : 0;
+}
+
 }  // namespace
 
 std::int32_t Find_Date_Format(const Column* column, const Date_Format_Search& search)
 {
     if (column == nullptr || !Is_Text_Like(column->type))
         return 0;
-    const Date_Counts counts = Count_Readings(*column, search.sample);
-    const std::int32_t best = Best_Format(counts, search);
-    const std::int64_t hits = counts.Hits(best);
-    std::int32_t found = best;
-    if (search.sample)
-        found = Is_Dated_Sample(hits - counts.blanks, counts.cells - counts.blanks, search.has_default) ? best
-                                                                                                        : 0;
-    else if (hits <= 2 && hits != counts.cells)
-        found = search.wanted;
-    return (counts.negative >> Date_Layout_Of(found) & 1) != 0 ? -found : found;
+    const Date_Counts counts = Count_Readings(*column, search.sample, nullptr);
+    const std::int32_t format = Found_Format(counts, search);
+    const bool negative = column->date_form == 0 && (counts.early >> Date_Layout_Of(format) & 1) != 0;
+    return negative ? -format : format;
 }
 
 namespace {
@@ -179,25 +227,35 @@ void Warn_Of_Date(const Column& column, long row, std::string_view text)
     Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, std::string(text).c_str());
 }
 
+void Read_Date_Cells(Column& column, std::int32_t format)
+{
+    const double missing = column.sheet->missing_value;
+    long row = 0;
+    for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
+        const std::string_view text = cell->Text();
+        ++row;
+        double value;
+        if (!Read_Date_Cell(text, format, missing, value))
+            Warn_Of_Date(column, row, text);
+        cell->value.number = value;
+    }
+}
+
 }  // namespace
 
 bool Text_Column_To_Date(Column* column, bool time_mode)
 {
     if (column == nullptr || !Is_Text_Like(column->type))
         return false;
-    const std::int32_t usual = time_mode ? time_format : 1;
-    const std::int32_t format =
-        std::abs(Find_Date_Format(column, {.wanted = usual, .has_default = true, .time_mode = time_mode}));
-    const double missing = column->sheet->missing_value;
-    long row = 0;
-    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
-        const std::string_view text = cell->Text();
-        ++row;
-        double value;
-        if (!Read_Date_Cell(text, format, missing, value))
-            Warn_Of_Date(*column, row, text);
-        cell->value.number = value;
-    }
+    Remembered_Dates remembered(*column);
+    const Date_Counts counts = Count_Readings(*column, false, &remembered);
+    const std::int32_t format = Found_Format(
+        counts, {.wanted = time_mode ? time_format : 1, .has_default = true, .time_mode = time_mode});
+    if (const double* value = remembered.Values_By(format); value != nullptr)
+        for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
+            cell->value.number = *value++;
+    else
+        Read_Date_Cells(*column, format);
     Become_Variate(*column);
     column->format = date_format_mark;
     column->date_format = format;

@@ -89,6 +89,7 @@ void Keep_Number_Characters(Label& label)
             exponent = true;
             part_begun = false;
             label.bytes[kept++] = 'e';
+            label.repairs += To_Lower(c) == 'd' ? 1 : 0;
         }
     }
     label.repairs += kept < label.size ? 1 : 0;
@@ -106,7 +107,7 @@ bool Rest_Is_Allowed(std::string_view rest, int mode)
 double Text_To_Number(std::string_view text, double missing, bool& changed)
 {
     const int mode = request.Text_Number_Mode;
-    text = Trim_Copy(text, Text_Cell_Width);
+    text = Trim_Copy(text);
     Label label;
     label.size = text.copy(label.bytes.data(), label.bytes.size());
     if (mode != exact_numbers)
@@ -120,7 +121,8 @@ double Text_To_Number(std::string_view text, double missing, bool& changed)
     if (number.status != Number_Status::good || !Rest_Is_Allowed(rest, mode) || !(number.value >= missing)
         || std::count(repaired.begin(), repaired.end(), '.') > 1 || (mode == one_slip && label.repairs > 1))
         return missing;
-    changed = label.repairs > 0 || !rest.empty() || number.value > Greatest_Number;
+    changed = label.repairs > 0 || !rest.empty() || text.size() > label.bytes.size()
+              || number.value > Greatest_Number;
     return std::min(number.value, Greatest_Number);
 }
 

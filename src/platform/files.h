@@ -127,6 +127,9 @@ private:
     std::size_t used_ = 0;
 };
 
+/// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails.
+[[nodiscard]] bool Copy_File(std::string_view from, std::string_view to);
+
 /// Deletes the named file when it goes out of sight.
 class Scratch_File {
 public:

@@ -275,6 +275,22 @@ bool Output_File::Close()
     return !failed_;
 }
 
+bool Copy_File(std::string_view from, std::string_view to)
+{
+    constexpr std::size_t block_size = std::size_t{1} << 20;
+    Input_File source;
+    Output_File target;
+    if (!source.Open(from) || !target.Open_Scratch(to))
+        return false;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
+    while (const std::size_t got = source.Read(block.get(), block_size))
+        target.Write(block.get(), got);
+    const bool good = target.Close() && source.Close();
+    if (!good)
+        Delete_File(to);
+    return good;
+}
+
 Scratch_File::~Scratch_File()
 {
     Delete_File(name_);

@@ -69,7 +69,7 @@ TEST_F(Pipeline_Test, Converts)
         {Crops, "c.csv", "O.TAB/mv=NA/n", "O.TAB", "1\toats\t2.5\r\n2\trye\tNA\r\n"},
         {Crops, "c.csv", "o.csv/n", "o.csv", "    1,\"oats\" ,   2.5\r\n    2,\"rye\"  ,     *\r\n"},
         {Crops, "c.csv", "o.xyz/z/n", "o.xyz", "    1 oats   2.5\r\n    2 rye      *\r\n"},
-        {Crops, "c.csv/w/tr", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
+        {Crops, "c.csv/w/tr/c=2:3/db", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
         {Crops, "c.csv/c=2", "o.tab", "o.tab", "kind\tyield\r\noats\t2.5\r\nrye\t*\r\n"},
         {Crops, "c.csv/c=2:2", "o.tab", "o.tab", "kind\r\noats\r\nrye\r\n"},
         {Crops, "c.csv/c=3:9", "o.tab/e", "o.tab", "yield\r\n2.5\r\n*\r\n", few_words},
@@ -151,11 +151,15 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv/tr", f + "o.tab"}, 5, "Transposing" + missing},
         {{f + "c.csv", f + "o.tab/@,k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
-        {{"Clipboard.csv", "o.tab"}, 9, "Using the clipboard" + missing},
-        {{f + "c.csv", "clipboard.tab"}, 9, "Using the clipboard" + missing},
+        {{"Clipboard.csv", "o.tab"}, 9, "Read Error: Cannot open clipboard for read.\n"},
+        {{f + "c.csv", "clipboard.tab"},
+         9,
+         "Copy Error: Cannot open clipboard for write.\nCould not put data on the clipboard.\n"},
         {{f + "c.csv", "clipboard.xls"}, 6, "Clipboard format not supported.\n"},
     };
     const std::string before = Files();
+    ::unsetenv("DISPLAY");
+    ::unsetenv("WAYLAND_DISPLAY");
     for (const auto& [records, status, said] : cases) {
         EXPECT_EQ(Call(records), (Host_Answer{status, said + ":\n"})) << testing::PrintToString(records);
         EXPECT_EQ(Files(), before) << testing::PrintToString(records);
@@ -197,6 +201,20 @@ TEST_F(Pipeline_Test, An_Old_Output_Is_Replaced_Whole)
     EXPECT_EQ(::read(pipe, bytes, sizeof bytes), static_cast<::ssize_t>(Crops_Tab.size()));
     EXPECT_TRUE(std::filesystem::is_fifo(Path("pipe.tab"))) << "a file took the place of a pipe";
     ::close(pipe);
+}
+
+TEST_F(Pipeline_Test, A_Pipe_Is_Read_Whole)
+{
+    ASSERT_EQ(::mkfifo(Path("in.csv").c_str(), 0600), 0);
+    const ::pid_t writer = ::fork();
+    if (writer == 0) {
+        const int end = ::open(Path("in.csv").c_str(), O_WRONLY | O_CLOEXEC);
+        ::_exit(::write(end, Crops.data(), Crops.size()) > 0 ? 0 : 1);
+    }
+    EXPECT_EQ(Convert("in.csv", "o.tab"), (Host_Answer{0, ""}));
+    EXPECT_EQ(Get("o.tab"), Crops_Tab);
+    EXPECT_EQ(Files(), "in.csv o.tab");
+    ::waitpid(writer, nullptr, 0);
 }
 
 TEST_F(Pipeline_Test, A_Full_Disk_Leaves_The_Old_Output_And_Nothing_Else)

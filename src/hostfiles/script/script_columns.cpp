@@ -153,13 +153,14 @@ bool Write_Vector_Script(Sheet& sheet, Script_Buffer& script)
         written = Write_Column_Script(*column, script) && written;
         Show_Progress("Writing", column->index, sheet.column_count);
     }
-    Write_Restrictions(sheet, script);
-    return written;
+    return Write_Restrictions(sheet, script) && written;
 }
 
-void Write_Restrictions(Sheet& sheet, Script_Buffer& script)
+bool Write_Restrictions(Sheet& sheet, Script_Buffer& script)
 {
-    const bool restricted = sheet.restriction_active != 0 && sheet.row_count > 0 && Need_Rows(&sheet);
+    const bool restricted = sheet.restriction_active != 0 && sheet.row_count > 0;
+    if (restricted && !Need_Rows(&sheet))
+        return false;
     if (restricted) {
         Write_Delete("_rest_", script);
         Write_Statement("READ [print=*;setnvalues=y] _rest_\n", script);
@@ -170,7 +171,7 @@ void Write_Restrictions(Sheet& sheet, Script_Buffer& script)
     // Without a restriction too: it ends one that the host may still have.
     Write_Names("RESTRICT ", Columns_Behind_Row{sheet}, Name_Of, script);
     Write_Statement(restricted ? "; _rest_\n" : "\n", script);
-    sheet.modified = 0;
+    return true;
 }
 
 bool Write_Scalar_Script(Sheet& sheet, Script_Buffer& script)

@@ -32,7 +32,7 @@ void Write_Factor_Declaration(Column& column, std::int32_t length, Script_Buffer
 [[nodiscard]] std::string Factor_Name(const Column& column);
 
 /// Restricts the columns to the included rows, or frees them from an older restriction.
-void Write_Restrictions(Sheet& sheet, Script_Buffer& script);
+[[nodiscard]] bool Write_Restrictions(Sheet& sheet, Script_Buffer& script);
 
 /// The first column of `type`, or null.
 Column* First_Of_Type(const Sheet& sheet, std::int32_t type);

@@ -3,6 +3,7 @@
 #include "model/calendar.h"
 #include "model/sheet.h"
 #include "support/number_text.h"
+#include "support/text.h"
 
 #include <algorithm>
 #include <cmath>
@@ -23,7 +24,7 @@ void Script_Buffer::Empty_For(std::size_t count)
 }
 
 /// What must come before a piece. A line that nothing stands on is not broken: the piece is longer
-/// than any line. Data may keep a single character and the end of data on the line they belong to.
+/// than any line. A single mark and the end of data stay on the line they belong to; a digit is data.
 std::string_view Script_Buffer::Break_Before(std::string_view piece, bool keep_whole) const
 {
     const std::size_t first_line = std::min(piece.find('\n'), piece.size());
@@ -32,7 +33,8 @@ std::string_view Script_Buffer::Break_Before(std::string_view piece, bool keep_w
         return {};
     if (keep_whole)
         return "\\\n";
-    return piece.size() == 1 || piece.front() == ':' ? "" : "\n";
+    const bool mark = piece.size() == 1 && !Is_Digit(piece.front());
+    return mark || piece.front() == ':' ? "" : "\n";
 }
 
 void Script_Buffer::Take(const char* end, bool keep_whole)

@@ -1,10 +1,13 @@
 #include "hostfiles/script/script.h"
 
 #include "hostfiles/script/script_parts.h"
+#include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "model/names.h"
 #include "support/text.h"
 
+#include <algorithm>
+#include <string>
 #include <vector>
 
 namespace ingester {
@@ -108,10 +111,16 @@ void Write_Pointer(const Sheet& sheet, Script_Buffer& script)
 {
     if (request.Pointer_Name.empty())
         return;
-    Write_Delete(request.Pointer_Name, script);
-    Write_Statement(Format_Text("POINTER %s", request.Pointer_Name.c_str()), script);
+    const std::string pointer = Make_Valid_Name(request.Pointer_Name);
+    const std::vector<std::string_view> names = Structure_Names(sheet);
+    if (std::ranges::find(names, pointer) != names.end()) {
+        Report_Message_Text("Warning: pointer %s not written, as data have that name.\n", pointer.c_str());
+        return;
+    }
+    Write_Delete(pointer, script);
+    Write_Statement(Format_Text("POINTER %s", pointer.c_str()), script);
     Write_Names(
-        "; !p(", Structure_Names(sheet), [](std::string_view name) { return name; }, script);
+        "; !p(", names, [](std::string_view name) { return name; }, script);
     Write_Statement(")\n\n", script);
 }
 
@@ -144,7 +153,10 @@ bool Write_Host_Script(Sheet* sheet, const char* file_name)
     const bool written = write(*sheet, script);
     Write_Pointer(*sheet, script);
     Write_Script_Text(Last_Statement(file_name), false, true, script);
-    return file.Close() && written;
+    const bool whole = file.Close() && written;
+    if (whole && sheet->type == vector_sheet)
+        sheet->modified = 0;
+    return whole;
 }
 
 }  // namespace ingester

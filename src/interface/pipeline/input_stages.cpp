@@ -1,4 +1,5 @@
 // Stages that take the two strings apart and find out what they name.
+#include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/paths.h"
 #include "interface/pipeline/stages.h"
@@ -17,7 +18,7 @@ namespace ingester {
 
 Request_Run::~Request_Run()
 {
-    if (downloaded)
+    if (downloaded || clipboard_input || kept_stream)
         Delete_File(infile);
     if (map_downloaded)
         Delete_File(request.Qtl_Map_File);
@@ -95,47 +96,41 @@ Request_Status Name_Var_File(Request_Run& run)
     return Done;
 }
 
-namespace {
-
-/// Names that stand for the clipboard, which must not become files on the way.
-constexpr std::string_view Clipboard_Inputs[] = {"clipboard", "clipboard.tab", "clipboard.csv",
-                                                 "clipboard.rda"};
-constexpr std::string_view Clipboard_Output_Start = "clipboard.";
-constexpr std::string_view Clipboard_Output_Extensions[] = {".csv", ".tab", ".txt", ".gen", ".rda"};
-
-Request_Status Stop_At_Clipboard()
+/// The clipboard's text becomes a file of its own, with the extension that was asked for.
+Request_Status Take_Clipboard_Input(Request_Run& run)
 {
-    return Stop(Request_Status::clipboard_failed, "Using the clipboard is not available in this version.\n");
-}
-
-}  // namespace
-
-Request_Status Refuse_Clipboard_Input(Request_Run& run)
-{
-    for (const std::string_view name : Clipboard_Inputs)
-        if (Equal_Ignoring_Case(run.infile, name))
-            return Stop_At_Clipboard();
-    return Done;
-}
-
-Request_Status Refuse_Clipboard_Output(Request_Run& run)
-{
-    if (!Starts_Ignoring_Case(run.outfile, Clipboard_Output_Start))
+    if (!Is_Clipboard_Input(run.infile))
         return Done;
-    for (const std::string_view extension : Clipboard_Output_Extensions)
-        if (Ends_Ignoring_Case(run.outfile, extension))
-            return Stop_At_Clipboard();
-    return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
+    const std::string extension = run.infile.substr(Extension_Start(run.infile));
+    run.infile = Get_Temp_Folder().append("$Clip$").append(extension.empty() ? ".txt" : extension);
+    run.clipboard_input = true;
+    return Read_Clipboard_To_File(run.infile) ? Done : Request_Status::clipboard_failed;
+}
+
+/// A pipe or a device can be read once; what comes out of it is kept until the reader has it.
+Request_Status Keep_Stream(Request_Run& run)
+{
+    if (!Is_Special_File(run.infile))
+        return Done;
+    const std::string copy = Get_Temp_Folder()
+                                 .append("IN")
+                                 .append(request.Scratch_Stem)
+                                 .append(run.infile.substr(Extension_Start(run.infile)));
+    if (!Copy_File(run.infile, copy))
+        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
+    run.source_name = run.infile;
+    run.infile = copy;
+    run.kept_stream = true;
+    return Done;
 }
 
 Request_Status Find_Source_Base_Name(Request_Run& run)
 {
-    const std::string_view source = run.downloaded ? request.Source_Url.view() : std::string_view(run.infile);
-    std::string_view name = File_Part_Of(source);
+    std::string_view name = File_Part_Of(run.Source());
     name = name.substr(0, Extension_Start(name));
     if (name.empty() || name == "$Std_In$")
         name = "std_in";
-    else if (Equal_Ignoring_Case(name, "clipboard"))
+    else if (run.clipboard_input)
         name = "clipbrd";
     request.Source_Base_Name = name;
     return Done;
@@ -213,8 +208,25 @@ Request_Status Read_Merge_Keys(Request_Run& run)
     return Done;
 }
 
+namespace {
+
+/// Programs that take a clipboard's text understand these.
+Request_Status Take_Clipboard_Output(Request_Run& run)
+{
+    if (!Ends_With_One_Of(run.outfile, ".csv .tab .txt .gen .rda"))
+        return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
+    run.clipboard_output = true;
+    request.R_Text_Output = true;
+    return Done;
+}
+
+}  // namespace
+
 Request_Status Choose_Output(Request_Run& run)
 {
+    if (Is_Clipboard_Output(run.outfile))
+        if (const Request_Status status = Take_Clipboard_Output(run); status != Done)
+            return status;
     run.output = &Output_Driver_Of(run.outfile);
     if (run.output->code == r_data_file && request.R_Text_Output)
         run.output = &Output_Driver_Of(r_text_file);
@@ -226,6 +238,8 @@ Request_Status Choose_Output(Request_Run& run)
     if (run.output->write == nullptr)
         return Stop(Request_Status::output_failed, "Writing %s is not available in this version.\n",
                     std::string(run.output->name).c_str());
+    if (run.clipboard_output)
+        run.outfile.resize(Extension_Start(run.outfile));
     return Done;
 }
 
@@ -288,6 +302,9 @@ Request_Status Switch_Off_For_List(Request_Run&)
     request.Source_Key_Given = false;
     request.Fixed_Number_Text = false;
     request.Output_Matrix = false;
+    request.Print_Summary = false;
+    request.First_Column = 0;
+    request.Last_Column = Every_Column;
     Get_Settings().delete_empty_rows = 0;
     return Done;
 }

@@ -1,4 +1,5 @@
 // Stages that write the Sheet and put the new file in the place of an old one.
+#include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
@@ -11,6 +12,10 @@ namespace ingester {
 /// An existing output is written beside itself, so that it stays whole until the new one is.
 Request_Status Name_Temporary_Output(Request_Run& run)
 {
+    if (run.clipboard_output) {
+        run.temp_output = Get_Temp_Folder().append(run.outfile).append(".$$$");
+        return Done;
+    }
     run.output_was_there = File_Exists(run.outfile);
     // A device or a pipe takes the text itself; a rename would put a file in its place.
     request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there && !Is_Special_File(run.outfile);
@@ -18,6 +23,8 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     if (!request.Write_Via_Temp || request.Add_To_Output)
         return Done;
     run.temp_output = With_Extension(run.outfile, ".$$$");
+    if (run.temp_output == run.outfile)
+        run.temp_output += ".$$$";
     if (Same_File(run.temp_output, run.infile))
         return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
     return Done;
@@ -57,6 +64,17 @@ Request_Status Write_Column_List(Request_Run& run)
 {
     if (request.Write_Var_List)
         Write_Var_File(*Current_Sheet, With_Extension(run.outfile, ".$V$"));
+    return Done;
+}
+
+Request_Status Fill_Clipboard(Request_Run& run)
+{
+    if (!run.clipboard_output)
+        return Done;
+    run.finished = Put_File_On_Clipboard(run.temp_output, true);
+    if (!run.finished)
+        return Stop(Request_Status::clipboard_failed, "Could not put data on the clipboard.\n");
+    run.writing = false;
     return Done;
 }
 

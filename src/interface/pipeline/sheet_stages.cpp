@@ -31,7 +31,7 @@ void Tell_No_Import(const Request_Run& run)
 
 Request_Status Read_Input(Request_Run& run)
 {
-    if (!Read_Data_File(run.infile, run.input_code, run.infile)) {
+    if (!Read_Data_File(run.infile, run.input_code, run.Source())) {
         Tell_No_Import(run);
         return Request_Status::not_imported;
     }
@@ -94,7 +94,7 @@ Request_Status Drop_Empty_Columns(Request_Run& run)
 
 Request_Status Note_Source(Request_Run& run)
 {
-    Current_Sheet->source_file = run.downloaded ? request.Source_Url.view() : std::string_view(run.infile);
+    Current_Sheet->source_file = run.Source();
     return Done;
 }
 

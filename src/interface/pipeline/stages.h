@@ -4,6 +4,7 @@
 
 #include "interface/format_drivers.h"
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
 #include "interface/status.h"
 #include "platform/folders.h"
 
@@ -18,6 +19,10 @@ struct Request_Run {
     std::string outfile;
     std::string temp_output;  ///< where the writer writes
     bool downloaded = false;  ///< `infile` is the copy of a fetched input
+    bool clipboard_input = false;
+    bool kept_stream = false;  ///< `infile` is the copy of what a pipe gave
+    std::string source_name;   ///< the pipe's own name
+    bool clipboard_output = false;
     bool map_downloaded = false;
     bool genotype = false;      ///< the input goes the road of genotype files
     bool host_scratch = false;  ///< the output is a scratch file of the host's own
@@ -27,6 +32,14 @@ struct Request_Run {
     std::int32_t input_code = 0;
     std::int32_t output_code = 0;
     const Format_Driver* output = nullptr;
+
+    /// The name that the user knows the input by.
+    [[nodiscard]] std::string_view Source() const
+    {
+        if (downloaded)
+            return request.Source_Url;
+        return kept_stream ? source_name : infile;
+    }
 
     Request_Run() = default;
     Request_Run(const Request_Run&) = delete;
@@ -58,12 +71,12 @@ Request_Status Reflow_Lines(Request_Run& run);
 Request_Status Cut_Input_Options(Request_Run& run);
 Request_Status Fetch_Input(Request_Run& run);
 Request_Status Name_Var_File(Request_Run& run);
-Request_Status Refuse_Clipboard_Input(Request_Run& run);
+Request_Status Take_Clipboard_Input(Request_Run& run);
+Request_Status Keep_Stream(Request_Run& run);
 Request_Status Find_Source_Base_Name(Request_Run& run);
 Request_Status Detect_Input(Request_Run& run);
 Request_Status Cut_Output_Options(Request_Run& run);
 Request_Status Read_Merge_Keys(Request_Run& run);
-Request_Status Refuse_Clipboard_Output(Request_Run& run);
 Request_Status Choose_Output(Request_Run& run);
 Request_Status Refuse_Same_File(Request_Run& run);
 Request_Status Keep_Names_As_They_Stand(Request_Run& run);
@@ -93,6 +106,7 @@ Request_Status Write_Output(Request_Run& run);
 /// From here on the file that the writer writes is ours, and goes when the request fails.
 void Begin_Writing(Request_Run& run);
 Request_Status Write_Column_List(Request_Run& run);
+Request_Status Fill_Clipboard(Request_Run& run);
 Request_Status Replace_Old_Output(Request_Run& run);
 
 }  // namespace ingester

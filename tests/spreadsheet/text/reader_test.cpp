@@ -82,6 +82,7 @@ TEST_F(Text_Reader, Numbers_Texts_And_Missing_Cells)
         {"NA", "a,b\nNA,na\n1,x\n\"Na\",*\n", "a V*|1|*; b T|x|", missing("na")},
         {"-9", "a,b\n-9,x\n*,\"*\"\n-9.0,-9\n", "a V*|*|-9; b Tx|*|", missing("-9")},
         {"marks", "x!,y$,z#,d:D,t:t!\n1,2,three,4,5\n", "x F1; y T2; z V*; d V4; t F1"},
+        {"dates", "d:d,t:T,n:D\n1900-03-01,10:30,5\n*,12:00,6\n", "d V109573|*; t V0.4375|0.5; n V5|6"},
         {"a marked number", "z#,y\n\" 12\",1\n3x,1\n*,1\n", "z V12|*|*; y V1|1|1"},
         {"wanted types", "x$,y#\n1,a\n", "x V1; y Ta", types},
         {"90 characters", numbered(90), "a T90 characters"},

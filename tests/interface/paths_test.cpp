@@ -1,0 +1,153 @@
+// Names that stand for other names: tokens, variables, URLs; and what happens when the processor refuses.
+#include "interface/paths.h"
+
+#include "host_fixture.h"
+#include "support/progress.h"
+
+#include <cfenv>
+#include <csignal>
+
+#include <sys/wait.h>
+
+namespace ingester {
+namespace {
+
+class Paths_Test : public Host_Test {
+protected:
+    void SetUp() override
+    {
+        Host_Test::SetUp();
+        Put("settings.ini", "; of the host\n[options]\nAddInFolder = /add/ins/\n[Host]\nVersion=19.2\n"
+                            "[Spreadsheet]\nAllow HTML Formatting=7\n");
+        ::setenv("TABULON_SETTINGS", Path("settings.ini").c_str(), 1);
+        ::setenv("INGESTER_PLACE", "/some/place/", 1);
+        Start_Request("t");
+    }
+    void TearDown() override
+    {
+        ::unsetenv("TABULON_SETTINGS");
+        Host_Test::TearDown();
+    }
+
+    static std::string Expanded(std::string name)
+    {
+        Expand_Path_Tokens(name, "\\t\\");
+        return name;
+    }
+
+    /// The status and messages of a process whose reader does `fault` in the middle of its work; 1 when the
+    /// arithmetic isn't as the host had it.
+    std::pair<int, std::string> After(void (*fault)()) const
+    {
+        const ::pid_t child = ::fork();
+        if (child == 0) {
+            for (const int signal : {SIGFPE, SIGSEGV})
+                std::signal(signal, [](int number) { ::_exit(100 + number); });  // the host's own handler
+            static void (*at_work)();
+            at_work = fault;
+            progress_hook = [](const char*, std::int64_t, std::int64_t) { at_work(); };
+            Put(Stem() + ".inp", Pass_Bytes(2, {Request_Name("c.csv"), Request_Name("o.tab")}));
+            std::feclearexcept(FE_ALL_EXCEPT);
+            INGESTER("", "", 0, 0);
+            ::_exit(std::fetestexcept(FE_ALL_EXCEPT) == 0 ? 0 : 1);
+        }
+        int how = 0;
+        ::waitpid(child, &how, 0);
+        const std::string left = "IG" + std::to_string(child) + ".ERR";
+        return {WIFEXITED(how) ? WEXITSTATUS(how) : -1, Get(left)};
+    }
+};
+
+TEST_F(Paths_Test, Tokens_And_Variables_Become_Folders)
+{
+    const std::string install = Expanded("%TABDIR%");
+    EXPECT_TRUE(install.ends_with("\\") && !install.ends_with("tests\\")) << install;
+    const std::pair<std::string, std::string> cases[] = {
+        {"C:\\x\\%TEMP%\\y.csv", "\\t\\y.csv"},
+        {"%tmp%y.csv", "\\t\\y.csv"},
+        {"%DATA%a.csv", install + "Data\\a.csv"},
+        {"x%SystemAddins%%TMP%", "\\t\\"},
+        {"%USERADDINS%b", "\\add\\ins\\b"},
+        {"%TABDIR64%b", "%TABDIR64%b"},
+        {"%INGESTER_PLACE%\\c\\d", "\\some\\place\\c\\d"},
+        {"%INGESTER_NOWHERE%\\c", "%INGESTER_NOWHERE%\\c"},
+        {"x%INGESTER_PLACE%\\c", "x%INGESTER_PLACE%\\c"},
+        {"%\\c", "%\\c"},
+        {"http:\\\\h\\%TEMP%", "http:\\\\h\\%TEMP%"},
+        {"%TEMP%" + std::string(1000, 'x'), "\\t\\" + std::string(277, 'x')},
+        {std::string(600, 'x'), std::string(600, 'x')},
+        {"%TEMP%" + std::string(1200, 'x'), "%TEMP%" + std::string(1200, 'x')},
+    };
+    for (const auto& [name, expanded] : cases)
+        EXPECT_EQ(Expanded(name), expanded);
+}
+
+TEST_F(Paths_Test, The_Hosts_Settings_Tell_Its_Version_And_Its_Scratch_Files)
+{
+    EXPECT_EQ(Read_Host_Setting("spreadsheet", "allow html formatting", 0, 1, 0), 0) << "out of its range";
+    EXPECT_EQ(Read_Host_Setting("Spreadsheet", "Allow HTML Formatting", 0, 9, 0), 7);
+    EXPECT_EQ(request.Return_Delete_Marker.view(), "T192D");
+    EXPECT_TRUE(Is_Host_Scratch_File(Request_Name("t192d7.tbk")));
+    for (const char* const other : {"T192D7.csv", "xT192D7.tss", "T181D7.tss"})
+        EXPECT_FALSE(Is_Host_Scratch_File(Request_Name(other))) << other;
+    EXPECT_FALSE(Is_Host_Scratch_File("T192D7.tss"));
+    ::setenv("TABULON_SETTINGS", Path("none.ini").c_str(), 1);
+    EXPECT_EQ(Host_Delete_Marker(), "T181D");
+}
+
+TEST_F(Paths_Test, Urls_Become_Scratch_Files_That_Go_Again)
+{
+    Put("c.csv", "plot,yield\n1,2.5\n");
+    const std::string url = "file:\\\\" + Request_Name("c.csv");
+    EXPECT_EQ(Call({url, Request_Name("o.tab")}), (Host_Answer{0, ""}));
+    EXPECT_EQ(Get("o.tab"), "plot\tyield\r\n1\t2.5\r\n");
+    EXPECT_EQ(Files(), "c.csv o.tab settings.ini");
+    const std::string none = "file:\\\\" + Request_Name("none.csv");
+    std::string told = none;
+    EXPECT_EQ(Call({none, Request_Name("p.tab")}),
+              (Host_Answer{19, "Could not download input URL:\n" + told + "\n:\n"}));
+    EXPECT_EQ(Files(), "c.csv o.tab settings.ini");
+}
+
+TEST_F(Paths_Test, Faults_Are_Told_And_Left_To_The_Host)
+{
+#ifdef __SANITIZE_ADDRESS__
+    GTEST_SKIP() << "the sanitizer takes such signals itself";
+#else
+    Put("c.csv", "plot,yield\n1,2.5\n");
+    const auto memory = After([] {
+        volatile std::uintptr_t nowhere = 8;
+        *reinterpret_cast<volatile int*>(nowhere) = 1;
+    });
+    EXPECT_EQ(memory, std::pair(100 + SIGSEGV, std::string("Error: A Memory fault has occurred.\n:\n")));
+    const auto sent = After([] { ::raise(SIGSEGV); });
+    EXPECT_EQ(sent, memory);
+#ifdef __x86_64__
+    const auto integer = After([] {
+        volatile int zero = 0;
+        volatile int seven = 7;
+        zero = seven / zero;
+    });
+    EXPECT_EQ(integer,
+              std::pair(100 + SIGFPE, std::string("Error: An Integer Division by Zero has occurred.\n:\n")));
+    const auto division = After([] {
+        feenableexcept(FE_DIVBYZERO);
+        volatile double zero = 0.0;
+        zero = 1.0 / zero;
+    });
+    EXPECT_EQ(
+        division,
+        std::pair(100 + SIGFPE, std::string("Error: A Floating point Division by Zero has occurred.\n:\n")));
+    const auto invalid = After([] {
+        feenableexcept(FE_INVALID);
+        volatile double zero = 0.0;
+        zero = zero / zero;
+    });
+    EXPECT_EQ(invalid,
+              std::pair(0, std::string("Warning: An Illegal Floating point calculation has occurred.\n:\n")));
+#endif
+#endif
+}
+
+}  // namespace
+}  // namespace ingester

@@ -1,0 +1,351 @@
+#include "model/calendar.h"
+#include "model/date_format.h"
+#include "model/date_text.h"
+#include "model/number_format.h"
+#include "model/text_columns.h"
+#include "support/cell_lists.h"
+
+#include <bit>
+#include <cmath>
+#include <random>
+
+namespace ingester {
+namespace {
+
+constexpr double gone = Missing_Value;
+
+using Dates = Request_Test;
+
+std::string Shown(double value, std::int32_t form, std::int32_t format)
+{
+    char text[Number_Text_Room];
+    return {text, Format_Date_Time(text, value, form, format)};
+}
+
+/// What a text reads as, to the second; "no" for no date.
+std::string Read(std::string_view text, std::int32_t format, bool strict)
+{
+    double value;
+    const bool good = Text_To_Date(text, value, 1, format, gone, strict);
+    EXPECT_TRUE(good || value == gone) << text;
+    return good ? Shown(value, 1, 34) : "no";
+}
+
+TEST_F(Dates, Days_Have_Numbers_In_Both_Forms)
+{
+    struct Case {
+        std::int32_t day, month, year;
+        double serial, count;
+    };
+    const Case cases[] = {
+        {1, 1, 1900, 1, 109514},   {28, 2, 1900, 59, 109572}, {29, 2, 1900, 60, 109573},
+        {1, 3, 1900, 61, 109573},  {31, 12, 1899, 0, 109513}, {31, 12, 9999, 2958465, 3067977},
+        {1, 3, 1600, 1, 1},        {29, 2, 1600, 0, 0},       {1, 2, 3, 1128, 110640},
+        {1, 1, 99, 36161, 145673}, {1, 3, 1599, 0, 0},        {29, 2, 2100, 73110, 182622},
+        {29, 2, 2001, gone, gone}, {31, 4, 2000, gone, gone}, {0, 1, 2000, gone, gone},
+        {1, 13, 2000, gone, gone}, {1, 0, 2000, gone, gone},
+    };
+    for (const Case& day : cases) {
+        EXPECT_EQ(Date_To_Number(day.day, day.month, day.year), day.serial) << day.count;
+        EXPECT_EQ(Date_To_Number(day.day, day.month, day.year, 1), day.count) << day.serial;
+    }
+    EXPECT_LT(std::fabs(Today_Number(1) - Today_Number(0) - Serial_Offset), 1e-3);
+}
+
+TEST_F(Dates, Every_Day_Goes_Forth_And_Back)
+{
+    for (const std::int32_t form : {0, 1}) {
+        Calendar_Date before = Number_To_Date(0, form);
+        for (std::int32_t number = 0; number < Max_Date(form); ++number) {
+            const auto [day, month, year] = Number_To_Date(number, form);
+            const double back =
+                Date_To_Number(static_cast<std::int32_t>(day), static_cast<std::int32_t>(month),
+                               static_cast<std::int32_t>(year), form);
+            const bool follows = number == 0 || (day == before.day + 1 && month == before.month)
+                                 || (day == 1 && (month == before.month + 1 || (month == 1 && day == 1)));
+            ASSERT_TRUE(back == number && follows) << number << " in form " << form;
+            before = {day, month, year};
+            double moved = number + 0.25;
+            if (form == 0 && number != 60) {
+                Serial_To_Day_Count(moved, gone);
+                Day_Count_To_Serial(moved, gone);
+                ASSERT_EQ(moved, number + 0.25);
+            }
+        }
+    }
+    double early = -0.5;
+    Serial_To_Day_Count(early, gone);
+    double late = Serial_Offset - 1;
+    Day_Count_To_Serial(late, gone);
+    EXPECT_TRUE(early == gone && late == gone);
+}
+
+TEST_F(Dates, Print_By_Code)
+{
+    const double in_1999 = Date_To_Number(5, 2, 1999, 1) + 14.0 / 24 + 5.0 / 1440 + 7.25 / 86400;
+    const double in_2004 = Date_To_Number(15, 12, 2004, 1) + 9.0 / 24;
+    const std::tuple<std::int32_t, const char*, const char*> cases[] = {
+        {1, "05/02/99", "15/12/2004"},
+        {2, "05/02/1999", "15/12/2004"},
+        {3, "5/2/99", "15/12/2004"},
+        {4, "5/2/1999", "15/12/2004"},
+        {5, "050299", "15122004"},
+        {6, "05021999", "15122004"},
+        {7, "05Feb99", "15Dec2004"},
+        {8, "05Feb1999", "15Dec2004"},
+        {9, "05-Feb-99", "15-Dec-2004"},
+        {10, "05-Feb-1999", "15-Dec-2004"},
+        {11, "5Feb99", "15Dec2004"},
+        {12, "5Feb1999", "15Dec2004"},
+        {13, "5-Feb-99", "15-Dec-2004"},
+        {14, "5-Feb-1999", "15-Dec-2004"},
+        {15, "5-February-99", "15-December-2004"},
+        {16, "5-February-1999", "15-December-2004"},
+        {17, "990205", "20041215"},
+        {18, "19990205", "20041215"},
+        {19, "99/02/05", "2004/12/15"},
+        {20, "1999/02/05", "2004/12/15"},
+        {21, "020599", "12152004"},
+        {22, "02051999", "12152004"},
+        {23, "02/05/99", "12/15/2004"},
+        {24, "02/05/1999", "12/15/2004"},
+        {25, "050299", "15122004"},
+        {27, "1999-02-05", "2004-12-15"},
+        {33, "05/02/99 14:05:07.25", "15/12/2004 09:00:00.00"},
+        {34, "1999-02-05 14:05:07", "2004-12-15 09:00:00"},
+        {35, "5-Feb-1999 2:05:07 am", "15-December-2004 9:00:00 pm"},
+        {36, "14:05:07", " 9:00:00"},
+        {37, " 2:05:07 pm", " 9:00:00 am"},
+        {38, "3497006:05:07", "3548361:00:00"},
+        {39, "12589221907.250", "12774099600.000"},
+        {40, "145709", "147848"},
+        {41, "050299", "15122004"},
+        {-7, "050299", "15122004"},
+    };
+    for (const auto& [format, first, second] : cases) {
+        EXPECT_EQ(Shown(in_1999, 1, format), first) << format;
+        EXPECT_EQ(Shown(in_2004, 1, format), second) << format;
+    }
+    EXPECT_EQ(Shown(60, 0, 2) + Shown(0.999999999, 0, 34), "29/02/19001900-01-01 00:00:00");
+    EXPECT_EQ(Shown(-0.1, 1, 40) + Shown(std::nan(""), 0, 2) + Shown(1e300, 0, 2), "**1e+300");
+    for (int second = 0; second < 86400; ++second)
+        ASSERT_EQ(Shown(second / 86400.0, 1, 36),
+                  Format_Text("%2d:%02d:%02d", second / 3600, second / 60 % 60, second % 60));
+}
+
+TEST_F(Dates, Cells_Print_In_Their_Columns_Form)
+{
+    Sheet* const sheet = New_Sheet_With_Rows(2);
+    Column* const column = Add_Cells(sheet, variate_column, "x", {"61", "*"});
+    column->format = date_format_mark;
+    column->date_format = 27;
+    char text[Number_Text_Room];
+    EXPECT_EQ(std::string(text, Format_Cell_Number(text, *column, 61)), "1900-03-01");
+    EXPECT_EQ(std::string(text, Format_Cell_Number(text, *column, gone)), "*");
+    Compute_Column_Width(column);
+    EXPECT_EQ(column->width, 11);
+    request.Current_Date_Form = 1;
+    EXPECT_EQ(std::string(text, Format_Number(text, 109573, 5, -1, gone)), "01/03/00");
+    EXPECT_TRUE(Set_Cell_From_Text(column, 1, "1900-03-02") && Set_Cell_From_Text(column, 0, "63"));
+    EXPECT_EQ(Numbers_Of(*column), (std::vector<double>{63, 62}));
+}
+
+TEST_F(Dates, What_Is_Printed_Reads_Back)
+{
+    std::mt19937_64 random(7);
+    for (std::int32_t format = 1; format <= 40; ++format) {
+        const bool no_form_of_its_own = format == 25 || format == 26 || (format > 27 && format < 33);
+        if (no_form_of_its_own || format == 35 || format == 40)
+            continue;
+        for (int i = 0; i < 2000; ++i) {
+            double value = static_cast<double>(1 + random() % 3067976);
+            if (format == 36 || format == 37)
+                value = 0.0;
+            if (format >= 33)
+                value += static_cast<double>(random() % (format == 37 ? 43200 : 86400))
+                         / 86400;  // 37's noon is am
+            const std::string text = Shown(value, 1, format);
+            double back;
+            ASSERT_TRUE(Text_To_Date(text, back, 1, format, gone, true)) << text << " by " << format;
+            ASSERT_NEAR(back, value, 1e-7) << text << " by " << format;
+        }
+    }
+}
+
+TEST_F(Dates, Texts_Read_By_Code)
+{
+    struct Case {
+        const char* text;
+        std::int32_t format;
+        const char* strictly;
+        const char* loosely = nullptr;  // where it differs
+    };
+    const Case cases[] = {
+        {"01/02/03", 1, "1903-02-01 00:00:00"},
+        {" 1 3-1600 ", 1, "1600-03-01 00:00:00"},
+        {"1/2/1599", 2, "no"},
+        {"1/2/100", 2, "no"},
+        {"1/2/10000", 2, "no"},
+        {"31/04/2000", 2, "no"},
+        {"29/2/2000", 2, "2000-02-29 00:00:00"},
+        {"001/2/2000", 2, "no", "2000-02-01 00:00:00"},
+        {"1st/2/2000AD", 2, "no", "2000-02-01 00:00:00"},
+        {"1//2/2000", 2, "no"},
+        {"1/2/2000/3", 2, "no", "2000-02-01 00:00:00"},
+        {"+1/2/2000", 2, "no"},
+        {"1/2/", 2, "no"},
+        {"//", 2, "no"},
+        {"010203 or so", 5, "no", "1903-02-01 00:00:00"},
+        {"010203,4", 1, "no", "1903-02-01 00:00:00"},
+        {"109573.5", 2, "no", "1900-03-01 12:00:00"},
+        {"0", 2, "no"},
+        {"01022003", 5, "2003-02-01 00:00:00"},
+        {"0102003", 6, "no", "1903-02-01 00:00:00"},
+        {"20030201", 17, "2003-02-01 00:00:00"},
+        {"030201", 17, "1903-02-01 00:00:00"},
+        {"1FEB2003", 11, "2003-02-01 00:00:00"},
+        {"1Febr2003", 11, "no"},
+        {"1-Febr-2003", 13, "no", "2003-02-01 00:00:00"},
+        {"1-february-2003", 15, "2003-02-01 00:00:00"},
+        {"1-feb-2003", 15, "no"},
+        {"2003-2-1", 27, "2003-02-01 00:00:00"},
+        {"Feb-01-2003", 25, "2003-02-01 00:00:00"},
+        {"Feb012003", 26, "2003-02-01 00:00:00"},
+        {"Monday 1 February 2003", 28, "2003-02-01 00:00:00"},
+        {"Noday 1 2 2003", 28, "no"},
+        {"Monday", 29, "1900-01-02 00:00:00"},
+        {"Feb03", 30, "1903-02-01 00:00:00"},
+        {"2003", 31, "2003-01-01 00:00:00"},
+        {"1/2/2003 2:05", 2, "2003-02-01 02:05:00"},
+        {"1/2/2003 2:05 pm", 2, "no", "2003-02-01 14:05:00"},
+        {"1/2/2003 12:05:30 AM", 2, "no", "2003-02-01 00:05:30"},
+        {"1/2/2003 24:00:00", 2, "2003-02-02 00:00:00"},
+        {"1/2/2003 25:00", 2, "no"},
+        {"1/2/2003 2:61", 2, "no"},
+        {"1/2/2003 2:05:60.5", 2, "no"},
+        {"1/2/2003 2:05:", 2, "no"},
+        {"1/2/2003 2:05h", 2, "no", "2003-02-01 02:05:00"},
+        {"1/2/2003", 33, "no", "2003-02-01 00:00:00"},
+        {"1-Feb-2003 2:05:06 pm", 35, "2003-02-01 14:05:06"},
+        {"12:30", 36, "1600-02-29 12:30:00"},
+        {"12:30 am", 36, "no", "1600-02-29 00:30:00"},
+        {"12:30am", 37, "1600-02-29 00:30:00"},
+        {"25:00:00", 36, "no"},
+        {"49:00:00", 38, "1600-03-02 01:00:00"},
+        {"1e3x", 39, "no"},
+        {"1e999", 40, "no"},
+        {"1/2/2003", 41, "no"},
+        {"1/2/2003", 0, "no"},
+        {"1/2/2003 :", 1, "no"},
+        {":", 36, "no"},
+    };
+    for (const Case& date : cases) {
+        EXPECT_EQ(Read(date.text, date.format, true), date.strictly) << date.text;
+        EXPECT_EQ(Read(date.text, date.format, false), date.loosely != nullptr ? date.loosely : date.strictly)
+            << date.text;
+        // All layouts at once say what each says by itself.
+        const Strict_Readings readings = Read_By_All_Layouts(date.text);
+        for (std::int32_t format = 1; format <= 40; ++format)
+            EXPECT_EQ(readings.good >> Date_Layout_Of(format) & 1, Read(date.text, format, true) != "no")
+                << date.text << " by " << format;
+    }
+    for (const char* blank : {"", "  ", "*", "*x"})
+        EXPECT_TRUE(Read(blank, 2, true) == "*" && Read_By_All_Layouts(blank).blank);
+    EXPECT_EQ(Read(std::string(10000, '1'), 2, false), "1.11111111111111e+89");
+    EXPECT_EQ(Month_From_Short("Sept", false) + Month_From_Name("may", true), 9 + 5);
+    EXPECT_EQ(Month_From_Short("Sept", true) + Month_From_Name("Ma", false), 0);
+}
+
+Column* Text_Of(const Texts& cells)
+{
+    return Add_Cells(New_Sheet_With_Rows(static_cast<std::int32_t>(cells.size())), text_column, "d", cells);
+}
+
+Texts Repeated(std::size_t count, const char* text, const Texts& others = {})
+{
+    Texts texts(count, text);
+    texts.insert(texts.end(), others.begin(), others.end());
+    return texts;
+}
+
+TEST_F(Dates, Formats_Are_Found)
+{
+    const Texts mixed = {"13/1/2000", "1/13/2000", "1/14/2000"};
+    const std::tuple<Texts, Date_Format_Search, std::int32_t> cases[] = {
+        {{"1/2/2000", "2/1/2000"}, {}, 1},
+        {{"1/2/2000", "2/1/2000"}, {.wanted = 2}, 2},
+        {{"1/2/2000", "2/1/2000"}, {.wanted = 24}, 24},
+        {mixed, {}, 1},
+        {Repeated(1, "3/13/2000", mixed), {}, 23},
+        {{"2000-01-02", "x"}, {.wanted = 7}, 7},
+        {{"2000-01-02", "", "x"}, {}, 1},
+        {{"2000-01-02", "", "*"}, {}, 19},
+        {{"1/2/1850", "1/2/2000", "3/2/2000"}, {}, -1},
+        {{"1/2/2000 1:00", "2/1/2000 2:00"}, {.wanted = 34}, 33},
+        {{"2000-2-3 1:00", "x", "2000-2-1 2:00", "2000-2-1 3:00"}, {}, 34},
+        {{"10:00", "11:00"}, {}, 36},
+        {{"10:00", "26:00", "27:00"}, {.time_mode = true}, 38},
+        {{"1/2/2000", "x", "y"}, {.time_mode = true}, 1},
+        {{"2000", "2001"}, {}, 31},
+        {{"2000", "2001"}, {.sample = true}, 0},
+        {{"1/2/2000", "x"}, {.sample = true}, 0},
+        {{"1/2/2000", "x"}, {.sample = true, .has_default = true}, 1},
+        {{"", "*"}, {.sample = true, .has_default = true}, 0},
+        {Repeated(96, "1/2/2000", Repeated(50, "x")), {.sample = true}, 1},
+        {Repeated(95, "1/2/2000", Repeated(50, "x")), {.sample = true}, 0},
+        {Repeated(200, "", Repeated(94, "1/2/2000", Repeated(50, "x"))), {.sample = true}, 0},
+    };
+    for (const auto& [cells, search, format] : cases)
+        EXPECT_EQ(Find_Date_Format(Text_Of(cells), search), format) << cells.front() << " " << cells.size();
+    EXPECT_EQ(Find_Date_Format(Add_Cells(New_Sheet_With_Rows(1), variate_column, "x", {"1"}), {}), 0);
+}
+
+TEST_F(Dates, Text_Columns_Become_Dates)
+{
+    Column* const dates = Text_Of({"1/2/1999", "*", "2/2/1999", "3-Feb-1999", "some day", "4/2/1999"});
+    Column* const times = Text_Of({"10:30", "noon", "", "6:00 pm", "36:00"});
+    ASSERT_TRUE(Text_Column_To_Date(dates, false) && Text_Column_To_Date(times, true));
+    EXPECT_FALSE(Text_Column_To_Date(times, true));
+    EXPECT_EQ(Render(dates->sheet), "d V145704|*|145705|145706|*|145707");
+    EXPECT_EQ(Render(times->sheet), "d V0.4375|*|*|0.75|1.5");
+    EXPECT_EQ((std::vector{dates->format, dates->date_format, 1 * dates->date_form, dates->decimals}),
+              (std::vector{5, 1, 1, -1}));
+    EXPECT_EQ(times->date_format, 37);
+    EXPECT_EQ(Messages(), "Text to Date Conversion Warnings\n \n"
+                          "Column d Row    5: some day read as *\n"
+                          "Column d Row    2: noon read as *\n:\n");
+}
+
+TEST_F(Dates, Numbers_Print_As_The_C_Library_Does)
+{
+    std::mt19937_64 random(11);
+    std::vector<double> numbers = {0.0, 5e-324, 2.2250738585072014e-308, 9.99999e307, 0.5, 1.5, 2.5, 9.995};
+    for (int power = -307; power <= 307; ++power)
+        numbers.push_back(std::stod("1e" + std::to_string(power)));
+    while (numbers.size() < 50000) {
+        const double any = std::bit_cast<double>(random());
+        numbers.push_back(std::isfinite(any) ? any : 1.0);
+        numbers.push_back(static_cast<double>(random() % 2000000001) / 1000.0);
+    }
+    constexpr double least = -9.9e306;
+    char text[Number_Text_Room];
+    for (double number : numbers) {
+        number = number > least ? number : -number;
+        const auto decimals = static_cast<std::int32_t>(random() % 18) - 1;
+        const double point = std::trunc(std::log10(std::fabs(number))) + 1;
+        const bool counted =
+            std::fabs(number) >= 1e-12 && std::fabs(number) <= 1e12 && std::fabs(point) < decimals;
+        const std::string expected[] = {
+            counted ? Format_Text("%.*g", decimals, number) : Format_Text("%g", number),
+            decimals < 1 ? Format_Text("%e", number) : Format_Text("%.*e", decimals, number),
+            decimals < 0 ? Format_Text("%f", number) : Format_Text("%.*f", decimals, number),
+            Format_Text("%g", number)};
+        for (std::int32_t format = 1; format <= 4; ++format)
+            ASSERT_EQ(std::string_view(text, Format_Number(text, number, format, decimals, gone)),
+                      expected[format - 1])
+                << number << " by " << format << " with " << decimals;
+    }
+}
+
+}  // namespace
+}  // namespace ingester
