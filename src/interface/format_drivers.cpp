@@ -139,10 +139,16 @@ const Format_Driver& Output_Driver_Of(std::int32_t code)
 
 bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string_view source_name)
 {
+    request.Read_Type = type;
     request.Current_File_Name = request.Source_Url.empty() ? source_name : request.Source_Url.view();
     const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
     const bool readable = found != std::end(Format_Drivers) && found->read != nullptr;
     return readable && found->read(file_name.c_str());
+}
+
+bool A_Host_File_Was_Read()
+{
+    return request.Read_Type == spreadsheet_file || request.Read_Type == book_file;
 }
 
 }  // namespace ingester
