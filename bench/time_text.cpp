@@ -1,5 +1,6 @@
 // Times one read of delimited text into a Sheet and, if asked, one write of the Sheet as comma
-// text or as a command script; or one read of some columns only, told by number. Prints "name value" lines: seconds, counts and bytes.
+// text or as a command script; or one read of some columns only, told by number. Prints "name value" lines:
+// seconds, counts and bytes.
 
 #include "hostfiles/script/script.h"
 #include "interface/process_request.h"
@@ -65,7 +66,9 @@ int main(int count, char** arguments)
 {
     const std::string_view form = count == 4 ? arguments[3] : "packed";
     if (count < 2 || count > 4 || (form != "packed" && form != "padded" && form != "script")) {
-        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script]\n       time_text FILE COLUMN,COLUMN...\n", stderr);
+        std::fputs(
+            "usage: time_text FILE [OUTPUT packed|padded|script]\n       time_text FILE COLUMN,COLUMN...\n",
+            stderr);
         return 2;
     }
     Start_Request();

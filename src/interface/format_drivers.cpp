@@ -139,7 +139,7 @@ const Format_Driver& Output_Driver_Of(std::int32_t code)
 
 bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string_view source_name)
 {
-    request.Read_Type = type;
+    request.Content_Code = type;
     request.Current_File_Name = request.Source_Url.empty() ? source_name : request.Source_Url.view();
     const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
     const bool readable = found != std::end(Format_Drivers) && found->read != nullptr;
@@ -148,7 +148,7 @@ bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string
 
 bool A_Host_File_Was_Read()
 {
-    return request.Read_Type == spreadsheet_file || request.Read_Type == book_file;
+    return request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
 }
 
 }  // namespace ingester

@@ -74,7 +74,7 @@ bool Has_Sheet_List(std::int32_t code)
 /// A file of one sheet gives a list of one.
 Request_Status List_Sheets(Request_Run&)
 {
-    if (!request.List_Sheets_Only || Has_Sheet_List(request.Read_Type))
+    if (!request.List_Sheets_Only || Has_Sheet_List(request.Content_Code))
         return Done;
     const std::string name(Current_Sheet->sheet_name.empty() ? "Sheet1" : Current_Sheet->sheet_name.view());
     Sheet* const list = New_Sheet_With_Rows(1);

@@ -103,8 +103,7 @@ public:
     }
 
 private:
-    template <class Map, class Key>
-    static std::optional<std::size_t> Find_In(const Map& map, const Key& key)
+    template <class Map, class Key> static std::optional<std::size_t> Find_In(const Map& map, const Key& key)
     {
         const auto found = map.find(key);
         return found == map.end() ? std::nullopt : std::optional(found->second);
