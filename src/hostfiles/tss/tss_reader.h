@@ -6,6 +6,8 @@
 
 #include <cstdint>
 #include <span>
+#include <string>
+#include <string_view>
 #include <vector>
 
 namespace ingester {
@@ -38,6 +40,9 @@ struct TSS_Reading {
 
 /// Reads the record of column `ordinal`. False where the columns end, silently.
 [[nodiscard]] bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal);
+
+/// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
+[[nodiscard]] std::string Valid_Name_Of_No_Column(std::string_view name);
 
 /// Whether the request's list of columns has a name, or a number.
 [[nodiscard]] bool Is_Column_Selected(std::int32_t ordinal, std::string_view name);

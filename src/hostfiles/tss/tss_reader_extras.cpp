@@ -177,14 +177,16 @@ bool Read_Dummy_Name(TSS_Reading& reading)
     std::string name;
     if (!reading.source.Read_Count(length) || !reading.source.Read_Bytes(length, Name_Width + 1, name))
         return false;
-    const bool marked = name.starts_with('-');
+    if (name.empty())
+        return true;
+    const bool marked = name.front() == '-';
     sheet.analysis_dummy_plain = marked ? 0 : 1;
     if (marked)
         name.erase(0, 1);
     if (length - (marked ? 1 : 0) > static_cast<std::int32_t>(Name_Width))
         Report_Message("Analysis dummy name truncated in reading TSS File.\n");
     if (!name.empty())
-        sheet.analysis_dummy = Make_Valid_Name(name.substr(0, Name_Width));
+        sheet.analysis_dummy = Valid_Name_Of_No_Column(name.substr(0, Name_Width));
     return true;
 }
 
