@@ -1,5 +1,4 @@
 // The records of columns.
-#include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss_reader.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
@@ -194,11 +193,6 @@ bool Skip_TSS_Data(TSS_Source& source, const Column_Record& record)
 }
 
 // --- Levels ------------------------------------------------------------------------------------------
-
-double Clean_Number(double value, double missing)
-{
-    return !Is_Surely_Present(value) && Is_Missing_In_File(value, missing) ? missing : value;
-}
 
 bool Read_Level_Values(TSS_Source& source, Column& column, std::int32_t count)
 {

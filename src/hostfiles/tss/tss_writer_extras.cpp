@@ -258,8 +258,9 @@ void Write_Cell_Colours(Sheet& sheet, TSS_Sink& sink)
 std::int32_t Colours_To_Write(const Column& column)
 {
     const auto held = static_cast<std::int32_t>(column.factor_colours.size());
-    return held == 0 ? 0
-                     : std::min(column.nlevels, std::max({held, column.label_count, column.level_values_count}));
+    return held == 0
+               ? 0
+               : std::min(column.nlevels, std::max({held, column.label_count, column.level_values_count}));
 }
 
 void Write_Factor_Colours(Sheet& sheet, TSS_Sink& sink)
