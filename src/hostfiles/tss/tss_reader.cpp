@@ -105,7 +105,9 @@ bool Start_Sheet(TSS_Reading& reading)
     // The rows and columns of a Symmetric Matrix go together, so they are left out when all is read.
     const bool symmetric = sheet->type == symmetric_matrix_sheet;
     reading.selects_columns = request.Subset_Columns && !symmetric;
-    reading.rows = {request.Subset_Rows && !symmetric, request.Subset_Row_Flags};
+    const std::span<const std::int32_t> flags = request.Subset_Row_Flags;
+    const auto rows = static_cast<std::size_t>(head.row_count);
+    reading.rows = {request.Subset_Rows && !symmetric, flags.first(std::min(flags.size(), rows))};
     Expect_Rows(sheet, reading.rows.Count(head.row_count));
     return true;
 }

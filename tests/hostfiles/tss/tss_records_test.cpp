@@ -491,6 +491,9 @@ TEST_F(TSS_Records, Selections_Leave_Out_Columns_And_Rows)
     ASSERT_NE(Read(Of(Maker().Head(1, 2, 3), Maker().Numbers(4, "x", {1.0, 2.0, 3.0}), 21, 3, 1, 0, 1), rows),
               nullptr);
     EXPECT_EQ(Current_Sheet->restricted_rows, 1);
+    // A column may be longer than the Sheet then.
+    ASSERT_NE(Read(Of(Maker().Head(1, 1, 2), Maker().Numbers(4, "x", {1.0, 2.0, 3.0})), rows), nullptr);
+    EXPECT_EQ(Render(Current_Sheet), "x V2");
     Items symmetric = Of(Maker().Head(3, 3, 3), "S", 1);
     symmetric << Maker().Numbers(7, "a", {1.0, 2.0, 3.0}) << Maker().Numbers(7, "b", {4.0, 5.0})
               << Maker().Numbers(7, "c", {6.0});
