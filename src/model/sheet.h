@@ -134,7 +134,7 @@ struct Sheet : Sheet_Host_Fields {
     std::int32_t title_bytes = 0;
     Fixed_Text<Name_Width> structure_name;
     Fixed_Text<Name_Width> row_label_name;
-    Fixed_Text<Name_Width> column_label_name;
+    Fixed_Text<Extra_Width> column_label_name;
     Fixed_Text<280> source_file;
     Fixed_Text<Text_Cell_Width> margin_label = "Margin";
     std::int32_t format_version = 0;

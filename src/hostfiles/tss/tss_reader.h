@@ -1,11 +1,14 @@
 // What the steps of the reader hand to each other.
 #pragma once
 
+#include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss_format.h"
 #include "hostfiles/tss/tss_source.h"
 
 #include <cstdint>
 #include <span>
+#include <string>
+#include <string_view>
 #include <vector>
 
 namespace ingester {
@@ -38,6 +41,15 @@ struct TSS_Reading {
 
 /// Reads the record of column `ordinal`. False where the columns end, silently.
 [[nodiscard]] bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal);
+
+/// A number of the file, with the Sheet's own mark for "missing".
+[[nodiscard]] inline double Clean_Number(double value, double missing)
+{
+    return !Is_Surely_Present(value) && Is_Missing_In_File(value, missing) ? missing : value;
+}
+
+/// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
+[[nodiscard]] std::string Valid_Name_Of_No_Column(std::string_view name);
 
 /// Whether the request's list of columns has a name, or a number.
 [[nodiscard]] bool Is_Column_Selected(std::int32_t ordinal, std::string_view name);

@@ -42,6 +42,9 @@ private:
                                                                                        : value;
 }
 
+/// A name, made up when it is empty: the reader refuses an empty one.
+[[nodiscard]] std::string_view Name_For_File(Fixed_Text<Name_Width>& name);
+
 /// A Table whose columns are labelled: one of two or more ways.
 [[nodiscard]] inline bool Is_Many_Way_Table(const Sheet& sheet)
 {

@@ -56,7 +56,7 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
     bool Columns_Were_Selected = false;  ///< by the reader: the Sheet holds those of the subset only
-    std::int32_t Content_Code = 0;          ///< the type of what was read, inside its compression
+    std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place
     bool Dates_From_1904 = false;                   ///< the dates of what was read count from then
