@@ -2,6 +2,7 @@
 #include "interface/paths.h"
 
 #include "host_fixture.h"
+#include "support/http_server.h"
 #include "support/progress.h"
 
 #include <cfenv>
@@ -107,6 +108,60 @@ TEST_F(Paths_Test, Urls_Become_Scratch_Files_That_Go_Again)
     EXPECT_EQ(Call({none, Request_Name("p.tab")}),
               (Host_Answer{19, "Could not download input URL:\n" + told + "\n:\n"}));
     EXPECT_EQ(Files(), "c.csv o.tab settings.ini");
+}
+
+/// What the server of the test below says to each path.
+std::string Web_Page(const std::string& path)
+{
+    const std::string good = "HTTP/1.1 200 OK\r\nConnection: close\r\n";
+    const std::string crops = "plot,yield\n1,2.5\n";
+    const std::string moved = "HTTP/1.1 302 Found\r\nContent-Length: 0\r\nConnection: close\r\nLocation: ";
+    if (path == "/a/crops.csv?x=1")
+        return good + "\r\n" + crops;
+    if (path == "/moved.csv")
+        return moved + "/a/crops.csv?x=1\r\n\r\n";
+    if (path == "/loop.csv")
+        return moved + "/loop.csv\r\n\r\n";
+    if (path == "/home.csv")
+        return moved + "file:///etc/passwd\r\n\r\n";
+    if (path == "/short.csv")
+        return good + "Content-Length: 1000\r\n\r\n" + crops;
+    if (path == "/huge.csv")
+        return good + "Content-Length: 9000000000000000000\r\n\r\n" + crops;
+    if (path == "/slow.csv")
+        return good + "\r\nplot~,~y~i~e~l~d";
+    if (path == "/silent.csv")
+        return "~~~~~~";
+    return "HTTP/1.1 404 Not Found\r\nConnection: close\r\n\r\n" + crops;
+}
+
+TEST_F(Paths_Test, The_Web_Is_Read_And_Its_Faults_Leave_Nothing_Behind)
+{
+    const Http_Server server(Web_Page);
+    if (server.Port() == 0)
+        GTEST_SKIP() << "no server can be run here";
+    Put("settings.ini", "[Download]\nConnectSeconds=1\nTotalSeconds=1\n");
+    Put("o.tab", "old");
+    const std::string host = "http:\\\\127.0.0.1:" + std::to_string(server.Port()) + "\\";
+    for (const char* const good : {"a\\crops.csv?x=1", "moved.csv"}) {
+        EXPECT_EQ(Call({host + good, Request_Name("o.tab")}), (Host_Answer{0, ""})) << good;
+        EXPECT_EQ(Get("o.tab"), "plot\tyield\r\n1\t2.5\r\n");
+        Put("o.tab", "old");
+    }
+    EXPECT_EQ(Call({Request_Name("settings.ini"), Request_Name("o.tab"), "", "", host + "none\\s"}).first, -1)
+        << "without a list there is no request";
+    const std::string merge = "http:\\\\127.0.0.1:" + std::to_string(server.Port()) + "\\a\\crops.csv?x=1";
+    EXPECT_EQ(Call({merge, Request_Name("o.tab") + "/%=2"}).first, 19) << "its keys aren't there";
+    EXPECT_EQ(Files() + Get("o.tab"), "o.tab settings.iniold");
+    const std::string longest = host + std::string(1120 - host.size(), 'x');
+    EXPECT_EQ(Call({longest, Request_Name("o.tab")}),
+              (Host_Answer{19, "Could not download input URL:\n" + longest.substr(0, 500) + "\n:\n"}));
+    for (const char* const bad :
+         {"none.csv", "loop.csv", "home.csv", "short.csv", "huge.csv", "slow.csv", "silent.csv"}) {
+        EXPECT_EQ(Call({host + bad, Request_Name("o.tab")}),
+                  (Host_Answer{19, "Could not download input URL:\n" + host + bad + "\n:\n"}));
+        EXPECT_EQ(Files() + Get("o.tab"), "o.tab settings.iniold") << bad;
+    }
 }
 
 TEST_F(Paths_Test, Faults_Are_Told_And_Left_To_The_Host)

@@ -1,0 +1,86 @@
+// The clipboard of a real display, which is there for as long as a test runs.
+#include "host_fixture.h"
+
+#include <cstdlib>
+
+#include <fcntl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace ingester {
+namespace {
+
+bool Is_Installed(const std::string& program)
+{
+    return std::system(("command -v " + program + " >/dev/null 2>&1").c_str()) == 0;
+}
+
+class Clipboard_Test : public Host_Test {
+protected:
+    void SetUp() override
+    {
+        Host_Test::SetUp();
+        ::unsetenv("WAYLAND_DISPLAY");
+        if (!Is_Installed("Xvfb") || !Is_Installed("xclip"))
+            GTEST_SKIP() << "Xvfb and xclip are not installed";
+        const std::string number = Start_Display();
+        if (number.empty())
+            GTEST_SKIP() << "Xvfb does not run here";
+        ::setenv("DISPLAY", (":" + number).c_str(), 1);
+    }
+    void TearDown() override
+    {
+        ::unsetenv("DISPLAY");
+        if (display_ > 0) {
+            ::kill(display_, SIGTERM);
+            ::waitpid(display_, nullptr, 0);
+        }
+        Host_Test::TearDown();
+    }
+
+private:
+    /// The number of a display of its own; empty when it can't be had.
+    std::string Start_Display()
+    {
+        int ends[2];
+        if (::pipe(ends) != 0)
+            return {};
+        display_ = ::fork();
+        if (display_ == 0) {
+            const int nothing = ::open("/dev/null", O_RDWR);
+            ::dup2(nothing, STDERR_FILENO);
+            ::close(ends[0]);
+            const std::string end = std::to_string(ends[1]);
+            ::execlp("Xvfb", "Xvfb", "-displayfd", end.c_str(), "-screen", "0", "64x64x8", nullptr);
+            ::_exit(127);
+        }
+        ::close(ends[1]);
+        std::string number;
+        for (char c; ::read(ends[0], &c, 1) == 1 && c != '\n';)
+            number += c;
+        ::close(ends[0]);
+        return number;
+    }
+
+    ::pid_t display_ = -1;
+};
+
+TEST_F(Clipboard_Test, Takes_And_Gives_Text)
+{
+    const std::string took = "Data read from the clipboard.\n:\n";
+    const std::string gave = "Data written to the clipboard.\n:\n";
+    EXPECT_EQ(Convert("none.csv", "o.tab").first, 2);
+    EXPECT_EQ(Call({"clipboard", Request_Name("o.tab")}).first, 9) << "there is nothing on it";
+    Put("c.csv", "plot,kind\n1,oats\n2,rye\n");
+    EXPECT_EQ(Call({Request_Name("c.csv"), "clipboard.tab"}), (Host_Answer{0, gave}));
+    EXPECT_EQ(Files(), "c.csv");
+    for (const char* const name : {"clipboard", "Clipboard.tab"}) {
+        EXPECT_EQ(Call({name, Request_Name("o.csv") + "/h"}), (Host_Answer{0, took})) << name;
+        EXPECT_EQ(Get("o.csv"), "plot,kind\r\n1,\"oats\"\r\n2,\"rye\"\r\n");
+        std::filesystem::remove(Path("o.csv"));
+    }
+    EXPECT_EQ(Files(), "c.csv");
+}
+
+}  // namespace
+}  // namespace ingester
