@@ -36,12 +36,10 @@ struct Var_List {
     std::vector<std::string> lines;  ///< behind the count
 };
 
-bool Load_Var_List(std::string_view file_name, Var_List& list)
+Var_List Load_Var_List(Input_File& file)
 {
-    Input_File file;
+    Var_List list;
     std::string line;
-    if (file_name.empty() || !file.Open(file_name))
-        return false;
     bool more = file.Read_Line(line, Longest_Line);
     list.by_name = more && Trim_Copy(line) == By_Names_Line;
     list.count = more ? std::max(Leading_Integer(line), 0L) : 0;
@@ -50,9 +48,11 @@ bool Load_Var_List(std::string_view file_name, Var_List& list)
     const bool counted = list.count > 0;
     const long most = list.by_name ? Every_Column : (counted ? list.count : Lines_Without_Count);
     // One more than the names: the structure's own.
-    for (long read = 0; more && read <= most; ++read, more = file.Read_Line(line, Longest_Line))
+    for (long read = 0; more && read <= most; ++read, more = file.Read_Line(line, Longest_Line)) {
+        std::ranges::replace(line, '\0', ' ');  // which would end a name
         list.lines.emplace_back(Trim_Copy(line));
-    return true;
+    }
+    return list;
 }
 
 /// "old=new" taken apart; without a "=" all of it is the old name.
@@ -67,9 +67,10 @@ std::pair<std::string, std::string> Split_Entry(std::string_view line)
 
 void Read_Var_File(std::string_view file_name)
 {
-    Var_List list;
-    if (!Load_Var_List(file_name, list))
+    Input_File file;
+    if (file_name.empty() || !file.Open(file_name))
         return;
+    const Var_List list = Load_Var_List(file);
     std::vector<std::int32_t> types;
     std::vector<std::string> names;
     for (const std::string& line : list.lines) {
@@ -267,13 +268,17 @@ void Apply_By_Name(Sheet& sheet, const Var_List& list)
 
 bool Apply_Var_File(Sheet* sheet, std::string_view file_name)
 {
-    Var_List list;
-    if (sheet == nullptr || !Load_Var_List(file_name, list))
-        return false;
+    Input_File file;
+    return sheet != nullptr && !file_name.empty() && file.Open(file_name) && Apply_Var_List(*sheet, file);
+}
+
+bool Apply_Var_List(Sheet& sheet, Input_File& file)
+{
+    const Var_List list = Load_Var_List(file);
     if (list.by_name)
-        Apply_By_Name(*sheet, list);
+        Apply_By_Name(sheet, list);
     else
-        Apply_In_Order(*sheet, list);
+        Apply_In_Order(sheet, list);
     return true;
 }
 

@@ -7,6 +7,7 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "platform/files.h"
 
 #include <string_view>
 
@@ -22,6 +23,8 @@ void Read_Var_File(std::string_view file_name);
 /// Carries out a list on what was read. Names too many, or of no column, are told. False, silently, when
 /// there is no such file.
 bool Apply_Var_File(Sheet* sheet, std::string_view file_name);
+/// The same from an open list; always true.
+bool Apply_Var_List(Sheet& sheet, Input_File& file);
 
 /// Writes the names of the columns, or of the structure, as a list that `/v` takes; into the
 /// temporary folder when `file_name` can't be made. False when neither can.
