@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Measures text tables, scripts, Factors and dates, alone and against the peers that are installed.
+"""Measures text tables, spreadsheets of the host, scripts, Factors and dates, alone and against the peers that are installed.
 
 Every number is the median of paired runs: ours and a peer's take turns, each in a process of its
 own, and a ratio is the median of the ratios of neighbours. "1.50x" says that the peer took 1.5
@@ -39,6 +39,13 @@ GREATEST_BYTES_A_CELL = 26
 
 # Millions of bytes a second of a script of numbers.
 LEAST_SCRIPT_RATE = 150
+
+# Numbers in a spreadsheet file of the host. Millions of bytes a second each way, or that part of what a
+# plain copy of the file makes; and a request from text to file against the reading of the text.
+SPREADSHEETS = {"spreadsheet": (1_000_000, 10)}
+LEAST_SPREADSHEET_RATE = 1000
+PART_OF_COPY = 0.7
+MOST_OF_READING = 1.15
 
 R_SCRIPT = """
 suppressMessages(library(data.table))
@@ -289,11 +296,40 @@ def show_dates(kind, program, pairs, scale):
     sys.stdout.flush()
 
 
+def show_spreadsheet(kind, programs, folder, pairs, scale):
+    """A file written from text, then read and written again and copied, all in memory."""
+    rows, columns = SPREADSHEETS[kind]
+    data = make_data(programs["make_data"], "build/bench/data", "numeric", max(int(rows * scale), 1), columns)
+    first, second = (os.path.join(folder, name) for name in ("first.tss", "second.tss"))
+    found = Measures()
+    for _ in range(pairs):
+        text = run([programs["time_text"], data, first, "tss"])
+        ours = run([programs["time_text"], first, second, "tss"])
+        size = os.path.getsize(first)
+        for name in ("read", "write", "copy"):
+            found.add(name, size / 1e6 / ours[name + "_seconds"])
+        found.add("cells", (ours["peak_after_read"] - ours["resident_before"])
+                  / (ours["rows"] * ours["columns"]))
+        found.add("request", (text["read_seconds"] + text["write_seconds"]) / text["read_seconds"])
+        os.remove(second)
+    os.remove(first)
+    least = min(LEAST_SPREADSHEET_RATE, PART_OF_COPY * found["copy"])
+    verdict = lambda good: "reached" if good else "SHORT"
+    print("\n%s: %.1f MB of numbers; a plain copy makes %.0f MB/s" % (kind, size / 1e6, found["copy"]))
+    for name in ("read", "write"):
+        print("  %-14s %.0f MB/s  (goal %.0f: %s)" % (name, found[name], least, verdict(found[name] >= least)))
+    print("  memory         %.1f bytes a cell  (goal %d: %s)"
+          % (found["cells"], GREATEST_BYTES_A_CELL, verdict(found["cells"] <= GREATEST_BYTES_A_CELL)))
+    print("  text to file   %.2f of reading the text  (goal %.2f: %s)"
+          % (found["request"], MOST_OF_READING, verdict(found["request"] <= MOST_OF_READING)))
+    sys.stdout.flush()
+
+
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--build", default="build/release", help="folder of the built programs")
     parser.add_argument("--rows-scale", type=float, default=1.0, help="part of the rows, for a quick run")
-    parser.add_argument("--only", choices=sorted(WORKLOADS | FACTORS | DATE_WORKLOADS),
+    parser.add_argument("--only", choices=sorted(WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS),
                         action="append", help="this workload; repeatable")
     parser.add_argument("--pairs", type=int, default=5, help="paired runs (default %(default)s)")
     options = parser.parse_args()
@@ -311,7 +347,10 @@ def main():
     for peer in peers:
         print("%s: %s" % (peer.name, peer.version or "skipped: not installed"))
     with tempfile.TemporaryDirectory(prefix="ingester-bench-", dir=out_root) as folder:
-        for kind in options.only or WORKLOADS | FACTORS | DATE_WORKLOADS:
+        for kind in options.only or WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS:
+            if kind in SPREADSHEETS:
+                show_spreadsheet(kind, programs, folder, max(options.pairs, 1), options.rows_scale)
+                continue
             if kind in FACTORS:
                 run_factors(options.build, kind, options.rows_scale, max(options.pairs, 1))
                 continue

@@ -10,7 +10,7 @@ namespace ingester {
 
 namespace {
 
-constexpr std::int64_t Least_Block = 64;
+constexpr std::int64_t Least_Block = 8;
 
 /// A block of nodes for `blocks` to own. Throws std::bad_alloc after the message.
 Cell_Node* New_Block(Block_Table& blocks, std::size_t count)

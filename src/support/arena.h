@@ -46,7 +46,7 @@ public:
 
 private:
     static constexpr std::size_t prefix_size = sizeof(std::uint16_t);
-    static constexpr std::size_t first_chunk = 1024;
+    static constexpr std::size_t first_chunk = 128;
     static constexpr std::size_t greatest_chunk = 1 << 20;
     static constexpr std::array<char, prefix_size + 1> empty_record{};
 

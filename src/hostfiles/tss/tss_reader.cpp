@@ -227,12 +227,14 @@ bool Read_Type_Block(TSS_Reading& reading)
 
 // --- When all has been read --------------------------------------------------------------------------
 
-/// A row count that no column comes near is none to make rows of: a row takes four bytes at least.
+/// A large row count that no column comes near is none to make rows of: a row takes four bytes at least.
 void Limit_Rows(TSS_Reading& reading)
 {
     constexpr std::int64_t least_cell = 4;
+    constexpr std::int32_t large_count = 100000;
     Sheet& sheet = *reading.sheet;
-    if (reading.rows.active || least_cell * sheet.row_count <= reading.source.File().Position())
+    if (reading.rows.active || sheet.row_count <= large_count
+        || least_cell * sheet.row_count <= reading.source.File().Position())
         return;
     auto longest = static_cast<std::int32_t>(reading.row_marks.size());
     for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
@@ -285,7 +287,6 @@ bool Finish_Sheet(TSS_Reading& reading)
     Sheet& sheet = *reading.sheet;
     if (sheet.column_count == 0 || (reading.rows.active && sheet.row_count == 0))
         return false;  // silent by design: the pipeline tells what was left out
-    Limit_Rows(reading);
     if (!Set_Row_Marks(reading) || !Select_Symmetric(sheet))
         return false;
     Restore_Pointer_Names(&sheet);
@@ -310,7 +311,9 @@ bool Read_Sheet(TSS_Reading& reading)
     if (!Read_Magic(reading.source) || !Read_Head(reading) || !Start_Sheet(reading)
         || !Read_Variate_Pointer(reading) || !Read_Type_Block(reading))
         return false;
-    if (Read_Columns(reading) && !Read_Auxiliary_Records(reading))
+    const bool whole = Read_Columns(reading);
+    Limit_Rows(reading);
+    if (whole && !Read_Auxiliary_Records(reading))
         return false;
     if (Has_Flag(reading, recode_genotypes_bit))
         Recode_Genotype_Factors(reading.sheet);
