@@ -148,7 +148,7 @@ TEST_F(Selection_Test, A_List_Beside_The_Input_Changes_Its_Columns)
          "b\ta\td!|1\tx\tp|2\ty\tq|3\tz\tp|Warning: column x was not found and not changed.|"},
         {"@names\na=$\nd=*\nb=*\nb_1=*\n", "a|1|2|3|"},
         {"*\n*\n*\n*\n", "4 All columns in the input file are empty.|"},
-        {std::string("\0\1\n\xFF\n", 5), "%\t%\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
+        {std::string("\0\1\n\xFF\n", 5), "a\t%\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
     };
     for (const auto& [list, told] : cases)
         EXPECT_EQ(Change(list, "", "o.tab/d"), told) << list;
