@@ -35,6 +35,8 @@ protected:
 
     [[nodiscard]] std::string Written(Sheet* sheet) const
     {
+        // Emptying a file makes some systems wait for the disk.
+        std::filesystem::remove(Path("written.tss"));
         EXPECT_TRUE(Write_TSS_File(sheet, Path("written.tss").c_str()));
         return Get("written.tss");
     }

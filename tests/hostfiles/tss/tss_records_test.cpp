@@ -11,8 +11,9 @@ namespace {
 using TSS_Records = TSS_Test;
 
 constexpr double M = Missing_Value;
+using S = const Sheet&;
 
-const Column& Col(const Sheet& sheet, std::int32_t index)
+const Column& Col(S sheet, std::int32_t index)
 {
     return *Column_At(const_cast<Sheet*>(&sheet), index);
 }
@@ -30,7 +31,7 @@ struct Record_Case {
     const char* what;
     int bit;
     Items items;
-    std::string (*show)(const Sheet&);
+    std::string (*show)(S sheet);
     const char* shown;
     bool comes_back = true;
 };
@@ -40,134 +41,121 @@ const Record_Case Record_Cases[] = {
      Of(0, 1, 1, 0, 0, 0, 0, "title", std::string(90, 't'), "", "", "", "", Raw{std::string(24, '\1')}, 1, "treat", "d",
         "e", std::string(10, 'n'), "", std::string(200, 'e'), 0, 0, 1.0, "f", 0, 0, 1.0, "x", 0, 0, 1.0, "", 5, 6, 1.0,
         "y"),
-     [](const Sheet& s) { return Text_Of(Col(s, 1).date_form, Col(s, 4).date_form, s.current_column); }, "1 1 1", false},
+     [](S s) { return Text_Of(Col(s, 1).date_form, Col(s, 4).date_form, s.current_column); }, "1 1 1", false},
     {"a print block with longer texts than fields", 0,
      Of(0, 1, 1, 0, 0, 0, 0, 95, Raw{std::string(90, 't')}, 0, 2000, Raw{std::string(1024, 't')}, 0, 0, 0,
         Raw{std::string(24, '\1')}, 1, "", 81, Raw{std::string(80, 'd')}, 201, Raw{std::string(200, 'd')}, "", "", "", 0, 0,
         1.0, "", 0, 0, 1.0, "", 0, 0, 1.0, "", 0, 0, 1.0, ""),
-     [](const Sheet& s) { return Text_Of(Col(s, 4).date_form); }, "1", false},
+     [](S s) { return Text_Of(Col(s, 4).date_form); }, "1", false},
     {"bookmarks", 1, Of(2, Raw{std::string(16, 'b')}, 0, Raw{std::string(16, 'b')}, 7, "place"),
-     [](const Sheet& s) { return Text_Of(s.current_column); }, "1", false},
+     [](S s) { return Text_Of(s.current_column); }, "1", false},
     {"analysis", 2, Of(8, 2, "one", "two", "-d", 3, 1, "go"),
-     [](const Sheet& s) {
-         return Text_Of(Hex(s.analysis_setup), s.analysis_setup_count, s.analysis_dummy.view(),
-                        s.analysis_dummy_plain, Hex(s.analysis_commands), s.analysis_command_count);
-     },
+     [](S s) { return Text_Of(Hex(s.analysis_setup), s.analysis_setup_count, s.analysis_dummy.view(), s.analysis_dummy_plain, Hex(s.analysis_commands), s.analysis_command_count); },
      "6F6E650074776F00 2 d 0 676F00 1"},
     {"a plain dummy alone", 2, Of(0, "plain", 2, 1, "x"),
-     [](const Sheet& s) { return Text_Of(s.analysis_dummy.view(), s.analysis_dummy_plain); }, "plain 1"},
-    {"no dummy", 2, Of(2, 1, "x", "", 0), [](const Sheet& s) { return Text_Of(s.analysis_dummy_plain); }, "0"},
+     [](S s) { return Text_Of(s.analysis_dummy.view(), s.analysis_dummy_plain); }, "plain 1"},
+    {"no dummy", 2, Of(2, 1, "x", "", 0), [](S s) { return Text_Of(s.analysis_dummy_plain); }, "0"},
     {"title", 3, Of(6, 2, "ab", "cd"),
-     [](const Sheet& s) { return Text_Of(Hex(s.title_lines), s.title_line_count, s.title_bytes); },
+     [](S s) { return Text_Of(Hex(s.title_lines), s.title_line_count, s.title_bytes); },
      "616200636400 2 6"},
     {"an empty title line takes no room", 3, Of(5, 3, "", "a", "bc"),
-     [](const Sheet& s) { return Text_Of(Hex(s.title_lines), s.title_line_count); }, "6100626300 3", false},
-    {"a cleared title", 3, Of(0), [](const Sheet& s) { return Text_Of(s.title_cleared, s.title_bytes); }, "0 0", false},
-    {"current cell", 4, Of(2, 3), [](const Sheet& s) { return Text_Of(s.current_column, s.current_row); }, "2 2"},
-    {"a current cell beyond", 4, Of(9, 9), [](const Sheet& s) { return Text_Of(s.current_column, s.current_row); },
+     [](S s) { return Text_Of(Hex(s.title_lines), s.title_line_count); }, "6100626300 3", false},
+    {"a cleared title", 3, Of(0), [](S s) { return Text_Of(s.title_cleared, s.title_bytes); }, "0 0", false},
+    {"current cell", 4, Of(2, 3), [](S s) { return Text_Of(s.current_column, s.current_row); }, "2 2"},
+    {"a current cell beyond", 4, Of(9, 9), [](S s) { return Text_Of(s.current_column, s.current_row); },
      "4 2", false},
-    {"a current cell before", 4, Of(-1, 0), [](const Sheet& s) { return Text_Of(s.current_column, s.current_row); },
+    {"a current cell before", 4, Of(-1, 0), [](S s) { return Text_Of(s.current_column, s.current_row); },
      "1 0", false},
     {"pointers", 5, Of(2, 0, "p", 2, "x", "t", 4, "q"),
-     [](const Sheet& s) {
+     [](S s) {
          const auto& p = s.pointers;
          return Text_Of(p.size(), p[0].name, p[0].kind, p[0].members[0], p[0].members[1], p[1].name, p[1].kind);
      },
      "2 p 0 x t q 4"},
-    {"four integers", 6, Of(9, 9, 9, 9), [](const Sheet& s) { return Text_Of(s.current_column); }, "1", false},
-    {"flag b", 7, {}, [](const Sheet& s) { return Text_Of(s.host_flag_b, s.host_flag_c); }, "1 0"},
-    {"flag c", 13, {}, [](const Sheet& s) { return Text_Of(s.host_flag_b, s.host_flag_c); }, "0 1"},
+    {"four integers", 6, Of(9, 9, 9, 9), [](S s) { return Text_Of(s.current_column); }, "1", false},
+    {"flag b", 7, {}, [](S s) { return Text_Of(s.host_flag_b, s.host_flag_c); }, "1 0"},
+    {"flag c", 13, {}, [](S s) { return Text_Of(s.host_flag_b, s.host_flag_c); }, "0 1"},
     {"conditions", 9, Of(5, 1, 2, 1, 1.5, 255, 6, M, 256, 8, -3.0, 257),
-     [](const Sheet& s) {
+     [](S s) {
          const Column& x = Col(s, 2);
          return Text_Of(s.cond_mode, x.cond_active, x.cond_op[0], x.cond_value[0], x.cond_colour[0], x.cond_op[1],
                         x.cond_value[1] == M, x.cond_colour[1], x.cond_op[2], x.cond_value[2], x.cond_colour[2]);
      },
      "5 1 1 1.5 255 6 1 256 8 -3 257"},
     {"a mode without conditions", 9, Of(5, 0),
-     [](const Sheet& s) { return Text_Of(s.cond_mode, Col(s, 2).cond_active); }, "5 0", false},
+     [](S s) { return Text_Of(s.cond_mode, Col(s, 2).cond_active); }, "5 0", false},
     {"range limits", 10, Of(2, 2, -1.0, 1.0, 4, M, 5.0),
-     [](const Sheet& s) {
-         return Text_Of(Col(s, 2).range_low, Col(s, 2).range_high, Col(s, 4).range_low == M, Col(s, 4).range_high);
-     },
+     [](S s) { return Text_Of(Col(s, 2).range_low, Col(s, 2).range_high, Col(s, 4).range_low == M, Col(s, 4).range_high); },
      "-1 1 1 5"},
     {"DDE link", 11, Of("Excel", "book", "ab12:c3", "more", 1, 2, 3, 4, 99),
-     [](const Sheet& s) {
-         return Text_Of(s.dde_topic, s.dde_source, s.dde_item, s.dde_extra, s.dde_flags[0], s.dde_flags[3],
-                        s.current_column);
-     },
+     [](S s) { return Text_Of(s.dde_topic, s.dde_source, s.dde_item, s.dde_extra, s.dde_flags[0], s.dde_flags[3], s.current_column); },
      "Excel book R12C28:R3C3 more 1 4 1", false},
     {"another DDE link", 11, Of("Other", "", "ab12:c3", "", 0, 0, 0, 0, 0),
-     [](const Sheet& s) { return Text_Of(s.dde_item); }, "ab12:c3", false},
+     [](S s) { return Text_Of(s.dde_item); }, "ab12:c3", false},
     {"gradients", 12, Of(1, 4, 2, 1, -1.5, 2.5, 0.25),
-     [](const Sheet& s) {
+     [](S s) {
          const Column& y = Col(s, 4);
          return Text_Of(y.gradient_scale, y.gradient_reversed, y.gradient_low, y.gradient_high, y.gradient_strength);
      },
      "2 1 -1.5 2.5 0.25"},
     {"creation dates", 14, Of(10.5, 4, 1.0, 2.0, 0.0, 4.0),
-     [](const Sheet& s) {
-         return Text_Of(s.creation_date, Col(s, 1).creation_date, Col(s, 2).creation_date, Col(s, 3).creation_date,
-                        Col(s, 4).creation_date);
-     },
+     [](S s) { return Text_Of(s.creation_date, Col(s, 1).creation_date, Col(s, 2).creation_date, Col(s, 3).creation_date, Col(s, 4).creation_date); },
      "10.5 1 2 0 4"},
     {"creation dates of more columns, some before time", 14, Of(-1.0, 6, 1.0, M, -2.0, 4.0, 5.0, 6.0),
-     [](const Sheet& s) { return Text_Of(s.creation_date, Col(s, 2).creation_date, Col(s, 4).creation_date); },
+     [](S s) { return Text_Of(s.creation_date, Col(s, 2).creation_date, Col(s, 4).creation_date); },
      "0 0 4", false},
-    {"split column", 15, Of(3), [](const Sheet& s) { return Text_Of(s.split_set, s.split_column); }, "1 3"},
+    {"split column", 15, Of(3), [](S s) { return Text_Of(s.split_set, s.split_column); }, "1 3"},
     {"a split at the leading columns", 15, Of(1),
-     [](const Sheet& s) { return Text_Of(s.split_set, s.split_column); }, "0 0", false},
-    {"a split beyond", 15, Of(5), [](const Sheet& s) { return Text_Of(s.split_set); }, "0", false},
+     [](S s) { return Text_Of(s.split_set, s.split_column); }, "0 0", false},
+    {"a split beyond", 15, Of(5), [](S s) { return Text_Of(s.split_set); }, "0", false},
     {"saved restrictions", 16, Of(2, "first", 3, Raw{"\5"}, "", 3, Raw{"\2"}),
-     [](const Sheet& s) {
+     [](S s) {
          const auto& r = s.saved_restrictions;
          return Text_Of(r.size(), r[0].name, Hex(r[0].bits), Hex(r[1].bits));
      },
      "2 first 05 02"},
-    {"page name", 18, Of("Page"), [](const Sheet& s) { return Text_Of(s.sheet_name.view()); }, "Page"},
-    {"a long page name", 18, Of(std::string(40, 'p')), [](const Sheet& s) { return Text_Of(s.sheet_name.size()); },
+    {"page name", 18, Of("Page"), [](S s) { return Text_Of(s.sheet_name.view()); }, "Page"},
+    {"a long page name", 18, Of(std::string(40, 'p')), [](S s) { return Text_Of(s.sheet_name.size()); },
      "32", false},
-    {"the page name that all have", 18, Of("Sheet1"), [](const Sheet& s) { return Text_Of(s.sheet_name.view()); },
+    {"the page name that all have", 18, Of("Sheet1"), [](S s) { return Text_Of(s.sheet_name.view()); },
      "Sheet1", false},
-    {"reference levels", 20, Of(1, 1, 2), [](const Sheet& s) { return Text_Of(Col(s, 1).reference_level); }, "2"},
-    {"a reference level beyond", 20, Of(1, 1, 9), [](const Sheet& s) { return Text_Of(Col(s, 1).reference_level); },
+    {"reference levels", 20, Of(1, 1, 2), [](S s) { return Text_Of(Col(s, 1).reference_level); }, "2"},
+    {"a reference level beyond", 20, Of(1, 1, 9), [](S s) { return Text_Of(Col(s, 1).reference_level); },
      "3", false},
     {"cell colours", 21, Of(2, 2, 2, 1, 255, 256, 3, 257, 258, 4, 1, 2, 3, 4),
-     [](const Sheet& s) {
+     [](S s) {
          const auto& x = Col(s, 2).cell_colours;
          return Text_Of(x.size(), x[0].row, x[0].text_colour, x[0].back_colour, x[1].row,
                         Col(s, 4).cell_colours[0].back_colour);
      },
      "2 1 255 256 3 4"},
     {"black cells, and a column without any", 21, Of(2, 9, 0, 2, 1, 1, 7, 0),
-     [](const Sheet& s) { return Text_Of(Col(s, 2).cell_colours[0].back_colour); }, "65793", false},
+     [](S s) { return Text_Of(Col(s, 2).cell_colours[0].back_colour); }, "65793", false},
     {"cells all alike", 21, Of(1, 2, 3, 1, 5, 6, 2, 5, 6, 3, 5, 6),
-     [](const Sheet& s) {
-         return Text_Of(Col(s, 2).cell_colours.size(), Col(s, 2).text_colour, Col(s, 2).back_colour);
-     },
+     [](S s) { return Text_Of(Col(s, 2).cell_colours.size(), Col(s, 2).text_colour, Col(s, 2).back_colour); },
      "0 5 6", false},
     {"IPRINT", 22, Of(1, 2, 2, 1, 4, 2),
-     [](const Sheet& s) { return Text_Of(s.iprint, Col(s, 2).iprint, Col(s, 4).iprint); }, "1 1 2"},
+     [](S s) { return Text_Of(s.iprint, Col(s, 2).iprint, Col(s, 4).iprint); }, "1 1 2"},
     {"IPRINT beyond", 22, Of(9, 2, 2, -5, 4, 7),
-     [](const Sheet& s) { return Text_Of(s.iprint, Col(s, 2).iprint, Col(s, 4).iprint); }, "2 0 2", false},
+     [](S s) { return Text_Of(s.iprint, Col(s, 2).iprint, Col(s, 4).iprint); }, "2 0 2", false},
     {"hidden columns", 23, Of(2, 2, 3),
-     [](const Sheet& s) { return Text_Of(Col(s, 1).hidden, Col(s, 2).hidden, Col(s, 3).hidden); }, "0 1 1"},
+     [](S s) { return Text_Of(Col(s, 1).hidden, Col(s, 2).hidden, Col(s, 3).hidden); }, "0 1 1"},
     {"factor colours", 24, Of(3, 1, 0, 3, 10, 11, 12, 2, 1, 3, 0),
-     [](const Sheet& s) {
+     [](S s) {
          const Column& f = Col(s, 1);
          return Text_Of(f.factor_colours.size(), f.factor_colours[2], Col(s, 2).colour_source == &f,
                         Col(s, 3).colour_source == nullptr);
      },
      "3 12 1 1", false},
     {"more colours than levels", 24, Of(1, 1, 0, 4, 1, 2, 3, 4),
-     [](const Sheet& s) { return Text_Of(Col(s, 1).factor_colours.size()); }, "0", false},
+     [](S s) { return Text_Of(Col(s, 1).factor_colours.size()); }, "0", false},
     {"colours of the last column by the strict test", 24, Of(1, 4, 1),
-     [](const Sheet& s) { return Text_Of(Col(s, 4).colour_source == nullptr); }, "1", false},
-    {"cond_on_background", 26, {}, [](const Sheet& s) { return Text_Of(s.cond_on_background); }, "1"},
+     [](S s) { return Text_Of(Col(s, 4).colour_source == nullptr); }, "1", false},
+    {"cond_on_background", 26, {}, [](S s) { return Text_Of(s.cond_on_background); }, "1"},
     {"trial seasons", 27, Of(1, "spring", 1.0, 2, 7, 8, 1.0, 2.0),
-     [](const Sheet& s) { return Text_Of(s.current_column); }, "1", false},
+     [](S s) { return Text_Of(s.current_column); }, "1", false},
     {"column colours", 28, Of(2, 2, 255, 0, 3, 0, 128),
-     [](const Sheet& s) { return Text_Of(Col(s, 2).text_colour, Col(s, 3).back_colour); }, "255 128"},
+     [](S s) { return Text_Of(Col(s, 2).text_colour, Col(s, 3).back_colour); }, "255 128"},
 };
 
 TEST_F(TSS_Records, Are_Read_And_Written)
