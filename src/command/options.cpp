@@ -34,6 +34,10 @@ constexpr const char* Examples = R"(Examples:
       NA means missing in the input; missing cells are written as a point
   ingester --in-options '/x=NA' --out-options '/mv=.' field.csv other.csv
       the same, in the option language of requests
+  ingester crops.csv all.tbk --add-sheet Crops
+      one more sheet in the book all.tbk, which is made where there is none
+  ingester sheets all.tbk
+      the sheets that the book holds; --sheet NAME reads one of them
   ingester formats
       the formats that are read and written
 

@@ -99,7 +99,12 @@ public:
 
     [[nodiscard]] bool Is_Open() const { return descriptor_ >= 0; }
 
+    /// Bytes written so far.
+    [[nodiscard]] std::int64_t Position() const { return flushed_ + static_cast<std::int64_t>(used_); }
+
     void Write(const void* bytes, std::size_t count);
+    /// Puts other bytes in the place of some that were written; not on a pipe.
+    void Write_At(std::int64_t position, const void* bytes, std::size_t count);
     void Write(std::string_view text) { Write(text.data(), text.size()); }
     template <class T> void Write_Little(T value)
     {
@@ -125,6 +130,7 @@ private:
     std::size_t buffer_size_;
     std::unique_ptr<char[]> buffer_;
     std::size_t used_ = 0;
+    std::int64_t flushed_ = 0;  ///< bytes given to the system
 };
 
 /// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails.

@@ -513,15 +513,6 @@ std::int32_t Type_In_Sheet(const Column_Record& record)
 
 }  // namespace
 
-bool Is_Column_Selected(std::int32_t ordinal, std::string_view name)
-{
-    const std::string wanted = request.Subset_By_Number ? std::to_string(ordinal) : Make_Valid_Name(name);
-    const bool found = std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
-    if (!found)
-        Remember_Bracket_Text({});  // of a name that no Column gets
-    return found;
-}
-
 bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal)
 {
     TSS_Source& source = reading.source;

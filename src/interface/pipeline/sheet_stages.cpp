@@ -16,9 +16,9 @@ namespace ingester {
 namespace {
 
 /// The host's own files are narrowed while they are read, so that nothing may be left of them.
-void Tell_No_Import(const Request_Run& run)
+void Tell_No_Import()
 {
-    const bool host_file = run.input_code == spreadsheet_file || run.input_code == book_file;
+    const bool host_file = request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
     if (!host_file)
         Report_Message("No data could be imported.\n");
     else if (request.Subset_Columns)
@@ -32,7 +32,7 @@ void Tell_No_Import(const Request_Run& run)
 Request_Status Read_Input(Request_Run& run)
 {
     if (!Read_Data_File(run.infile, run.input_code, run.Source())) {
-        Tell_No_Import(run);
+        Tell_No_Import();
         return Request_Status::not_imported;
     }
     if (Current_Sheet == nullptr)
@@ -67,9 +67,9 @@ bool Has_Sheet_List(std::int32_t code)
 }  // namespace
 
 /// A file of one sheet gives a list of one.
-Request_Status List_Sheets(Request_Run& run)
+Request_Status List_Sheets(Request_Run&)
 {
-    if (!request.List_Sheets_Only || Has_Sheet_List(run.input_code))
+    if (!request.List_Sheets_Only || Has_Sheet_List(request.Content_Code))
         return Done;
     const std::string name(Current_Sheet->sheet_name.empty() ? "Sheet1" : Current_Sheet->sheet_name.view());
     Sheet* const list = New_Sheet_With_Rows(1);

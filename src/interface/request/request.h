@@ -55,6 +55,7 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<Short_Name_Width> Source_Base_Name;  ///< input name without folder and extension
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
+    std::int32_t Content_Code = 0;  ///< file-type code of what was read, of a compressed file what it holds
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int32_t Max_Columns = Default_Max_Columns;
     Fixed_Text<60> Return_Delete_Marker = "T181D";  ///< starts the host's scratch names
