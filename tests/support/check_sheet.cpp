@@ -59,7 +59,8 @@ void Checker::Check_Cell(const Column& column, const Cell_Node& cell, std::int64
         Expect(cell.value.text[cell.Text().size()] == '\0', "an open text in cell", index);
     } else if (column.type == factor_column && !(cell.value.number < 1.0)) {
         const double level = cell.value.number;
-        Expect(level <= column.nlevels && level == std::floor(level), "no such level in cell", index);
+        const bool margin = column.sheet->type == table_sheet && column.sheet->has_margins != 0;
+        Expect(level <= column.nlevels + (margin ? 1 : 0) && level == std::floor(level), "no such level in cell", index);
     }
 }
 
