@@ -500,6 +500,7 @@ bool List_Sheets_Of(Input_File& file, const std::string& shown)
 {
     Sheet_Offsets offsets;
     std::vector<std::string> names;
+    Current_Sheet = nullptr;
     if (!List_Pages(file, offsets, names))
         return Fail("Unable to get Pagenames from Tabulon Book file %.200s.\n", shown.c_str());
     Sheet* const list = New_Sheet_With_Rows(static_cast<std::int32_t>(names.size()));

@@ -23,9 +23,11 @@ struct Column_Facts {
 
 bool Read_Column_Facts(Book_Source& source, Column_Facts& facts)
 {
-    return source.Read(facts.type, facts.length) && source.Read_Short_Text(&facts.name, Name_Width) >= 0
-           && source.Read(facts.format, facts.width, facts.justify, facts.date_format, facts.date_form,
-                          facts.protected_column, facts.extra_flag);
+    if (!source.Read(facts.type, facts.length) || source.Read_Short_Text(&facts.name, Name_Width) < 0)
+        return false;
+    facts.name.resize(std::min(facts.name.find('\0'), facts.name.size()));
+    return source.Read(facts.format, facts.width, facts.justify, facts.date_format, facts.date_form,
+                       facts.protected_column, facts.extra_flag);
 }
 
 bool Is_Known_Type(std::int32_t type)

@@ -20,7 +20,7 @@ struct Book_Bytes {
                                      : Put_Number<T, std::endian::big>(bytes.data(), value);
         return bytes;
     }
-    [[nodiscard]] static std::string Byte(int value) { return {1, static_cast<char>(value)}; }
+    [[nodiscard]] static std::string Byte(int value) { return std::string(1, static_cast<char>(value)); }
     [[nodiscard]] std::string Word(std::int64_t value) const
     {
         return Number(static_cast<std::int32_t>(value));

@@ -11,13 +11,26 @@ namespace {
 /// What a record holds: b a byte, w a word, d a double, s and l texts behind a byte or a word of length.
 /// What stands behind "*" comes as often as the record's first word says.
 const std::map<int, std::string> Layouts = {
-    {1, "ww"},      {2, ""},       {12, "b"},        {13, "l"},         {16, "bwwdbbbbs"}, {17, ""},
-    {19, "sb"},     {20, "bbb"},   {21, "bbsb"},     {22, "s"},         {25, "ww"},        {29, "d"},
-    {33, "w"},      {35, ""},      {37, "b"},        {39, ""},          {40, ""},          {64, "bwsbbbbbbb"},
-    {65, ""},       {66, "b"},     {81, "w*d"},      {82, "wb*s"},      {83, "ww*l"},      {97, "wb*d"},
-    {98, "wb*s"},   {99, "w"},     {100, ""},        {112, "bl"},       {113, "s"},        {114, "dd"},
-    {115, "bbddd"}, {116, "bdwbdwbdw"}, {117, "d"}, {118, "b"},        {119, "d"},        {120, "w*www"},
-    {121, "b"},     {122, "w"},    {123, "ww"},
+    {1, "ww"},         {2, ""},
+    {12, "b"},         {13, "l"},
+    {16, "bwwdbbbbs"}, {17, ""},
+    {19, "sb"},        {20, "bbb"},
+    {21, "bbsb"},      {22, "s"},
+    {25, "ww"},        {29, "d"},
+    {33, "w"},         {35, ""},
+    {37, "b"},         {39, ""},
+    {40, ""},          {64, "bwsbbbbbbb"},
+    {65, ""},          {66, "b"},
+    {81, "w*d"},       {82, "wb*s"},
+    {83, "ww*l"},      {97, "wb*d"},
+    {98, "wb*s"},      {99, "w"},
+    {100, ""},         {112, "bl"},
+    {113, "s"},        {114, "dd"},
+    {115, "bbddd"},    {116, "bdwbdwbdw"},
+    {117, "d"},        {118, "b"},
+    {119, "d"},        {120, "w*www"},
+    {121, "b"},        {122, "w"},
+    {123, "ww"},
 };
 
 class Walker {
@@ -44,10 +57,7 @@ private:
             out.faults += what + " at record " + std::to_string(start) + "\n";
     }
     unsigned U8(std::size_t i) const { return i < bytes.size() ? static_cast<unsigned char>(bytes[i]) : 0; }
-    unsigned U16(std::size_t i) const
-    {
-        return big ? U8(i) << 8U | U8(i + 1) : U8(i) | U8(i + 1) << 8U;
-    }
+    unsigned U16(std::size_t i) const { return big ? U8(i) << 8U | U8(i + 1) : U8(i) | U8(i + 1) << 8U; }
     std::uint32_t U32(std::size_t i) const
     {
         return big ? U16(i) << 16U | U16(i + 2) : U16(i) | U16(i + 2) << 16U;
@@ -76,9 +86,10 @@ private:
     {
         const bool opens = type == 1 || type == 16 || type == 64;
         const bool closes = type == 2 || type == 17 || type == 65;
-        const std::size_t depth = type <= 13 ? (type <= 2 ? 0U : 1U) : type == 16 || type == 17 ? 1U
-                                  : type < 64 || type == 64 || type == 65                     ? 2U
-                                                                                              : 3U;
+        const std::size_t depth = type <= 13                              ? (type <= 2 ? 0U : 1U)
+                                  : type == 16 || type == 17              ? 1U
+                                  : type < 64 || type == 64 || type == 65 ? 2U
+                                                                          : 3U;
         Expect(nesting.size() == depth + (closes ? 1 : 0), "type " + std::to_string(type) + " out of place");
         if (opens)
             nesting.push_back(type);
@@ -91,22 +102,58 @@ private:
         if (const auto layout = Layouts.find(type); layout != Layouts.end())
             Go_Over(layout->second);
         switch (type) {
-        case 1: sheets = U32(start + 6); ends.push_back(U32(start + 10)); break;
-        case 3: Take_Offsets(sheets, 16); break;
-        case 16: columns = U32(start + 7), rows = U32(start + 11), margin = 0, table = U8(start + 6) == 5; break;
-        case 18: Take_Offsets(columns, 64); break;
-        case 20: margin = U8(start + 7) != 0; break;
-        case 23: Text_Block(), Go_Over("s"), Text_Block(); break;
-        case 24: Text_Block(); break;
-        case 26: Go_Over(U8(at) == 0 ? "bs" : "bs"); Members(); break;
-        case 34: Go_Over("sw"), at += (rows + 7) / 8 + (rows == 0); break;
-        case 36: at += columns; break;
-        case 64: Expect(U32(start + 7) <= rows, "a column longer than its sheet"), length = U32(start + 7); break;
-        case 81: case 82: case 83: Expect(U32(start + 6) == length, "cells"); break;
-        case 96: Codes(end); break;
-        case 97: case 98: Expect(U32(start + 6) == levels, "levels"); break;
-        case 101: at += 4 * std::size_t{levels}; break;
-        default: Expect(Layouts.contains(type), "an unknown type");
+        case 1:
+            sheets = U32(start + 6);
+            ends.push_back(U32(start + 10));
+            break;
+        case 3:
+            Take_Offsets(sheets, 16);
+            break;
+        case 16:
+            columns = U32(start + 7), rows = U32(start + 11), margin = 0, table = U8(start + 6) == 5;
+            break;
+        case 18:
+            Take_Offsets(columns, 64);
+            break;
+        case 20:
+            margin = U8(start + 7) != 0;
+            break;
+        case 23:
+            Text_Block(), Go_Over("s"), Text_Block();
+            break;
+        case 24:
+            Text_Block();
+            break;
+        case 26:
+            Go_Over(U8(at) == 0 ? "bs" : "bs");
+            Members();
+            break;
+        case 34:
+            Go_Over("sw"), at += (rows + 7) / 8 + (rows == 0);
+            break;
+        case 36:
+            at += columns;
+            break;
+        case 64:
+            Expect(U32(start + 7) <= rows, "a column longer than its sheet"), length = U32(start + 7);
+            break;
+        case 81:
+        case 82:
+        case 83:
+            Expect(U32(start + 6) == length, "cells");
+            break;
+        case 96:
+            Codes(end);
+            break;
+        case 97:
+        case 98:
+            Expect(U32(start + 6) == levels, "levels");
+            break;
+        case 101:
+            at += 4 * std::size_t{levels};
+            break;
+        default:
+            Expect(Layouts.contains(type), "an unknown type");
         }
     }
 
@@ -151,7 +198,8 @@ private:
         Expect(U32(start + 6) == length && U8(start + 14) <= 2, "a Factor's head");
         at += 9 + (n == 0 && bits < 8 ? 1 : (n * bits + 7) / 8);
         const auto unused = static_cast<unsigned>((8 - n * bits % 8) % 8);
-        Expect(bits >= 8 || n == 0 || unused == 0 || U8(end - 1) >> (8 - unused) == 0, "bits that are no cell's");
+        Expect(bits >= 8 || n == 0 || unused == 0 || U8(end - 1) >> (8 - unused) == 0,
+               "bits that are no cell's");
     }
     void Take_Offsets(std::uint32_t count, int type)
     {

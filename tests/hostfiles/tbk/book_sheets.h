@@ -23,7 +23,8 @@ inline Sheet* Plain_Sheet(const std::string& name, const Texts& cells = {"1", "2
 /// A Factor with `levels` levels and no lists.
 inline Column* Add_Factor(Sheet* sheet, const std::string& name, std::int32_t levels, const Texts& cells)
 {
-    Column* const column = New_Data_Column(sheet, factor_column, name, static_cast<std::int32_t>(cells.size()));
+    Column* const column =
+        New_Data_Column(sheet, factor_column, name, static_cast<std::int32_t>(cells.size()));
     column->nlevels = levels;
     column->factor_kind = plain_factor;
     auto text = cells.begin();
@@ -176,7 +177,10 @@ protected:
         EXPECT_TRUE(Write_TBK_File(sheets, Request_Name("w.tbk").c_str()));
         return Get("w.tbk");
     }
-    [[nodiscard]] std::string Written(Sheet* sheet) const { return Written(std::span<Sheet* const>(&sheet, 1)); }
+    [[nodiscard]] std::string Written(Sheet* sheet) const
+    {
+        return Written(std::span<Sheet* const>(&sheet, 1));
+    }
 
     [[nodiscard]] Texts Pages(const std::string& name) const
     {

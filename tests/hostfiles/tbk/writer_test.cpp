@@ -17,8 +17,8 @@ TEST_F(Book_Writer, Writes_These_Bytes)
     const std::string column = b.Record(64, std::string("\4\2\0\0\0\1x\1\6\0\1\0\0\0", 14))
                                + b.Record(81, b.Word(2) + b.Reals({1.5, -1e307})) + dates + b.Record(65);
     const std::string factor = b.Record(64, std::string("\2\2\0\0\0\1f\1\6\0\1\0\0\0", 14))
-                               + b.Record(66, "\2") + b.Record(96, b.Words({2, 4}) + std::string("\0\4", 2)) + dates
-                               + b.Record(65);
+                               + b.Record(66, "\2") + b.Record(96, b.Words({2, 4}) + std::string("\0\4", 2))
+                               + dates + b.Record(65);
     const std::string front = b.Record(12, "\t") + b.Record(13, b.Long("C:\\in.csv"));
     const std::size_t at = 12 + 14 + front.size() + 10;
     const std::size_t columns_at = at + 32 + 14 + 14;
@@ -76,9 +76,9 @@ TEST_F(Book_Writer, Packs_Cells_Of_Factors_As_Their_Levels_Allow)
         std::int32_t levels;
         int cells;
         std::int64_t length;
-    } cases[] = {{3, 5, 11},     {4, 5, 12},    {15, 4, 11},    {16, 5, 14},     {255, 3, 12},
-                 {256, 3, 15},   {65535, 2, 13}, {65536, 2, 17}, {3, 4, 10},     {3, 0, 10},
-                 {15, 0, 10},    {300, 0, 9},    {1, 100000, 25009}, {5, 100001, 50010}};
+    } cases[] = {{3, 5, 11},   {4, 5, 12},     {15, 4, 11},        {16, 5, 14},       {255, 3, 12},
+                 {256, 3, 15}, {65535, 2, 13}, {65536, 2, 17},     {3, 4, 10},        {3, 0, 10},
+                 {15, 0, 10},  {300, 0, 9},    {1, 100000, 25009}, {5, 100001, 50010}};
     for (const auto& [levels, cells, length] : cases) {
         SCOPED_TRACE(std::to_string(levels) + " levels, " + std::to_string(cells));
         Sheet* const sheet = New_Sheet_With_Rows(cells);
@@ -110,7 +110,8 @@ TEST_F(Book_Writer, Names_What_Has_No_Name_And_Refuses_What_Is_None)
     EXPECT_EQ(Pages("w.tbk"), (Texts{"Asked", "asked_1", "B"}));
     EXPECT_FALSE(Write_TBK_File(nullptr, Request_Name("n.tbk").c_str()));
     EXPECT_FALSE(Write_TBK_File(sheet, Request_Name("none\\n.tbk").c_str()));
-    EXPECT_EQ(Messages(), "Internal Spreadsheet Error: Null BOOK in Save book.\nTabulon Book file not saved.\n:\n");
+    EXPECT_EQ(Messages(),
+              "Internal Spreadsheet Error: Null BOOK in Save book.\nTabulon Book file not saved.\n:\n");
 }
 
 }  // namespace
