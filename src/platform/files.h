@@ -113,6 +113,10 @@ public:
         Write(bytes, sizeof bytes);
     }
 
+    /// Writes the next `count` bytes of `source`, which the system copies by itself where it can. False when
+    /// they aren't there, or after a refusal.
+    [[nodiscard]] bool Copy_From(Input_File& source, std::int64_t count);
+
     /// The system refused a write; later ones are dropped.
     [[nodiscard]] bool Failed() const { return failed_; }
 
@@ -122,6 +126,7 @@ public:
 private:
     [[nodiscard]] bool Start(int descriptor);
     void Flush();
+    [[nodiscard]] std::int64_t Copy_In_System(const Input_File& source, std::int64_t count);
     void Write_Directly(const char* bytes, std::size_t count);
 
     int descriptor_ = -1;

@@ -294,6 +294,50 @@ void Output_File::Write_At(std::int64_t position, const void* bytes, std::size_t
         std::memcpy(buffer_.get() + (position - flushed_), at, count);
 }
 
+/// How many of the bytes the system could copy.
+std::int64_t Output_File::Copy_In_System(const Input_File& source, std::int64_t count)
+{
+    constexpr std::int64_t at_once = 1 << 26;
+    std::int64_t done = 0;
+    ::off_t from = source.Position();
+    while (done < count && !failed_) {
+        if (!File_Change_Allowed()) {
+            failed_ = true;
+            break;
+        }
+        const auto part = static_cast<std::size_t>(std::min(count - done, at_once));
+        const ::ssize_t copied = ::copy_file_range(source.Descriptor(), &from, descriptor_, nullptr, part, 0);
+        if (copied <= 0)
+            break;  // what can't be copied so may be read and written
+        done += copied;
+    }
+    flushed_ += done;
+    return done;
+}
+
+bool Output_File::Copy_From(Input_File& source, std::int64_t count)
+{
+    constexpr std::int64_t block_size = 1 << 20;
+    Flush();
+    if (source.Descriptor() >= 0 && descriptor_ >= 0 && !failed_) {
+        const std::int64_t copied = Copy_In_System(source, count);
+        count -= copied;
+        if (!source.Seek(source.Position() + copied))
+            return false;
+    }
+    if (count == 0)
+        return !failed_;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
+    while (count > 0 && !failed_) {
+        const auto part = static_cast<std::size_t>(std::min(count, block_size));
+        if (!source.Read_Exactly(block.get(), part))
+            return false;
+        Write(block.get(), part);
+        count -= static_cast<std::int64_t>(part);
+    }
+    return !failed_;
+}
+
 bool Output_File::Close()
 {
     if (descriptor_ < 0)

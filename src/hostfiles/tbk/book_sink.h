@@ -36,6 +36,8 @@ public:
     void Put_Byte(std::int32_t value) { Put(static_cast<std::uint8_t>(value)); }
     void Put_Bytes(std::string_view bytes) { file_->Write(bytes); }
     void Put_Bytes(const std::byte* bytes, std::size_t count) { file_->Write(bytes, count); }
+    /// The file itself, for bytes that are copied to it.
+    [[nodiscard]] Output_File& File() { return *file_; }
     void Put_Short_Text(std::string_view text)
     {
         text = text.substr(0, Short_Text_Width);

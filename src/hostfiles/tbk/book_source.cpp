@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <utility>
 
 namespace ingester {
 
@@ -62,6 +63,14 @@ bool Book_Source::Skip_Rest()
     }
     unread_ = 0;
     return file_->Seek(behind) || Short_Read();
+}
+
+bool Book_Source::Copy_Rest(Output_File& target)
+{
+    target.Write(block_.get() + next_, end_ - next_);
+    next_ = end_ = 0;
+    const std::int64_t count = std::exchange(unread_, 0);
+    return target.Copy_From(*file_, count) || (!target.Failed() && Short_Read());
 }
 
 bool Book_Source::Refill(std::size_t count)

@@ -45,6 +45,8 @@ public:
     /// Bytes of the record that were not read yet.
     [[nodiscard]] std::int64_t Left() const { return unread_ + std::int64_t(end_ - next_); }
     [[nodiscard]] bool Skip_Rest();
+    /// Copies the rest of a large record.
+    [[nodiscard]] bool Copy_Rest(Output_File& target);
 
     /// The next `count` bytes (`Bytes_At_Once` at most), which stand until the next call; null when the
     /// record has no more.

@@ -57,6 +57,9 @@ void Copy_Record_Head(Book_Copy& copy)
 
 bool Copy_Payload(Book_Copy& copy)
 {
+    constexpr std::int64_t large = 1 << 20;
+    if (copy.source.Left() >= large)
+        return copy.source.Copy_Rest(copy.sink.File());
     while (copy.source.Left() > 0) {
         const auto count =
             std::min(copy.source.Left(), static_cast<std::int64_t>(Book_Source::Bytes_At_Once));
