@@ -1,16 +1,22 @@
-// Times one read of delimited text into a Sheet and, if asked, one write of the Sheet as comma
-// text or as a command script. Prints "name value" lines: seconds, counts and bytes.
+// Times one read of delimited text or of a spreadsheet of the host into a Sheet and, if asked, one write of
+// the Sheet as comma text, as a command script or as a spreadsheet; then also a plain copy of that file
+// through the same streams. Or times one read of some columns only, told by number. Prints "name value"
+// lines: seconds, counts and bytes.
 
 #include "hostfiles/script/script.h"
+#include "hostfiles/tss/tss.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "model/sheet.h"
+#include "platform/files.h"
 #include "spreadsheet/text/text.h"
 
+#include <algorithm>
 #include <chrono>
 #include <cstdint>
 #include <cstdio>
+#include <iterator>
 #include <string>
 #include <string_view>
 
@@ -48,18 +54,47 @@ template <class Work> bool Time(const char* name, Work work)
     return done;
 }
 
+/// Numbers with commas between them.
+void Keep_Columns_Of(std::string_view list)
+{
+    request.Subset_Columns = request.Subset_By_Number = true;
+    for (std::size_t end; !list.empty(); list.remove_prefix(std::min(end + 1, list.size()))) {
+        end = std::min(list.find(','), list.size());
+        request.Subset_Names.emplace_back(list.substr(0, end));
+    }
+}
+
+constexpr std::string_view Forms[] = {"packed", "padded", "script", "tss"};
+
+bool Read_Input(const char* name)
+{
+    return std::string_view(name).ends_with(".tss") ? Read_TSS_File(name) : Read_CSV_File(name);
+}
+
+bool Write_As(std::string_view form, const char* name)
+{
+    if (form == "tss")
+        return Write_TSS_File(Current_Sheet, name);
+    return form == "script" ? Write_Host_Script(Current_Sheet, name)
+                            : Write_Text_File(Current_Sheet, name, false);
+}
+
 }  // namespace
 
 int main(int count, char** arguments)
 {
     const std::string_view form = count == 4 ? arguments[3] : "packed";
-    if ((count != 2 && count != 4) || (form != "packed" && form != "padded" && form != "script")) {
-        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script]\n", stderr);
+    if (count < 2 || count > 4 || std::ranges::find(Forms, form) == std::end(Forms)) {
+        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script|tss]\n"
+                   "       time_text FILE COLUMN,COLUMN...\n",
+                   stderr);
         return 2;
     }
     Start_Request();
+    if (count == 3)
+        Keep_Columns_Of(arguments[2]);
     Print_Memory("before");
-    const bool read = Time("read_seconds", [&] { return Read_CSV_File(arguments[1]); });
+    const bool read = Time("read_seconds", [&] { return Read_Input(arguments[1]); });
     Print_Memory("after_read");
     if (!read || Current_Sheet == nullptr) {
         Close_Message_File();
@@ -73,10 +108,7 @@ int main(int count, char** arguments)
         request.Packed_Csv_Output = form == "packed";
         request.settings.csv_title = 0;
         Current_Sheet->settings.csv_title = 0;
-        const bool written = Time("write_seconds", [&] {
-            return form == "script" ? Write_Host_Script(Current_Sheet, arguments[2])
-                                    : Write_Text_File(Current_Sheet, arguments[2], false);
-        });
+        const bool written = Time("write_seconds", [&] { return Write_As(form, arguments[2]); });
         Print_Memory("after_write");
         if (!written) {
             Close_Message_File();
@@ -85,5 +117,11 @@ int main(int count, char** arguments)
         }
     }
     Free_Sheets();
+    if (form == "tss") {
+        const std::string copy = std::string(arguments[2]) + ".copy";
+        const bool copied = Time("copy_seconds", [&] { return Copy_File(arguments[2], copy); });
+        Delete_File(copy);
+        return copied ? 0 : 1;
+    }
     return 0;
 }

@@ -1,6 +1,7 @@
 // The target of one reader: the build names its header, its entry and what prepares its options.
 #include FUZZ_HEADER
 
+#include "hostfiles/tss/tss.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
@@ -59,6 +60,29 @@ std::size_t Choice(std::byte character, std::size_t count)
     request.Fixed_Lines = static_cast<std::int32_t>(mark);
     request.settings.trim_cells = Choice(head[6], 16) < 2 * std::size(marks) ? 1 : 0;
     return names[Choice(head[0], std::size(names))];
+}
+
+/// Two characters in front of a spreadsheet: what is left out of it (columns by name, by number, rows), and
+/// names with brackets; then the order of a file read before, for those that don't tell theirs.
+[[maybe_unused]] std::string_view Prepare_TSS(std::span<const std::byte>& bytes)
+{
+    constexpr std::size_t head_size = 2;
+    constexpr std::string_view magics[] = {"\x51\x50\x3E\x03", "\x03\x3E\x50\x51"};
+    if (bytes.size() < head_size)
+        return "fuzz.tss";
+    const auto head = bytes.first<head_size>();
+    bytes = bytes.subspan(head_size);
+    const std::size_t choice = Choice(head[0], 8);
+    request.Subset_Columns = (choice & 1U) != 0;
+    request.Subset_By_Number = (choice & 2U) != 0;
+    request.Subset_Names = request.Subset_By_Number ? std::vector<std::string>{"1", "3"}
+                                                    : std::vector<std::string>{"x", "f", "2"};
+    request.Subset_Rows = (choice & 4U) != 0;
+    request.Subset_Row_Flags = {0, 1, 1, 0, 1};
+    Get_Settings().bracket_names = Choice(head[1], 4) < 2;
+    Input_File before(std::as_bytes(std::span(magics[Choice(head[1], 2)])), "before.tss");
+    static_cast<void>(Read_TSS(before));
+    return "fuzz.tss";
 }
 
 }  // namespace

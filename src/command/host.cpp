@@ -2,7 +2,9 @@
 
 #include "command/progress_line.h"
 #include "command/request_text.h"
+#include "command/selection_lists.h"
 #include "ingester/ingester.h"
+#include "interface/paths.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/host_process.h"
@@ -72,6 +74,8 @@ struct Conversion {
     const Command_Options& options;
     Sent_Name input;
     Sent_Name output;
+    std::string folder;
+    Choice_Lists lists;
 
     [[nodiscard]] bool From_Standard_Input() const { return options.input == Standard_Stream; }
     [[nodiscard]] bool To_Standard_Output() const { return options.output == Standard_Stream; }
@@ -149,6 +153,18 @@ bool Output_May_Be_Written(const Conversion& conversion)
     return refusal == nullptr;
 }
 
+/// A list of the user's own would be taken in the place of ours.
+bool Change_List_Is_Free(const Conversion& conversion)
+{
+    const std::string name = Find_Companion(With_Extension(conversion.input.request, ".VAR"));
+    const bool asked = conversion.options.input_options.find("/v") != std::string::npos;
+    if (conversion.lists.changes.empty() || (!asked && !File_Exists(name)))
+        return true;
+    Say(Native_Path(name), "a list of columns beside the input can't be used together with --drop, --rename "
+                           "and --type; put them into the list, or move it");
+    return false;
+}
+
 void Write_Text_Record(Output_File& file, std::string_view text)
 {
     file.Write_Little<std::int32_t>(0);
@@ -156,18 +172,71 @@ void Write_Text_Record(Output_File& file, std::string_view text)
     file.Write(text);
 }
 
+std::string Column_List_Name(const Conversion& conversion)
+{
+    return conversion.folder + "columns";
+}
+
+std::string Row_List_Name(const Conversion& conversion)
+{
+    return conversion.folder + "rows";
+}
+
+/// The names of scratch files begin so.
+std::string Stem_Of(const Conversion& conversion)
+{
+    return conversion.folder + Format_Text("IG%li", Process_Id());
+}
+
+/// Where a request looks for the list of an input that has none beside it. A fetched one is known by the
+/// name of its copy.
+std::string Change_List_Name(const Conversion& conversion)
+{
+    const std::string& input = conversion.input.request;
+    const std::string name = Is_Url(input) ? "IN" + std::string(File_Part_Of(Stem_Of(conversion)))
+                                           : std::string(File_Part_Of(input));
+    return conversion.folder + With_Extension(name, ".VAR");
+}
+
 /// The strings of the request, in the order of the pass file.
 std::vector<std::string> Request_Records(const Conversion& conversion)
 {
     const Command_Options& options = conversion.options;
     const std::string& output = conversion.output.request;
-    std::vector<std::string> records = {conversion.input.request + options.input_options,
+    const Choice_Lists& lists = conversion.lists;
+    const bool chosen = !lists.columns.empty() || !lists.rows.empty();
+    const std::string change = lists.changes.empty() ? "" : "/v";
+    // In front of the options that were written as they stand: a pointer's name takes all that follows it.
+    std::vector<std::string> records = {conversion.input.request + change + options.input_options,
                                         output + options.output_options + Packed_Option(options, output)};
-    if (!options.sheet.empty() || !options.range.empty())
+    if (chosen || !options.sheet.empty() || !options.range.empty())
         records.push_back(options.sheet);
-    if (!options.range.empty())
+    if (chosen || !options.range.empty())
         records.push_back(options.range);
+    if (!lists.columns.empty())
+        records.push_back(Column_List_Name(conversion) + (lists.rows.empty() ? "/s" : "/s/r"));
+    if (!lists.rows.empty())
+        records.push_back(Row_List_Name(conversion) + (lists.columns.empty() ? "/r" : ""));
     return records;
+}
+
+bool Write_List(const std::string& name, const std::string& text)
+{
+    Output_File file;
+    if (text.empty())
+        return true;
+    if (!file.Open_Scratch(name))
+        return false;
+    file.Write(text);
+    return file.Close();
+}
+
+bool Write_Lists(const Conversion& conversion)
+{
+    const Choice_Lists& lists = conversion.lists;
+    return Write_List(Column_List_Name(conversion), lists.columns)
+           && Write_List(Row_List_Name(conversion), lists.rows)
+           && Write_List(Change_List_Name(conversion), lists.changes);
 }
 
 bool Write_Pass_File(const Conversion& conversion, const std::string& name)
@@ -184,7 +253,8 @@ bool Write_Pass_File(const Conversion& conversion, const std::string& name)
 
 void Print_Request(const Conversion& conversion)
 {
-    constexpr const char* names[] = {"Infile", "Outfile", "Worksheet", "Cell range"};
+    constexpr const char* names[] = {"Infile",     "Outfile",        "Worksheet",
+                                     "Cell range", "Secondary file", "Subset rows file"};
     const char* const* name = names;
     for (const std::string& record : Request_Records(conversion))
         std::printf("%s: %s\n", *name++, record.c_str());
@@ -215,11 +285,11 @@ std::string Read_Messages(const std::string& name)
     return text;
 }
 
-Answer Call_Library(const Conversion& conversion, const std::string& folder)
+Answer Call_Library(const Conversion& conversion)
 {
-    const std::string stem = folder + Format_Text("IG%li", Process_Id());
+    const std::string stem = Stem_Of(conversion);
     Answer answer;
-    if (!Write_Pass_File(conversion, stem + ".inp"))
+    if (!Write_Lists(conversion) || !Write_Pass_File(conversion, stem + ".inp"))
         return answer;
     {
         const Progress_Line progress(!conversion.options.quiet);
@@ -240,11 +310,11 @@ std::string Unfinished_File(const Sent_Name& output)
     return name;
 }
 
-Answer Convert(const Conversion& conversion, const std::string& folder)
+Answer Convert(const Conversion& conversion)
 {
     const std::string unfinished = Unfinished_File(conversion.output);
     Remove_On_Signal(unfinished);
-    const Answer answer = Call_Library(conversion, folder);
+    const Answer answer = Call_Library(conversion);
     if (!answer.Is_Good() && !unfinished.empty())
         Delete_File(unfinished);
     Remove_On_Signal({});
@@ -278,10 +348,14 @@ int Run_Command(const Command_Options& options)
             "no temporary folder can be made here; set TMPDIR to a folder that you can write to");
         return INGESTER_NO_REQUEST;
     }
+    std::string fault;
     const Conversion conversion{
         options, Name_Of(options.input, "standard input", folder.Name() + Standard_Input_Name),
-        Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name)};
-    if (!Request_Can_Carry(conversion))
+        Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name), folder.Name(),
+        Make_Lists(options.chosen, fault)};
+    if (!fault.empty())
+        std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", fault.c_str());
+    if (!fault.empty() || !Request_Can_Carry(conversion) || !Change_List_Is_Free(conversion))
         return Unusable_Arguments;
     if (options.dry_run) {
         Print_Request(conversion);
@@ -293,7 +367,7 @@ int Run_Command(const Command_Options& options)
         Say(conversion.input.native, "could not be read to its end and kept in the temporary folder");
         return INGESTER_INPUT_UNREADABLE;
     }
-    const Answer answer = Convert(conversion, folder.Name());
+    const Answer answer = Convert(conversion);
     Tell_Answer(conversion, answer);
     if (conversion.To_Standard_Output() && answer.Is_Good()
         && !Copy_To_Standard_Output(conversion.output.request)) {

@@ -34,6 +34,8 @@ constexpr const char* Examples = R"(Examples:
       NA means missing in the input; missing cells are written as a point
   ingester --in-options '/x=NA' --out-options '/mv=.' field.csv other.csv
       the same, in the option language of requests
+  ingester crops.csv crops.gen --keep plot,yield --rename plot=Plot --type plot=factor
+      two columns, one of them under another name and as a factor
   ingester crops.csv all.tbk --add-sheet Crops
       one more sheet in the book all.tbk, which is made where there is none
   ingester sheets all.tbk
@@ -104,6 +106,7 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
     app.add_flag("-f,--force", options.force, "Replace an output that exists");
     app.add_flag("-q,--quiet", options.quiet, "Show no progress");
     app.add_flag("--dry-run", options.dry_run, "Print the request that would be sent, and stop");
+    Offer_Choices(app, options.chosen);
     const std::array input_tables = {Genotype_Options(), Input_Options()};
     const std::array output_tables = {Output_Options()};
     Offer_Named_Options(app, "Options of the input", input_tables, options.named_input_options);

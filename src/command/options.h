@@ -2,6 +2,7 @@
 #pragma once
 
 #include "command/named_options.h"
+#include "command/selection_lists.h"
 
 #include <optional>
 #include <string>
@@ -20,6 +21,7 @@ struct Command_Options {
     std::string output_options;
     Given_Options named_input_options;  ///< added to `input_options` when the line is parsed
     Given_Options named_output_options;
+    Chosen_Data chosen;
     bool dry_run = false;  ///< show the request, don't send it
     bool padded = false;   ///< comma text keeps its columns under each other
     bool force = false;

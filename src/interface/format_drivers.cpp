@@ -160,4 +160,9 @@ bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string
     return readable && found->read(file_name.c_str());
 }
 
+bool A_Host_File_Was_Read()
+{
+    return request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
+}
+
 }  // namespace ingester

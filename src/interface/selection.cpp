@@ -1,10 +1,9 @@
 #include "interface/selection.h"
 
+#include "interface/format_drivers.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
-#include "platform/files.h"
-#include "platform/folders.h"
-#include "support/text.h"
+#include "model/subset.h"
 
 namespace ingester {
 
@@ -26,16 +25,20 @@ bool Delete_Empty_Rows(Sheet* sheet)
     return true;
 }
 
-namespace {
-
-/// Opens a list file, or one of its name in the temporary folder.
-bool Open_Var_File(Output_File& file, std::string_view file_name)
+Subset_Result Apply_Subset(Sheet* sheet)
 {
-    return file.Open(file_name)
-           || file.Open(Get_Temp_Folder().append(With_Extension(File_Part_Of(file_name), ".VAR")));
+    if (sheet == nullptr)
+        return Subset_Result::no_columns;
+    const bool host_file = A_Host_File_Was_Read();
+    if (request.Subset_Columns && !host_file && !request.Columns_Were_Selected && !Keep_Column_Subset(sheet))
+        return Subset_Result::no_columns;
+    if (request.Subset_Columns && sheet->column_count < 1)
+        return Subset_Result::no_columns;
+    Tell_Missing_Columns(*sheet);
+    if (request.Subset_Rows && !host_file && !Keep_Rows(sheet, request.Subset_Row_Flags))
+        return Subset_Result::no_rows;
+    return Subset_Result::kept;
 }
-
-}  // namespace
 
 bool Keep_Column_Range(Sheet* sheet, std::int32_t first, std::int32_t last)
 {
@@ -47,24 +50,6 @@ bool Keep_Column_Range(Sheet* sheet, std::int32_t first, std::int32_t last)
         return Fail("Error: Data contains fewer columns than first column to be kept.\n");
     Keep_Columns(sheet, first, last);
     return true;
-}
-
-bool Write_Var_File(const Sheet& sheet, std::string_view file_name)
-{
-    Output_File file(Output_File::small_buffer);
-    if (!Open_Var_File(file, file_name))
-        return false;  // silent by design: the list is an extra, the output stands
-    const bool named_columns = sheet.type == vector_sheet || sheet.type == scalar_sheet
-                               || (sheet.type == table_sheet && sheet.table_ways == 1);
-    if (!named_columns) {
-        file.Write(Format_Text("1\n%s\n", sheet.structure_name.c_str()));
-        return file.Close();
-    }
-    file.Write(Format_Text("%li\n", static_cast<long>(sheet.column_count)));
-    for (const Column* column = sheet.first_column; column != nullptr; column = column->next)
-        if (column->type != row_column)
-            file.Write(Format_Text("%s\n", column->name.c_str()));
-    return file.Close();
 }
 
 }  // namespace ingester

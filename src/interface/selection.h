@@ -4,19 +4,20 @@
 #include "model/sheet.h"
 
 #include <cstdint>
-#include <string_view>
 
 namespace ingester {
 
 /// Removes the rows without data; the last one stays. Warns when all are empty.
 bool Delete_Empty_Rows(Sheet* sheet);
 
+enum class Subset_Result : std::uint8_t { kept, no_columns, no_rows };
+
+/// Leaves the columns and rows of the request's lists, where the reader hasn't done so already. Names of
+/// the list that aren't there are told.
+[[nodiscard]] Subset_Result Apply_Subset(Sheet* sheet);
+
 /// Keeps the data columns from `first` to `last`, counted from 1; below 1 is the first. Columns that
 /// aren't there are told. False after a message when nothing would be kept.
 bool Keep_Column_Range(Sheet* sheet, std::int32_t first, std::int32_t last);
-
-/// Writes the names of the columns, or of the structure, as a list that `/v` takes; into the
-/// temporary folder when `file_name` can't be made. False when neither can.
-bool Write_Var_File(const Sheet& sheet, std::string_view file_name);
 
 }  // namespace ingester

@@ -11,6 +11,7 @@
 #include <memory>
 #include <string>
 #include <utility>
+#include <vector>
 
 namespace ingester {
 
@@ -492,30 +493,46 @@ bool Delete_Column(Column* column, bool keep_square)
     return true;
 }
 
+namespace {
+
+/// Deletes the columns that `unwanted` names, from the last to the first; never the `Row` column. Of a
+/// Symmetric Matrix their rows go as well. The others are numbered once: a wide sheet may lose thousands.
+template <class Unwanted> void Delete_Columns(Sheet& sheet, Unwanted unwanted)
+{
+    for (Column* column = sheet.last_column; column != nullptr && column->type != row_column;) {
+        Column* const one = std::exchange(column, column->prev);
+        if (!unwanted(*one))
+            continue;
+        if (one->type == symmetric_matrix_column) {
+            Delete_Column(one, true);
+            continue;
+        }
+        Unlink(sheet.first_column, sheet.last_column, one);
+        Count_Column(sheet, *one, -1);
+        Free_Column(sheet, one);
+    }
+    Renumber_Columns(sheet);
+    if (sheet.label_state == 0)
+        Number_Matrix_Columns(&sheet);
+}
+
+}  // namespace
+
 void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last)
 {
-    if (sheet == nullptr)
-        return;
-    if (sheet->type == symmetric_matrix_sheet) {
-        for (Column* column = sheet->last_column; column != nullptr;) {
-            Column* const before = column->prev;
-            if (column->type != row_column && (column->index < first || column->index > last))
-                Delete_Column(column, true);
-            column = before;
-        }
-        return;
-    }
-    for (Column *column = sheet->first_column, *next; column != nullptr; column = next) {
-        next = column->next;
-        if (column->type == row_column || (column->index >= first && column->index <= last))
-            continue;
-        Unlink(sheet->first_column, sheet->last_column, column);
-        Count_Column(*sheet, *column, -1);
-        Free_Column(*sheet, column);
-    }
-    Renumber_Columns(*sheet);
-    if (sheet->label_state == 0)
-        Number_Matrix_Columns(sheet);
+    if (sheet != nullptr)
+        Delete_Columns(*sheet, [first, last](const Column& column) {
+            return column.index < first || column.index > last;
+        });
+}
+
+void Keep_Columns(Sheet* sheet, const std::vector<bool>& wanted)
+{
+    if (sheet != nullptr)
+        Delete_Columns(*sheet, [&wanted](const Column& column) {
+            const auto place = static_cast<std::size_t>(column.index) - 1;
+            return place >= wanted.size() || !wanted[place];
+        });
 }
 
 bool Delete_Empty_Columns(Sheet* sheet)
@@ -526,22 +543,8 @@ bool Delete_Empty_Columns(Sheet* sheet)
         return true;
     if (Find_Empty_Columns(sheet, true) == 0)
         return true;
-    for (Column* column = sheet->last_column; column != nullptr && column->type != row_column;) {
-        Column* const empty = std::exchange(column, column->prev);
-        if (empty->all_empty == 0 || empty->protected_column != 0)
-            continue;
-        if (empty->type == symmetric_matrix_column) {
-            Delete_Column(empty, true);
-            continue;
-        }
-        // Without the renumbering of `Delete_Column`: a wide sheet may lose thousands.
-        Unlink(sheet->first_column, sheet->last_column, empty);
-        Count_Column(*sheet, *empty, -1);
-        Free_Column(*sheet, empty);
-    }
-    Renumber_Columns(*sheet);
-    if (sheet->label_state == 0)
-        Number_Matrix_Columns(sheet);
+    Delete_Columns(
+        *sheet, [](const Column& column) { return column.all_empty != 0 && column.protected_column == 0; });
     return true;
 }
 

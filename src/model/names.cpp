@@ -5,6 +5,7 @@
 #include "support/windows_1252.h"
 
 #include <algorithm>
+#include <utility>
 #include <vector>
 
 namespace ingester {
@@ -353,6 +354,40 @@ bool Cut_End_Mark(std::string& name, std::string_view marks)
 }
 
 }  // namespace
+
+Name_Marks Read_Name_Marks(std::string_view name)
+{
+    constexpr std::pair<char, std::int32_t> type_marks[] = {
+        {'!', factor_column}, {'#', variate_column}, {'$', text_column}};
+    Name_Marks marks;
+    marks.date = Find_Ignoring_Case(name, ":D") != std::string_view::npos;
+    marks.time = !marks.date && Find_Ignoring_Case(name, ":T") != std::string_view::npos;
+    for (bool found = true; std::exchange(found, false);) {
+        for (const auto& [mark, type] : type_marks)
+            if (marks.type == 0 && name.ends_with(mark)) {
+                marks.type = type;
+                name.remove_suffix(1);
+                found = true;
+            }
+        if (name.size() < 2 || name[name.size() - 2] != ':')
+            continue;
+        const char c = To_Upper(name.back());
+        if (c != 'D' && c != 'T' && c != 'E' && !Is_Digit(c))
+            continue;
+        marks.exponent = marks.exponent || c == 'E';
+        if (Is_Digit(c))
+            marks.decimals = c - '0';
+        name.remove_suffix(2);
+        found = true;
+    }
+    return marks;
+}
+
+std::string Name_In_Lists(const std::string& name)
+{
+    const bool quoted = name.find(Quoted_Open) != std::string::npos;
+    return name.empty() || quoted ? name : Make_Valid_Name(name);
+}
 
 std::string Strip_Name_Mark(std::string_view name)
 {

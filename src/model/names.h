@@ -37,6 +37,20 @@ void Reset_Name_Counters();
 /// number, and their old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
 void Make_Column_Names_Unique(Sheet* sheet);
 
+/// The marks of a name, which tell what becomes of its column.
+struct Name_Marks {
+    bool date = false;           ///< ":D"
+    bool time = false;           ///< ":T", where no ":D" stands
+    bool exponent = false;       ///< ":E" at the end
+    std::int32_t decimals = -1;  ///< ":n" at the end, a digit; -1 for none
+    std::int32_t type = 0;       ///< at the end: "!" Factor, "#" Variate, "$" Text; 0 for none
+};
+[[nodiscard]] Name_Marks Read_Name_Marks(std::string_view name);
+
+/// A name that a list gives, as a Column would bear it. Those with a quoted suffix are left alone: cleaning
+/// numbers them.
+[[nodiscard]] std::string Name_In_Lists(const std::string& name);
+
 /// `name` without its marks: every ":D" and ":T" (in either case), and at the end one "!", "#" or "$" and
 /// one ":E" or ":" with a digit.
 [[nodiscard]] std::string Strip_Name_Mark(std::string_view name);

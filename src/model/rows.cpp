@@ -169,6 +169,78 @@ bool Delete_Row(Sheet* sheet, std::int32_t index, bool keep_square)
     return true;
 }
 
+namespace {
+
+/// Unlinks the cells of rows whose flag is 0, in one sweep.
+void Keep_Cells(Column& column, std::span<const std::int32_t> flags)
+{
+    column.cursor_node = nullptr;
+    column.cursor_index = -1;
+    std::size_t row = 0;
+    for (Cell_Node *cell = column.first_cell, *next; cell != nullptr; cell = next, ++row) {
+        next = cell->next;
+        if (row < flags.size() && flags[row] != 0)
+            continue;
+        Unlink(column.first_cell, column.last_cell, cell);
+        --column.length;
+    }
+}
+
+void Keep_Row_Nodes(Sheet& sheet, std::span<const std::int32_t> flags)
+{
+    sheet.cursor_row = nullptr;
+    sheet.cursor_row_index = -1;
+    std::size_t index = 0;
+    for (Row_Node *row = sheet.first_row, *next; row != nullptr; row = next, ++index) {
+        next = row->next;
+        if (index < flags.size() && flags[index] != 0)
+            continue;
+        sheet.restricted_rows -= row->restricted != 0 ? 1 : 0;
+        Unlink(sheet.first_row, sheet.last_row, row);
+        --sheet.row_count;
+    }
+}
+
+/// Row numbers run 1..N, so the `Row` column loses cells at its end.
+void Shorten_Row_Numbers(Sheet& sheet)
+{
+    while (sheet.first_column->length > sheet.row_count)
+        Remove_Cell(sheet.first_column, sheet.first_column->length - 1);
+}
+
+void Delete_Square_Rows(Sheet& sheet, std::span<const std::int32_t> flags)
+{
+    for (std::int32_t row = sheet.row_count - 1; row >= 0; --row)
+        if (static_cast<std::size_t>(row) >= flags.size() || flags[static_cast<std::size_t>(row)] == 0)
+            Delete_Row(&sheet, row, true);
+}
+
+}  // namespace
+
+bool Keep_Rows(Sheet* sheet, std::span<const std::int32_t> flags)
+{
+    if (sheet == nullptr || sheet->type == scalar_sheet)
+        return false;
+    const auto rows = static_cast<std::size_t>(std::max(sheet->row_count, 0));
+    const auto listed = flags.first(std::min(rows, flags.size()));
+    const auto dropped = static_cast<std::size_t>(std::ranges::count(listed, 0)) + (rows - listed.size());
+    if (dropped == rows || !Need_Rows(sheet))
+        return false;
+    if (dropped == 0)
+        return true;
+    if (sheet->type == symmetric_matrix_sheet) {
+        Delete_Square_Rows(*sheet, listed);
+        return true;
+    }
+    Keep_Row_Nodes(*sheet, listed);
+    Shorten_Row_Numbers(*sheet);
+    for (Column* column = sheet->first_column->next; column != nullptr; column = column->next)
+        Keep_Cells(*column, listed);
+    sheet->current_row = std::min(sheet->current_row, sheet->row_count - 1);
+    sheet->top_row = std::min(sheet->top_row, sheet->row_count - 1);
+    return true;
+}
+
 bool Cell_Is_Present(const Column& column, const Cell_Node& cell)
 {
     if (Is_Text_Like(column.type))

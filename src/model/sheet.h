@@ -10,8 +10,10 @@
 #include "support/fixed_text.h"
 
 #include <cstdint>
+#include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace ingester {
 
@@ -132,7 +134,7 @@ struct Sheet : Sheet_Host_Fields {
     std::int32_t title_bytes = 0;
     Fixed_Text<Name_Width> structure_name;
     Fixed_Text<Name_Width> row_label_name;
-    Fixed_Text<Name_Width> column_label_name;
+    Fixed_Text<Extra_Width> column_label_name;
     Fixed_Text<280> source_file;
     Fixed_Text<Text_Cell_Width> margin_label = "Margin";
     std::int32_t format_version = 0;
@@ -248,6 +250,8 @@ bool Delete_Empty_Columns(Sheet* sheet);
 /// Deletes the columns whose index is below `first` or above `last`; never the `Row` column. Of a
 /// Symmetric Matrix their rows go as well.
 void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last);
+/// The same for the columns whose flag, in the order of their places, is off or isn't there.
+void Keep_Columns(Sheet* sheet, const std::vector<bool>& wanted);
 
 /// Frees the cells of a list: kind 90 the level values, 91 the labels, all others the cells.
 void Free_Cell_Nodes(Column* column, std::int32_t kind);
@@ -270,6 +274,9 @@ bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool k
 bool Remove_Cell(Column* column, std::int32_t index);
 /// Not the last row of a Sheet, and none of a Scalar Sheet.
 bool Delete_Row(Sheet* sheet, std::int32_t index, bool keep_square);
+/// Deletes the rows whose flag, in the order of the rows, is 0 or isn't there; of a Symmetric Matrix
+/// their columns go as well. False when nothing would be left, or in a Scalar Sheet: then all stay.
+bool Keep_Rows(Sheet* sheet, std::span<const std::int32_t> flags);
 
 /// Mark what holds no data, and count it.
 std::int32_t Find_Empty_Rows(Sheet* sheet, bool also_columns);

@@ -105,6 +105,7 @@ TEST_F(Command_Test, Converts)
     const std::string tail = Crops_Tab.substr(Crops_Tab.find("2\trye"));
     const std::string head = "plot\tkind\tyield\r\n1\toats\t2.5\r\n";
     Put("few.csv", "x,y\n1,oats\n");
+    Put("rows.txt", "# the good ones\n1\n\n 3 - 9\r\n");
     const std::tuple<Texts, const char*, std::string> cases[] = {
         {{"crops.csv", "out.tab"}, "out.tab", Crops_Tab},
         {{"my data/crops 1.csv", "my data/out 1.tab"}, "my data/out 1.tab", Crops_Tab},
@@ -118,6 +119,18 @@ TEST_F(Command_Test, Converts)
          "C1\tC2\r\nx\ty\r\n1\toats\r\n"},
         {{"crops.csv", "m.tab", "--missing", "oats"}, "m.tab", "plot\tkind\tyield\r\n1\t\t2.5\r\n" + tail},
         {{"--force", "crops.csv", "old.tab"}, "old.tab", Crops_Tab},
+        {{"crops.csv", "k.tab", "--keep", "yield,plot", "--rename", "plot=Block", "--type=plot=factor"},
+         "k.tab",
+         "Block!\tyield\r\n1\t2.5\r\n2\t*\r\n3\t4\r\n"},
+        {{"crops.csv", "n.tab", "--keep=3,1-1", "--rows", "rows.txt"},
+         "n.tab",
+         "plot\tyield\r\n1\t2.5\r\n3\t4\r\n"},
+        {{"crops.csv", "d.tab", "--drop", "kind, yield", "--type", "plot=date", "--rows", "rows.txt"},
+         "d.tab",
+         "plot:D\r\n01/03/1600\r\n03/03/1600\r\n"},
+        {{"-", "s.tab", "--rename", "plot=kind,kind=plot", "--drop=yield", "--type", "plot=text"},
+         "s.tab",
+         "kind\tplot\r\n1\toats\r\n2\trye\r\n3\tbarley\r\n"},
     };
     for (const auto& [arguments, output, text] : cases) {
         const Ran ran = Run(arguments);
@@ -161,8 +174,32 @@ TEST_F(Command_Test, Tells_What_It_Would_Send_And_What_It_Can)
               std::string::npos);
 }
 
+TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
+{
+    std::ifstream read_me(INGESTER_DOCS "/../README.md");
+    int examples = 0;
+    for (std::string line; std::getline(read_me, line);) {
+        if (line.find("ingester crops.csv ") == std::string::npos && !line.starts_with("ingester raw.csv "))
+            continue;
+        ++examples;
+        std::filesystem::remove_all(Path("try"));
+        std::filesystem::create_directory(Path("try"));
+        for (const char* const file : {"crops.csv", "raw.csv", "out.tab"})
+            Put(std::string("try/") + file, file[0] == 'r' ? "1,2,3\n4,5,6\n" : Crops);
+        Put("try/plots.txt", "1-2\n");
+        if (line.find("--force") == std::string::npos)
+            std::filesystem::remove(Path("try/out.tab"));
+        const std::string command = std::filesystem::path(INGESTER_COMMAND).parent_path().string();
+        const std::string words = "cd '" + Path("try") + "' && PATH='" + command + "':$PATH && TMPDIR=. && ("
+                                  + line + "\n) >shown 2>&1";
+        EXPECT_EQ(std::system(words.c_str()), 0) << line << "\n" << Get("try/shown");
+    }
+    EXPECT_GT(examples, 8);
+}
+
 TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
 {
+    Put("my data/crops 1.var", "*\n");
     Put("folder/odd.bin", std::string("\1\2\3\4 no text\n", 13));
     const std::string files = Files();
     const std::string many(1110, 'x');
@@ -194,6 +231,14 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {Wrong_Command_Line,
          "--separators: the value is empty",
          {"crops.csv", "out.tab", "--separators", ""}},
+        {Wrong_Command_Line, "is not of the form OLD=NEW", {"crops.csv", "out.tab", "--rename", "a"}},
+        {Wrong_Command_Line, "can't be the name", {"crops.csv", "out.tab", "--rename", "kind=*"}},
+        {Wrong_Command_Line, "can't be the name", {"crops.csv", "out.tab", "--rename", "kind=a:D"}},
+        {Wrong_Command_Line, "factor, text", {"crops.csv", "out.tab", "--type", "kind=whole"}},
+        {Wrong_Command_Line, "line 1 of crops.csv", {"crops.csv", "out.tab", "--rows", "crops.csv"}},
+        {Wrong_Command_Line, "none can't be opened", {"crops.csv", "out.tab", "--rows", "none"}},
+        {Wrong_Command_Line, "beside the input", {"my data/crops 1.csv", "out.tab", "--drop", "kind"}},
+        {13, "no columns or rows", {"crops.csv", "out.tab", "--keep", "none"}},
         {2, "no/crops.csv", {"no/crops.csv", "out.tab"}},
         {2, "no/crops.csv", {"no/crops.csv", "old.tab", "--force"}},
         {3, "folder/odd.bin", {"folder/odd.bin", "out.tab"}},

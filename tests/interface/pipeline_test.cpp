@@ -145,9 +145,6 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv/c=4", f + "o.tab"},
          5,
          "Error: Data contains fewer columns than first column to be kept.\n" + removed},
-        {{f + "c.csv/csv=0/w/v", f + "o.tab"},
-         5,
-         "CSV number of lines per record (0) is invalid.\nRenaming columns by a list file" + missing},
         {{f + "c.csv/tr", f + "o.tab"}, 5, "Transposing" + missing},
         {{f + "c.csv", f + "o.tab/@,k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
@@ -166,8 +163,6 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         for (std::size_t i = 0; i < files.size(); i += 2)
             EXPECT_EQ(Get(files[i]), files[i + 1]);
     }
-    EXPECT_EQ(Call({f + "c.csv", "o.tab", "", "", f + "empty.csv/s"}),
-              (Host_Answer{5, "Keeping a subset" + missing + ":\n"}));
 }
 
 TEST_F(Pipeline_Test, A_List_Of_The_Columns_Is_Written_Beside_The_Output)

@@ -1,5 +1,6 @@
 #include "support/check_sheet.h"
 
+#include "hostfiles/shared/host_sheet.h"
 #include "model/factors.h"
 
 #include <cmath>
@@ -7,6 +8,14 @@
 namespace ingester {
 
 namespace {
+
+/// The margin of a Table is one level more, and genotypes keep their level whatever labels there are.
+double Greatest_Level(const Column& column)
+{
+    const Sheet& sheet = *column.sheet;
+    const double levels = column.nlevels + (sheet.type == table_sheet && sheet.has_margins != 0 ? 1.0 : 0.0);
+    return column.factor_recoded != 0 ? std::max<double>(levels, Greatest_Genotype_Level) : levels;
+}
 
 class Checker {
 public:
@@ -59,8 +68,7 @@ void Checker::Check_Cell(const Column& column, const Cell_Node& cell, std::int64
         Expect(cell.value.text[cell.Text().size()] == '\0', "an open text in cell", index);
     } else if (column.type == factor_column && !(cell.value.number < 1.0)) {
         const double level = cell.value.number;
-        const bool margin = column.sheet->type == table_sheet && column.sheet->has_margins != 0;
-        Expect(level <= column.nlevels + (margin ? 1 : 0) && level == std::floor(level), "no such level in cell", index);
+        Expect(level <= Greatest_Level(column) && level == std::floor(level), "no such level in cell", index);
     }
 }
 
@@ -72,11 +80,15 @@ void Checker::Check_Column(const Sheet& sheet, const Column& column, std::int64_
     Expect(column.sheet == &sheet, "belongs to another Sheet", index);
     Expect(column.type != unbuffered_text_column, "has a type that is asked for, never stored", index);
     Expect(column.type == row_column || !column.name.empty(), "has no name", index);
-    // A Symmetric Matrix column begins at the diagonal; all others have a cell for every row.
+    // A Symmetric Matrix column begins at the diagonal; all others have a cell for every row, but that
+    // columns of the host's files may end earlier in a Vector.
     std::int64_t rows = column.type == row_column && sheet.rows_due ? 0 : sheet.row_count;
     if (column.type == symmetric_matrix_column)
         rows += sheet.leading_columns - column.index;
-    Expect(column.length == rows || (column.length <= 0 && rows <= 0), "has the length", column.length);
+    const bool may_be_short = sheet.type == vector_sheet && sheet.has_short_columns != 0;
+    Expect(column.length == rows || (column.length <= 0 && rows <= 0)
+               || (may_be_short && column.length < rows),
+           "has the length", column.length);
     const Cell_Node* const last =
         Check_List(column.first_cell, std::max(column.length, 0), column.cursor_node, column.cursor_index);
     Expect(column.last_cell == last, "another last node than", column.length);

@@ -29,7 +29,8 @@ bool Is_Missing_In_File(double value, double sheet_missing)
 
 double Missing_Marker(double value)
 {
-    return std::isfinite(value) && value < 0.0 ? value : Missing_Value;
+    constexpr double first_level = 1.0;
+    return std::isfinite(value) && value < first_level ? value : Missing_Value;
 }
 
 std::int32_t Label_State_In_File(const Sheet& sheet)

@@ -17,13 +17,18 @@ std::int32_t Row_Selection::Count(std::int32_t rows) const
                                      - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
 }
 
+std::string Valid_Name_Of_No_Column(std::string_view name)
+{
+    std::string valid = Make_Valid_Name(name);
+    Remember_Bracket_Text({});
+    return valid;
+}
+
 bool Is_Column_Selected(std::int32_t ordinal, std::string_view name)
 {
-    const std::string wanted = request.Subset_By_Number ? std::to_string(ordinal) : Make_Valid_Name(name);
-    const bool found = std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
-    if (!found)
-        Remember_Bracket_Text({});  // of a name that no Column gets
-    return found;
+    const std::string wanted =
+        request.Subset_By_Number ? std::to_string(ordinal) : Valid_Name_Of_No_Column(name);
+    return std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
 }
 
 bool Select_Symmetric(Sheet& sheet)

@@ -25,6 +25,9 @@ struct Row_Selection {
     [[nodiscard]] std::int32_t Count(std::int32_t rows) const;
 };
 
+/// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
+[[nodiscard]] std::string Valid_Name_Of_No_Column(std::string_view name);
+
 /// Whether the request's list of columns has a name, or a number.
 [[nodiscard]] bool Is_Column_Selected(std::int32_t ordinal, std::string_view name);
 

@@ -37,7 +37,8 @@ bool Read_Magic(TSS_Source& source)
                 source.order = last_order = order;
                 return true;
             }
-    if (!Is_Sheet_Type(Number_At<std::int32_t>(bytes)))
+    if (!Is_Sheet_Type(Number_At<std::int32_t>(bytes, std::endian::native))
+        && !Is_Sheet_Type(Number_At<std::int32_t>(bytes, last_order)))
         return Fail("Spreadsheet Read Error: This file is not a Tabulon spreadsheet.\n");
     source.order = last_order;
     return source.File().Seek(start);
@@ -67,8 +68,8 @@ bool Read_Head(TSS_Reading& reading)
     Limit_Columns(reading);
     if (head.row_count < 0)
         return Fail("Spreadsheet Read Error: Number of rows should be positive.\n");
-    if (head.sheet_type == symmetric_matrix_sheet && head.column_count != head.row_count
-        && head.column_count - 1 != head.row_count)
+    const std::int64_t beyond_square = std::int64_t{head.column_count} - head.row_count;
+    if (head.sheet_type == symmetric_matrix_sheet && beyond_square != 0 && beyond_square != 1)
         return Fail("Spreadsheet Read Error: Symmetric Matrix is not symmetric.\n");
     return complete;
 }
@@ -93,11 +94,13 @@ bool Start_Sheet(TSS_Reading& reading)
     sheet->read_only = head.read_only != 0;
     sheet->host_flag_b = Has_Flag(reading, host_flag_b_bit);
     sheet->host_flag_c = Has_Flag(reading, host_flag_c_bit);
-    sheet->table_in_columns = sheet->type == table_sheet && Has_Flag(reading, table_in_columns_bit);
+    sheet->table_in_columns = Has_Flag(reading, table_in_columns_bit);
     // The rows and columns of a Symmetric Matrix go together, so they are left out when all is read.
     const bool symmetric = sheet->type == symmetric_matrix_sheet;
     reading.selects_columns = request.Subset_Columns && !symmetric;
-    reading.rows = {request.Subset_Rows && !symmetric, request.Subset_Row_Flags};
+    const std::span<const std::int32_t> flags = request.Subset_Row_Flags;
+    const auto rows = static_cast<std::size_t>(head.row_count);
+    reading.rows = {request.Subset_Rows && !symmetric, flags.first(std::min(flags.size(), rows))};
     Expect_Rows(sheet, reading.rows.Count(head.row_count));
     return true;
 }
@@ -112,7 +115,7 @@ bool Read_Variate_Pointer(TSS_Reading& reading)
         return false;
     if (length > greatest_length)
         Report_Message("Pointer to Variate columns was truncated in reading TSS file.\n");
-    return length == 0 || Define_Pointer(reading.sheet, Make_Valid_Name(name), variates);
+    return length == 0 || Define_Pointer(reading.sheet, Valid_Name_Of_No_Column(name), variates);
 }
 
 // --- Blocks of the Sheet types -----------------------------------------------------------------------
@@ -162,7 +165,7 @@ std::string Factor_Name(const std::string& name)
 {
     const bool made_up =
         name.starts_with("vclass['classification'][") || name.starts_with("*['classification'][");
-    return made_up ? Default_Column_Name(0) : Make_Valid_Name(name);
+    return made_up ? Default_Column_Name(0) : Valid_Name_Of_No_Column(name);
 }
 
 bool Read_Table_Names(TSS_Reading& reading)

@@ -1,11 +1,14 @@
 // What the steps of the reader hand to each other.
 #pragma once
 
+#include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/shared/selection.h"
 #include "hostfiles/tss/tss_format.h"
 #include "hostfiles/tss/tss_source.h"
 
 #include <cstdint>
+#include <string>
+#include <string_view>
 #include <vector>
 
 namespace ingester {
@@ -23,6 +26,12 @@ struct TSS_Reading {
 
 /// Reads the record of column `ordinal`. False where the columns end, silently.
 [[nodiscard]] bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal);
+
+/// A number of the file, with the Sheet's own mark for "missing".
+[[nodiscard]] inline double Clean_Number(double value, double missing)
+{
+    return !Is_Surely_Present(value) && Is_Missing_In_File(value, missing) ? missing : value;
+}
 
 /// Reads what the head announces behind the columns, up to a fault. False for a fault that leaves no Sheet.
 [[nodiscard]] bool Read_Auxiliary_Records(TSS_Reading& reading);

@@ -1,5 +1,4 @@
 // The records of columns.
-#include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss_reader.h"
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
@@ -92,7 +91,8 @@ bool Length_Fits(const TSS_Reading& reading, std::int32_t length, std::int32_t o
 bool Read_Texts_And_Display(TSS_Source& source, Column_Record& record)
 {
     std::int32_t length;
-    if (!source.Read(length) || length <= 0 || !source.Read_Bytes(length, Name_Width, record.name))
+    if (!source.Read(length) || length <= 0 || !source.Read_Bytes(length, Name_Width, record.name)
+        || record.name.front() == '\0')
         return false;
     if (source.version >= 3 && !source.Read_Text(Extra_Width, record.description))
         return false;
@@ -105,8 +105,7 @@ bool Read_Texts_And_Display(TSS_Source& source, Column_Record& record)
 bool Settle_Display(Column_Record& record)
 {
     Display_Record& display = record.display;
-    if (display.format < 0 || display.format > date_format_mark || display.justify < default_side
-        || display.justify > centred)
+    if (display.format > date_format_mark || display.justify < default_side || display.justify > centred)
         return false;
     if (display.format == 0)
         display.format = significant_digits_format;
@@ -195,11 +194,6 @@ bool Skip_TSS_Data(TSS_Source& source, const Column_Record& record)
 
 // --- Levels ------------------------------------------------------------------------------------------
 
-double Clean_Number(double value, double missing)
-{
-    return !Is_Surely_Present(value) && Is_Missing_In_File(value, missing) ? missing : value;
-}
-
 bool Read_Level_Values(TSS_Source& source, Column& column, std::int32_t count)
 {
     std::vector<double> values;
@@ -270,8 +264,11 @@ void Drop_Margin_Level(Sheet& sheet, Column& column)
     --column.nlevels;
     if (column.level_values_count > 0)
         Drop_Last(column.level_values, column.level_values_count);
-    if (column.label_count > 0)
-        sheet.margin_label = Text_Arena::View(Drop_Last(column.labels, column.label_count).text);
+    if (column.label_count == 0)
+        return;
+    const std::string_view label = Text_Arena::View(Drop_Last(column.labels, column.label_count).text);
+    if (!label.empty())
+        sheet.margin_label = label;
 }
 
 // --- Cells -------------------------------------------------------------------------------------------
@@ -371,10 +368,13 @@ bool Read_TSS_Cells(TSS_Reading& reading, Column& column, std::int32_t count, st
 }
 
 /// The columns of all Sheets but Vectors have a cell for every row.
-bool Is_Of_Full_Length(const Column& column)
+bool Is_Length_Lawful(const Column& column)
 {
-    const Sheet& sheet = *column.sheet;
-    return sheet.type == vector_sheet || column.length == Cells_For_Rows(column, sheet.row_count);
+    Sheet& sheet = *column.sheet;
+    const bool short_column = column.length != Cells_For_Rows(column, sheet.row_count);
+    if (short_column && sheet.type == vector_sheet)
+        sheet.has_short_columns = 1;
+    return !short_column || sheet.type == vector_sheet;
 }
 
 // --- Width -------------------------------------------------------------------------------------------
@@ -441,7 +441,8 @@ void Set_Column_Fields(const TSS_Reading& reading, Column& column, const Column_
     constexpr std::int32_t most_fixed_decimals = 9;
     const Display_Record& display = record.display;
     const bool fixed = display.format <= significant_digits_format && record.decimals <= most_fixed_decimals;
-    column.format = fixed ? fixed_format : display.format;
+    if (fixed || display.format > 0)
+        column.format = fixed ? fixed_format : display.format;
     column.decimals = record.decimals;
     column.justify = display.justify;
     column.protected_column = static_cast<std::int16_t>(display.flags_word);
@@ -481,7 +482,7 @@ bool Fill_TSS_Column(TSS_Reading& reading, Column& column, const Column_Record& 
     if (!Read_Levels(reading.source, column, record))
         return false;
     Set_Table_Column(column, record);
-    if (!Read_TSS_Cells(reading, column, record.length, text_width) || !Is_Of_Full_Length(column))
+    if (!Read_TSS_Cells(reading, column, record.length, text_width) || !Is_Length_Lawful(column))
         return false;
     if (column.type == factor_column)
         Drop_Margin_Level(*reading.sheet, column);

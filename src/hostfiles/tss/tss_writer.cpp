@@ -9,6 +9,13 @@
 
 namespace ingester {
 
+std::string_view Name_For_File(Fixed_Text<Name_Width>& name)
+{
+    if (name.empty())
+        name = Make_Valid_Name({});
+    return name;
+}
+
 namespace {
 
 void Write_Head(const Sheet& sheet, TSS_Sink& sink)
@@ -24,14 +31,6 @@ void Write_Head(const Sheet& sheet, TSS_Sink& sink)
     };
     sink.Put(static_cast<std::int32_t>(TSS_Magics[0].word));
     sink.Put(head, Head_Fields);
-}
-
-/// The reader refuses an empty name.
-std::string_view Name_For_File(Fixed_Text<Name_Width>& name)
-{
-    if (name.empty())
-        name = Make_Valid_Name({});
-    return name;
 }
 
 void Write_Table_Block(Sheet& sheet, TSS_Sink& sink)

@@ -35,6 +35,9 @@ private:
     Output_File* file_;
 };
 
+/// A name, made up when it is empty: the reader refuses an empty one.
+[[nodiscard]] std::string_view Name_For_File(Fixed_Text<Name_Width>& name);
+
 /// Writes the record of a column.
 void Write_TSS_Column(Column& column, TSS_Sink& sink);
 

@@ -253,6 +253,16 @@ void Write_Cell_Colours(Sheet& sheet, TSS_Sink& sink)
     });
 }
 
+/// One for each level; where a Factor has more levels than a list of it, no more than it holds: the number
+/// of levels alone costs a file nothing.
+std::int32_t Colours_To_Write(const Column& column)
+{
+    const auto held = static_cast<std::int32_t>(column.factor_colours.size());
+    return held == 0
+               ? 0
+               : std::min(column.nlevels, std::max({held, column.label_count, column.level_values_count}));
+}
+
 void Write_Factor_Colours(Sheet& sheet, TSS_Sink& sink)
 {
     Write_Columns(sheet, sink, Has_Factor_Colours, [&](Column& column) {
@@ -263,11 +273,10 @@ void Write_Factor_Colours(Sheet& sheet, TSS_Sink& sink)
         sink.Put(column.colour_source == nullptr ? 0 : column.colour_source->index);
         if (column.type != factor_column)
             return;
-        std::vector<std::int32_t> colours = column.factor_colours;
-        colours.resize(colours.empty() ? 0 : static_cast<std::size_t>(std::max(column.nlevels, 0)));
-        sink.Put(static_cast<std::int32_t>(colours.size()));
-        for (const std::int32_t colour : colours)
-            sink.Put(colour);
+        const std::int32_t count = Colours_To_Write(column);
+        sink.Put(count);
+        for (std::size_t level = 0; level < static_cast<std::size_t>(count); ++level)
+            sink.Put(level < column.factor_colours.size() ? column.factor_colours[level] : 0);
     });
 }
 

@@ -5,6 +5,7 @@
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "interface/slash_options.h"
+#include "interface/var_file.h"
 #include "model/sheet.h"
 #include "platform/files.h"
 #include "spreadsheet/text/text.h"
@@ -272,6 +273,13 @@ Request_Status Know_Host_Scratch_File(Request_Run& run)
     return Done;
 }
 
+Request_Status Take_Wanted_Types(Request_Run&)
+{
+    if (request.Use_Var_File)
+        Read_Var_File(request.Var_File_Name);
+    return Done;
+}
+
 Request_Status Require_Output_Folder(Request_Run& run)
 {
     const std::string folder(Folder_Of(run.outfile));
@@ -319,9 +327,7 @@ struct Missing_Operation {
 
 constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
-    {[](const Request_Run&) { return request.Subset_Columns || request.Subset_Rows; }, "Keeping a subset"},
     {[](const Request_Run&) { return request.Transpose; }, "Transposing"},
-    {[](const Request_Run&) { return request.Use_Var_File; }, "Renaming columns by a list file"},
     {[](const Request_Run& run) {
          return request.Add_Mode != Add_Modes::none
                 || (request.Add_To_Output && run.output_code != book_file);

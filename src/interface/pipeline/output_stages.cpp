@@ -4,7 +4,7 @@
 #include "interface/file_detection.h"
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
-#include "interface/selection.h"
+#include "interface/var_file.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
 
@@ -36,8 +36,7 @@ Request_Status Name_Temporary_Output(Request_Run& run)
 Request_Status Make_Output_Form(Request_Run& run)
 {
     const bool host_file = run.output_code == spreadsheet_file || run.output_code == book_file;
-    const bool from_host_file = request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
-    if (host_file && !from_host_file)
+    if (host_file && !A_Host_File_Was_Read())
         Vector_To_Scalars(Current_Sheet);
     if (request.Output_Matrix && (host_file || run.output_code == script_file))
         Vector_To_Matrix(Current_Sheet, request.Output_Matrix_Name);

@@ -3,6 +3,7 @@
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "interface/selection.h"
+#include "interface/var_file.h"
 #include "model/names.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
@@ -15,16 +16,20 @@ namespace ingester {
 
 namespace {
 
+constexpr const char* No_Columns_Selected =
+    "No columns selected from input file (i.e. no matches to specified names).\n";
+constexpr const char* No_Rows_Selected =
+    "No rows selected from input file (i.e. no matches to specified rows).\n";
+
 /// The host's own files are narrowed while they are read, so that nothing may be left of them.
 void Tell_No_Import()
 {
-    const bool host_file = request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
-    if (!host_file)
+    if (!A_Host_File_Was_Read())
         Report_Message("No data could be imported.\n");
     else if (request.Subset_Columns)
-        Report_Message("No columns selected from input file (i.e. no matches to specified names).\n");
+        Report_Message(No_Columns_Selected);
     else if (request.Subset_Rows)
-        Report_Message("No rows selected from input file (i.e. no matches to specified rows).\n");
+        Report_Message(No_Rows_Selected);
 }
 
 }  // namespace
@@ -81,9 +86,24 @@ Request_Status List_Sheets(Request_Run&)
     return Done;
 }
 
-Request_Status Drop_Empty_Columns(Request_Run& run)
+Request_Status Keep_Subset(Request_Run& run)
 {
     request.Current_File_Name = run.outfile;
+    if (!request.Subset_Columns && !request.Subset_Rows)
+        return Done;
+    switch (Apply_Subset(Current_Sheet)) {
+    case Subset_Result::no_columns:
+        return Stop(Request_Status::nothing_selected, No_Columns_Selected);
+    case Subset_Result::no_rows:
+        return Stop(Request_Status::nothing_selected, No_Rows_Selected);
+    case Subset_Result::kept:
+        break;
+    }
+    return Done;
+}
+
+Request_Status Drop_Empty_Columns(Request_Run&)
+{
     if (request.Keep_Empty_Columns)
         return Done;
     Delete_Empty_Columns(Current_Sheet);
@@ -95,6 +115,21 @@ Request_Status Drop_Empty_Columns(Request_Run& run)
 Request_Status Note_Source(Request_Run& run)
 {
     Current_Sheet->source_file = run.Source();
+    return Done;
+}
+
+/// Without the list that was asked for, one is made that a user can fill in.
+Request_Status Change_By_List(Request_Run& run)
+{
+    if (!request.Use_Var_File)
+        return Done;
+    const bool changed = Apply_Var_File(Current_Sheet, request.Var_File_Name);
+    if (changed && run.host_scratch)
+        Delete_File(request.Var_File_Name);
+    else if (!changed)
+        Write_Var_File(*Current_Sheet, request.Var_File_Name);
+    if (Current_Sheet->column_count < 1)
+        return Stop(Request_Status::no_data, "All columns in the input file are empty.\n");
     return Done;
 }
 

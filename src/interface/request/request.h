@@ -55,8 +55,11 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<Short_Name_Width> Source_Base_Name;  ///< input name without folder and extension
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
-    std::int32_t Content_Code = 0;  ///< file-type code of what was read, of a compressed file what it holds
+    bool Columns_Were_Selected = false;  ///< by the reader: the Sheet holds those of the subset only
+    std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
+    std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place
+    bool Dates_From_1904 = false;                   ///< the dates of what was read count from then
     std::int32_t Max_Columns = Default_Max_Columns;
     Fixed_Text<60> Return_Delete_Marker = "T181D";  ///< starts the host's scratch names
     bool Names_Kept_As_They_Stand = false;          ///< `Make_Valid_Name` leaves names alone

@@ -5,6 +5,7 @@
 #include "model/cell_text.h"
 #include "model/date_format.h"
 #include "model/names.h"
+#include "model/subset.h"
 #include "model/text_columns.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/number_text.h"
@@ -23,6 +24,7 @@ enum class Filling : std::uint8_t {
     numbers_so_far,  ///< undecided: numbers until a field says otherwise
     numbers,         ///< a Variate by its mark: what isn't a number is missing
     texts,
+    left_out,  ///< a Variate without cells, which goes when the text is read
 };
 
 struct Column_Filling {
@@ -32,6 +34,16 @@ struct Column_Filling {
     std::int64_t rows_to_redo = 0;  ///< rows filled with numbers before the column became Text
     Cell_Node* cell_to_redo = nullptr;
 };
+
+/// One trailing mark of a name has done its work when the scan is over.
+void Cut_Type_Mark(Column& column)
+{
+    const std::string_view name = column.name;
+    if (name.empty())
+        column.name = Default_Column_Name(0);
+    else if (name.find_last_of("!#$") == name.size() - 1)
+        column.name = std::string(name.substr(0, name.size() - 1));
+}
 
 constexpr std::int32_t New_Column_Width = 6;
 constexpr std::int64_t Spare_Rows = 8;
@@ -62,12 +74,17 @@ public:
 
     bool Fill();
 
+    /// Takes out the columns that the request leaves out.
+    void Drop_Left_Out();
+
 private:
     [[nodiscard]] std::int64_t Expected_Rows() const;
     void Limit_Rows();
     void Start_Column(Column& column, const Cell_Appender& cells);
     void Fill_Names();
     void Name_Column(std::size_t index, std::string_view text);
+    void Settle_Names();
+    void Leave_Out(Column_Filling& state, std::size_t index);
     bool Fill_Rows();
     void Finish_Rows(const char* last_line);
     void Report_Oddities() const;
@@ -99,6 +116,7 @@ private:
     std::int64_t row_limit_ = 0;
     const char* told_ = nullptr;  ///< how far progress has been told
     bool columns_full_ = false;
+    Column_Subset subset_;
     bool no_number_is_missing_;  ///< else one does by `Missing_Input_Text`, and all are looked at
     std::string undoubled_;
 };
@@ -136,8 +154,9 @@ void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
 {
     Column& column = *columns_[index].column;
     Column_Scan& scan = shape_.types[index];
-    scan.make_date = Find_Ignoring_Case(text, ":D") != std::string_view::npos;
-    scan.make_time = !scan.make_date && Find_Ignoring_Case(text, ":T") != std::string_view::npos;
+    const Name_Marks marks = Read_Name_Marks(text);
+    scan.make_date = marks.date;
+    scan.make_time = marks.time;
     column.name = Make_Valid_Name(Strip_Name_Mark(text));
     Use_Bracket_Text(column);
 }
@@ -155,6 +174,25 @@ void Sheet_Filler::Fill_Names()
             Name_Column(index, name);
         ++index;
     } while (walker_.Has_More());
+}
+
+/// The names as they will be, which is what a list of columns goes by.
+void Sheet_Filler::Settle_Names()
+{
+    for (Column_Filling& state : columns_)
+        Cut_Type_Mark(*state.column);
+    Make_Column_Names_Unique(&sheet_);
+    for (std::size_t index = 0; index < columns_.size(); ++index)
+        Leave_Out(columns_[index], index);
+}
+
+/// A column that nobody wants is not filled: its fields are only passed over.
+void Sheet_Filler::Leave_Out(Column_Filling& state, std::size_t index)
+{
+    if (subset_.Keeps(static_cast<std::int32_t>(index) + 1, state.column->name))
+        return;
+    state.filling = Filling::left_out;
+    shape_.types[index] = Column_Scan{};
 }
 
 /// A field's text, doubled quotes made single, cut and trimmed.
@@ -231,6 +269,8 @@ inline void Sheet_Filler::Fill_Number(const Text_Field& field, Column_Filling& s
 
 inline void Sheet_Filler::Append_Blank(Column_Filling& state)
 {
+    if (state.filling == Filling::left_out)
+        return;
     state.cells.Append(state.filling == Filling::texts ? empty_ : missing_);
 }
 
@@ -255,6 +295,9 @@ bool Sheet_Filler::Add_Late_Column()
     shape_.types.emplace_back();
     shape_.columns = number;
     Start_Column(*column, Cell_Appender(*column, row_ + Spare_Rows));
+    Leave_Out(columns_.back(), columns_.size() - 1);
+    if (columns_.back().filling == Filling::left_out)
+        return true;
     for (std::int64_t row = 0; row < row_; ++row)
         columns_.back().cells.Append(missing_);
     Limit_Rows();
@@ -274,9 +317,9 @@ void Sheet_Filler::Fill_Row()
             columns_[index + Columns_Ahead].cells.Prefetch();
         Column_Filling& state = columns_[index++];
         const Text_Field field = walker_.Next();
-        if (state.filling != Filling::texts)
+        if (state.filling < Filling::texts)
             Fill_Number(field, state);
-        else
+        else if (state.filling == Filling::texts)
             Fill_Text(field, *state.column, state.cells.Append(empty_));
     } while (walker_.Has_More());
     for (; index < columns_.size(); ++index)
@@ -388,11 +431,28 @@ void Sheet_Filler::Make_Dates()
     }
 }
 
+void Sheet_Filler::Drop_Left_Out()
+{
+    std::vector<bool> wanted;
+    std::vector<Column_Scan> types;
+    for (std::size_t index = 0; index < columns_.size(); ++index) {
+        wanted.push_back(columns_[index].filling != Filling::left_out);
+        if (wanted.back())
+            types.push_back(shape_.types[index]);
+    }
+    if (types.size() == columns_.size())
+        return;
+    Keep_Columns(&sheet_, wanted);
+    shape_.types = std::move(types);
+    shape_.columns = sheet_.column_count;
+}
+
 bool Sheet_Filler::Fill()
 {
     walker_.Go_To(walker_.First_Line());
     if (shape_.has_names)
         Fill_Names();
+    Settle_Names();
     const char* const first_row = walker_.Place();
     if (!Fill_Rows())
         return false;
@@ -424,7 +484,14 @@ Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type)
 bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
                      const Text_Buffer& buffer, File_Image* image)
 {
-    return sheet != nullptr && Sheet_Filler(*sheet, shape, options, buffer, image).Fill();
+    if (sheet == nullptr)
+        return false;
+    Sheet_Filler filler(*sheet, shape, options, buffer, image);
+    if (!filler.Fill())
+        return false;
+    filler.Drop_Left_Out();
+    request.Columns_Were_Selected = true;
+    return true;
 }
 
 }  // namespace ingester

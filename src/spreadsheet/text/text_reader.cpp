@@ -53,18 +53,6 @@ void Make_Factors(Sheet& sheet, const Text_Shape& shape, const Text_Scan_Options
     }
 }
 
-/// One trailing mark of a name has done its work when the types are set.
-void Cut_Type_Marks(Sheet& sheet)
-{
-    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
-        const std::string_view name = column->name;
-        if (name.empty())
-            column->name = Default_Column_Name(0);
-        else if (name.find_last_of("!#$") == name.size() - 1)
-            column->name = std::string(name.substr(0, name.size() - 1));
-    }
-}
-
 }  // namespace
 
 bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
@@ -82,7 +70,6 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image))
         return false;
     Make_Factors(*sheet, shape, options);
-    Cut_Type_Marks(*sheet);
     Make_Column_Names_Unique(sheet);
     Current_Sheet = sheet;
     return true;

@@ -1,11 +1,14 @@
 // The shape of a text: how many rows and columns, whether names come first, what the columns are.
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
+#include "model/names.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
 
 #include <algorithm>
+#include <optional>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 namespace ingester {
@@ -69,27 +72,53 @@ void Take_Name_Mark(std::string_view name, Column_Scan& column)
         column.type = variate_column;
 }
 
-/// The entry of the wanted types that speaks of a column: its place, or its place among the columns
-/// of the subset that the list was written for. Below 0 for none.
-std::int64_t Wanted_Entry(std::int32_t column, std::string_view name)
-{
-    if (!request.Subset_Columns)
-        return column;
-    for (std::size_t i = 0; i < request.Subset_Names.size(); ++i) {
-        const std::string& entry = request.Subset_Names[i];
-        if (request.Subset_By_Number ? Leading_Integer(entry) == column + 1 : entry == name)
-            return static_cast<std::int64_t>(i);
+/// Finds the entry of the wanted types that speaks of a column: by its name, by its place, or by its place
+/// among the columns of the subset that the list was written for.
+class Wanted_Entries {
+public:
+    Wanted_Entries()
+    {
+        const bool by_number = request.Subset_Columns && request.Subset_By_Number;
+        const std::vector<std::string>& names =
+            request.Column_Wanted_Names.empty() ? request.Subset_Names : request.Column_Wanted_Names;
+        for (std::size_t i = 0; i < names.size(); ++i) {
+            if (request.Column_Wanted_Names.empty() && by_number)
+                places_.emplace(Leading_Integer(names[i]), i);
+            else
+                names_.emplace(names[i], i);
+            names_.emplace(Name_In_Lists(names[i]), i);
+        }
     }
-    return -1;
-}
+
+    /// Nothing for a column that no entry speaks of.
+    [[nodiscard]] std::optional<std::size_t> Find(std::size_t column, std::string_view name) const
+    {
+        if (request.Column_Wanted_Names.empty() && !request.Subset_Columns)
+            return column;
+        if (!places_.empty())
+            return Find_In(places_, static_cast<long>(column) + 1);
+        const std::string stripped = Strip_Name_Mark(name);
+        const auto found = Find_In(names_, stripped);
+        return found ? found : Find_In(names_, Name_In_Lists(stripped));
+    }
+
+private:
+    template <class Map, class Key> static std::optional<std::size_t> Find_In(const Map& map, const Key& key)
+    {
+        const auto found = map.find(key);
+        return found == map.end() ? std::nullopt : std::optional(found->second);
+    }
+
+    std::unordered_map<long, std::size_t> places_;
+    std::unordered_map<std::string, std::size_t> names_;
+};
 
 /// A list of wanted types overrules the marks of the names.
-void Take_Wanted_Type(std::int32_t index, std::string_view name, Column_Scan& column)
+void Take_Wanted_Type(std::size_t entry, Column_Scan& column)
 {
-    const std::int64_t entry = Wanted_Entry(index, name);
-    if (entry < 0 || entry >= static_cast<std::int64_t>(request.Column_Wanted_Types.size()))
+    if (entry >= request.Column_Wanted_Types.size())
         return;
-    const std::int32_t wanted = request.Column_Wanted_Types[static_cast<std::size_t>(entry)];
+    const std::int32_t wanted = request.Column_Wanted_Types[entry];
     if (wanted <= 0)
         return;
     column.make_factor = wanted == factor_column;
@@ -146,8 +175,10 @@ void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
     if (shape.has_names)
         names = Names_Of_Line(walker);
     names.resize(shape.types.size());
+    const Wanted_Entries entries;
     for (std::size_t index = 0; index < names.size(); ++index)
-        Take_Wanted_Type(static_cast<std::int32_t>(index), names[index], shape.types[index]);
+        if (const auto entry = entries.Find(index, names[index]))
+            Take_Wanted_Type(*entry, shape.types[index]);
 }
 
 }  // namespace

@@ -50,7 +50,7 @@ struct Column_Writing {
     std::int32_t first_row;  ///< no cells above (Symmetric Matrix)
     std::int32_t width = 0;
     const Cell_Node* cell = nullptr;       ///< of the row being written
-    std::vector<std::string> levels = {};  ///< of a Factor, as they print
+    std::vector<std::string> levels = {};  ///< those that a Factor lists, as they print
 };
 
 /// A line under way; fields are printed straight into it.
@@ -118,31 +118,29 @@ Cell_Kind Kind_Of(const Column& column)
     return Prints_By_Format(column) ? Cell_Kind::formatted_number : Cell_Kind::number;
 }
 
-std::vector<std::string> Printed_Levels(const Column& column)
+/// Levels without a label or a value print as their number, however many there are said to be.
+std::vector<std::string> Listed_Levels(const Column& column)
 {
     std::vector<std::string> levels;
     char text[Number_Text_Room];
     const Level_Node* label = column.factor_kind == factor_with_labels ? column.labels : nullptr;
     const Level_Node* value = column.factor_kind == factor_with_levels ? column.level_values : nullptr;
-    for (std::int32_t level = 1; level <= column.nlevels; ++level) {
-        if (label != nullptr) {
-            levels.emplace_back(label->Text());
-            label = label->next;
-        } else if (value != nullptr) {
-            levels.emplace_back(text, Print_Number(text, column, value->value.number));
-            value = value->next;
-        } else {
-            levels.emplace_back(text, Print_Integer(text, level));
-        }
-    }
-    if (column.sheet->type == table_sheet && column.sheet->has_margins != 0)
-        levels.emplace_back(column.sheet->margin_label);
+    for (; label != nullptr && std::ssize(levels) < column.nlevels; label = label->next)
+        levels.emplace_back(label->Text());
+    for (; value != nullptr && std::ssize(levels) < column.nlevels; value = value->next)
+        levels.emplace_back(text, Print_Number(text, column, value->value.number));
     return levels;
 }
 
-bool Is_Level(const Column_Writing& state, double value)
+/// The margin of a Table is one more level of its Factors.
+bool Has_Margin(const Column& column)
 {
-    return value >= 1.0 && value < static_cast<double>(state.levels.size()) + 1.0;
+    return column.sheet->type == table_sheet && column.sheet->has_margins != 0;
+}
+
+bool Is_Level(const Column& column, double value)
+{
+    return value >= 1.0 && value < (Has_Margin(column) ? 2.0 : 1.0) + std::max(column.nlevels, 0);
 }
 
 /// The mark behind a name by which a reader knows the column's type again.
@@ -169,7 +167,7 @@ public:
 private:
     void Start_Column(const Column& column);
     std::int32_t Measured_Width(const Column_Writing& state);
-    void Put_Level(const Column_Writing& state, std::string_view level);
+    void Put_Level(const Column_Writing& state, std::int32_t level);
     void Put_Cell(const Column_Writing& state, const Cell_Node& cell);
     void Put_Factor(const Column_Writing& state, double value);
     void Put_Text(std::string_view text);
@@ -194,7 +192,7 @@ void Text_Table_Writer::Start_Column(const Column& column)
     Column_Writing& state = columns_.back();
     state.cell = column.first_cell;
     if (kind == Cell_Kind::factor)
-        state.levels = Printed_Levels(column);
+        state.levels = Listed_Levels(column);
     if (layout_.padded)
         state.width = Measured_Width(state);
 }
@@ -211,12 +209,20 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
         line_.Clear();
     };
     line_.Clear();
-    for (const std::string& level : state.levels) {
+    for (std::int32_t level = 1; level <= std::ssize(state.levels); ++level) {
         Put_Level(state, level);
         take_printed();
     }
+    if (factor && std::ssize(state.levels) < column.nlevels) {
+        Put_Level(state, column.nlevels);
+        take_printed();
+    }
+    if (factor && Has_Margin(column)) {
+        Put_Level(state, column.nlevels + 1);
+        take_printed();
+    }
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        if (factor && Is_Level(state, cell->value.number))
+        if (factor && Is_Level(column, cell->value.number))
             continue;
         Put_Cell(state, *cell);
         take_printed();
@@ -253,18 +259,28 @@ void Text_Table_Writer::Put_Text(std::string_view text)
         line_.Put(text);
 }
 
-void Text_Table_Writer::Put_Level(const Column_Writing& state, std::string_view level)
+void Text_Table_Writer::Put_Level(const Column_Writing& state, std::int32_t level)
 {
-    if (state.column->factor_kind == factor_with_labels)
-        Put_Text(level);
+    const Column& column = *state.column;
+    std::string_view text;
+    if (level <= std::ssize(state.levels)) {
+        text = state.levels[static_cast<std::size_t>(level) - 1];
+    } else if (level > column.nlevels) {
+        text = column.sheet->margin_label;
+    } else {
+        line_.Advance_To(Print_Integer(line_.Reserve(Number_Text_Room), level));
+        return;
+    }
+    if (column.factor_kind == factor_with_labels)
+        Put_Text(text);
     else
-        line_.Put(level);
+        line_.Put(text);
 }
 
 void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
 {
-    if (Is_Level(state, value))
-        Put_Level(state, state.levels[static_cast<std::size_t>(value) - 1]);
+    if (Is_Level(*state.column, value))
+        Put_Level(state, static_cast<std::int32_t>(value));
     else
         line_.Put(state.column->factor_kind == factor_with_labels ? std::string_view(" ")
                                                                   : request.Missing_Text.view());

@@ -1,0 +1,306 @@
+#include "interface/var_file.h"
+
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "model/date_format.h"
+#include "model/factors.h"
+#include "model/names.h"
+#include "model/text_columns.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <iterator>
+#include <map>
+#include <set>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace ingester {
+
+namespace {
+
+constexpr std::size_t Longest_Line = 1024;
+
+/// Lines that are read of a list without a count.
+constexpr long Lines_Without_Count = 16000;
+
+/// Days between the starts of the two ways in which spreadsheets count dates.
+constexpr double Days_To_1904 = 1462.0;
+
+struct Var_List {
+    long count = 0;  ///< 0: not told
+    bool by_name = false;
+    std::vector<std::string> lines;  ///< behind the count
+};
+
+bool Load_Var_List(std::string_view file_name, Var_List& list)
+{
+    Input_File file;
+    std::string line;
+    if (file_name.empty() || !file.Open(file_name))
+        return false;
+    bool more = file.Read_Line(line, Longest_Line);
+    list.by_name = more && Trim_Copy(line) == By_Names_Line;
+    list.count = more ? std::max(Leading_Integer(line), 0L) : 0;
+    if (list.by_name || list.count > 0)
+        more = file.Read_Line(line, Longest_Line);
+    const bool counted = list.count > 0;
+    const long most = list.by_name ? Every_Column : (counted ? list.count : Lines_Without_Count);
+    // One more than the names: the structure's own.
+    for (long read = 0; more && read <= most; ++read, more = file.Read_Line(line, Longest_Line))
+        list.lines.emplace_back(Trim_Copy(line));
+    return true;
+}
+
+/// "old=new" taken apart; without a "=" all of it is the old name.
+std::pair<std::string, std::string> Split_Entry(std::string_view line)
+{
+    const std::size_t equals = std::min(line.find('='), line.size());
+    const std::string_view changed = line.substr(std::min(equals + 1, line.size()));
+    return {std::string(Trim_Copy(line.substr(0, equals))), std::string(Trim_Copy(changed))};
+}
+
+}  // namespace
+
+void Read_Var_File(std::string_view file_name)
+{
+    Var_List list;
+    if (!Load_Var_List(file_name, list))
+        return;
+    std::vector<std::int32_t> types;
+    std::vector<std::string> names;
+    for (const std::string& line : list.lines) {
+        if (!list.by_name && list.count > 0 && std::ssize(types) == list.count)
+            break;
+        const auto [old_name, new_name] = list.by_name ? Split_Entry(line) : std::pair(std::string(), line);
+        types.push_back(Read_Name_Marks(new_name).type);
+        if (list.by_name)
+            names.push_back(old_name);
+    }
+    if (std::ranges::count(types, 0) == std::ssize(types))
+        return;
+    request.Column_Wanted_Types = std::move(types);
+    request.Column_Wanted_Names = std::move(names);
+}
+
+namespace {
+
+/// Dates that count from 1904 are brought to those of all others.
+void Count_From_1899(Column& column)
+{
+    if (!request.Dates_From_1904 || column.date_form != 0 || column.format == date_format_mark)
+        return;
+    const double missing = column.sheet->missing_value;
+    const bool levels = column.type == factor_column;
+    for (Cell_Node* cell = levels ? column.level_values : column.first_cell; cell != nullptr;
+         cell = cell->next)
+        if (cell->value.number > missing)
+            cell->value.number += Days_To_1904;
+}
+
+void Make_Date_Column(Column& column, bool time)
+{
+    if (Is_Text_Like(column.type)) {
+        Text_Column_To_Date(&column, time);
+        return;
+    }
+    Count_From_1899(column);
+    column.format = date_format_mark;
+    column.date_format = time ? time_format : day_month_year_format;
+    if (request.Date_Base_Text.empty())
+        column.date_form = 1;
+}
+
+void Set_Number_Format(Column& column, const Name_Marks& marks)
+{
+    if (Is_Text_Like(column.type) || (!marks.exponent && marks.decimals < 0))
+        return;
+    column.format = marks.exponent ? exponent_format : fixed_format;
+    column.decimals = marks.decimals;
+}
+
+void Change_Type(Column& column, std::int32_t wanted)
+{
+    const bool trim = column.sheet->settings.trim_cells != 0;
+    const bool text = Is_Text_Like(column.type);
+    const bool factor = column.type == factor_column;
+    if (wanted == factor_column && text)
+        Text_To_Factor(&column, false, trim, 0);
+    else if (wanted == factor_column && column.type == variate_column)
+        Variate_To_Factor(&column, true, 0);
+    else if (wanted == variate_column && text)
+        Text_Column_To_Number(&column);
+    else if (wanted == variate_column && factor)
+        Factor_To_Variate(&column, true);
+    else if (wanted == text_column && factor)
+        Factor_To_Text(&column);
+    else if (wanted == text_column && column.type == variate_column)
+        Variate_To_Text(&column);
+}
+
+void Act_On_Marks(Column& column, const Name_Marks& marks)
+{
+    if (marks.date || marks.time)
+        Make_Date_Column(column, marks.time);
+    Set_Number_Format(column, marks);
+    const bool was_text = Is_Text_Like(column.type);
+    Change_Type(column, marks.type);
+    if (was_text)
+        Set_Number_Format(column, marks);  // a text has become a number just now
+}
+
+/// What one line of a list says of a column.
+void Change_Column(Column* column, const std::string& line)
+{
+    if (column == nullptr || line.empty())
+        return;
+    if (line.front() == '*') {
+        Delete_Column(column, true);
+        return;
+    }
+    if (request.Names_Kept_As_They_Stand) {
+        column->name = line;
+        return;
+    }
+    if (column->sheet->type == vector_sheet)
+        Act_On_Marks(*column, Read_Name_Marks(line));
+    const std::string name = Strip_Name_Mark(line);
+    if (name.empty())
+        return;  // nothing but marks: the column keeps its name
+    column->name = Make_Valid_Name(name);
+    Use_Bracket_Text(*column);
+}
+
+std::vector<Column*> Columns_Of(const Sheet& sheet)
+{
+    std::vector<Column*> columns;
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        columns.push_back(column);
+    return columns;
+}
+
+/// The lines (from 0) that speak of the columns which a subset left, in their order.
+std::vector<std::size_t> Lines_Of_Subset()
+{
+    std::set<long> numbers;
+    if (request.Subset_By_Number)
+        for (const std::string& entry : request.Subset_Names)
+            numbers.insert(Leading_Integer(entry));
+    std::vector<std::size_t> lines;
+    for (const long number : numbers)
+        if (number >= 1)
+            lines.push_back(static_cast<std::size_t>(number) - 1);
+    return lines;
+}
+
+/// Which line goes with which column; false when that can't be told.
+bool Pair_Lines(const Sheet& sheet, long count, std::vector<std::size_t>& lines)
+{
+    const auto columns = static_cast<std::size_t>(sheet.column_count);
+    for (std::size_t line = 0; line < columns; ++line)
+        lines.push_back(line);
+    if (count <= sheet.column_count)
+        return true;
+    if (!request.Subset_Columns) {
+        Report_Message("Too many column names provided.\n");
+        return true;
+    }
+    Report_Message("Too many column names provided.\n"
+                   "If subsetting columns, just provide names for remaining columns.\n"
+                   "Attempting to rename correct columns.\n");
+    lines = Lines_Of_Subset();
+    return !lines.empty() || Fail("Could not locate correct columns to rename.\n");
+}
+
+bool Has_Structure_Name(const Sheet& sheet)
+{
+    const bool one_way = sheet.type == table_sheet && sheet.table_ways == 1;
+    return sheet.type >= matrix_sheet && sheet.type <= table_sheet && !one_way;
+}
+
+void Apply_In_Order(Sheet& sheet, const Var_List& list)
+{
+    const bool structure = Has_Structure_Name(sheet);
+    // The list that is written for a structure holds its name alone.
+    if (structure && list.count == 1 && list.lines.size() == 1) {
+        sheet.structure_name = Make_Valid_Name(list.lines.front());
+        return;
+    }
+    const long count = list.count > 0 ? list.count : sheet.column_count;
+    std::vector<std::size_t> lines;
+    if (!Pair_Lines(sheet, count, lines))
+        return;
+    const std::vector<Column*> columns = Columns_Of(sheet);
+    const auto named = std::min(list.lines.size(), static_cast<std::size_t>(count));
+    for (std::size_t i = 0; i < columns.size() && i < lines.size(); ++i)
+        if (lines[i] < named)
+            Change_Column(columns[i], list.lines[lines[i]]);
+    if (structure && named < list.lines.size() && !list.lines[named].empty())
+        sheet.structure_name = Make_Valid_Name(list.lines[named]);
+}
+
+/// All are found before the first is changed, so that names may change places.
+void Apply_By_Name(Sheet& sheet, const Var_List& list)
+{
+    std::map<std::string, Column*, std::less<>> columns;
+    for (Column* const column : Columns_Of(sheet))
+        columns.emplace(column->name.view(), column);
+    for (const std::string& line : list.lines) {
+        if (line.empty())
+            continue;
+        const auto [old_name, new_name] = Split_Entry(line);
+        auto found = columns.find(old_name);
+        if (found == columns.end())
+            found = columns.find(Name_In_Lists(old_name));
+        if (found == columns.end()) {
+            Report_Message_Text("Warning: column %.60s was not found and not changed.\n", old_name.c_str());
+            continue;
+        }
+        Change_Column(std::exchange(found->second, nullptr), new_name);
+    }
+}
+
+}  // namespace
+
+bool Apply_Var_File(Sheet* sheet, std::string_view file_name)
+{
+    Var_List list;
+    if (sheet == nullptr || !Load_Var_List(file_name, list))
+        return false;
+    if (list.by_name)
+        Apply_By_Name(*sheet, list);
+    else
+        Apply_In_Order(*sheet, list);
+    return true;
+}
+
+namespace {
+
+/// Opens a list file, or one of its name in the temporary folder.
+bool Make_Var_File(Output_File& file, std::string_view file_name)
+{
+    return file.Open(file_name)
+           || file.Open(Get_Temp_Folder().append(With_Extension(File_Part_Of(file_name), ".VAR")));
+}
+
+}  // namespace
+
+bool Write_Var_File(const Sheet& sheet, std::string_view file_name)
+{
+    Output_File file(Output_File::small_buffer);
+    if (!Make_Var_File(file, file_name))
+        return false;  // silent by design: the list is an extra, the output stands
+    if (Has_Structure_Name(sheet)) {
+        file.Write(Format_Text("1\n%s\n", sheet.structure_name.c_str()));
+        return file.Close();
+    }
+    file.Write(Format_Text("%li\n", static_cast<long>(sheet.column_count)));
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        file.Write(Format_Text("%s\n", column->name.c_str()));
+    return file.Close();
+}
+
+}  // namespace ingester

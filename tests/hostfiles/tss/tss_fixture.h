@@ -1,0 +1,51 @@
+// Reads and writes spreadsheet files, each in a request of its own.
+#pragma once
+
+#include "hostfiles/tss/tss.h"
+#include "hostfiles/tss/tss_bytes.h"
+#include "interface/host_fixture.h"
+#include "support/cell_lists.h"
+#include "support/check_sheet.h"
+
+#include <span>
+#include <sstream>
+
+namespace ingester {
+
+class TSS_Test : public Host_Test {
+protected:
+    /// Reads bytes under the options that `prepare` sets; null when they were refused. Any Sheet has to be
+    /// sound.
+    static Sheet* Read(
+        const std::string& bytes, void (*prepare)() = [] {})
+    {
+        Start_Request("t");
+        prepare();
+        Input_File file(std::as_bytes(std::span(bytes)), "small.tss");
+        if (!Read_TSS(file))
+            return nullptr;
+        EXPECT_EQ(Check_Sheet(*Current_Sheet), "");
+        return Current_Sheet;
+    }
+    static Sheet* Read(
+        const Items& items, void (*prepare)() = [] {})
+    {
+        return Read(Encode(items), prepare);
+    }
+
+    [[nodiscard]] std::string Written(Sheet* sheet) const
+    {
+        EXPECT_TRUE(Write_TSS_File(sheet, Path("written.tss").c_str()));
+        return Get("written.tss");
+    }
+};
+
+/// Values with a blank between.
+template <class... Values> std::string Text_Of(const Values&... values)
+{
+    std::ostringstream text;
+    ((text << (text.tellp() > 0 ? " " : "") << values), ...);
+    return text.str();
+}
+
+}  // namespace ingester

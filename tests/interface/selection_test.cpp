@@ -1,0 +1,158 @@
+// Columns and rows by list: the lists that a host sends, and the one that stands beside an input.
+#include "interface/selection.h"
+
+#include "host_fixture.h"
+#include "interface/format_drivers.h"
+#include "interface/var_file.h"
+#include "model/cell_text.h"
+#include "support/check_sheet.h"
+
+#include <random>
+
+namespace ingester {
+namespace {
+
+const std::string Four = "a,b,b,d!\n1,x,2.5,p\n2,y,*,q\n3,z,4,p\n";
+
+class Selection_Test : public Host_Test {
+protected:
+    void SetUp() override
+    {
+        Host_Test::SetUp();
+        Put("f.csv", Four);
+    }
+
+    /// The answer to a request that keeps columns and rows, and what came out, lines ended by "|".
+    [[nodiscard]] std::string Keep(const std::string& columns, const std::string& rows,
+                                   const std::string& input = "f.csv") const
+    {
+        Texts records = {Request_Name(input), Request_Name("o.tab") + "/e", "", ""};
+        if (!columns.empty()) {
+            Put("columns", columns);
+            records.push_back(Request_Name("columns") + "/s");
+        }
+        if (!rows.empty()) {
+            Put("rows", rows);
+            records.push_back(Request_Name("rows"));
+            if (columns.empty())
+                records.back() += "/r";
+            else
+                records[4] += "/r";
+        }
+        const auto [status, said] = Call(records);
+        EXPECT_FALSE(Exists("columns") || Exists("rows")) << "the lists are the request's to delete";
+        return Told(status, said);
+    }
+
+    [[nodiscard]] bool Exists(const std::string& name) const { return std::filesystem::exists(Path(name)); }
+
+    [[nodiscard]] std::string Told(int status, const std::string& said) const
+    {
+        std::string text = status == 0 ? Get("o.tab") : std::to_string(status) + " ";
+        text += said;
+        std::filesystem::remove(Path("o.tab"));
+        std::erase(text, '\r');
+        std::ranges::replace(text, '\n', '|');
+        return text.ends_with(":|") ? text.substr(0, text.size() - 2) : text;
+    }
+
+    /// What a list beside the input makes of it.
+    [[nodiscard]] std::string Change(const std::string& list, const std::string& options = "",
+                                     const std::string& output = "o.tab") const
+    {
+        Put("f.VAR", list);
+        const auto [status, said] = Convert("f.csv/v" + options, output);
+        return Told(status, said);
+    }
+};
+
+TEST_F(Selection_Test, Keeps_Columns_And_Rows_Of_Lists)
+{
+    const std::string none = "No columns selected from input file (i.e. no matches to specified names).|";
+    const std::string no_rows = "No rows selected from input file (i.e. no matches to specified rows).|";
+    const std::tuple<std::string, std::string, std::string> cases[] = {
+        {"2\nV\nd\na\n", "", "a\td!|1\tp|2\tq|3\tp|"},
+        {"9\nv\n b_1 \n", "", "b_1|2.5|*|4|"},  // as told apart, and the count is more than the lines
+        {"2\nV\nb\nnone\n", "", "b|x|y|z|Warning: column none was not found in the input.|"},
+        {"1\nV\na\nb\n", "", "a|1|2|3|"},  // the count is less
+        {"3\nN\n4\n1\n9\n", "", "a\td!|1\tp|2\tq|3\tp|"},
+        {"2147483648\nN\n2\n", "", "b|x|y|z|"},
+        {"1\nN\n4294967297\n", "", "13 " + none},
+        {"1\nV\nB\n", "", "13 " + none},
+        {"0\nV\n", "", "13 " + none},
+        {std::string("1\nV\n\1\xFF\0\n", 9), "", "13 " + none},
+        {"x", "", "13 " + none},
+        {"", "3\n1\n0\n1\n", "a\tb\tb_1\td!|1\tx\t2.5\tp|3\tz\t4\tp|"},
+        {"", "9\n0\n-1\n", "a\tb\td!|2\ty\tq|"},  // rows behind the list are dropped
+        {"", "3\n0\n0\n0\n", "13 " + no_rows},
+        {"", "2147483648\nx\n", "13 " + no_rows},
+        {"1\nV\nb\n", "3\n0\n1\n1\n", "b|y|z|"},
+    };
+    for (const auto& [columns, rows, told] : cases)
+        EXPECT_EQ(Keep(columns, rows), told) << columns << " " << rows;
+}
+
+TEST_F(Selection_Test, Reading_A_Part_Is_Reading_All_And_Leaving_Out)
+{
+    std::mt19937 random(5);
+    const auto Any = [&random](unsigned below) { return static_cast<unsigned>(random()) % below; };
+    for (int round = 0; round < 300; ++round) {
+        std::string text;
+        const unsigned columns = 1 + Any(6);
+        for (unsigned i = 0; i < columns; ++i)
+            text += (i > 0 ? "," : "") + std::string(1, static_cast<char>('a' + Any(3)))
+                    + (Any(4) == 0 ? "!" : (Any(6) == 0 ? ":D" : ""));
+        for (unsigned row = 0; row < 1 + Any(6); ++row) {
+            text += "\n";
+            for (unsigned i = 0; i < 1 + Any(columns + 2); ++i)
+                text += std::string(i > 0 ? "," : "") + (Any(5) == 0 ? "t" : std::to_string(Any(30)));
+        }
+        Put("r.csv", text + "\n");
+        std::string list = "9\nN\n";
+        for (unsigned i = 1; i <= columns + 2; ++i)
+            if (Any(2) == 0)
+                list += std::to_string(i) + "\n";
+        request.Subset_By_Number = true;
+        Put("list", list);
+        const std::string part = Keep(list, "", "r.csv/k");
+        // The way of formats whose readers leave nothing out.
+        Start_Request("t");
+        Sheet* const sheet = Read_Data_File(Request_Name("r.csv"), 25, "r.csv") ? Current_Sheet : nullptr;
+        request.Subset_Columns = request.Subset_By_Number = true;
+        for (unsigned i = 1; i <= columns + 2; ++i)
+            if (list.find("\n" + std::to_string(i) + "\n") != std::string::npos)
+                request.Subset_Names.push_back(std::to_string(i));
+        request.Columns_Were_Selected = false;
+        if (sheet == nullptr)
+            continue;  // a line of numbers for names
+        if (Apply_Subset(sheet) != Subset_Result::kept) {
+            EXPECT_TRUE(part.starts_with("13 ")) << text << list << part;
+            continue;
+        }
+        EXPECT_EQ(Check_Sheet(*sheet), "");
+        ASSERT_TRUE(Output_Driver_Of("o.tab").write(sheet, Request_Name("o.tab").c_str()));
+        EXPECT_TRUE(part.starts_with(Told(0, ""))) << text << list << part;
+    }
+}
+
+TEST_F(Selection_Test, A_List_Beside_The_Input_Changes_Its_Columns)
+{
+    const std::string many = "Too many column names provided.|";
+    const std::pair<std::string, std::string> cases[] = {
+        {"4\nn 1\n\n*\nlast\n", "n_1\tb\tlast!|1\tx\tp|2\ty\tq|3\tz\tp|"},
+        {"names\n*\n*\n*\n", "names|1|2|3|"},
+        {"2\na!\nb!\nc\n", "a!\tb!\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
+        {"4\n*\n*\nw:E\n*\n", "w|2.500000e+00|4.000000e+00|"},
+        {"9\n*\n*\nv:2\n*\n", "v|2.50|4.00|" + many},
+        {"@names\nb_1=*\n a = b \nb=a$\nx=y\nd\n",
+         "b\ta\td!|1\tx\tp|2\ty\tq|3\tz\tp|Warning: column x was not found and not changed.|"},
+        {"@names\na=$\nd=*\nb=*\nb_1=*\n", "a|1|2|3|"},
+        {"*\n*\n*\n*\n", "4 All columns in the input file are empty.|"},
+        {std::string("\0\1\n\xFF\n", 5), "%\t%\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
+    };
+    for (const auto& [list, told] : cases)
+        EXPECT_EQ(Change(list, "", "o.tab/d"), told) << list;
+}
+
+}  // namespace
+}  // namespace ingester
