@@ -62,6 +62,26 @@ std::size_t Choice(std::byte character, std::size_t count)
     return names[Choice(head[0], std::size(names))];
 }
 
+/// Two characters in front of a book: the sheet that is asked for, and what is left out of it.
+[[maybe_unused]] std::string_view Prepare_TBK(std::span<const std::byte>& bytes)
+{
+    constexpr std::size_t head_size = 2;
+    constexpr std::string_view sheets[] = {"", "2", "Table", "s"};
+    if (bytes.size() < head_size)
+        return "fuzz.tbk";
+    const auto head = bytes.first<head_size>();
+    bytes = bytes.subspan(head_size);
+    request.Worksheet_Name = sheets[Choice(head[0], std::size(sheets))];
+    const std::size_t choice = Choice(head[1], 16);
+    request.Replace_Book_Data = (choice & 1U) != 0;
+    request.Subset_Columns = (choice & 2U) != 0;
+    request.Subset_Names = {"x", "f", "v", "c"};
+    request.Subset_Rows = (choice & 4U) != 0;
+    request.Subset_Row_Flags = {0, 1, 1, 0, 1};
+    request.List_Sheets_Only = choice == 8;
+    return "fuzz.tbk";
+}
+
 /// Two characters in front of a spreadsheet: what is left out of it (columns by name, by number, rows), and
 /// names with brackets; then the order of a file read before, for those that don't tell theirs.
 [[maybe_unused]] std::string_view Prepare_TSS(std::span<const std::byte>& bytes)

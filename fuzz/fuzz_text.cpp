@@ -1,5 +1,6 @@
 // The targets of functions that take a text: the build names the one that is tried. The first bytes of
 // an input choose how the function is called.
+#include "hostfiles/tbk/tbk.h"
 #include "interface/detection_tests.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
@@ -10,6 +11,7 @@
 #include "model/date_text.h"
 #include "model/sheet.h"
 #include "model/text_number.h"
+#include "platform/files.h"
 #include "spreadsheet/text/text.h"
 #include "support/check_sheet.h"
 #include "support/number_text.h"
@@ -116,6 +118,30 @@ void Must(bool holds, const char* what)
     Close_Message_File();
     const std::string faults = Check_Sheet(*Current_Sheet);
     Must(faults.empty(), faults.c_str());
+    Free_Sheets();
+}
+
+/// A book, to which a sheet is added, or in which one is replaced.
+[[maybe_unused]] void Try_Book_Update(std::string_view head, std::string_view text)
+{
+    const std::string folder = Get_Temp_Folder();
+    const std::string name = folder + "update.tbk";
+    Output_File book(Output_File::small_buffer);
+    Must(book.Open(name), "no file can be made");
+    book.Write(text);
+    Must(book.Close(), "no file can be written");
+    Start_Request();
+    Sheet* sheet = New_Sheet_With_Rows(2);
+    New_Data_Column(sheet, variate_column, "x", 2);
+    const auto before = Read_Page_Names(name.c_str());
+    const bool replaces = Choice(head[0], 2) == 1;
+    const bool good = replaces ? Replace_Sheet_In_TBK(name.c_str(), sheet, "1")
+                               : Add_Sheets_To_TBK(name.c_str(), std::span<Sheet* const>(&sheet, 1));
+    const auto after = Read_Page_Names(name.c_str());
+    Must(!good || (before && after && after->size() == before->size() + (replaces ? 0 : 1)),
+         "an update leaves another number of sheets");
+    Must(good || before == after, "a failed update changes a book");
+    Close_Message_File();
     Free_Sheets();
 }
 

@@ -1,6 +1,7 @@
 #include "command/formats.h"
 #include "command/host.h"
 #include "command/options.h"
+#include "command/sheets.h"
 
 #include <string_view>
 
@@ -14,6 +15,7 @@ struct Subcommand {
 /// First words that are no names of files. A file of such a name is reached as "./formats".
 constexpr Subcommand Subcommands[] = {
     {"formats", ingester::Run_Formats},
+    {"sheets", ingester::Run_Sheets},
 };
 
 }  // namespace

@@ -36,6 +36,10 @@ constexpr const char* Examples = R"(Examples:
       the same, in the option language of requests
   ingester crops.csv crops.gen --keep plot,yield --rename plot=Plot --type plot=factor
       two columns, one of them under another name and as a factor
+  ingester crops.csv all.tbk --add-sheet Crops
+      one more sheet in the book all.tbk, which is made where there is none
+  ingester sheets all.tbk
+      the sheets that the book holds; --sheet NAME reads one of them
   ingester formats
       the formats that are read and written
 

@@ -46,6 +46,8 @@ bool Decompress(Gzip_File& packed, Output_File& plain, std::uint64_t most)
     return true;
 }
 
+}  // namespace
+
 bool Decompress_To(const std::string& scratch, const char* file_name)
 {
     Gzip_File packed;
@@ -60,8 +62,6 @@ bool Decompress_To(const std::string& scratch, const char* file_name)
         return Fail("Temporary file for decompressing could not be written.\n");
     return packed.Close() || Fail("Compressed file is damaged or not complete.\n");
 }
-
-}  // namespace
 
 bool Read_Compressed_File(const char* file_name)
 {

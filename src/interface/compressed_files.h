@@ -1,10 +1,15 @@
 // Input that is compressed as a whole.
 #pragma once
 
+#include <string>
+
 namespace ingester {
 
 /// Decompresses a file in gzip form into the temporary folder and reads what it holds, by its own
 /// type. False after a message.
 [[nodiscard]] bool Read_Compressed_File(const char* file_name);
+
+/// Decompresses a file in gzip form into the scratch file `scratch`. False after a message.
+[[nodiscard]] bool Decompress_To(const std::string& scratch, const char* file_name);
 
 }  // namespace ingester

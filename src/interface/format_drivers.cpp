@@ -1,6 +1,7 @@
 #include "interface/format_drivers.h"
 
 #include "hostfiles/script/script.h"
+#include "hostfiles/tbk/tbk.h"
 #include "hostfiles/tss/tss.h"
 #include "interface/compressed_files.h"
 #include "interface/file_detection.h"
@@ -81,7 +82,7 @@ constexpr Format_Driver Format_Drivers[] = {
     {54, "Affymetrix CDF, text"},
     {55, "GeneChip sequences"},
     {compressed_file, "gzip, of any format here", Read_Compressed_File},
-    {book_file, "Tabulon Book", nullptr, ".tbk", nullptr, 10000000},
+    {book_file, "Tabulon Book", Read_TBK_File, ".tbk", Write_TBK_File, 10000000, Read_Page_Names},
     {xml_workbook_file, "Excel 2007 workbook", nullptr, ".xlsx .xlsm"},
     {60, "JPEG image", nullptr, ".jpg"},
     {61, "TIFF image", nullptr, ".tif .tiff"},
@@ -135,6 +136,19 @@ const Format_Driver& Output_Driver_Of(std::int32_t code)
 {
     const auto* const found = std::ranges::find(Format_Drivers, code, &Format_Driver::code);
     return found == std::end(Format_Drivers) ? Fixed_Width_Text : *found;
+}
+
+std::optional<std::vector<std::string>> List_Sheet_Names(const std::string& file_name)
+{
+    constexpr std::size_t most_names = 4096;
+    const std::int32_t type = Detect_File_Type(file_name);
+    const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
+    if (found == std::end(Format_Drivers) || found->sheet_names == nullptr)
+        return std::nullopt;
+    auto names = found->sheet_names(file_name.c_str());
+    if (names)
+        names->resize(std::min(names->size(), most_names));
+    return names;
 }
 
 bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string_view source_name)

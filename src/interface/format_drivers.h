@@ -6,14 +6,19 @@
 #include "model/sheet.h"
 
 #include <cstdint>
+#include <optional>
 #include <span>
+#include <string>
 #include <string_view>
+#include <vector>
 
 namespace ingester {
 
 /// Readers leave their Sheet in `Current_Sheet`; false after a message.
 using Reader = bool (*)(const char* file_name);
 using Writer = bool (*)(Sheet* sheet, const char* file_name);
+/// The names of a file's sheets, in order; nothing for a file that can't be understood.
+using Sheet_Lister = std::optional<std::vector<std::string>> (*)(const char* file_name);
 
 /// One format. Detection gives inputs their code, the extension gives it to outputs. A format that this
 /// build knows by name only has neither `read` nor `write`.
@@ -24,6 +29,7 @@ struct Format_Driver {
     std::string_view extensions = {};  ///< of outputs, with blanks between them
     Writer write = nullptr;
     std::int32_t max_columns = Default_Max_Columns;  ///< of outputs
+    Sheet_Lister sheet_names = nullptr;              ///< of formats that hold several sheets
 };
 
 /// All formats, by code.
@@ -34,6 +40,9 @@ struct Format_Driver {
 
 /// The format of an output code.
 [[nodiscard]] const Format_Driver& Output_Driver_Of(std::int32_t code);
+
+/// The names of the sheets in a file of several, 4096 at most; nothing for any other file.
+[[nodiscard]] std::optional<std::vector<std::string>> List_Sheet_Names(const std::string& file_name);
 
 /// Reads a file of a known type. Messages name it by `source_name`, or by the URL that it was fetched
 /// from. False when no Sheet was made; formats without a reader give it without a message.

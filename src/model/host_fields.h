@@ -93,6 +93,8 @@ struct Sheet_Host_Fields {
     std::int32_t split_column = 0;
     std::vector<Saved_Restriction> saved_restrictions;
     std::int32_t iprint = 0;
+    std::int16_t population_set = 0;
+    std::uint8_t population_code = 0;     ///< of marker data
     std::int16_t has_short_columns = 0;   ///< some end before the last row: a Vector's may
     std::int16_t has_colour_sources = 0;  ///< some Column may have one, to be cleared when that one goes
 };

@@ -44,6 +44,13 @@ void Free_Sheets()
     Current_Sheet = nullptr;
 }
 
+void Free_Sheet(Sheet* sheet)
+{
+    if (Current_Sheet == sheet)
+        Current_Sheet = nullptr;
+    std::erase_if(sheets, [&](const std::unique_ptr<Sheet>& each) { return each.get() == sheet; });
+}
+
 Settings Copy_Settings()
 {
     return Get_Settings();

@@ -177,6 +177,9 @@ void Init_Library();
 /// Ends every Sheet of the request before.
 void Free_Sheets();
 
+/// Ends one Sheet early: nobody may hold a handle to it any more.
+void Free_Sheet(Sheet* sheet);
+
 /// A private copy of the request's settings.
 [[nodiscard]] Settings Copy_Settings();
 

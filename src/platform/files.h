@@ -99,7 +99,12 @@ public:
 
     [[nodiscard]] bool Is_Open() const { return descriptor_ >= 0; }
 
+    /// Bytes written so far.
+    [[nodiscard]] std::int64_t Position() const { return flushed_ + static_cast<std::int64_t>(used_); }
+
     void Write(const void* bytes, std::size_t count);
+    /// Puts other bytes in the place of some that were written; not on a pipe.
+    void Write_At(std::int64_t position, const void* bytes, std::size_t count);
     void Write(std::string_view text) { Write(text.data(), text.size()); }
     template <class T> void Write_Little(T value)
     {
@@ -107,6 +112,10 @@ public:
         Put_Number<T>(bytes, value);
         Write(bytes, sizeof bytes);
     }
+
+    /// Writes the next `count` bytes of `source`, which the system copies by itself where it can. False when
+    /// they aren't there, or after a refusal.
+    [[nodiscard]] bool Copy_From(Input_File& source, std::int64_t count);
 
     /// The system refused a write; later ones are dropped.
     [[nodiscard]] bool Failed() const { return failed_; }
@@ -117,6 +126,7 @@ public:
 private:
     [[nodiscard]] bool Start(int descriptor);
     void Flush();
+    [[nodiscard]] std::int64_t Copy_In_System(const Input_File& source, std::int64_t count);
     void Write_Directly(const char* bytes, std::size_t count);
 
     int descriptor_ = -1;
@@ -125,6 +135,7 @@ private:
     std::size_t buffer_size_;
     std::unique_ptr<char[]> buffer_;
     std::size_t used_ = 0;
+    std::int64_t flushed_ = 0;  ///< bytes given to the system
 };
 
 /// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails.

@@ -1,4 +1,4 @@
-// Reading files in gzip form (RFC 1952) as what they hold.
+// Files in gzip form (RFC 1952): read as what they hold, and made.
 #pragma once
 
 #include <cstddef>
@@ -28,5 +28,9 @@ private:
     gzFile_s* stream_ = nullptr;
     bool failed_ = false;
 };
+
+/// Packs all bytes of `from` as closely as can be into the scratch file `to`. False, and no such file, when
+/// either fails.
+[[nodiscard]] bool Compress_File(std::string_view from, std::string_view to);
 
 }  // namespace ingester

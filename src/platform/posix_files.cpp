@@ -1,5 +1,6 @@
 #include "platform/files.h"
 
+#include "platform/file_changes.h"
 #include "platform/folders.h"
 
 #include <algorithm>
@@ -12,6 +13,8 @@
 #include <unistd.h>
 
 namespace ingester {
+
+bool (*file_change_hook)() = nullptr;
 
 namespace {
 
@@ -206,6 +209,7 @@ bool Output_File::Start(int descriptor)
     owned_ = true;
     failed_ = descriptor < 0;
     used_ = 0;
+    flushed_ = 0;
     if (!failed_ && buffer_ == nullptr)
         buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
     return !failed_;
@@ -231,6 +235,8 @@ void Output_File::Open_Standard_Output()
 
 void Output_File::Write_Directly(const char* bytes, std::size_t count)
 {
+    failed_ = failed_ || (count > 0 && !File_Change_Allowed());
+    flushed_ += static_cast<std::int64_t>(count);
     while (count > 0 && !failed_) {
         const ::ssize_t put = ::write(descriptor_, bytes, std::min(count, Greatest_System_Request));
         if (put >= 0) {
@@ -262,6 +268,74 @@ void Output_File::Write(const void* bytes, std::size_t count)
     }
     std::memcpy(buffer_.get() + used_, bytes, count);
     used_ += count;
+}
+
+void Output_File::Write_At(std::int64_t position, const void* bytes, std::size_t count)
+{
+    if (position < 0 || position + static_cast<std::int64_t>(count) > Position()) {
+        failed_ = true;
+        return;
+    }
+    const auto* at = static_cast<const char*>(bytes);
+    if (position < flushed_ && count > 0)
+        failed_ = failed_ || !File_Change_Allowed();
+    while (position < flushed_ && count > 0 && !failed_) {
+        const auto part = std::min(count, static_cast<std::size_t>(flushed_ - position));
+        const ::ssize_t put = ::pwrite(descriptor_, at, part, position);
+        if (put >= 0) {
+            at += put;
+            position += put;
+            count -= static_cast<std::size_t>(put);
+        } else if (errno != EINTR) {
+            failed_ = true;
+        }
+    }
+    if (count > 0 && !failed_)
+        std::memcpy(buffer_.get() + (position - flushed_), at, count);
+}
+
+/// How many of the bytes the system could copy.
+std::int64_t Output_File::Copy_In_System(const Input_File& source, std::int64_t count)
+{
+    constexpr std::int64_t at_once = 1 << 26;
+    std::int64_t done = 0;
+    ::off_t from = source.Position();
+    while (done < count && !failed_) {
+        if (!File_Change_Allowed()) {
+            failed_ = true;
+            break;
+        }
+        const auto part = static_cast<std::size_t>(std::min(count - done, at_once));
+        const ::ssize_t copied = ::copy_file_range(source.Descriptor(), &from, descriptor_, nullptr, part, 0);
+        if (copied <= 0)
+            break;  // what can't be copied so may be read and written
+        done += copied;
+    }
+    flushed_ += done;
+    return done;
+}
+
+bool Output_File::Copy_From(Input_File& source, std::int64_t count)
+{
+    constexpr std::int64_t block_size = 1 << 20;
+    Flush();
+    if (source.Descriptor() >= 0 && descriptor_ >= 0 && !failed_) {
+        const std::int64_t copied = Copy_In_System(source, count);
+        count -= copied;
+        if (!source.Seek(source.Position() + copied))
+            return false;
+    }
+    if (count == 0)
+        return !failed_;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
+    while (count > 0 && !failed_) {
+        const auto part = static_cast<std::size_t>(std::min(count, block_size));
+        if (!source.Read_Exactly(block.get(), part))
+            return false;
+        Write(block.get(), part);
+        count -= static_cast<std::int64_t>(part);
+    }
+    return !failed_;
 }
 
 bool Output_File::Close()

@@ -1,5 +1,7 @@
 #include "platform/folders.h"
 
+#include "platform/file_changes.h"
+
 #include <algorithm>
 #include <array>
 #include <climits>
@@ -126,7 +128,7 @@ bool Replace_File(std::string_view from, std::string_view to)
     struct stat facts;
     if (Look_At(to, facts))
         static_cast<void>(::chmod(from_path.c_str(), facts.st_mode & 07777));  // where that is ours to do
-    return ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
+    return File_Change_Allowed() && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
 std::string_view Folder_Of(std::string_view name)

@@ -1,3 +1,5 @@
+#include "platform/file_changes.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/gzip_file.h"
 
@@ -49,6 +51,38 @@ bool Gzip_File::Close()
     const bool good = stream_ != nullptr && gzclose_r(stream_) == Z_OK && !failed_;
     stream_ = nullptr;
     return good;
+}
+
+namespace {
+
+bool Compress(Input_File& source, gzFile target)
+{
+    constexpr std::size_t block_size = std::size_t{1} << 20;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
+    while (const std::size_t got = source.Read(block.get(), block_size))
+        if (!File_Change_Allowed() || gzwrite(target, block.get(), static_cast<unsigned>(got)) <= 0)
+            return false;
+    return !source.Failed();
+}
+
+}  // namespace
+
+bool Compress_File(std::string_view from, std::string_view to)
+{
+    Input_File source;
+    const std::string path = Native_Path(to);
+    if (!source.Open(from))
+        return false;
+    ::unlink(path.c_str());
+    const int descriptor = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600);
+    gzFile target = descriptor < 0 ? nullptr : gzdopen(descriptor, "wb9");
+    if (target == nullptr && descriptor >= 0)
+        ::close(descriptor);
+    const bool packed = target != nullptr && Compress(source, target);
+    const bool closed = target != nullptr && gzclose_w(target) == Z_OK;
+    if (!packed || !closed)
+        Delete_File(to);
+    return packed && closed;
 }
 
 }  // namespace ingester

@@ -27,6 +27,26 @@ bool Is_Missing_In_File(double value, double sheet_missing)
            || Upper_Bytes(value) == Upper_Bytes(Missing_Value);
 }
 
+double Missing_Marker(double value)
+{
+    constexpr double first_level = 1.0;
+    return std::isfinite(value) && value < first_level ? value : Missing_Value;
+}
+
+std::int32_t Label_State_In_File(const Sheet& sheet)
+{
+    return std::clamp<std::int32_t>(sheet.label_state, labels_by_position,
+                                    sheet.type == table_sheet ? labels_by_text_and_level : labels_by_text);
+}
+
+void Set_Margin_Level(Sheet& sheet)
+{
+    const Column* const last_leading = Column_At(&sheet, sheet.leading_columns - 1);
+    if (sheet.type == table_sheet && sheet.has_margins != 0 && last_leading != nullptr
+        && last_leading->type == factor_column)
+        sheet.margin_level = last_leading->nlevels + 1;
+}
+
 bool Has_Range_Limits(const Column& column)
 {
     const Sheet& sheet = *column.sheet;

@@ -21,6 +21,37 @@ constexpr double Least_Sure_Number = -1e36;
 /// may have lost their lowest byte to a rounding.
 [[nodiscard]] bool Is_Missing_In_File(double value, double sheet_missing);
 
+/// A number as files hold it.
+[[nodiscard]] inline double Number_In_File(double value, const Sheet& sheet)
+{
+    return !Is_Surely_Present(value) && Is_Missing_In_File(value, sheet.missing_value) ? Missing_Value
+                                                                                       : value;
+}
+
+/// A Table whose columns are labelled: one of two or more ways.
+[[nodiscard]] inline bool Is_Many_Way_Table(const Sheet& sheet)
+{
+    return sheet.type == table_sheet && sheet.table_ways >= 2;
+}
+
+/// The marker that a file gives must lie below the numbers and the levels that it is told from.
+[[nodiscard]] double Missing_Marker(double value);
+
+/// How a Table's columns are labelled, and what their names in the file are.
+enum Table_Labels : std::int32_t {
+    labels_by_position = 0,
+    labels_by_level = 1,
+    labels_by_text = 2,
+    labels_by_text_and_level = 3,
+};
+
+/// The state of a Sheet's labels as files hold it: one without a code of its own is that of columns named
+/// by their place.
+[[nodiscard]] std::int32_t Label_State_In_File(const Sheet& sheet);
+
+/// Tells the margin from the levels of the last classifying Factor, when all columns are there.
+void Set_Margin_Level(Sheet& sheet);
+
 /// Whether the files hold limits of the values that a Column shows. The body of a Sheet other than a
 /// Vector, a Scalar or a one-way Table shares one pair, on its first data column.
 [[nodiscard]] bool Has_Range_Limits(const Column& column);

@@ -5,6 +5,7 @@
 // a counted text is its length and its bytes.
 #pragma once
 
+#include "hostfiles/shared/host_sheet.h"
 #include "model/host_fields.h"
 #include "model/sheet.h"
 
@@ -58,14 +59,6 @@ struct Table_Record {
     std::int32_t table_ways = 0;
     std::int32_t has_margins = 0;
     std::int32_t has_second_margin = 0;  ///< of two or more ways only
-};
-
-/// How a Table's columns are labelled, and what their names in the file are.
-enum Table_Labels : std::int32_t {
-    labels_by_position = 0,
-    labels_by_level = 1,
-    labels_by_text = 2,
-    labels_by_text_and_level = 3,
 };
 
 /// Of each column, behind its type, length, name and description; the attached text follows.

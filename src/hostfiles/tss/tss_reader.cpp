@@ -74,13 +74,6 @@ bool Read_Head(TSS_Reading& reading)
     return complete;
 }
 
-/// The marker must lie below the levels of Factors, which it is told from as well.
-double Missing_Marker(double value)
-{
-    constexpr double first_level = 1.0;
-    return std::isfinite(value) && value < first_level ? value : Missing_Value;
-}
-
 bool Has_Flag(const TSS_Reading& reading, Present_Flag flag)
 {
     return (static_cast<std::uint32_t>(reading.head.present_flags) & flag) != 0;
@@ -261,27 +254,6 @@ bool Set_Row_Marks(TSS_Reading& reading)
     return true;
 }
 
-/// Leaves out rows of a Symmetric Matrix with their columns. False when none would be left.
-bool Select_Symmetric(Sheet& sheet)
-{
-    if (sheet.type != symmetric_matrix_sheet || (!request.Subset_Columns && !request.Subset_Rows))
-        return true;
-    const Row_Selection rows{request.Subset_Rows, request.Subset_Row_Flags};
-    std::vector<std::int32_t> left_out;
-    for (std::int32_t row = 0; row < sheet.row_count; ++row) {
-        const Column* const column = Column_At(&sheet, sheet.leading_columns + row);
-        const bool named =
-            column == nullptr || !request.Subset_Columns || Is_Column_Selected(column->index, column->name);
-        if (!named || !rows.Keeps(row))
-            left_out.push_back(row);
-    }
-    if (static_cast<std::int32_t>(left_out.size()) == sheet.row_count)
-        return false;
-    for (; !left_out.empty(); left_out.pop_back())
-        Delete_Row(&sheet, left_out.back(), sheet.leading_columns + left_out.back() <= sheet.column_count);
-    return true;
-}
-
 bool Finish_Sheet(TSS_Reading& reading)
 {
     Sheet& sheet = *reading.sheet;
@@ -290,10 +262,7 @@ bool Finish_Sheet(TSS_Reading& reading)
     if (!Set_Row_Marks(reading) || !Select_Symmetric(sheet))
         return false;
     Restore_Pointer_Names(&sheet);
-    const Column* const last_leading = Column_At(&sheet, sheet.leading_columns - 1);
-    if (sheet.type == table_sheet && sheet.has_margins != 0 && last_leading != nullptr
-        && last_leading->type == factor_column)
-        sheet.margin_level = last_leading->nlevels + 1;
+    Set_Margin_Level(sheet);
     Make_Column_Names_Unique(&sheet);
     return true;
 }
@@ -323,22 +292,6 @@ bool Read_Sheet(TSS_Reading& reading)
 }
 
 }  // namespace
-
-std::string Valid_Name_Of_No_Column(std::string_view name)
-{
-    std::string valid = Make_Valid_Name(name);
-    Remember_Bracket_Text({});
-    return valid;
-}
-
-std::int32_t Row_Selection::Count(std::int32_t rows) const
-{
-    if (!active)
-        return rows;
-    const auto listed = std::min(static_cast<std::size_t>(rows), flags.size());
-    return static_cast<std::int32_t>(listed
-                                     - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
-}
 
 bool Read_TSS(Input_File& file)
 {

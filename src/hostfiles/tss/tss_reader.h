@@ -2,31 +2,16 @@
 #pragma once
 
 #include "hostfiles/shared/host_sheet.h"
+#include "hostfiles/shared/selection.h"
 #include "hostfiles/tss/tss_format.h"
 #include "hostfiles/tss/tss_source.h"
 
 #include <cstdint>
-#include <span>
 #include <string>
 #include <string_view>
 #include <vector>
 
 namespace ingester {
-
-/// The rows that the request keeps.
-struct Row_Selection {
-    bool active = false;
-    std::span<const std::int32_t> flags;  ///< rows beyond are left out
-
-    [[nodiscard]] bool Keeps(std::int32_t row) const
-    {
-        return !active
-               || (row < static_cast<std::int32_t>(flags.size())
-                   && flags[static_cast<std::size_t>(row)] != 0);
-    }
-    /// How many of the first `rows`.
-    [[nodiscard]] std::int32_t Count(std::int32_t rows) const;
-};
 
 struct TSS_Reading {
     TSS_Source source;
@@ -47,12 +32,6 @@ struct TSS_Reading {
 {
     return !Is_Surely_Present(value) && Is_Missing_In_File(value, missing) ? missing : value;
 }
-
-/// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
-[[nodiscard]] std::string Valid_Name_Of_No_Column(std::string_view name);
-
-/// Whether the request's list of columns has a name, or a number.
-[[nodiscard]] bool Is_Column_Selected(std::int32_t ordinal, std::string_view name);
 
 /// Reads what the head announces behind the columns, up to a fault. False for a fault that leaves no Sheet.
 [[nodiscard]] bool Read_Auxiliary_Records(TSS_Reading& reading);

@@ -514,13 +514,6 @@ std::int32_t Type_In_Sheet(const Column_Record& record)
 
 }  // namespace
 
-bool Is_Column_Selected(std::int32_t ordinal, std::string_view name)
-{
-    const std::string wanted =
-        request.Subset_By_Number ? std::to_string(ordinal) : Valid_Name_Of_No_Column(name);
-    return std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
-}
-
 bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal)
 {
     TSS_Source& source = reading.source;

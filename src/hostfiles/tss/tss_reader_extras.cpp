@@ -202,24 +202,6 @@ void Date_By_File(TSS_Reading& reading)
 
 // --- Saved restrictions ----------------------------------------------------------------------------
 
-/// The bits of the rows that are kept.
-std::string Kept_Bits(const TSS_Reading& reading, const std::string& bits)
-{
-    if (!reading.rows.active)
-        return bits;
-    const auto kept_rows = static_cast<std::size_t>(reading.sheet->row_count);
-    std::string kept(kept_rows / 8 + 1, '\0');
-    std::size_t to = 0;
-    for (std::int32_t row = 0; to < kept_rows; ++row)
-        if (reading.rows.Keeps(row)) {
-            const auto from = static_cast<std::size_t>(row);
-            if ((static_cast<unsigned char>(bits[from / 8]) >> from % 8 & 1U) != 0)
-                kept[to / 8] = static_cast<char>(kept[to / 8] | 1 << to % 8);
-            ++to;
-        }
-    return kept;
-}
-
 bool Read_Saved_Restrictions(TSS_Reading& reading)
 {
     constexpr std::int32_t longest_name = 90;
@@ -244,7 +226,7 @@ bool Read_Saved_Restrictions(TSS_Reading& reading)
         const std::int64_t bytes = rows / 8 + 1;
         if (!source.Read_Bytes(bytes, static_cast<std::size_t>(bytes), restriction.bits))
             return false;
-        restriction.bits = Kept_Bits(reading, restriction.bits);
+        restriction.bits = Kept_Bits(reading.rows, restriction.bits, rows);
         reading.sheet->saved_restrictions.push_back(std::move(restriction));
     }
     return true;

@@ -33,13 +33,6 @@ void Write_Head(const Sheet& sheet, TSS_Sink& sink)
     sink.Put(head, Head_Fields);
 }
 
-/// A state without a code of its own is that of columns named by their place.
-std::int32_t Label_State_In_File(const Sheet& sheet)
-{
-    return std::clamp<std::int32_t>(sheet.label_state, labels_by_position,
-                                    sheet.type == table_sheet ? labels_by_text_and_level : labels_by_text);
-}
-
 void Write_Table_Block(Sheet& sheet, TSS_Sink& sink)
 {
     sink.Put(sheet.table_ways);

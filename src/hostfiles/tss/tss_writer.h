@@ -35,21 +35,8 @@ private:
     Output_File* file_;
 };
 
-/// A number as files hold it.
-[[nodiscard]] inline double Number_In_File(double value, const Sheet& sheet)
-{
-    return !Is_Surely_Present(value) && Is_Missing_In_File(value, sheet.missing_value) ? Missing_Value
-                                                                                       : value;
-}
-
 /// A name, made up when it is empty: the reader refuses an empty one.
 [[nodiscard]] std::string_view Name_For_File(Fixed_Text<Name_Width>& name);
-
-/// A Table whose columns are labelled: one of two or more ways.
-[[nodiscard]] inline bool Is_Many_Way_Table(const Sheet& sheet)
-{
-    return sheet.type == table_sheet && sheet.table_ways >= 2;
-}
 
 /// Writes the record of a column.
 void Write_TSS_Column(Column& column, TSS_Sink& sink);

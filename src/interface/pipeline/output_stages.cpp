@@ -1,4 +1,5 @@
 // Stages that write the Sheet and put the new file in the place of an old one.
+#include "interface/book_updates.h"
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/pipeline/stages.h"
@@ -49,10 +50,24 @@ void Begin_Writing(Request_Run& run)
         Delete_File(run.temp_output);  // a link of that name would lead the text elsewhere
 }
 
+namespace {
+
+/// A Sheet goes into the book that is there, or into a new file.
+bool Write_Or_Add(const Request_Run& run)
+{
+    if (run.output_code != book_file || !request.Add_To_Output || !run.output_was_there)
+        return run.output->write(Current_Sheet, run.temp_output.c_str());
+    return request.Replace_Sheet_Asked
+               ? Replace_Sheet(Current_Sheet, run.outfile.c_str(), request.Output_Sheet_Name)
+               : Add_Sheet(Current_Sheet, run.outfile.c_str());
+}
+
+}  // namespace
+
 Request_Status Write_Output(Request_Run& run)
 {
     Begin_Writing(run);
-    if (run.output->write(Current_Sheet, run.temp_output.c_str()))
+    if (Write_Or_Add(run))
         return Done;
     if (request.Add_To_Output && !request.Add_Sheet_Given)
         return Stop(Request_Status::inexact_sheet, "Could add data to Excel file.\n");

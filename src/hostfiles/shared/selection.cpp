@@ -1,0 +1,71 @@
+#include "hostfiles/shared/selection.h"
+
+#include "interface/request/request.h"
+#include "model/names.h"
+
+#include <algorithm>
+#include <vector>
+
+namespace ingester {
+
+std::int32_t Row_Selection::Count(std::int32_t rows) const
+{
+    if (!active)
+        return rows;
+    const auto listed = std::min(static_cast<std::size_t>(rows), flags.size());
+    return static_cast<std::int32_t>(listed
+                                     - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
+}
+
+std::string Valid_Name_Of_No_Column(std::string_view name)
+{
+    std::string valid = Make_Valid_Name(name);
+    Remember_Bracket_Text({});
+    return valid;
+}
+
+bool Is_Column_Selected(std::int32_t ordinal, std::string_view name)
+{
+    const std::string wanted =
+        request.Subset_By_Number ? std::to_string(ordinal) : Valid_Name_Of_No_Column(name);
+    return std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
+}
+
+bool Select_Symmetric(Sheet& sheet)
+{
+    if (sheet.type != symmetric_matrix_sheet || (!request.Subset_Columns && !request.Subset_Rows))
+        return true;
+    const Row_Selection rows{request.Subset_Rows, request.Subset_Row_Flags};
+    std::vector<std::int32_t> left_out;
+    for (std::int32_t row = 0; row < sheet.row_count; ++row) {
+        const Column* const column = Column_At(&sheet, sheet.leading_columns + row);
+        const bool named =
+            column == nullptr || !request.Subset_Columns || Is_Column_Selected(column->index, column->name);
+        if (!named || !rows.Keeps(row))
+            left_out.push_back(row);
+    }
+    if (static_cast<std::int32_t>(left_out.size()) == sheet.row_count)
+        return false;
+    for (; !left_out.empty(); left_out.pop_back())
+        Delete_Row(&sheet, left_out.back(), sheet.leading_columns + left_out.back() <= sheet.column_count);
+    return true;
+}
+
+std::string Kept_Bits(const Row_Selection& selection, const std::string& bits, std::int32_t rows)
+{
+    if (!selection.active)
+        return bits;
+    std::string kept(static_cast<std::size_t>(selection.Count(rows)) / 8 + 1, '\0');
+    std::size_t to = 0;
+    for (std::int32_t row = 0; row < rows; ++row) {
+        if (!selection.Keeps(row))
+            continue;
+        const auto from = static_cast<std::size_t>(row);
+        if ((static_cast<unsigned char>(bits[from / 8]) >> from % 8 & 1U) != 0)
+            kept[to / 8] = static_cast<char>(kept[to / 8] | 1 << to % 8);
+        ++to;
+    }
+    return kept;
+}
+
+}  // namespace ingester

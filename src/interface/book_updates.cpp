@@ -1,0 +1,84 @@
+#include "interface/book_updates.h"
+
+#include "hostfiles/tbk/tbk.h"
+#include "interface/compressed_files.h"
+#include "interface/file_detection.h"
+#include "interface/request/messages.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/gzip_file.h"
+#include "support/text.h"
+
+#include <string>
+
+namespace ingester {
+
+namespace {
+
+enum class Book_Kind : std::uint8_t { none, plain, compressed };
+
+Book_Kind Kind_Of(const char* file_name)
+{
+    const std::int32_t type = Detect_File_Type(file_name);
+    if (type == book_file)
+        return Book_Kind::plain;
+    const bool packed = type == compressed_file && Detect_Compressed_File_Type(file_name) == book_file;
+    return packed ? Book_Kind::compressed : Book_Kind::none;
+}
+
+std::string Scratch_Name(std::string_view file_name)
+{
+    const long pid = Process_Id();
+    return Get_Temp_Folder()
+        .append(pid < 1 ? "$Ingester$.tmp" : Format_Text("$IG%li$.tmp", pid))
+        .append(file_name.substr(Extension_Start(file_name)));
+}
+
+/// Packs the changed book beside the old one, which it then replaces.
+bool Compress_Over(const std::string& plain, const char* file_name)
+{
+    const std::string packed = std::string(file_name).append(".$$$");
+    if (!Compress_File(plain, packed))
+        return Fail("Document not saved.\n");
+    if (Replace_File(packed, file_name))
+        return true;
+    Delete_File(packed);
+    return Fail("Document not saved.\n");
+}
+
+/// Runs `update` on the book, or on what a compressed one holds.
+template <class Update> bool Update_Book(const char* file_name, Book_Kind kind, Update update)
+{
+    if (kind == Book_Kind::plain)
+        return update(file_name);
+    const Scratch_File scratch(Scratch_Name(file_name));
+    return Decompress_To(scratch.Name(), file_name) && update(scratch.Name().c_str())
+           && Compress_Over(scratch.Name(), file_name);
+}
+
+}  // namespace
+
+bool Add_Sheet(Sheet* sheet, const char* file_name)
+{
+    const Book_Kind kind = Kind_Of(file_name);
+    if (kind == Book_Kind::none)
+        return Fail("The file, %.80s, you chose to add sheets to is not in Tabulon Workbook (TBK) format.\n",
+                    file_name);
+    return Update_Book(file_name, kind, [&](const char* plain) {
+        return Add_Sheets_To_TBK(plain, std::span<Sheet* const>(&sheet, 1), file_name);
+    });
+}
+
+bool Replace_Sheet(Sheet* sheet, const char* file_name, std::string_view page)
+{
+    const Book_Kind kind = Kind_Of(file_name);
+    if (kind == Book_Kind::none)
+        return Fail(
+            "The file, %.80s, you chose to replace sheets in is not in Tabulon Workbook (TBK) format.\n",
+            file_name);
+    return Update_Book(file_name, kind, [&](const char* plain) {
+        return Replace_Sheet_In_TBK(plain, sheet, page, file_name);
+    });
+}
+
+}  // namespace ingester
