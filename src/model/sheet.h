@@ -332,7 +332,21 @@ bool Column_Statistics(const Column* column, Column_Summary& summary);
 /// Replaces a missing value by another, wherever a numeric column holds one.
 void Change_Missing_Value(Column* column, double new_value, double old_value);
 
+/// The data Columns of a type; 99 stands for all types. With `only_selected` those that are marked by
+/// `range_selected`.
+constexpr std::int32_t Any_Column_Type = 99;
+[[nodiscard]] std::int32_t Count_Columns_Of_Type(const Sheet* sheet, std::int32_t type, bool only_selected);
+
+/// The n-th data Column of a type, from 1; null when there are fewer.
+[[nodiscard]] Column* Nth_Column_Of_Type(const Sheet* sheet, std::int32_t type, std::int32_t n);
+
 /// Adds each line of `text`, without its control characters, to the Sheet's title.
 void Add_Sheet_Comment(Sheet* sheet, std::string_view text);
+
+void Clear_Title(Sheet* sheet);
+
+/// Gives `target` the title of `source`, behind a line that says what was done (`text`, null for none)
+/// and when.
+void Stamp_Title(Sheet* target, const Sheet* source, const char* text);
 
 }  // namespace ingester

@@ -3,9 +3,12 @@
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "interface/selection.h"
+#include "model/column_summary.h"
 #include "model/names.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "model/source_column.h"
+#include "model/transpose.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -92,9 +95,23 @@ Request_Status Drop_Empty_Columns(Request_Run& run)
     return Done;
 }
 
+Request_Status Turn_Rows_Into_Columns(Request_Run&)
+{
+    if (request.Transpose && !Transpose_Sheet(Current_Sheet))
+        return Stop(Request_Status::not_imported, "Unable to transpose input file.\n");
+    return Done;
+}
+
 Request_Status Note_Source(Request_Run& run)
 {
     Current_Sheet->source_file = run.Source();
+    return Done;
+}
+
+Request_Status Mark_Source(Request_Run&)
+{
+    if (request.Source_Key_Given)
+        static_cast<void>(Add_Source_Column(Current_Sheet));  // an extra: the data stand without it
     return Done;
 }
 
@@ -130,6 +147,13 @@ Request_Status Find_Fixed_Decimals(Request_Run&)
 {
     if (request.Fixed_Number_Text)
         Find_Decimals(Current_Sheet);
+    return Done;
+}
+
+Request_Status Tell_Summary(Request_Run& run)
+{
+    if (request.Print_Summary)
+        Print_Column_Summary(Current_Sheet, run.outfile);
     return Done;
 }
 
