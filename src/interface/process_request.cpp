@@ -41,6 +41,7 @@ constexpr Stage Stages[] = {
     Note_Source,
     Name_Temporary_Output,
     Mark_Source,
+    Join_With_Output,
     Keep_Range_Of_Columns,
     Make_Names_Unique,
     Drop_Empty_Rows,

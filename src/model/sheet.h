@@ -242,6 +242,10 @@ void Set_Column_Type(Column& column, std::int32_t type);
 /// Takes a Column out of its Sheet and frees it; on a Symmetric Matrix with its row.
 bool Delete_Column(Column* column, bool keep_square);
 bool Delete_Empty_Columns(Sheet* sheet);
+/// Puts a Column of another Sheet, whose indexes then have a gap, in the place of `old`, which is freed.
+void Replace_Column(Column* old, Column* column);
+/// Takes `first` and the columns behind it out of their Sheet and puts them behind those of `sheet`.
+void Take_Columns(Sheet* sheet, Column* first);
 /// Deletes the columns whose index is below `first` or above `last`; never the `Row` column. Of a
 /// Symmetric Matrix their rows go as well.
 void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last);

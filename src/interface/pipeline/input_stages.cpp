@@ -321,8 +321,7 @@ constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
     {[](const Request_Run&) { return request.Subset_Columns || request.Subset_Rows; }, "Keeping a subset"},
     {[](const Request_Run&) { return request.Use_Var_File; }, "Renaming columns by a list file"},
-    {[](const Request_Run&) { return request.Add_Mode != Add_Modes::none || request.Add_To_Output; },
-     "Adding to an existing output"},
+    {[](const Request_Run&) { return request.Add_To_Output; }, "Adding to an existing output"},
 };
 
 }  // namespace

@@ -1,5 +1,6 @@
 // Stages that make the Sheet and bring it into the shape that the output gets.
 #include "interface/file_detection.h"
+#include "interface/output_joins.h"
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "interface/selection.h"
@@ -112,6 +113,35 @@ Request_Status Mark_Source(Request_Run&)
 {
     if (request.Source_Key_Given)
         static_cast<void>(Add_Source_Column(Current_Sheet));  // an extra: the data stand without it
+    return Done;
+}
+
+namespace {
+
+/// One way of joining, and what is said when it fails.
+struct Output_Join {
+    Add_Modes mode;
+    Request_Status (*join)(Sheet* sheet, const std::string& path);
+    const char* failed;
+};
+
+constexpr Output_Join Output_Joins[] = {
+    {Add_Modes::append, Append_To_Output, "Could not append data.\n"},
+    {Add_Modes::concatenate, Concatenate_With_Output, "Could not concatenate data.\n"},
+    {Add_Modes::merge, Merge_With_Output, "Could not merge data.\n"},
+};
+
+}  // namespace
+
+Request_Status Join_With_Output(Request_Run&)
+{
+    for (const Output_Join& way : Output_Joins) {
+        if (way.mode != request.Add_Mode)
+            continue;
+        const std::string path(request.Add_File_Name);
+        if (const Request_Status status = way.join(Current_Sheet, path); status != Done)
+            return Stop(status, way.failed);
+    }
     return Done;
 }
 

@@ -97,6 +97,7 @@ Request_Status Note_Source(Request_Run& run);
 Request_Status Name_Temporary_Output(Request_Run& run);
 /// Acts twice: on what was read, and on what it was joined with.
 Request_Status Mark_Source(Request_Run& run);
+Request_Status Join_With_Output(Request_Run& run);
 Request_Status Keep_Range_Of_Columns(Request_Run& run);
 Request_Status Make_Names_Unique(Request_Run& run);
 Request_Status Drop_Empty_Rows(Request_Run& run);
