@@ -138,8 +138,13 @@ private:
         constexpr std::size_t few = 2000;
         const std::span<Place> places(places_.data() + group.begin, group.end - group.begin);
         bool texts_go_on = false;
-        for (Place& place : places)
+        for (std::size_t i = 0; i < places.size(); ++i) {
+            if (i + 2 * Sort_Key::ahead < places.size())
+                keys_[group.key].Prefetch(places[i + Sort_Key::ahead].row,
+                                          places[i + 2 * Sort_Key::ahead].row);
+            Place& place = places[i];
             place.image = Image_Of(group, place.row, texts_go_on) ^ (ascending_ ? 0 : ~std::uint64_t{0});
+        }
         if (places.size() < few)
             std::sort(places.begin(), places.end(), Comes_First);
         else

@@ -32,6 +32,18 @@ struct Sort_Key {
 
     [[nodiscard]] std::size_t Rows() const { return numbers.empty() ? texts.size() : numbers.size(); }
     [[nodiscard]] std::string_view Text(std::size_t row) const;
+
+    /// How far in front of a walk in sorted order, which jumps about in memory, keys are brought near.
+    static constexpr std::size_t ahead = 12;
+    void Prefetch(std::size_t soon, std::size_t later) const
+    {
+        if (texts.empty()) {
+            __builtin_prefetch(&numbers[soon]);
+            return;
+        }
+        __builtin_prefetch(texts[soon]);
+        __builtin_prefetch(&texts[later]);
+    }
 };
 
 /// The first `rows` cells of a column as a key. Cells that it hasn't are missing, NaN is so as well.

@@ -18,31 +18,42 @@ namespace {
 /// Levels by number that a Factor with lists may be given.
 constexpr std::int32_t Most_Added_Levels = Greatest_Level_Table / sizeof(const char*);
 
+std::vector<std::string_view> Listed_Labels(const Column& factor)
+{
+    std::vector<std::string_view> labels;
+    for (const Level_Node* label = factor.labels;
+         label != nullptr && std::ssize(labels) < std::max(factor.nlevels, 0); label = label->next)
+        labels.push_back(label->Text());
+    return labels;
+}
+
+/// The key numbers of all labels.
+template <class Distinct>
+std::vector<std::uint32_t> Number_Labels(Distinct& distinct, const std::vector<std::string_view>& labels)
+{
+    std::vector<std::uint32_t> numbers(labels.size());
+    for (std::size_t begin = 0; begin < labels.size(); begin += Distinct::batch)
+        distinct.Number_Keys_Of(&labels[begin], std::min(Distinct::batch, labels.size() - begin),
+                                &numbers[begin]);
+    return numbers;
+}
+
 /// Maps each label; those that are new are noted in `added`, by their level of `source`.
 template <class Rules> void Match_Labels(const Column& target, const Column& source,
                                          std::vector<std::int32_t>& map, std::vector<std::int32_t>& added)
 {
     Distinct_Keys<std::string_view, Rules> distinct;
     std::vector<std::int32_t> levels;  // of the target, by key number
-    const auto number_of = [&](const Level_Node& label) {
-        const std::string_view text = label.Text();
-        std::uint32_t number;
-        distinct.Number_Keys_Of(&text, 1, &number);
-        return number;
-    };
     std::int32_t level = 0;
-    for (const Level_Node* label = target.labels; label != nullptr && level < target.nlevels;
-         label = label->next) {
+    for (const std::uint32_t number : Number_Labels(distinct, Listed_Labels(target))) {
         ++level;
-        if (number_of(*label) > levels.size())
+        if (number > levels.size())
             levels.push_back(level);
     }
     std::int32_t next = target.nlevels;
     level = 0;
-    for (const Level_Node* label = source.labels; label != nullptr && level < source.nlevels;
-         label = label->next) {
+    for (const std::uint32_t number : Number_Labels(distinct, Listed_Labels(source))) {
         ++level;
-        const std::uint32_t number = number_of(*label);
         if (number > levels.size()) {
             levels.push_back(++next);
             added.push_back(level);

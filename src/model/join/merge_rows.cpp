@@ -46,8 +46,19 @@ private:
         return static_cast<std::int32_t>(source_order_[at]);
     }
 
+    static void Bring_Near(const std::vector<Sort_Key>& keys, const std::vector<std::uint32_t>& order,
+                           std::size_t at)
+    {
+        const std::size_t soon = at + Sort_Key::ahead;
+        if (soon + Sort_Key::ahead < order.size())
+            for (const Sort_Key& key : keys)
+                key.Prefetch(order[soon], order[soon + Sort_Key::ahead]);
+    }
+
     void Step()
     {
+        Bring_Near(keys_.target, target_order_, target_);
+        Bring_Near(keys_.source, source_order_, source_);
         switch (Compare()) {
         case Key_Order::first_ended:
         case Key_Order::above:
