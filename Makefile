@@ -32,7 +32,7 @@ test: $(RELEASE)
 
 bench: $(RELEASE)
 	@tools/set_up.sh bench
-	@cmake --build build/release --target ingester_command make_data time_text time_dates
+	@cmake --build build/release --target ingester_command make_data time_text time_factor time_dates time_joins
 	@python3 bench/run_bench.py --build build/release $(BENCH_OPTIONS)
 
 fuzz:

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Measures text tables, spreadsheets of the host, scripts, Factors and dates, alone and against the peers that are installed.
+"""Measures text tables, spreadsheets of the host, scripts, Factors, dates and joins, alone and against peers.
 
 Every number is the median of paired runs: ours and a peer's take turns, each in a process of its
 own, and a ratio is the median of the ratios of neighbours. "1.50x" says that the peer took 1.5
@@ -84,6 +84,21 @@ seconds <- system.time(f <- factor(x))[["elapsed"]]
 sum <- sum(as.numeric(as.integer(f)) * (seq_along(x) %% 1000))
 cat(sprintf("factor_seconds %.6f\\nlevels %d\\nsum %.0f\\n", seconds, nlevels(f), sum))
 """
+
+
+# Sheets in memory: rows, labels or columns.
+JOINS = {
+    "sort": 5_000_000,
+    "merge": 1_000_000,
+    "transpose": 2_000,
+    "levels": 1_000_000,
+    "append": 40_000,
+}
+TRANSPOSED_COLUMNS = 50_000
+SORT_GOAL = 1 / 1.2
+MERGE_GOAL = 2.0
+TRANSPOSE_GOAL = 4.0
+TEN_TIMES_GOAL = 12.0
 
 
 class Peer:
@@ -325,11 +340,45 @@ def show_spreadsheet(kind, programs, folder, pairs, scale):
     sys.stdout.flush()
 
 
+def show_join(kind, build, scale, pairs):
+    """Sorting against GNU sort, merging against both sorts, transposing against a copy, and what ten times
+    the size costs."""
+    program = os.path.join(build, "bench/time_joins")
+    size = max(int(JOINS[kind] * scale), 10)
+    found = Measures()
+    lines = os.path.join("build/bench", "joins.csv")
+    for _ in range(pairs):
+        if kind == "sort":
+            ours = run([program, "sort", str(size), lines])["sort_seconds"]
+            theirs = run(["env", "LC_ALL=C", "sort", "-s", "-t,", "-k1,1", "-k2,2n", "-o", lines + ".out",
+                          lines])["whole_seconds"]
+            found.add("ratio", theirs / max(ours, 1e-6))
+        elif kind in ("levels", "append"):
+            tenth = run([program, kind, str(size // 10)])[kind + "_seconds"]
+            ours = run([program, kind, str(size)])[kind + "_seconds"]
+            found.add("ratio", ours / max(tenth, 1e-6))
+        else:
+            extra = [str(max(int(TRANSPOSED_COLUMNS * scale), 10))] if kind == "transpose" else []
+            result = run([program, kind, str(size), *extra])
+            ours = result[kind + "_seconds"]
+            found.add("ratio", ours / max(result["sorts_seconds" if kind == "merge" else "copy_seconds"], 1e-6))
+        found.add("ours", ours)
+    ratio = found["ratio"]
+    word, good = {
+        "sort": ("GNU sort / ours (goal %.2g" % SORT_GOAL, ratio >= SORT_GOAL),
+        "merge": ("of both sorts (goal %.2g" % MERGE_GOAL, ratio < MERGE_GOAL),
+        "transpose": ("of a copy of the cells (goal %.2g" % TRANSPOSE_GOAL, ratio < TRANSPOSE_GOAL),
+    }.get(kind, ("of a tenth of the size (goal %.2g" % TEN_TIMES_GOAL, ratio <= TEN_TIMES_GOAL))
+    print("\n%s: %d\n  ours           %.3f s   %.2fx %s: %s)"
+          % (kind, size, found["ours"], ratio, word, "reached" if good else "SHORT"))
+    sys.stdout.flush()
+
+
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--build", default="build/release", help="folder of the built programs")
     parser.add_argument("--rows-scale", type=float, default=1.0, help="part of the rows, for a quick run")
-    parser.add_argument("--only", choices=sorted(WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS),
+    parser.add_argument("--only", choices=sorted(WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS | JOINS),
                         action="append", help="this workload; repeatable")
     parser.add_argument("--pairs", type=int, default=5, help="paired runs (default %(default)s)")
     options = parser.parse_args()
@@ -347,9 +396,12 @@ def main():
     for peer in peers:
         print("%s: %s" % (peer.name, peer.version or "skipped: not installed"))
     with tempfile.TemporaryDirectory(prefix="ingester-bench-", dir=out_root) as folder:
-        for kind in options.only or WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS:
+        for kind in options.only or WORKLOADS | SPREADSHEETS | FACTORS | DATE_WORKLOADS | JOINS:
             if kind in SPREADSHEETS:
                 show_spreadsheet(kind, programs, folder, max(options.pairs, 1), options.rows_scale)
+                continue
+            if kind in JOINS:
+                show_join(kind, options.build, options.rows_scale, max(options.pairs, 1))
                 continue
             if kind in FACTORS:
                 run_factors(options.build, kind, options.rows_scale, max(options.pairs, 1))

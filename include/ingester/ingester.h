@@ -47,6 +47,7 @@ enum ingester_status {
     INGESTER_ZIP_UNSUPPORTED = 11,
     INGESTER_NOTHING_SELECTED = 13, /* no columns or rows selected */
     INGESTER_QTL_FAILED = 14,
+    INGESTER_CONCATENATE_FAILED = 15, /* the tables can't stand beside each other */
     INGESTER_QTL_OPTIONS = 16,
     INGESTER_MERGE_FAILED = 17, /* a key of a merge was not found, or merging failed */
     INGESTER_DOWNLOAD_FAILED = 19

@@ -55,6 +55,7 @@ constexpr Status_Sentence Status_Sentences[] = {
     {INGESTER_ZIP_UNSUPPORTED, Blamed::input, "this is a zip archive; give the files in it one by one"},
     {INGESTER_NOTHING_SELECTED, Blamed::input, "no columns or rows were selected"},
     {INGESTER_QTL_FAILED, Blamed::input, "the QTL file could not be converted"},
+    {INGESTER_CONCATENATE_FAILED, Blamed::request, "the tables can't stand beside each other"},
     {INGESTER_QTL_OPTIONS, Blamed::input, "these options do not fit a QTL file"},
     {INGESTER_MERGE_FAILED, Blamed::request, "the tables could not be merged"},
     {INGESTER_DOWNLOAD_FAILED, Blamed::input, "the download failed"},
@@ -79,6 +80,7 @@ struct Conversion {
 
     [[nodiscard]] bool From_Standard_Input() const { return options.input == Standard_Stream; }
     [[nodiscard]] bool To_Standard_Output() const { return options.output == Standard_Stream; }
+    [[nodiscard]] bool Joins() const { return Options_Join_With_Output(options.output_options); }
 };
 
 /// What the library answered.
@@ -138,10 +140,12 @@ bool Output_May_Be_Written(const Conversion& conversion)
 {
     const Command_Options& options = conversion.options;
     const Sent_Name& output = conversion.output;
-    if (conversion.To_Standard_Output())
-        return true;
     const char* refusal = nullptr;
-    if (Folder_Exists(output.request))
+    if (options.summary || (conversion.To_Standard_Output() && !conversion.Joins()))
+        return true;
+    if (conversion.Joins() && !File_Exists(output.request))
+        refusal = "there is no such file that the input could be joined with";
+    else if (Folder_Exists(output.request))
         refusal = "this is a folder; name a file in it";
     else if (Is_Special_File(output.request))
         refusal = "this is a device or a pipe, which a finished file can't replace; "
@@ -251,6 +255,28 @@ bool Write_Pass_File(const Conversion& conversion, const std::string& name)
     return file.Close();
 }
 
+/// The list of keys stands beside the input, where it must not replace what the user has there; so the
+/// library gets a link to the input, in the private folder. An input that isn't there fails by itself.
+bool Put_Merge_Keys(Conversion& conversion, const std::string& folder)
+{
+    const std::string link = folder + std::string(File_Part_Of(conversion.input.request));
+    if (!conversion.From_Standard_Input()) {
+        if (!File_Exists(conversion.input.request))
+            return true;
+        if (!Make_Link(link, conversion.input.request))
+            return false;
+        conversion.input.request = link;
+    }
+    std::string lines = Format_Text("%zu\n", conversion.options.merge_keys.size());
+    for (const std::string& key : conversion.options.merge_keys)
+        lines.append(key).append("\n");
+    Output_File file;
+    if (!file.Open_Scratch(With_Extension(link, ".mrg")))
+        return false;
+    file.Write(lines);
+    return file.Close();
+}
+
 void Print_Request(const Conversion& conversion)
 {
     constexpr const char* names[] = {"Infile",     "Outfile",        "Worksheet",
@@ -349,10 +375,10 @@ int Run_Command(const Command_Options& options)
         return INGESTER_NO_REQUEST;
     }
     std::string fault;
-    const Conversion conversion{
-        options, Name_Of(options.input, "standard input", folder.Name() + Standard_Input_Name),
-        Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name), folder.Name(),
-        Make_Lists(options.chosen, fault)};
+    Conversion conversion{options,
+                          Name_Of(options.input, "standard input", folder.Name() + Standard_Input_Name),
+                          Name_Of(options.output, "standard output", folder.Name() + Standard_Output_Name),
+                          folder.Name(), Make_Lists(options.chosen, fault)};
     if (!fault.empty())
         std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", fault.c_str());
     if (!fault.empty() || !Request_Can_Carry(conversion) || !Change_List_Is_Free(conversion))
@@ -366,6 +392,10 @@ int Run_Command(const Command_Options& options)
     if (conversion.From_Standard_Input() && !Copy_Standard_Input(conversion.input.request)) {
         Say(conversion.input.native, "could not be read to its end and kept in the temporary folder");
         return INGESTER_INPUT_UNREADABLE;
+    }
+    if (!options.merge_keys.empty() && !Put_Merge_Keys(conversion, folder.Name())) {
+        Say(conversion.input.native, "the keys of the merge could not be kept in the temporary folder");
+        return INGESTER_MERGE_FAILED;
     }
     const Answer answer = Convert(conversion);
     Tell_Answer(conversion, answer);

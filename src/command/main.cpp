@@ -4,6 +4,7 @@
 #include "command/sheets.h"
 
 #include <string_view>
+#include <vector>
 
 namespace {
 
@@ -12,10 +13,25 @@ struct Subcommand {
     int (*run)(int argc, const char* const* argv);
 };
 
+/// A conversion into nothing, by which the library tells what the columns hold.
+int Run_Summary(int argc, const char* const* argv)
+{
+    std::vector<const char*> words = {"ingester"};
+    words.insert(words.end(), argv + 1, argv + argc);
+    words.insert(words.end(), {"/dev/null", "--print-summary"});
+    ingester::Command_Options options;
+    options.summary = true;
+    if (const auto early_end =
+            ingester::Parse_Command_Line(static_cast<int>(words.size()), words.data(), options))
+        return *early_end;
+    return ingester::Run_Command(options);
+}
+
 /// First words that are no names of files. A file of such a name is reached as "./formats".
 constexpr Subcommand Subcommands[] = {
     {"formats", ingester::Run_Formats},
     {"sheets", ingester::Run_Sheets},
+    {"summary", Run_Summary},
 };
 
 }  // namespace

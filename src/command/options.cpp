@@ -1,5 +1,7 @@
 #include "command/options.h"
 
+#include "interface/paths.h"
+
 #include <CLI/CLI.hpp>
 #include <array>
 #include <cstdio>
@@ -40,11 +42,44 @@ constexpr const char* Examples = R"(Examples:
       one more sheet in the book all.tbk, which is made where there is none
   ingester sheets all.tbk
       the sheets that the book holds; --sheet NAME reads one of them
+  ingester june.csv all.csv --append
+      the rows of june.csv go beneath those of all.csv
+  ingester heights.csv plots.csv --merge plot
+      rows are joined by the column plot
+  ingester summary crops.csv
+      what each column holds
   ingester formats
       the formats that are read and written
 
 Exit status: 0 when the output is complete; 1 to 19 when a request failed, as messages on standard
 error say (6: the output; 7: the table has no rows); above 100 when the command line is wrong.)";
+
+/// Merging is told by names of columns; the option language has a list file for them.
+struct Merge_Choice {
+    bool into_equal_names = false;
+    std::string rows = "all";
+};
+
+std::string Check_Merge_Key(const std::string& key)
+{
+    const std::size_t equals = key.find('=');
+    const bool empty = equals == 0 || equals + 1 == key.size() || key.empty();
+    return empty || key.find_first_of("\r\n") != std::string::npos
+               ? "a key is the name of a column, or two names with '=' between them"
+               : "";
+}
+
+/// "/%=1UN": the number of keys, U for columns of equal names, and which rows make new ones. The letters
+/// for these change places behind U.
+std::string Merge_Option(std::size_t keys, const Merge_Choice& choice)
+{
+    std::string option = "/%=" + std::to_string(keys);
+    if (choice.into_equal_names)
+        option += 'U';
+    if (choice.rows != "all")
+        option += (choice.rows == "none") != choice.into_equal_names ? 'N' : 'M';
+    return option;
+}
 
 std::string Check_Not_Empty(const std::string& text)
 {
@@ -77,6 +112,26 @@ bool Add_Named_Options(Command_Options& options)
     return true;
 }
 
+bool Add_Merge_Option(Command_Options& options, const Merge_Choice& merge)
+{
+    constexpr std::size_t most_keys = 4;
+    if (options.merge_keys.empty())
+        return true;
+    const char* fault = nullptr;
+    if (options.merge_keys.size() > most_keys)
+        fault = "a merge has four keys at the most";
+    else if (Is_Url(options.input))
+        fault = "an input from elsewhere can't be merged by named keys; fetch it first";
+    else if (options.output_options.find("/%") != std::string::npos)
+        fault = "/% is given twice, in the option language and by its name";
+    if (fault != nullptr) {
+        std::fprintf(stderr, "ingester: --merge: %s\n", fault);
+        return false;
+    }
+    options.output_options += Merge_Option(options.merge_keys.size(), merge);
+    return true;
+}
+
 }  // namespace
 
 std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
@@ -102,6 +157,19 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
                    "Slash options of the output; folders in values take backslashes")
         ->type_name("TEXT")
         ->check(Check_Slash_Options);
+    Merge_Choice merge;
+    app.add_option("--merge", options.merge_keys,
+                   "Merge with the existing output by this column, or two of different names: of the output "
+                   "and of the input; up to four times")
+        ->type_name("KEY[=KEY]")
+        ->allow_extra_args(false)
+        ->check(Check_Merge_Key);
+    app.add_flag("--merge-equal-names", merge.into_equal_names,
+                 "With --merge: columns of equal names are written into those of the output");
+    app.add_option("--merge-rows", merge.rows,
+                   "With --merge: input rows that make new ones: all without a partner, copies for keys "
+                   "that are there, or none")
+        ->check(CLI::IsMember({"all", "copies", "none"}));
     app.add_flag("--padded", options.padded, "Comma text with blanks that keep its columns in line");
     app.add_flag("-f,--force", options.force, "Replace an output that exists");
     app.add_flag("-q,--quiet", options.quiet, "Show no progress");
@@ -116,7 +184,7 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
     } catch (const CLI::ParseError& end) {
         return app.exit(end);
     }
-    if (!Add_Named_Options(options))
+    if (!Add_Named_Options(options) || !Add_Merge_Option(options, merge))
         return Wrong_Values;
     return std::nullopt;
 }

@@ -6,6 +6,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace ingester {
 
@@ -22,8 +23,10 @@ struct Command_Options {
     Given_Options named_input_options;  ///< added to `input_options` when the line is parsed
     Given_Options named_output_options;
     Chosen_Data chosen;
-    bool dry_run = false;  ///< show the request, don't send it
-    bool padded = false;   ///< comma text keeps its columns under each other
+    std::vector<std::string> merge_keys;  ///< "key", or "key=key" of output and input
+    bool summary = false;                 ///< only describe the columns
+    bool dry_run = false;                 ///< show the request, don't send it
+    bool padded = false;                  ///< comma text keeps its columns under each other
     bool force = false;
     bool quiet = false;
 };

@@ -93,14 +93,30 @@ std::string Fault_Of_Name(std::string_view native)
     return {};
 }
 
-bool Options_Add_To_Output(std::string_view options)
+namespace {
+
+/// Whether output options, once they are taken, make `asked` true.
+template <class Asked> bool Options_Ask_For(std::string_view options, Asked asked)
 {
     std::string rest(options);
     const Reflow_Order reflow = Take_Reflow_Order(rest);
     Cut_Options(Output_Options(), rest);
-    const bool adds = !reflow.asked && (request.Add_To_Output || request.Add_Mode != Add_Modes::none);
+    const bool result = !reflow.asked && asked();
     request = Request_Globals{};
-    return adds;
+    return result;
+}
+
+}  // namespace
+
+bool Options_Add_To_Output(std::string_view options)
+{
+    return Options_Ask_For(options,
+                           [] { return request.Add_To_Output || request.Add_Mode != Add_Modes::none; });
+}
+
+bool Options_Join_With_Output(std::string_view options)
+{
+    return Options_Ask_For(options, [] { return request.Add_Mode != Add_Modes::none; });
 }
 
 std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)

@@ -501,8 +501,7 @@ constexpr Slash_Option Output_Table[] = {
      Optional("concatenate", "U", "")},
     {"/^", Take_Source_Key, "the same, with a column that names the source",
      Bare("concatenate-source", "KEY[,WITH]", "")},
-    {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M",
-     Optional("merge", "[N][U][N|M]")},
+    {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M"},
 };
 
 /// A key that another begins with must be searched behind it, or it would cut the other short.

@@ -23,6 +23,7 @@ enum class Request_Status : std::int32_t {
     zip_unsupported = INGESTER_ZIP_UNSUPPORTED,
     nothing_selected = INGESTER_NOTHING_SELECTED,
     qtl_failed = INGESTER_QTL_FAILED,
+    concatenate_failed = INGESTER_CONCATENATE_FAILED,
     qtl_options = INGESTER_QTL_OPTIONS,
     merge_failed = INGESTER_MERGE_FAILED,
     download_failed = INGESTER_DOWNLOAD_FAILED,

@@ -45,17 +45,17 @@ void Cell_Appender::Add_Block()
     Go_On_In(New_Block(column_->blocks, count), count);
 }
 
-std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, std::int64_t expected)
+std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected)
 {
     constexpr std::int64_t short_column = 20000;
     constexpr std::int32_t many_columns = 64;
+    const std::int32_t columns = first == nullptr ? 0 : sheet.column_count + 1 - first->index;
     std::vector<Cell_Appender> appenders;
     const auto count = static_cast<std::size_t>(expected);
-    const bool shared = sheet.column_count >= many_columns && expected < short_column;
+    const bool shared = columns >= many_columns && expected < short_column;
     Cell_Node* nodes =
-        shared ? New_Block(sheet.shared_blocks, count * static_cast<std::size_t>(sheet.column_count))
-               : nullptr;
-    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        shared ? New_Block(sheet.shared_blocks, count * static_cast<std::size_t>(columns)) : nullptr;
+    for (Column* column = first; column != nullptr; column = column->next) {
         appenders.emplace_back(*column, expected);
         if (shared) {
             appenders.back().Go_On_In(nodes, count);

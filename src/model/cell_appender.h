@@ -52,8 +52,8 @@ private:
     Cell_Node* last_ = nullptr;
 };
 
-/// Appenders for columns of `expected` cells each. Short columns share one block, so that a wide
-/// sheet lies in few pages.
-[[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, std::int64_t expected);
+/// Appenders for the columns from `first` on, of `expected` cells each. Short columns share one block, so
+/// that a wide sheet lies in few pages.
+[[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected);
 
 }  // namespace ingester

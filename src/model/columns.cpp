@@ -17,9 +17,6 @@ namespace ingester {
 
 namespace {
 
-/// Characters of a name by which the host tells columns apart.
-constexpr std::size_t Telling_Width = 32;
-
 bool Holds_Labels(std::int32_t type)
 {
     return type == matrix_column || type == symmetric_matrix_column || type == table_column
@@ -356,8 +353,9 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
     Column* const column = New_Column(sheet, type, wanted.name);
     if (column == nullptr)
         return nullptr;
-    if (!Is_Units(type))
-        Move_Column(sheet, column->index, Target_Index(*sheet, *column, position, insert_after));
+    const std::int32_t index = Target_Index(*sheet, *column, position, insert_after);
+    if (!Is_Units(type) && column->index != index)
+        Move_Column(sheet, column->index, index);
     column->decimals = wanted.decimals;
     column->width = 6;
     const bool square = type == symmetric_matrix_column;
@@ -371,27 +369,10 @@ Column* Add_Column(Sheet* sheet, const Column_Request& wanted, std::int32_t posi
         Delete_Column(column, square);
         return nullptr;
     }
-    if (sheet->label_state == 0)
+    if (sheet->label_state == 0 && Holds_Labels(type))
         Number_Matrix_Columns(sheet);
     return column;
 }
-
-namespace {
-
-/// A name as the host tells it from others: 32 characters, and any bracketed suffix apart.
-struct Telling_Parts {
-    std::string_view stem;
-    std::string_view suffix;
-    bool operator==(const Telling_Parts&) const = default;
-};
-
-Telling_Parts Tell_Parts(std::string_view name)
-{
-    name = Trim_Copy(name);
-    return {Stem_Of(name).substr(0, Telling_Width), name.substr(Bracket_Start(name))};
-}
-
-}  // namespace
 
 Column* Find_Column(const Sheet* sheet, std::string_view name)
 {
@@ -475,6 +456,38 @@ void Free_Column(Sheet& sheet, Column* column)
 }
 
 }  // namespace
+
+void Replace_Column(Column* old, Column* column)
+{
+    Sheet& sheet = *old->sheet;
+    Unlink(column->sheet->first_column, column->sheet->last_column, column);
+    Count_Column(*column->sheet, *column, -1);
+    column->sheet->cursor_column_index = -1;
+    Link_Before(sheet.first_column, sheet.last_column, old, column, column);
+    column->sheet = &sheet;
+    column->index = old->index;
+    Count_Column(sheet, *column, 1);
+    Unlink(sheet.first_column, sheet.last_column, old);
+    Count_Column(sheet, *old, -1);
+    sheet.cursor_column_index = -1;
+    Free_Column(sheet, old);
+}
+
+void Take_Columns(Sheet* sheet, Column* first)
+{
+    Sheet& from = *first->sheet;
+    for (Column* column = first; column != nullptr;) {
+        Column* const next = column->next;
+        Unlink(from.first_column, from.last_column, column);
+        Count_Column(from, *column, -1);
+        Link_Before(sheet->first_column, sheet->last_column, static_cast<Column*>(nullptr), column, column);
+        column->sheet = sheet;
+        Count_Column(*sheet, *column, 1);
+        column = next;
+    }
+    Renumber_Columns(from);
+    Renumber_Columns(*sheet);
+}
 
 bool Delete_Column(Column* column, bool keep_square)
 {

@@ -2,6 +2,7 @@
 
 #include "interface/request/messages.h"
 #include "model/factor_order.h"
+#include "model/level_tables.h"
 #include "model/number_format.h"
 #include "support/distinct_keys.h"
 #include "support/number_text.h"
@@ -423,23 +424,13 @@ void Drop_Levels(Column& column)
     column.factor_kind = plain_factor;
 }
 
-/// What stands for a cell's level in `table`; `otherwise` for a level beyond it.
-template <class Value> Value Of_Level(const std::vector<Value>& table, double level, Value otherwise)
-{
-    return level < static_cast<double>(table.size()) + 1.0 ? table[static_cast<std::size_t>(level) - 1]
-                                                           : otherwise;
-}
-
 }  // namespace
 
 bool Factor_To_Variate(Column* column, bool use_levels)
 {
     if (column == nullptr || column->type != factor_column)
         return false;
-    std::vector<double> values;
-    if (use_levels)
-        for (const Level_Node* node = column->level_values; node != nullptr; node = node->next)
-            values.push_back(node->value.number);
+    const std::vector<double> values = use_levels ? Level_Table(*column) : std::vector<double>{};
     for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
         double& value = cell->value.number;
         value =
@@ -484,11 +475,10 @@ template <class Text_Of> bool Turn_Into_Text(Column& column, bool text_only, Tex
 std::vector<const char*> Stored_Levels(Column& column)
 {
     char text[Number_Text_Room];
-    std::vector<const char*> stored;
     if (column.factor_kind == factor_with_labels)
-        for (const Level_Node* node = column.labels; node != nullptr; node = node->next)
-            stored.push_back(node->value.text);
-    else if (column.factor_kind == factor_with_levels)
+        return Label_Table(column);
+    std::vector<const char*> stored;
+    if (column.factor_kind == factor_with_levels)
         for (const Level_Node* node = column.level_values; node != nullptr; node = node->next)
             stored.push_back(
                 column.texts.Store({text, Format_Cell_Number(text, column, node->value.number)}));

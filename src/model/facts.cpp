@@ -1,4 +1,5 @@
 // What a Sheet and its Columns say of themselves: type names, widths, statistics.
+#include "model/level_tables.h"
 #include "model/number_format.h"
 #include "model/sheet.h"
 #include "support/number_text.h"
@@ -61,6 +62,27 @@ std::string Sheet_Type_Name(const Sheet& sheet)
 std::string_view Column_Type_Name(const Column& column)
 {
     return Look_Up_Type(Column_Type_Names, column.type, "Unknown");
+}
+
+std::int32_t Count_Columns_Of_Type(const Sheet* sheet, std::int32_t type, bool only_selected)
+{
+    std::int32_t count = 0;
+    const Column* column = sheet == nullptr ? nullptr : sheet->first_column;
+    for (; column != nullptr; column = column->next)
+        count += column->type != row_column && (type == Any_Column_Type || column->type == type)
+                         && (!only_selected || column->range_selected != 0)
+                     ? 1
+                     : 0;
+    return count;
+}
+
+Column* Nth_Column_Of_Type(const Sheet* sheet, std::int32_t type, std::int32_t n)
+{
+    Column* column = sheet == nullptr ? nullptr : sheet->first_column;
+    for (; column != nullptr; column = column->next)
+        if (column->type != row_column && (type == Any_Column_Type || column->type == type) && --n == 0)
+            return column;
+    return nullptr;
 }
 
 bool Doubles_Equal(double a, double b)
@@ -164,19 +186,6 @@ void Compute_Column_Width(Column* column)
     column->width = std::max(widest, name_width) + 1;
 }
 
-namespace {
-
-/// The values of a Factor's levels as a table: lists are no place for look-ups cell by cell.
-std::vector<double> Level_Table(const Column& column)
-{
-    std::vector<double> values;
-    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next)
-        values.push_back(node->value.number);
-    return values;
-}
-
-}  // namespace
-
 bool Column_Statistics(const Column* column, Column_Summary& summary)
 {
     if (column == nullptr || column->sheet == nullptr || Is_Text_Like(column->type))
@@ -193,8 +202,7 @@ bool Column_Statistics(const Column* column, Column_Summary& summary)
             ++summary.missing;
             continue;
         }
-        if (factor && value >= 1.0 && value <= static_cast<double>(levels.size()))
-            value = levels[static_cast<std::size_t>(value) - 1];
+        value = Of_Level(levels, value, value);
         summary.min = std::min(summary.min, value);
         summary.max = std::max(summary.max, value);
         sum += value;

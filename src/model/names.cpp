@@ -49,6 +49,14 @@ Name_State name_state;
 
 // --- Suffixes ------------------------------------------------------------------------------------
 
+Telling_Parts Tell_Parts(std::string_view name)
+{
+    constexpr std::size_t telling_width = 32;
+    name = Trim_Copy(name);
+    const std::size_t start = Bracket_Start(name);
+    return {name.substr(0, std::min(start, telling_width)), name.substr(start)};
+}
+
 std::size_t Bracket_Start(std::string_view name)
 {
     return name.ends_with(']') ? std::min(name.find('['), name.size()) : name.size();

@@ -30,6 +30,15 @@ void Use_Bracket_Text(Column& column);
 /// Where the bracketed suffix of `name` begins: at "[" when it ends with "]", else its size.
 [[nodiscard]] std::size_t Bracket_Start(std::string_view name);
 
+/// A name as the host tells it from others: outer blanks don't count, and only 32 characters do, or the 32 in
+/// front of a bracketed suffix and the suffix.
+struct Telling_Parts {
+    std::string_view stem;
+    std::string_view suffix;
+    bool operator==(const Telling_Parts&) const = default;
+};
+[[nodiscard]] Telling_Parts Tell_Parts(std::string_view name);
+
 /// Starts the counters of bracket numbers anew.
 void Reset_Name_Counters();
 

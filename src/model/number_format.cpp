@@ -67,4 +67,25 @@ std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level,
     return {target, static_cast<std::size_t>(end - target)};
 }
 
+char* Format_Cell_Fully(char* target, const Column& column, double value)
+{
+    constexpr int all_digits = 15;
+    const bool decimals_said = column.decimals >= 0 || column.format == date_format_mark;
+    return decimals_said || !Is_Present(*column.sheet, value) ? Format_Cell_Number(target, column, value)
+                                                              : Print_General(target, value, all_digits);
+}
+
+std::string_view Format_Cell(const Column& column, const Cell_Node& cell, char* target)
+{
+    if (Is_Text_Like(column.type))
+        return cell.Text();
+    const double value = cell.value.number;
+    if (column.type != factor_column)
+        return {target, static_cast<std::size_t>(Format_Cell_Fully(target, column, value) - target)};
+    if (Cell_Is_Present(column, cell) && value <= column.nlevels)
+        return Factor_Label_Or_Level(column, static_cast<std::int32_t>(value), target);
+    *target = '*';
+    return {target, column.factor_kind == factor_with_labels ? 0U : 1U};
+}
+
 }  // namespace ingester

@@ -16,6 +16,14 @@ char* Format_Number(char* target, double value, std::int32_t format, std::int32_
 /// The printed form of a present number of `column`, a date in the column's own form, or "*".
 char* Format_Cell_Number(char* target, const Column& column, double value);
 
+/// What a cell of any type prints as: a text itself, a Factor's label, level value or number, "*" for a
+/// missing number and no text for a missing level with a label. A number whose column says nothing of
+/// decimals keeps all its digits. Valid until `target` (of `Number_Text_Room`) changes.
+[[nodiscard]] std::string_view Format_Cell(const Column& column, const Cell_Node& cell, char* target);
+
+/// The same of a present or missing number.
+char* Format_Cell_Fully(char* target, const Column& column, double value);
+
 /// What cell `level` of a Factor prints as: its label, level value or number. Valid until `target`
 /// (of `Number_Text_Room`) changes. `level` is from 1.
 [[nodiscard]] std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target);

@@ -49,14 +49,6 @@ bool Holds_Variates(const Sheet& sheet, std::int32_t texts)
     return sheet.column_count > 0;
 }
 
-Column* First_Text_Column(const Sheet& sheet)
-{
-    Column* column = sheet.first_column;
-    while (column != nullptr && column->type != text_column)
-        column = column->next;
-    return column;
-}
-
 /// Row labels are a leading column.
 void Make_Row_Labels(Sheet& sheet, Column& column)
 {
@@ -97,7 +89,7 @@ void Find_Decimals(Sheet* sheet)
 
 void Vector_To_Matrix(Sheet* sheet, std::string_view name)
 {
-    Column* const labels = First_Text_Column(*sheet);
+    Column* const labels = Nth_Column_Of_Type(sheet, text_column, 1);
     if (sheet->type != vector_sheet || sheet->row_count < 1 || !Holds_Variates(*sheet, 1)
         || (labels != nullptr && sheet->column_count == 1))
         return;

@@ -3,6 +3,8 @@
 #include "interface/request/request.h"
 #include "model/list.h"
 #include "model/names.h"
+#include "platform/folders.h"
+#include "support/text.h"
 
 #include <algorithm>
 #include <memory>
@@ -155,6 +157,36 @@ void Add_Sheet_Comment(Sheet* sheet, std::string_view text)
         text.remove_prefix(end + 1);
     }
     sheet->title_bytes = static_cast<std::int32_t>(sheet->title_lines.size());
+}
+
+void Clear_Title(Sheet* sheet)
+{
+    if (sheet == nullptr)
+        return;
+    sheet->title_lines.clear();
+    sheet->title_line_count = 0;
+    sheet->title_bytes = 0;
+}
+
+void Stamp_Title(Sheet* target, const Sheet* source, const char* text)
+{
+    if (target == nullptr)
+        return;
+    Clear_Title(target);
+    if (text != nullptr) {
+        const Local_Time now = Local_Time_Now();
+        const auto month = static_cast<std::size_t>(now.month);  // the list begins with a mark
+        Add_Sheet_Comment(target,
+                          Format_Text("%s on: %li-%s-%li %li:%02li:%02li", text, static_cast<long>(now.day),
+                                      Get_Settings().month_names[month].c_str(), static_cast<long>(now.year),
+                                      static_cast<long>(now.hour), static_cast<long>(now.minute),
+                                      static_cast<long>(now.second)));
+    }
+    if (source == nullptr)
+        return;
+    target->title_lines += source->title_lines;
+    target->title_line_count += source->title_line_count;
+    target->title_bytes = static_cast<std::int32_t>(target->title_lines.size());
 }
 
 }  // namespace ingester

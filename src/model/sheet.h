@@ -247,6 +247,10 @@ void Set_Column_Type(Column& column, std::int32_t type);
 /// Takes a Column out of its Sheet and frees it; on a Symmetric Matrix with its row.
 bool Delete_Column(Column* column, bool keep_square);
 bool Delete_Empty_Columns(Sheet* sheet);
+/// Puts a Column of another Sheet, whose indexes then have a gap, in the place of `old`, which is freed.
+void Replace_Column(Column* old, Column* column);
+/// Takes `first` and the columns behind it out of their Sheet and puts them behind those of `sheet`.
+void Take_Columns(Sheet* sheet, Column* first);
 /// Deletes the columns whose index is below `first` or above `last`; never the `Row` column. Of a
 /// Symmetric Matrix their rows go as well.
 void Keep_Columns(Sheet* sheet, std::int32_t first, std::int32_t last);
@@ -342,7 +346,21 @@ bool Column_Statistics(const Column* column, Column_Summary& summary);
 /// Replaces a missing value by another, wherever a numeric column holds one.
 void Change_Missing_Value(Column* column, double new_value, double old_value);
 
+/// The data Columns of a type; 99 stands for all types. With `only_selected` those that are marked by
+/// `range_selected`.
+constexpr std::int32_t Any_Column_Type = 99;
+[[nodiscard]] std::int32_t Count_Columns_Of_Type(const Sheet* sheet, std::int32_t type, bool only_selected);
+
+/// The n-th data Column of a type, from 1; null when there are fewer.
+[[nodiscard]] Column* Nth_Column_Of_Type(const Sheet* sheet, std::int32_t type, std::int32_t n);
+
 /// Adds each line of `text`, without its control characters, to the Sheet's title.
 void Add_Sheet_Comment(Sheet* sheet, std::string_view text);
+
+void Clear_Title(Sheet* sheet);
+
+/// Gives `target` the title of `source`, behind a line that says what was done (`text`, null for none)
+/// and when.
+void Stamp_Title(Sheet* target, const Sheet* source, const char* text);
 
 }  // namespace ingester

@@ -41,6 +41,9 @@ bool Delete_File(std::string_view name) noexcept;
 /// system.
 [[nodiscard]] bool Replace_File(std::string_view from, std::string_view to);
 
+/// Makes `name` a link to an existing file.
+[[nodiscard]] bool Make_Link(std::string_view name, std::string_view file);
+
 /// The folder part of a request name, with its last separator; empty when there is none.
 [[nodiscard]] std::string_view Folder_Of(std::string_view name);
 

@@ -131,6 +131,14 @@ bool Replace_File(std::string_view from, std::string_view to)
     return File_Change_Allowed() && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
+bool Make_Link(std::string_view name, std::string_view file)
+{
+    char* const whole = ::realpath(Native_Path(file).c_str(), nullptr);
+    const bool made = whole != nullptr && ::symlink(whole, Native_Path(name).c_str()) == 0;
+    std::free(whole);
+    return made;
+}
+
 std::string_view Folder_Of(std::string_view name)
 {
     return name.substr(0, name.size() - File_Part_Of(name).size());

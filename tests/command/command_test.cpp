@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <chrono>
 #include <csignal>
+#include <sstream>
 #include <thread>
 
 #include <fcntl.h>
@@ -40,7 +41,7 @@ protected:
             std::filesystem::create_directory(Path(folder));
         Put("crops.csv", Crops);
         Put("my data/crops 1.csv", Crops);
-        Put("old.tab", "old\r\n");
+        Put("old.tab", "old\r\n1\r\n");
     }
     void TearDown() override
     {
@@ -158,6 +159,66 @@ TEST_F(Command_Test, Standard_Output_Gets_What_A_Comma_File_Gets)
     EXPECT_TRUE(Run({"--version"}).out.starts_with("ingester "));
 }
 
+/// The commands of a section of the README, as words.
+std::vector<Texts> Readme_Commands(const std::string& heading)
+{
+    std::ifstream file(INGESTER_README);
+    std::string line;
+    while (std::getline(file, line) && line != heading) {
+    }
+    std::vector<Texts> commands;
+    while (std::getline(file, line) && !(line == "```" && !commands.empty())) {
+        std::istringstream words(line.substr(0, line.find(" #")));
+        Texts command;
+        for (std::string word; words >> word;)
+            command.push_back(word);
+        if (!command.empty() && command[0] == "ingester")
+            commands.emplace_back(command.begin() + 1, command.end());
+    }
+    return commands;
+}
+
+TEST_F(Command_Test, Joins_Files_As_The_Readme_Says)
+{
+    const std::string head = "\nSummary of Columns output to: \\dev\\null\nSheet of type: Vector\n\n";
+    const std::string expected[] = {
+        "plot,kind\r\n1,oats\r\n2,rye\r\n7,bean\r\n",
+        "plot,kind,month!\r\n1,oats,Original\r\n2,rye,Original\r\n7,bean,june\r\n",
+        "plot,kind,kind1,height\r\n1,oats,a,5\r\n2,rye,b,6\r\n",
+        "plot,kind,height\r\n1,a,5\r\n2,b,6\r\n",
+        "plot,kind,name,yield\r\n1,oats,,*\r\n2,rye,rye,9\r\n3,,fern,8\r\n",
+        "plot,kind,yield\r\n1,oats,*\r\n2,rye,9\r\n",
+        "C1,C2\r\na,1\r\nb,2\r\n",
+        head
+            + "   1: plot - Variate\n      Mean: 1.5, Min: 1, Max: 2, NMV: 0\n"
+              "   2: kind - Text  Maximum width: 4\n     Decimals: 0\n\n",
+    };
+    const std::vector<Texts> commands = Readme_Commands("### Joining files");
+    ASSERT_EQ(commands.size(), std::size(expected));
+    for (std::size_t i = 0; i < commands.size(); ++i) {
+        for (const char* const name : {"all.csv", "plots.csv"})
+            Put(name, "plot,kind\n1,oats\n2,rye\n");
+        Put("june.csv", "kind,plot\nbean,7\n");
+        Put("heights.csv", "kind,height\na,5\nb,6\n");
+        Put("yields.csv", "plot,name,yield\n3,fern,8\n2,rye,9\n");
+        Put("yields.mrg", "not ours");
+        Put("wide.csv", "a,b\n1,2\n");
+        Texts arguments = commands[i];
+        const bool summary = arguments[0] == "summary";
+        const std::string output = arguments[1];
+        if (!summary)
+            arguments.push_back("--no-quotes");
+        const Ran ran = Run(arguments);
+        EXPECT_EQ(ran.status, 0) << output << ran.err;
+        EXPECT_EQ(ran.err, "");
+        EXPECT_EQ(summary ? ran.out : Get(output), expected[i]) << testing::PrintToString(arguments);
+        EXPECT_EQ(Get("yields.mrg"), "not ours");
+    }
+    EXPECT_EQ(Run({"-", "plots.csv", "--merge", "plot", "--no-quotes"}, {.input = "plot,x\n2,3\n"}).status,
+              0);
+    EXPECT_EQ(Get("plots.csv"), "plot,kind,x\r\n1,oats,*\r\n2,rye,3\r\n");
+}
+
 TEST_F(Command_Test, Tells_What_It_Would_Send_And_What_It_Can)
 {
     const Ran dry =
@@ -239,6 +300,15 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {Wrong_Command_Line, "none can't be opened", {"crops.csv", "out.tab", "--rows", "none"}},
         {Wrong_Command_Line, "beside the input", {"my data/crops 1.csv", "out.tab", "--drop", "kind"}},
         {13, "no columns or rows", {"crops.csv", "out.tab", "--keep", "none"}},
+        {6, "no such file", {"crops.csv", "new.tab", "--append"}},
+        {6, "no such file", {"crops.csv", "-", "--concatenate"}},
+        {17, "Merge key plot in WITH", {"crops.csv", "old.tab", "--merge", "plot"}},
+        {2, "no/crops.csv", {"no/crops.csv", "old.tab", "--merge", "plot"}},
+        {Wrong_Command_Line, "two names", {"crops.csv", "old.tab", "--merge", "a="}},
+        {Wrong_Command_Line,
+         "four keys",
+         {"crops.csv", "old.tab", "--merge=a", "--merge=b", "--merge=c", "--merge=d", "--merge=e"}},
+        {Wrong_Command_Line, "/% is given twice", {"crops.csv", "old.tab", "--merge=a", "--out-options=/%"}},
         {2, "no/crops.csv", {"no/crops.csv", "out.tab"}},
         {2, "no/crops.csv", {"no/crops.csv", "old.tab", "--force"}},
         {3, "folder/odd.bin", {"folder/odd.bin", "out.tab"}},
@@ -252,7 +322,7 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         EXPECT_EQ(ran.err.find("\n:"), std::string::npos) << ran.err;
         EXPECT_EQ(ran.out, "");
         EXPECT_EQ(Files(), files) << arguments.back();
-        EXPECT_EQ(Get("old.tab"), "old\r\n");
+        EXPECT_EQ(Get("old.tab"), "old\r\n1\r\n");
     }
     const Ran silent = Run({"-", "out.tab"}, {.input = ""});
     EXPECT_EQ(silent.status, 2);

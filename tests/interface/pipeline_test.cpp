@@ -71,6 +71,9 @@ TEST_F(Pipeline_Test, Converts)
         {Crops, "c.csv", "o.csv/n", "o.csv", "    1,\"oats\" ,   2.5\r\n    2,\"rye\"  ,     *\r\n"},
         {Crops, "c.csv", "o.xyz/z/n", "o.xyz", "    1 oats   2.5\r\n    2 rye      *\r\n"},
         {Crops, "c.csv/w/tr/c=2:3/db", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
+        {Crops, "c.csv/tr", "o.tab", "o.tab", "kind\toats\trye\r\nplot\t1\t2\r\nyield\t2.5\t*\r\n"},
+        {Crops, "c.csv/tr=N", "o.tab", "o.tab",
+         "C1\tC2\tC3\r\nplot\t1\t2\r\nkind\toats\trye\r\nyield\t2.5\t*\r\n"},
         {Crops, "c.csv/c=2", "o.tab", "o.tab", "kind\tyield\r\noats\t2.5\r\nrye\t*\r\n"},
         {Crops, "c.csv/c=2:2", "o.tab", "o.tab", "kind\r\noats\r\nrye\r\n"},
         {Crops, "c.csv/c=3:9", "o.tab/e", "o.tab", "yield\r\n2.5\r\n*\r\n", few_words},
@@ -94,12 +97,19 @@ TEST_F(Pipeline_Test, Converts)
 
 TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
 {
-    const Texts files = {"c.csv",      Crops,           "o.tab",       "old",
-                         "o.$$$",      Crops,           "empty.csv",   "",
-                         "void.csv",   "a,b\n,\n,\n",   "names.csv",   "a,b\n",
-                         "binary.csv", "a,b\n1,\x01\n", "accents.csv", "a,\xE9\n1,2\n",
-                         "short.csv",  "a,b,c",         "zip.zip",     "PK\3\4",
-                         "c.loc",      Crops,           "c.mrg",       "2\n"};
+    const Texts files = {"c.csv",       Crops,
+                         "o.tab",       "old",
+                         "o.$$$",       Crops,
+                         "empty.csv",   "",
+                         "void.csv",    "a,b\n,\n,\n",
+                         "names.csv",   "a,b\n",
+                         "binary.csv",  "a,b\n1,\x01\n",
+                         "accents.csv", "a,\xE9\n1,2\n",
+                         "short.csv",   "a,b,c",
+                         "zip.zip",     "PK\3\4",
+                         "c.loc",       Crops,
+                         "c.mrg",       "2\n",
+                         "tall.csv",    "a\n" + Repeated("1\n", 50001)};
     for (std::size_t i = 0; i < files.size(); i += 2)
         Put(files[i], files[i + 1]);
     std::filesystem::create_directory(Path("folder.csv"));
@@ -146,8 +156,11 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
         {{f + "c.csv/c=4", f + "o.tab"},
          5,
          "Error: Data contains fewer columns than first column to be kept.\n" + removed},
-        {{f + "c.csv/tr", f + "o.tab"}, 5, "Transposing" + missing},
-        {{f + "c.csv", f + "o.tab/@,k"}, 5, "Adding to an existing output" + missing},
+        {{f + "tall.csv/tr", f + "o.tab"},
+          5,
+          "Cannot transpose a spreadsheet with more than 50000 rows\nThis sheet has 50001 rows.\n"
+          "Unable to transpose input file.\n"},
+        {{f + "c.csv", f + "o.tab/a=k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
         {{"Clipboard.csv", "o.tab"}, 9, "Read Error: Cannot open clipboard for read.\n"},
         {{f + "c.csv", "clipboard.tab"},

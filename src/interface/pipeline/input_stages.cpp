@@ -327,13 +327,8 @@ struct Missing_Operation {
 
 constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
-    {[](const Request_Run&) { return request.Transpose; }, "Transposing"},
-    {[](const Request_Run& run) {
-         return request.Add_Mode != Add_Modes::none
-                || (request.Add_To_Output && run.output_code != book_file);
-     },
+    {[](const Request_Run& run) { return request.Add_To_Output && run.output_code != book_file; },
      "Adding to an existing output"},
-    {[](const Request_Run&) { return request.Print_Summary; }, "Printing a summary"},
 };
 
 }  // namespace

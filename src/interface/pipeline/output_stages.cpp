@@ -57,7 +57,7 @@ bool Write_Or_Add(const Request_Run& run)
 {
     if (run.output_code != book_file || !request.Add_To_Output || !run.output_was_there)
         return run.output->write(Current_Sheet, run.temp_output.c_str());
-    return request.Replace_Sheet_Asked
+    return request.Replace_Sheet_Asked || request.Sheet_Already_There
                ? Replace_Sheet(Current_Sheet, run.outfile.c_str(), request.Output_Sheet_Name)
                : Add_Sheet(Current_Sheet, run.outfile.c_str());
 }

@@ -1,12 +1,17 @@
 // Stages that make the Sheet and bring it into the shape that the output gets.
 #include "interface/file_detection.h"
+#include "interface/output_joins.h"
+#include "interface/output_sheet.h"
 #include "interface/pipeline/stages.h"
 #include "interface/request/request.h"
 #include "interface/selection.h"
 #include "interface/var_file.h"
+#include "model/column_summary.h"
 #include "model/names.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "model/source_column.h"
+#include "model/transpose.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -86,6 +91,19 @@ Request_Status List_Sheets(Request_Run&)
     return Done;
 }
 
+/// What is joined with an output takes the place of the sheet that it was joined with.
+Request_Status Find_Sheet_Of_Output(Request_Run& run)
+{
+    if (request.Add_Mode == Add_Modes::none && !request.Source_Key_Given)
+        return Done;
+    Find_Output_Sheet(run.outfile);
+    if (run.output_code == book_file || run.output_code == xml_workbook_file)
+        request.Add_To_Output = File_Exists(run.outfile);
+    if (!request.Merge_Sheet_Name.empty())
+        Current_Sheet->sheet_name = request.Merge_Sheet_Name;
+    return Done;
+}
+
 Request_Status Keep_Subset(Request_Run& run)
 {
     request.Current_File_Name = run.outfile;
@@ -112,6 +130,13 @@ Request_Status Drop_Empty_Columns(Request_Run&)
     return Done;
 }
 
+Request_Status Turn_Rows_Into_Columns(Request_Run&)
+{
+    if (request.Transpose && !Transpose_Sheet(Current_Sheet))
+        return Stop(Request_Status::not_imported, "Unable to transpose input file.\n");
+    return Done;
+}
+
 Request_Status Note_Source(Request_Run& run)
 {
     Current_Sheet->source_file = run.Source();
@@ -130,6 +155,42 @@ Request_Status Change_By_List(Request_Run& run)
         Write_Var_File(*Current_Sheet, request.Var_File_Name);
     if (Current_Sheet->column_count < 1)
         return Stop(Request_Status::no_data, "All columns in the input file are empty.\n");
+    return Done;
+}
+
+Request_Status Mark_Source(Request_Run&)
+{
+    if (request.Source_Key_Given)
+        static_cast<void>(Add_Source_Column(Current_Sheet));  // an extra: the data stand without it
+    return Done;
+}
+
+namespace {
+
+/// One way of joining, and what is said when it fails.
+struct Output_Join {
+    Add_Modes mode;
+    Request_Status (*join)(Sheet* sheet, const std::string& path);
+    const char* failed;
+};
+
+constexpr Output_Join Output_Joins[] = {
+    {Add_Modes::append, Append_To_Output, "Could not append data.\n"},
+    {Add_Modes::concatenate, Concatenate_With_Output, "Could not concatenate data.\n"},
+    {Add_Modes::merge, Merge_With_Output, "Could not merge data.\n"},
+};
+
+}  // namespace
+
+Request_Status Join_With_Output(Request_Run&)
+{
+    for (const Output_Join& way : Output_Joins) {
+        if (way.mode != request.Add_Mode)
+            continue;
+        const std::string path(request.Add_File_Name);
+        if (const Request_Status status = way.join(Current_Sheet, path); status != Done)
+            return Stop(status, way.failed);
+    }
     return Done;
 }
 
@@ -165,6 +226,13 @@ Request_Status Find_Fixed_Decimals(Request_Run&)
 {
     if (request.Fixed_Number_Text)
         Find_Decimals(Current_Sheet);
+    return Done;
+}
+
+Request_Status Tell_Summary(Request_Run& run)
+{
+    if (request.Print_Summary)
+        Print_Column_Summary(Current_Sheet, run.outfile);
     return Done;
 }
 

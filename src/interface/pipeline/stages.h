@@ -92,15 +92,21 @@ Request_Status Refuse_Missing_Operations(Request_Run& run);
 Request_Status Read_Input(Request_Run& run);
 Request_Status Name_Output_Sheet(Request_Run& run);
 Request_Status List_Sheets(Request_Run& run);
+Request_Status Find_Sheet_Of_Output(Request_Run& run);
 Request_Status Keep_Subset(Request_Run& run);
 Request_Status Drop_Empty_Columns(Request_Run& run);
+Request_Status Turn_Rows_Into_Columns(Request_Run& run);
 Request_Status Note_Source(Request_Run& run);
 Request_Status Name_Temporary_Output(Request_Run& run);
 Request_Status Change_By_List(Request_Run& run);
+/// Acts twice: on what was read, and on what it was joined with.
+Request_Status Mark_Source(Request_Run& run);
+Request_Status Join_With_Output(Request_Run& run);
 Request_Status Keep_Range_Of_Columns(Request_Run& run);
 Request_Status Make_Names_Unique(Request_Run& run);
 Request_Status Drop_Empty_Rows(Request_Run& run);
 Request_Status Find_Fixed_Decimals(Request_Run& run);
+Request_Status Tell_Summary(Request_Run& run);
 
 // --- The output ----------------------------------------------------------------------------------
 

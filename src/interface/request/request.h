@@ -136,6 +136,8 @@ struct Request_Globals : Lasting_Globals {
     bool Excel_97 = false;
     bool CSV_Output = false;
     Fixed_Text<Short_Name_Width> Merge_Sheet_Name;
+    Fixed_Text<Short_Name_Width> Update_Sheet_Name;  ///< the sheet of the output that is joined with
+    bool Sheet_Already_There = false;                ///< that sheet exists, and gives way to the result
     bool Keep_Sorted = true;
     Fixed_Text<Long_Name_Width> Add_File_Name;  ///< the output that is added to, in full
     Fixed_Text<60> Merge_Key;

@@ -65,7 +65,7 @@ public:
         double number;
         no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number);
         Column* column = sheet.first_column->next;
-        for (const Cell_Appender& cells : Make_Appenders(sheet, Expected_Rows())) {
+        for (const Cell_Appender& cells : Make_Appenders(sheet, sheet.first_column->next, Expected_Rows())) {
             Start_Column(*column, cells);
             column = column->next;
         }

@@ -1,0 +1,70 @@
+#include "interface/output_sheet.h"
+
+#include "interface/format_drivers.h"
+#include "interface/request/messages.h"
+#include "interface/request/request.h"
+#include "platform/folders.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <string_view>
+#include <vector>
+
+namespace ingester {
+
+namespace {
+
+/// Stands for a file of one table, whose sheet has no name.
+constexpr std::string_view Only_Sheet = "1";
+
+void Update_Sheet(std::string_view name, bool already_there)
+{
+    request.Output_Sheet_Name = name;
+    request.Update_Sheet_Name = name;
+    request.Sheet_Already_There = already_there;
+}
+
+/// The first sheet, in the place of one that isn't there or wasn't named.
+void Use_First_Sheet(const std::vector<std::string>& names, const std::string& output_name)
+{
+    const std::string wanted(request.Merge_Sheet_Name);
+    if (!wanted.empty())
+        Report_Message(
+            Format_Text("Warning: sheet %s not found in file %s.\n", wanted.c_str(), output_name.c_str()));
+    else if (names.size() > 1)
+        Report_Message(Format_Text("Using sheet %s within the file.\n", names.front().c_str()));
+    Update_Sheet(names.front(), true);
+    request.Add_To_Output = true;
+}
+
+}  // namespace
+
+bool Find_Output_Sheet(const std::string& output_name)
+{
+    const std::string wanted(request.Merge_Sheet_Name);
+    if (!File_Exists(output_name))
+        return false;
+    if (wanted.empty() && !request.Worksheet_Name.empty() && request.Worksheet_Name.view() != Only_Sheet) {
+        request.Update_Sheet_Name = request.Worksheet_Name;
+        return false;
+    }
+    const auto listed = List_Sheet_Names(output_name);
+    if (!listed || listed->empty()) {
+        request.Add_To_Output = false;
+        return false;
+    }
+    const auto found = std::ranges::find_if(
+        *listed, [&wanted](const std::string& name) { return Equal_Ignoring_Case(name, wanted); });
+    if (!wanted.empty() && found != listed->end()) {
+        Update_Sheet(wanted, true);
+        request.Add_To_Output = true;
+        return true;
+    }
+    if (request.Add_Mode == Add_Modes::none && request.Source_Key_Given)
+        Update_Sheet(wanted.empty() ? std::string_view(listed->front()) : wanted, wanted.empty());
+    else
+        Use_First_Sheet(*listed, output_name);
+    return false;
+}
+
+}  // namespace ingester

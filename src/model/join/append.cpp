@@ -1,0 +1,255 @@
+#include "model/join/append.h"
+
+#include "interface/request/messages.h"
+#include "model/factors.h"
+#include "model/join/cell_transfer.h"
+#include "model/join/column_index.h"
+#include "model/level_tables.h"
+#include "model/number_format.h"
+#include "support/number_text.h"
+#include "support/text.h"
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+namespace ingester {
+
+namespace {
+
+bool Can_Be_Appended(const Sheet* target, const Sheet* source)
+{
+    return target != nullptr && source != nullptr && source != target && source->row_count >= 1
+           && target->type != scalar_sheet && target->type != symmetric_matrix_sheet
+           && source->type != diagonal_matrix_sheet;
+}
+
+/// The Factor that tells where rows came from, and its level for the new ones.
+struct Source_Mark {
+    Column* column = nullptr;
+    double level = 0;
+};
+
+/// One more label. A Factor without any gets those that its levels print as.
+bool Add_Label(Column& factor, std::string_view label)
+{
+    char text[Number_Text_Room];
+    std::vector<const char*> labels = Label_Table(factor);
+    labels.resize(std::min(labels.size(), static_cast<std::size_t>(factor.nlevels) - 1));
+    while (std::ssize(labels) < factor.nlevels - 1)
+        labels.push_back(factor.texts.Store(
+            Factor_Label_Or_Level(factor, static_cast<std::int32_t>(labels.size()) + 1, text)));
+    labels.push_back(factor.texts.Store(label));
+    if (!Make_Labels(factor, factor.nlevels))
+        return false;
+    const char* const* next = labels.data();
+    for (Level_Node* node = factor.labels; node != nullptr; node = node->next)
+        node->value.text = *next++;
+    factor.factor_kind = factor_with_labels;
+    factor.label_width = std::max(factor.label_width, static_cast<std::int32_t>(label.size()));
+    return true;
+}
+
+bool Add_Level_Value(Column& factor)
+{
+    std::vector<double> values = Level_Table(factor);
+    values.resize(static_cast<std::size_t>(factor.nlevels), factor.nlevels);
+    if (!Make_Level_Values(factor, factor.nlevels))
+        return false;
+    const double* next = values.data();
+    for (Level_Node* node = factor.level_values; node != nullptr; node = node->next)
+        node->value.number = *next++;
+    return true;
+}
+
+/// A Factor that is there gets one more level for the new rows.
+bool Extend_Source_Column(Column& factor, const Append_Request& wanted)
+{
+    constexpr std::int32_t most_levels = Greatest_Level_Table / sizeof(const char*);
+    if (factor.type != factor_column)
+        return Fail("Selected column to indicate append source is not a factor.\n");
+    factor.nlevels = std::max(factor.nlevels, 0) + 1;
+    const bool labelled = factor.label_count > 0 || !wanted.new_label.empty();
+    if (labelled && factor.nlevels > most_levels)
+        return false;
+    const std::string label = wanted.new_label.empty() ? Format_Text("%li", static_cast<long>(factor.nlevels))
+                                                       : std::string(wanted.new_label);
+    return (!labelled || Add_Label(factor, label))
+           && (factor.level_values_count < 1 || Add_Level_Value(factor));
+}
+
+/// A Factor of two levels: the rows that are there, and those that come.
+Column* Make_Source_Column(Sheet& target, const Append_Request& wanted)
+{
+    Text_Arena texts;
+    Level_Node labels[2] = {};
+    Column_Request column{factor_column, wanted.source_column_name, -1, 2, "1"};
+    if (!wanted.new_label.empty()) {
+        labels[0].next = &labels[1];
+        labels[0].value.text = texts.Store(wanted.old_label);
+        labels[1].value.text = texts.Store(wanted.new_label);
+        column.labels = labels;
+        column.label_count = 2;
+        column.fill = wanted.old_label;
+    }
+    return Add_Column(&target, column, target.column_count + 1, true);
+}
+
+bool Find_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark& mark)
+{
+    if (wanted.source_column_name.empty())
+        return true;
+    mark.column = Find_Column(&target, wanted.source_column_name);
+    if (mark.column == nullptr) {
+        mark.column = Make_Source_Column(target, wanted);
+        mark.level = 2;
+        return mark.column != nullptr;
+    }
+    if (!Extend_Source_Column(*mark.column, wanted))
+        return false;
+    mark.level = mark.column->nlevels;
+    return true;
+}
+
+void Mark_New_Rows(const Source_Mark& mark, std::int32_t first_row)
+{
+    if (mark.column == nullptr)
+        return;
+    for (Cell_Node* cell = Cell_At(mark.column, first_row); cell != nullptr; cell = cell->next)
+        cell->value.number = mark.level;
+}
+
+/// A column with new cells, and where they come from; without a target the data are left out.
+struct Column_Pair {
+    Column* target;
+    const Column* source;
+};
+
+std::vector<Column_Pair> Pair_By_Name(const Sheet& target, const Sheet& source)
+{
+    Column_Index index(target);
+    std::vector<Column_Pair> pairs;
+    for (const Column* column = source.first_column->next; column != nullptr; column = column->next)
+        pairs.push_back({index.Take(column->name), column});
+    return pairs;
+}
+
+std::vector<Column_Pair> Pair_By_Position(const Sheet& target, const Sheet& source, const Column* passed_over)
+{
+    std::vector<Column_Pair> pairs;
+    Column* partner = target.first_column->next;
+    for (const Column* column = source.first_column->next; column != nullptr; column = column->next) {
+        if (partner != nullptr && partner == passed_over)
+            partner = partner->next;
+        pairs.push_back({partner, column});
+        partner = partner == nullptr ? nullptr : partner->next;
+    }
+    return pairs;
+}
+
+/// The columns whose data could not be appended as they are.
+class Left_Out_List {
+public:
+    explicit Left_Out_List(const Sheet& sheet) : sheet_(sheet) {}
+
+    void Note(const Column& column)
+    {
+        constexpr std::size_t longest = 1000;
+        any_ = true;
+        if (sheet_.type != vector_sheet && sheet_.label_state == 0)
+            return;  // numbers would name nothing
+        if (names_.size() + column.name.size() > longest) {
+            names_.append(names_.ends_with("...") ? "" : "...");
+            return;
+        }
+        names_.append(names_.empty() ? "" : ", ").append(column.name);
+    }
+
+    void Tell() const
+    {
+        if (!names_.empty())
+            Fail("Some column data has not been appended due to a data type mismatch.\n"
+                 "(e.g. text column data cannot be inserted into numeric column).\n"
+                 "Columns were:\n%s.\n",
+                 names_.c_str());
+        else if (any_)
+            Fail("Some column data has not been appended due to a data type mismatch.\n"
+                 "(e.g. text column data cannot be inserted to numeric column).\n");
+    }
+
+private:
+    const Sheet& sheet_;
+    std::string names_;
+    bool any_ = false;
+};
+
+/// Texts go into numbers when these can become texts: Variates of a Vector, and Factors without labels.
+bool Make_Room_For_Texts(Column& target, const Column& source)
+{
+    if (Is_Text_Like(target.type) || !Is_Text_Like(source.type) || target.label_count > 0)
+        return true;
+    const bool factor = target.type == factor_column;
+    if ((!factor && target.type != variate_column) || target.sheet->type != vector_sheet
+        || target.sheet->read_only != 0 || target.protected_column != 0)
+        return false;
+    Fail("Text column %s appended to variate column %s.\nConverting %s to a text for compatibility.\n",
+         source.name.c_str(), target.name.c_str(), target.name.c_str());
+    return factor ? Factor_To_Text(&target) : Variate_To_Text(&target);
+}
+
+void Copy_Cells(Cell_Transfer& transfer, std::int32_t first_row)
+{
+    const std::int32_t row = first_row + First_Row_Of(transfer.Source());
+    Cell_Node* to = Cell_At(&transfer.Target(), row);
+    for (const Cell_Node* from = transfer.Source().first_cell; from != nullptr && to != nullptr;
+         from = from->next) {
+        transfer.Put(*to, from->value);
+        to = to->next;
+    }
+}
+
+/// False when the Sheet has no room for a column.
+bool Append_Column(Sheet& target, Column_Pair pair, std::int32_t first_row, Left_Out_List& left_out)
+{
+    const bool is_new = pair.target == nullptr;
+    const bool never_texts = target.type != vector_sheet && Is_Text_Like(pair.source->type);
+    if (is_new && !never_texts)
+        pair.target = Add_Column_Like(target, *pair.source);
+    if (pair.target == nullptr && !never_texts)
+        return false;
+    Cell_Transfer transfer;
+    if (pair.target == nullptr || !Make_Room_For_Texts(*pair.target, *pair.source)
+        || !transfer.Prepare(*pair.target, *pair.source, 0.0, false)) {
+        left_out.Note(*pair.source);
+        return true;
+    }
+    Copy_Cells(transfer, first_row);
+    if (transfer.Has_Lost())
+        left_out.Note(*pair.source);
+    if (is_new)
+        Compute_Column_Width(pair.target);
+    return true;
+}
+
+}  // namespace
+
+bool Append_Sheet(Sheet* target, const Append_Request& wanted)
+{
+    if (!Can_Be_Appended(target, wanted.source))
+        return false;
+    Source_Mark mark;
+    const std::int32_t first_row = target->row_count;
+    if (!Find_Source_Column(*target, wanted, mark)
+        || !Insert_Rows(target, first_row, wanted.source->row_count, false))
+        return false;
+    Mark_New_Rows(mark, first_row);
+    Left_Out_List left_out(*wanted.source);
+    for (const Column_Pair& pair : wanted.by_name ? Pair_By_Name(*target, *wanted.source)
+                                                  : Pair_By_Position(*target, *wanted.source, mark.column))
+        if (!Append_Column(*target, pair, first_row, left_out))
+            return false;
+    left_out.Tell();
+    return true;
+}
+
+}  // namespace ingester

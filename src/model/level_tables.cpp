@@ -1,0 +1,21 @@
+#include "model/level_tables.h"
+
+namespace ingester {
+
+std::vector<double> Level_Table(const Column& column)
+{
+    std::vector<double> values;
+    for (const Level_Node* node = column.level_values; node != nullptr; node = node->next)
+        values.push_back(node->value.number);
+    return values;
+}
+
+std::vector<const char*> Label_Table(const Column& column)
+{
+    std::vector<const char*> labels;
+    for (const Level_Node* node = column.labels; node != nullptr; node = node->next)
+        labels.push_back(node->value.text == nullptr ? Text_Arena::Empty() : node->value.text);
+    return labels;
+}
+
+}  // namespace ingester

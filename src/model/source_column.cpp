@@ -1,0 +1,23 @@
+#include "model/source_column.h"
+
+#include "interface/request/request.h"
+
+namespace ingester {
+
+bool Add_Source_Column(Sheet* sheet)
+{
+    if (sheet == nullptr || request.Merge_Key.empty() || Find_Column(sheet, request.Merge_Key) != nullptr)
+        return sheet != nullptr;
+    Text_Arena texts;
+    Level_Node label{};
+    Column_Request wanted{factor_column, request.Merge_Key, -1, 1, "1"};
+    if (!request.Merge_With.empty()) {
+        label.value.text = texts.Store(request.Merge_With);
+        wanted.labels = &label;
+        wanted.label_count = 1;
+        wanted.fill = request.Merge_With;
+    }
+    return Add_Column(sheet, wanted, sheet->column_count + 1, true) != nullptr;
+}
+
+}  // namespace ingester

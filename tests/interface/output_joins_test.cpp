@@ -1,0 +1,113 @@
+// Joins with an existing output, through the export.
+#include "host_fixture.h"
+
+namespace ingester {
+namespace {
+
+using Output_Joins = Host_Test;
+
+const std::string Old = "plot,kind,yield\n1,oats,2.5\n2,rye,*\n3,oats,4\n";
+
+TEST_F(Output_Joins, Put_Old_And_New_Data_Together)
+{
+    const struct {
+        std::string input, in, out, text;
+    } cases[] = {
+        {"yield,plot\n7,4\n", "n.csv", "o.csv/h/-/u/@",
+         "plot,kind,yield\r\n1,oats,2.5\r\n2,rye,*\r\n3,oats,4\r\n4,,7\r\n"},
+        {"a,b\n4,wheat\n", "n.csv", "o.csv/h/-/u/@=N",
+         "plot,kind,yield\r\n1,oats,2.5\r\n2,rye,*\r\n3,oats,4\r\n4,wheat,*\r\n"},
+        {"plot,wet\n9,yes\n", "n.csv", "o.csv/h/-/u/@,from,june",
+         "plot,kind,yield,from,wet\r\n1,oats,2.5,Original,\r\n2,rye,*,Original,\r\n3,oats,4,Original,\r\n9,,*"
+         ",june,yes\r\n"},
+        {"plot\n9\n", "n.csv", "o.csv/h/-/u/@,from",
+         "plot,kind,yield,from\r\n1,oats,2.5,1\r\n2,rye,*,1\r\n3,oats,4,1\r\n9,,*,2\r\n"},
+        {"yield,height\n1,2\n3,4\n5,6\n", "n.csv", "o.csv/h/-/u/&",
+         "plot,kind,yield,yield1,height\r\n1,oats,2.5,1,2\r\n2,rye,*,3,4\r\n3,oats,4,5,6\r\n"},
+        {"YIELD,height\n1,2\n3,4\n5,6\n", "n.csv", "o.csv/h/-/u/&U",
+         "plot,kind,YIELD,height\r\n1,oats,1,2\r\n2,rye,3,4\r\n3,oats,5,6\r\n"},
+        {"height\n2\n4\n6\n", "n.csv", "o.csv/h/-/u/^from,'june'",
+         "plot,kind,yield,height,from\r\n1,oats,2.5,2,june\r\n2,rye,*,4,june\r\n3,oats,4,6,june\r\n"},
+        {"plot,b\n3,x\n9,y\n", "n.csv", "o.csv/h/-/u/%",
+         "plot,kind,yield,b\r\n1,oats,2.5,\r\n2,rye,*,\r\n3,oats,4,x\r\n9,,*,y\r\n"},
+        {"sort,b\nrye,1\noats,2\noats,3\noats,4\nbean,5\n", "k.csv", "o.csv/h/-/u/%=1M",
+         "plot,kind,yield,b\r\n1,oats,2.5,2\r\n2,rye,*,1\r\n3,oats,4,3\r\n3,oats,4,4\r\n"},
+        {"sort,yield\noats,9\nbean,5\n", "k.csv", "o.csv/h/-/u/%=1UM",
+         "plot,kind,yield\r\n1,oats,9\r\n2,rye,*\r\n3,oats,9\r\n"},
+        {"x;plot;b\n7;2;u\n8;1;v\n", "two.csv/z=;", "o.csv/h/-/u/%=4N",
+         "plot,kind,yield,x,b\r\n1,oats,2.5,8,v\r\n2,rye,*,7,u\r\n3,oats,4,*,\r\n"},
+        {"plot,kind,yield\n5,NA,6\n", "n.csv/x=NA/lt=0", "o.csv/h/-/u/@/mv=*",
+         "plot,kind,yield\r\n1,oats,2.5\r\n2,rye,*\r\n3,oats,4\r\n5,,6\r\n"},
+    };
+    Put("k.mrg", "1\nkind=sort\n");
+    Put("two.mrg", "1\nplot\n");
+    for (const auto& one : cases) {
+        Put("o.csv", Old);
+        Put(one.in.substr(0, one.in.find('/')), one.input);
+        EXPECT_EQ(Convert(one.in, one.out), (Host_Answer{0, ""})) << one.out;
+        EXPECT_EQ(Get("o.csv"), one.text) << one.out;
+    }
+}
+
+TEST_F(Output_Joins, Factors_Of_A_Host_File_Take_The_Texts_Of_Others)
+{
+    Put("n.csv", "kind!,year!\noats,2001\nrye,2003\n");
+    ASSERT_EQ(Convert("n.csv", "o.tss").first, 0);
+    Put("n.csv", "kind,year\nbean,2002\nrye,2001\n");
+    EXPECT_EQ(Convert("n.csv", "o.tss/@"),
+              (Host_Answer{0, "Some column data has not been appended due to a data type mismatch.\n"
+                              "(e.g. text column data cannot be inserted into numeric column).\n"
+                              "Columns were:\nyear.\n:\n"}))
+        << "2002 went to the nearest level";
+    Put("n.csv", "year,rain\n2001,5\n2004,6\n2003,7\n");
+    Put("n.mrg", "1\nyear\n");
+    EXPECT_EQ(Convert("n.csv", "o.tss/%=1"), (Host_Answer{0, ""}));
+    ASSERT_EQ(Convert("o.tss", "o.csv/h/-/u").first, 0);
+    EXPECT_EQ(Get("o.csv"),
+              "kind,year,rain\r\noats,2001,5\r\nrye,2003,7\r\nbean,2001,5\r\nrye,2001,5\r\n ,2004,6\r\n");
+}
+
+TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
+{
+    const std::string f = Request_Name("");
+    const std::string appended = "Could not append data.\n";
+    const std::string concatenated = "Could not concatenate data.\n";
+    const std::string merged = "Could not merge data.\n";
+    Put("n.csv", "plot,month,name\n1,2,x\n");
+    Put("n.mrg", "1\nabsent\n");
+    Put("m.csv", "plot,b\n1,2\n");
+    Put("m.mrg", "1\nplot=absent\n");
+    Put("t.csv", "plot,b\n1,2\n");
+    Put("t.mrg", "1\nkind=plot\n");
+    Put("one.csv", "plot\n1\n");
+    Put("two.mrg", "2\nplot\n");
+    Put("two.csv", "plot\n1\n");
+    Put("zip.csv", "PK\3\4");
+    Put("none.csv", "");
+    Put("odd.csv", std::string("\1\2\3\4", 4));
+    Put("head.csv", "a,b\n");
+    const std::tuple<std::string, std::string, int, std::string> cases[] = {
+        {"n.csv", "o.csv/&", 15, concatenated},
+        {"n.csv", "o.csv/@,kind", 13,
+         "Selected column to indicate append source is not a factor.\n" + appended},
+        {"n.csv", "o.csv/%=1", 17, "Merge key absent in WITH not found in OUTFILE.\n" + merged},
+        {"m.csv", "o.csv/%=1", 17, "Merge key absent in MATCH not found in " + f + "o.csv.\n" + merged},
+        {"t.csv", "o.csv/%=1", 17, "Columns kind and plot data types do not match.\n" + merged},
+        {"two.csv", "o.csv/%=2", 17, merged},
+        {"n.csv", "absent.csv/@", 2, "Input file could not be opened.\n" + appended},
+        {"n.csv", "none.csv/&", 2, "Input file is empty.\n" + concatenated},
+        {"n.csv", "odd.csv/%", 3, merged},
+        {"n.csv", "zip.csv/@", 11, appended},
+        {"n.csv", "head.csv/@", 4, appended},
+    };
+    for (const auto& [input, output, status, said] : cases) {
+        Put("o.csv", Old);
+        const std::string before = Files();
+        EXPECT_EQ(Convert(input, output), (Host_Answer{status, said + ":\n"})) << output;
+        EXPECT_EQ(Get("o.csv"), Old);
+        EXPECT_EQ(Files(), before);
+    }
+}
+
+}  // namespace
+}  // namespace ingester
