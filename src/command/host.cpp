@@ -363,6 +363,19 @@ void Tell_Answer(const Conversion& conversion, const Answer& answer)
         Say(about, told.sentence);
 }
 
+/// The lines of a text, to standard output.
+bool Print_Lines(const std::string& name)
+{
+    constexpr std::size_t longest = 4096;
+    Input_File file;
+    std::string line;
+    if (!file.Open(name))
+        return false;
+    while (file.Read_Line(line, longest))
+        std::printf("%s\n", line.c_str());
+    return file.Close() && std::fflush(stdout) == 0;
+}
+
 }  // namespace
 
 int Run_Command(const Command_Options& options)
@@ -400,7 +413,8 @@ int Run_Command(const Command_Options& options)
     const Answer answer = Convert(conversion);
     Tell_Answer(conversion, answer);
     if (conversion.To_Standard_Output() && answer.Is_Good()
-        && !Copy_To_Standard_Output(conversion.output.request)) {
+        && !(options.lines ? Print_Lines(conversion.output.request)
+                           : Copy_To_Standard_Output(conversion.output.request))) {
         Say(conversion.output.native, "could not be written to its end");
         return INGESTER_OUTPUT_FAILED;
     }

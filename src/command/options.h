@@ -29,6 +29,7 @@ struct Command_Options {
     bool padded = false;                  ///< comma text keeps its columns under each other
     bool force = false;
     bool quiet = false;
+    bool lines = false;  ///< standard output gets lines as the system ends them
 };
 
 /// The exit status when nothing is left to run: help and version were printed, or the command line

@@ -28,7 +28,7 @@ int Run_Sheets(int argc, const char* const* argv)
     options.output = Standard_Stream;
     options.input_options = "/w";
     options.output_options = "/h/n/-";
-    options.quiet = true;
+    options.quiet = options.lines = true;
     return Run_Command(options);
 }
 

@@ -141,6 +141,24 @@ TEST_F(Command_Test, Converts)
     }
 }
 
+TEST_F(Command_Test, Adds_Sheets_To_A_Book_And_Lists_Them)
+{
+    for (const char* const option :
+         {"--add-sheet=Crops", "--add-sheet=Crops", "--add-sheet=Crops", "--replace-sheet=Crops_1"})
+        EXPECT_EQ(Run({"crops.csv", "all.tbk", option}).err, "");
+    EXPECT_EQ(Run({"sheets", "all.tbk"}).out, "Crops\nCrops_1\nCrops_2\n");
+    EXPECT_EQ(Run({"sheets", "crops.csv"}).out, "Sheet1\n");
+    for (const char* const sheet : {"Crops", "crops_1", "3"}) {
+        EXPECT_EQ(Run({"--sheet", sheet, "all.tbk", "back.tab", "-f"}).status, 0);
+        EXPECT_EQ(Get("back.tab"), Crops_Tab) << sheet;
+    }
+    const std::string book = Get("all.tbk");
+    const Ran ran = Run({"crops.csv", "all.tbk", "--replace-sheet", "None"});
+    EXPECT_TRUE(ran.err.starts_with("Sheet None not found in Tabulon file all.tbk.\nCould add data"));
+    EXPECT_EQ(ran.status, 8);
+    EXPECT_EQ(Get("all.tbk"), book);
+}
+
 TEST_F(Command_Test, Standard_Output_Gets_What_A_Comma_File_Gets)
 {
     ASSERT_EQ(Run({"crops.csv", "same.csv"}).status, 0);

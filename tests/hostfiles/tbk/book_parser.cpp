@@ -9,28 +9,18 @@ namespace ingester {
 namespace {
 
 /// What a record holds: b a byte, w a word, d a double, s and l texts behind a byte or a word of length.
-/// What stands behind "*" comes as often as the record's first word says.
+/// What stands behind "*" comes as often as the record's first word says. h and r are a byte for each column
+/// and a bit for each row, k a word for each level, t a block of texts, m the members of a list.
 const std::map<int, std::string> Layouts = {
-    {1, "ww"},         {2, ""},
-    {12, "b"},         {13, "l"},
-    {16, "bwwdbbbbs"}, {17, ""},
-    {19, "sb"},        {20, "bbb"},
-    {21, "bbsb"},      {22, "s"},
-    {25, "ww"},        {29, "d"},
-    {33, "w"},         {35, ""},
-    {37, "b"},         {39, ""},
-    {40, ""},          {64, "bwsbbbbbbb"},
-    {65, ""},          {66, "b"},
-    {81, "w*d"},       {82, "wb*s"},
-    {83, "ww*l"},      {97, "wb*d"},
-    {98, "wb*s"},      {99, "w"},
-    {100, ""},         {112, "bl"},
-    {113, "s"},        {114, "dd"},
-    {115, "bbddd"},    {116, "bdwbdwbdw"},
-    {117, "d"},        {118, "b"},
-    {119, "d"},        {120, "w*www"},
-    {121, "b"},        {122, "w"},
-    {123, "ww"},
+    {1, "ww"},    {2, ""},        {12, "b"},          {13, "l"},          {16, "bwwdbbbbs"},
+    {17, ""},     {19, "sb"},     {20, "bbb"},        {21, "bbsb"},       {22, "s"},
+    {23, "tst"},  {24, "t"},      {26, "bsm"},        {34, "swr"},        {36, "h"},
+    {101, "k"},   {25, "ww"},     {29, "d"},          {33, "w"},          {35, ""},
+    {37, "b"},    {39, ""},       {40, ""},           {64, "bwsbbbbbbb"}, {65, ""},
+    {66, "b"},    {81, "w*d"},    {82, "wb*s"},       {83, "ww*l"},       {97, "wb*d"},
+    {98, "wb*s"}, {99, "w"},      {100, ""},          {112, "bl"},        {113, "s"},
+    {114, "dd"},  {115, "bbddd"}, {116, "bdwbdwbdw"}, {117, "d"},         {118, "b"},
+    {119, "d"},   {120, "w*www"}, {121, "b"},         {122, "w"},         {123, "ww"},
 };
 
 class Walker {
@@ -101,60 +91,24 @@ private:
     {
         if (const auto layout = Layouts.find(type); layout != Layouts.end())
             Go_Over(layout->second);
-        switch (type) {
-        case 1:
-            sheets = U32(start + 6);
-            ends.push_back(U32(start + 10));
-            break;
-        case 3:
-            Take_Offsets(sheets, 16);
-            break;
-        case 16:
+        else
+            Expect(type == 3 || type == 18 || type == 96, "an unknown type");
+        if (type == 1)
+            sheets = U32(start + 6), ends.push_back(U32(start + 10));
+        if (type == 3 || type == 18)
+            Take_Offsets(type == 3 ? sheets : columns, type == 3 ? 16 : 64);
+        if (type == 16)
             columns = U32(start + 7), rows = U32(start + 11), margin = 0, table = U8(start + 6) == 5;
-            break;
-        case 18:
-            Take_Offsets(columns, 64);
-            break;
-        case 20:
+        if (type == 20)
             margin = U8(start + 7) != 0;
-            break;
-        case 23:
-            Text_Block(), Go_Over("s"), Text_Block();
-            break;
-        case 24:
-            Text_Block();
-            break;
-        case 26:
-            Go_Over(U8(at) == 0 ? "bs" : "bs");
-            Members();
-            break;
-        case 34:
-            Go_Over("sw"), at += (rows + 7) / 8 + (rows == 0);
-            break;
-        case 36:
-            at += columns;
-            break;
-        case 64:
-            Expect(U32(start + 7) <= rows, "a column longer than its sheet"), length = U32(start + 7);
-            break;
-        case 81:
-        case 82:
-        case 83:
+        if (type == 64)
+            length = U32(start + 7), Expect(length <= rows, "a column longer than its sheet");
+        if (type >= 81 && type <= 83)
             Expect(U32(start + 6) == length, "cells");
-            break;
-        case 96:
+        if (type == 96)
             Codes(end);
-            break;
-        case 97:
-        case 98:
+        if (type == 97 || type == 98)
             Expect(U32(start + 6) == levels, "levels");
-            break;
-        case 101:
-            at += 4 * std::size_t{levels};
-            break;
-        default:
-            Expect(Layouts.contains(type), "an unknown type");
-        }
     }
 
     void Go_Over(const std::string& layout)
@@ -169,7 +123,18 @@ private:
     }
     void Go_Over(char c)
     {
-        at += c == 'b' ? 1U : c == 'w' ? 4U : c == 'd' ? 8U : c == 's' ? 1U + U8(at) : 4U + U32(at);
+        if (c == 't')
+            return Text_Block();
+        if (c == 'm')
+            return U8(start + 6) == 0 ? Go_Over("w*s") : void();
+        at += c == 'b'   ? 1U
+              : c == 'w' ? 4U
+              : c == 'd' ? 8U
+              : c == 's' ? 1U + U8(at)
+              : c == 'l' ? 4U + U32(at)
+              : c == 'h' ? columns
+              : c == 'k' ? 4 * std::size_t{levels}
+                         : (rows + 7) / 8 + (rows == 0);
     }
 
     void Text_Block()
@@ -183,11 +148,6 @@ private:
             ends_seen += U8(i) == 0;
         Expect(ends_seen == count, "a block of other texts");
         at += 4 + U32(at);
-    }
-    void Members()
-    {
-        for (std::uint32_t left = U8(start + 6) == 0 ? (at += 4, U32(at - 4)) : 0; left > 0; --left)
-            Go_Over('s');
     }
     void Codes(std::size_t end)
     {
