@@ -48,7 +48,9 @@ bool Find_Output_Sheet(const std::string& output_name)
         request.Update_Sheet_Name = request.Worksheet_Name;
         return false;
     }
-    const auto listed = List_Sheet_Names(output_name);
+    // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
+    const bool several = Output_Driver_Of(output_name).sheet_names != nullptr;
+    const auto listed = several ? List_Sheet_Names(output_name) : std::nullopt;
     if (!listed || listed->empty()) {
         request.Add_To_Output = false;
         return false;
@@ -56,7 +58,7 @@ bool Find_Output_Sheet(const std::string& output_name)
     const auto found = std::ranges::find_if(
         *listed, [&wanted](const std::string& name) { return Equal_Ignoring_Case(name, wanted); });
     if (!wanted.empty() && found != listed->end()) {
-        Update_Sheet(wanted, true);
+        Update_Sheet(*found, true);
         request.Add_To_Output = true;
         return true;
     }

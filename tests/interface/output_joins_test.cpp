@@ -67,6 +67,37 @@ TEST_F(Output_Joins, Factors_Of_A_Host_File_Take_The_Texts_Of_Others)
               "kind,year,rain\r\noats,2001,5\r\nrye,2003,7\r\nbean,2001,5\r\nrye,2001,5\r\n ,2004,6\r\n");
 }
 
+TEST_F(Output_Joins, Join_With_One_Sheet_Of_A_Book)
+{
+    const auto Sheets = [this] {
+        std::string text;
+        for (const char* const name : {"A", "B"}) {
+            EXPECT_EQ(Call({Request_Name("o.tbk"), Request_Name("o.csv") + "/h/-/u/n", name}).first, 0);
+            text += Get("o.csv") + "|";
+        }
+        EXPECT_EQ(Call({Request_Name("o.tbk") + "/w", Request_Name("o.csv") + "/h/-/u/n"}).first, 0);
+        text += Get("o.csv");
+        std::erase(text, '\r');
+        std::ranges::replace(text, '\n', ' ');
+        return text;
+    };
+    Put("n.csv", "plot,b\n1,x\n");
+    ASSERT_EQ(Convert("n.csv", "o.tbk/a=A").first, 0);
+    ASSERT_EQ(Convert("n.csv", "o.tbk/a=B").first, 0);
+    const std::tuple<std::string, std::string, std::string> steps[] = {
+        {"o.tbk/@/!=b", "", "1,x |1,x 1,x |A B "},
+        {"o.tbk/@", "Using sheet A within the file.\n:\n", "1,x 1,x |1,x 1,x |A B "},
+        {"o.tbk/%=U/!=none", "Warning: sheet none not found in file " + Request_Name("o.tbk") + ".\n:\n",
+         "1,x 1,x |1,x 1,x |A B "},
+        {"o.tbk/&/!='B'", "Could not concatenate data.\n:\n", "1,x 1,x |1,x 1,x |A B "},
+    };
+    for (const auto& [output, said, sheets] : steps) {
+        EXPECT_EQ(Convert("n.csv", output), (Host_Answer{said.starts_with("Could") ? 15 : 0, said}))
+            << output;
+        EXPECT_EQ(Sheets(), sheets) << output;
+    }
+}
+
 TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
 {
     const std::string f = Request_Name("");
