@@ -157,9 +157,9 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
          5,
          "Error: Data contains fewer columns than first column to be kept.\n" + removed},
         {{f + "tall.csv/tr", f + "o.tab"},
-          5,
-          "Cannot transpose a spreadsheet with more than 50000 rows\nThis sheet has 50001 rows.\n"
-          "Unable to transpose input file.\n"},
+         5,
+         "Cannot transpose a spreadsheet with more than 50000 rows\nThis sheet has 50001 rows.\n"
+         "Unable to transpose input file.\n"},
         {{f + "c.csv", f + "o.tab/a=k"}, 5, "Adding to an existing output" + missing},
         {{"https:\\\\h\\c.csv", ""}, 19, "Could not download input URL:\nhttps:\\\\h\\c.csv\n"},
         {{"Clipboard.csv", "o.tab"}, 9, "Read Error: Cannot open clipboard for read.\n"},

@@ -24,11 +24,9 @@ std::string Valid_Name_Of_No_Column(std::string_view name)
     return valid;
 }
 
-bool Is_Column_Selected(std::int32_t ordinal, std::string_view name)
+bool Is_Column_Selected(const Column_Subset& subset, std::int32_t ordinal, std::string_view name)
 {
-    const std::string wanted =
-        request.Subset_By_Number ? std::to_string(ordinal) : Valid_Name_Of_No_Column(name);
-    return std::ranges::find(request.Subset_Names, wanted) != request.Subset_Names.end();
+    return subset.Keeps(ordinal, request.Subset_By_Number ? std::string() : Valid_Name_Of_No_Column(name));
 }
 
 bool Select_Symmetric(Sheet& sheet)
@@ -36,11 +34,11 @@ bool Select_Symmetric(Sheet& sheet)
     if (sheet.type != symmetric_matrix_sheet || (!request.Subset_Columns && !request.Subset_Rows))
         return true;
     const Row_Selection rows{request.Subset_Rows, request.Subset_Row_Flags};
+    const Column_Subset columns;
     std::vector<std::int32_t> left_out;
     for (std::int32_t row = 0; row < sheet.row_count; ++row) {
         const Column* const column = Column_At(&sheet, sheet.leading_columns + row);
-        const bool named =
-            column == nullptr || !request.Subset_Columns || Is_Column_Selected(column->index, column->name);
+        const bool named = column == nullptr || Is_Column_Selected(columns, column->index, column->name);
         if (!named || !rows.Keeps(row))
             left_out.push_back(row);
     }

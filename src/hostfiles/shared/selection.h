@@ -2,6 +2,7 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "model/subset.h"
 
 #include <cstdint>
 #include <span>
@@ -28,8 +29,9 @@ struct Row_Selection {
 /// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
 [[nodiscard]] std::string Valid_Name_Of_No_Column(std::string_view name);
 
-/// Whether the request's list of columns has a name, or a number.
-[[nodiscard]] bool Is_Column_Selected(std::int32_t ordinal, std::string_view name);
+/// Whether the request's list of columns keeps the column of that place, or of that name when it is cleaned.
+[[nodiscard]] bool Is_Column_Selected(const Column_Subset& subset, std::int32_t ordinal,
+                                      std::string_view name);
 
 /// Leaves out rows of a Symmetric Matrix, and their columns with them. False when none would be left.
 [[nodiscard]] bool Select_Symmetric(Sheet& sheet);

@@ -31,6 +31,8 @@ struct Book_Reading {
     bool by_number = false;
     bool chosen = false;
 
+    Column_Subset subset = {};
+
     // The Sheet being read, or the last one; the column likewise.
     Sheet* sheet = nullptr;
     std::int32_t stored_columns = 0;

@@ -220,7 +220,7 @@ bool End_Column(Book_Reading& reading)
     const auto ordinal = static_cast<std::int32_t>(reading.columns.size());
     // The rows and columns of a Symmetric Matrix go together, when all are there.
     if (request.Subset_Columns && reading.sheet->type != symmetric_matrix_sheet
-        && !Is_Column_Selected(ordinal, column.name)) {
+        && !Is_Column_Selected(reading.subset, ordinal, column.name)) {
         reading.columns.back() = nullptr;
         Delete_Column(&column, false);
     }

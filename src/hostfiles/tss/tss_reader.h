@@ -19,6 +19,7 @@ struct TSS_Reading {
     Head_Record head = {};
     std::int32_t columns = 0;  ///< records to read
     Row_Selection rows = {};
+    Column_Subset subset = {};
     bool selects_columns = false;
     std::vector<std::int8_t> row_marks = {};  ///< of the rows kept
     bool colours_corrupt = false;             ///< a record of colours or the like was

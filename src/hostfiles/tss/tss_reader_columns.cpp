@@ -526,7 +526,7 @@ bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal)
     if (!Read_Texts_And_Display(source, record) || !Settle_Display(record)
         || !Read_Type_Fields(reading, record))
         return false;
-    if (reading.selects_columns && !Is_Column_Selected(ordinal, record.name))
+    if (reading.selects_columns && !Is_Column_Selected(reading.subset, ordinal, record.name))
         return Skip_TSS_Data(source, record);
     Column* const column = New_Column(reading.sheet, Type_In_Sheet(record), record.name);
     if (column == nullptr)
