@@ -256,6 +256,8 @@ void Output_File::Flush()
 
 void Output_File::Write(const void* bytes, std::size_t count)
 {
+    if (count == 0)
+        return;  // there may be no bytes to point at
     if (descriptor_ < 0) {
         failed_ = true;
         return;
