@@ -53,7 +53,7 @@ constexpr Status_Sentence Status_Sentences[] = {
     {INGESTER_CLIPBOARD_FAILED, Blamed::request, "the clipboard could not be used"},
     {INGESTER_RENAME_FAILED, Blamed::output, "the finished file could not take its name"},
     {INGESTER_ZIP_UNSUPPORTED, Blamed::input, "this is a zip archive; give the files in it one by one"},
-    {INGESTER_NOTHING_SELECTED, Blamed::input, "no columns or rows were selected"},
+    {INGESTER_NOTHING_SELECTED, Blamed::input, "no columns or rows were selected, or the data could not be appended"},
     {INGESTER_QTL_FAILED, Blamed::input, "the QTL file could not be converted"},
     {INGESTER_CONCATENATE_FAILED, Blamed::request, "the tables can't stand beside each other"},
     {INGESTER_QTL_OPTIONS, Blamed::input, "these options do not fit a QTL file"},

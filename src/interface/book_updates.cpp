@@ -26,14 +26,6 @@ Book_Kind Kind_Of(const char* file_name)
     return packed ? Book_Kind::compressed : Book_Kind::none;
 }
 
-std::string Scratch_Name(std::string_view file_name)
-{
-    const long pid = Process_Id();
-    return Get_Temp_Folder()
-        .append(pid < 1 ? "$Ingester$.tmp" : Format_Text("$IG%li$.tmp", pid))
-        .append(file_name.substr(Extension_Start(file_name)));
-}
-
 /// Packs the changed book beside the old one, which it then replaces.
 bool Compress_Over(const std::string& plain, const char* file_name)
 {
@@ -49,11 +41,12 @@ bool Compress_Over(const std::string& plain, const char* file_name)
 /// Runs `update` on the book, or on what a compressed one holds.
 template <class Update> bool Update_Book(const char* file_name, Book_Kind kind, Update update)
 {
+    const std::string real = Resolved_Name(file_name);  // a link stays, and its book changes
     if (kind == Book_Kind::plain)
-        return update(file_name);
-    const Scratch_File scratch(Scratch_Name(file_name));
+        return update(real.c_str());
+    const Scratch_File scratch(Decompressed_Name(file_name));
     return Decompress_To(scratch.Name(), file_name) && update(scratch.Name().c_str())
-           && Compress_Over(scratch.Name(), file_name);
+           && Compress_Over(scratch.Name(), real.c_str());
 }
 
 }  // namespace

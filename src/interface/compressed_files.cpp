@@ -19,17 +19,6 @@ namespace {
 /// Where the extension goes, whatever the length of the process's number: hosts look for it there.
 constexpr std::size_t Extension_Place = std::string_view("$Ingester$").size();
 
-/// The scratch file keeps the extension of what it came from.
-std::string Scratch_Name(std::string_view file_name)
-{
-    const long pid = Process_Id();
-    std::string name = pid > 0 ? Format_Text("$IG%li$.tmp", pid) : "$Ingester$.tmp";
-    const std::string_view extension = file_name.substr(Extension_Start(file_name));
-    if (!extension.empty())
-        name = name.substr(0, Extension_Place).append(extension);
-    return Get_Temp_Folder() + name;
-}
-
 /// Copies what `packed` holds. The temporary folder is never filled to the brim: a small file can
 /// hold a thousand times its size, and others need the disk as well.
 bool Decompress(Gzip_File& packed, Output_File& plain, std::uint64_t most)
@@ -48,6 +37,16 @@ bool Decompress(Gzip_File& packed, Output_File& plain, std::uint64_t most)
 
 }  // namespace
 
+std::string Decompressed_Name(std::string_view file_name)
+{
+    const long pid = Process_Id();
+    std::string name = pid > 0 ? Format_Text("$IG%li$.tmp", pid) : "$Ingester$.tmp";
+    const std::string_view extension = file_name.substr(Extension_Start(file_name));
+    if (!extension.empty())
+        name = name.substr(0, Extension_Place).append(extension);
+    return Get_Temp_Folder() + name;
+}
+
 bool Decompress_To(const std::string& scratch, const char* file_name)
 {
     Gzip_File packed;
@@ -65,7 +64,7 @@ bool Decompress_To(const std::string& scratch, const char* file_name)
 
 bool Read_Compressed_File(const char* file_name)
 {
-    const Scratch_File scratch(Scratch_Name(file_name));
+    const Scratch_File scratch(Decompressed_Name(file_name));
     if (!Decompress_To(scratch.Name(), file_name))
         return false;
     const std::int32_t type = Detect_File_Type(scratch.Name());

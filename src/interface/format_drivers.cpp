@@ -142,6 +142,11 @@ std::optional<std::vector<std::string>> List_Sheet_Names(const std::string& file
 {
     constexpr std::size_t most_names = 4096;
     const std::int32_t type = Detect_File_Type(file_name);
+    if (type == compressed_file && Detect_Compressed_File_Type(file_name) == book_file) {
+        const Scratch_File scratch(Decompressed_Name(file_name));
+        return Decompress_To(scratch.Name(), file_name.c_str()) ? Read_Page_Names(scratch.Name().c_str())
+                                                                : std::nullopt;
+    }
     const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
     if (found == std::end(Format_Drivers) || found->sheet_names == nullptr)
         return std::nullopt;

@@ -495,7 +495,7 @@ constexpr Slash_Option Output_Table[] = {
     {"/7", Set<&R::Excel_97, true>, "workbooks of the 1997 form", Flag("excel-97")},
     {"/!=", Take_Name<&R::Merge_Sheet_Name>, "sheet of the output that is updated",
      Quoted("update-sheet", "NAME")},
-    {"/@", Take_Append, "append to the existing output; N: unsorted; then the keys",
+    {"/@", Take_Append, "append to the existing output; KEY: a Factor that tells where rows came from",
      Optional("append", "KEY[,WITH]", ",")},
     {"/&", Take_Concatenate, "put columns behind those of the existing output; U: replace equal names",
      Optional("concatenate", "U", "")},

@@ -70,6 +70,8 @@ void Describe_Numbers(const Column& column, long number, std::string& text)
     const std::string type(Column_Type_Name(column));
     Column_Summary found{};
     const bool present = Column_Statistics(&column, found) && found.missing < column.length;
+    if (present && !Is_Present(*column.sheet, found.mean))
+        found.mean = found.min;  // of one value
     if (present)
         text += Format_Text("%4li: %s - %s\n      Mean: %.12g, Min: %.12g, Max: %.12g, NMV: %li", number,
                             column.name.c_str(), type.c_str(), found.mean, found.min, found.max,

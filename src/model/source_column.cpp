@@ -15,7 +15,8 @@ bool Add_Source_Column(Sheet* sheet)
         label.value.text = texts.Store(request.Merge_With);
         wanted.labels = &label;
         wanted.label_count = 1;
-        wanted.fill = request.Merge_With;
+        if (sheet->type == vector_sheet)
+            wanted.fill = request.Merge_With;  // elsewhere numbers stand for the labels
     }
     return Add_Column(sheet, wanted, sheet->column_count + 1, true) != nullptr;
 }

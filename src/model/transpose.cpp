@@ -278,10 +278,20 @@ void Set_Table_Level(const Transposition& work, const std::vector<double>& value
         column.table_label = work.to->margin_label;
 }
 
+/// A column of labels takes no place of a column of data.
+class Room_For_Labels {
+public:
+    Room_For_Labels() { ++request.Max_Columns; }
+    Room_For_Labels(const Room_For_Labels&) = delete;
+    Room_For_Labels& operator=(const Room_For_Labels&) = delete;
+    ~Room_For_Labels() { --request.Max_Columns; }
+};
+
 bool Add_New_Columns(Transposition& work)
 {
     const std::int32_t rows = work.from->row_count;
     const bool table = work.to->type == table_sheet;
+    const Room_For_Labels room;
     const bool classified = table && work.name_column->type == factor_column;
     const std::vector<double> values = classified ? Level_Table(*work.name_column) : std::vector<double>{};
     const std::vector<const char*> labels =

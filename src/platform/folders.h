@@ -9,6 +9,9 @@
 
 namespace ingester {
 
+/// The file that a name stands for in the end, where links lead; the name itself when there is none.
+[[nodiscard]] std::string Resolved_Name(std::string_view name);
+
 /// `name` with native separators.
 [[nodiscard]] std::string Native_Path(std::string_view name);
 

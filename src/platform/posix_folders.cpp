@@ -131,6 +131,14 @@ bool Replace_File(std::string_view from, std::string_view to)
     return File_Change_Allowed() && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
+std::string Resolved_Name(std::string_view name)
+{
+    char* const whole = ::realpath(Native_Path(name).c_str(), nullptr);
+    std::string resolved = whole == nullptr ? std::string(name) : Request_Path(whole);
+    std::free(whole);
+    return resolved;
+}
+
 bool Make_Link(std::string_view name, std::string_view file)
 {
     char* const whole = ::realpath(Native_Path(file).c_str(), nullptr);

@@ -198,7 +198,7 @@ std::vector<Texts> Readme_Commands(const std::string& heading)
 
 TEST_F(Command_Test, Joins_Files_As_The_Readme_Says)
 {
-    const std::string head = "\nSummary of Columns output to: \\dev\\null\nSheet of type: Vector\n\n";
+    const std::string head = "\nSummary of Columns output to: plots.csv\nSheet of type: Vector\n\n";
     const std::string expected[] = {
         "plot,kind\r\n1,oats\r\n2,rye\r\n7,bean\r\n",
         "plot,kind,month!\r\n1,oats,Original\r\n2,rye,Original\r\n7,bean,june\r\n",

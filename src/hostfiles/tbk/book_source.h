@@ -5,6 +5,7 @@
 #include "platform/files.h"
 #include "support/byte_fields.h"
 
+#include <algorithm>
 #include <bit>
 #include <cstdint>
 #include <memory>
@@ -44,6 +45,8 @@ public:
 
     /// Bytes of the record that were not read yet.
     [[nodiscard]] std::int64_t Left() const { return unread_ + std::int64_t(end_ - next_); }
+    /// The same, but no more than the file can hold.
+    [[nodiscard]] std::int64_t Left_In_File() const { return std::min(Left(), Size() - record_.offset); }
     [[nodiscard]] bool Skip_Rest();
     /// Copies the rest of a large record.
     [[nodiscard]] bool Copy_Rest(Output_File& target);

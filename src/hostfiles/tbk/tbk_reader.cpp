@@ -233,7 +233,6 @@ bool End_Sheet(Book_Reading& reading)
     Sheet& sheet = *reading.sheet;
     reading.in_sheet = false;
     Resolve_Colour_Sources(reading);
-    reading.columns.clear();
     reading.origins.clear();
     Limit_Rows(sheet);
     Set_Margin_Level(sheet);
@@ -242,7 +241,10 @@ bool End_Sheet(Book_Reading& reading)
         reading.finished = true;
     else
         request.Used_Sheet_Name = sheet.sheet_name;
-    return Select_Rows(sheet);
+    if (sheet.type == symmetric_matrix_sheet)
+        reading.columns.clear();  // which may go with its rows
+    reading.no_rows = !Select_Rows(sheet);
+    return true;
 }
 
 // --- Records without a reader of their own -----------------------------------------------------------
@@ -489,8 +491,10 @@ bool Read_Book(Book_Reading& reading)
     if (!reading.source.Read_Head() || !Walk_Records(reading))
         return false;
     Tell_Soft_Fault(reading);
-    if (reading.chooses && !reading.chosen)
+    if (reading.chooses && (!reading.chosen || reading.sheet == nullptr))
         return Tell_Not_Found(reading);
+    if (reading.no_rows)
+        return false;
     // The pipeline tells what a selection left out.
     return !request.Subset_Columns || reading.sheet == nullptr || reading.sheet->column_count > 0;
 }

@@ -39,6 +39,7 @@ struct Book_Reading {
     Column* column = nullptr;
     std::int32_t stored_length = 0;
     bool has_cells = false;
+    bool no_rows = false;  ///< a selection left none of the Sheet read last
     std::string hidden_map = {};
     std::vector<Column*> columns = {};       ///< by their place in the book; null for one left out
     std::vector<std::int32_t> origins = {};  ///< of the colours of each: a place in the book, 0 for none

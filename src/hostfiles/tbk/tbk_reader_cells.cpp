@@ -221,7 +221,7 @@ bool Read_Factor_Record(Book_Reading& reading)
 
 namespace {
 
-/// A list for the levels begins with their number. Not more of it is made than the record can fill.
+/// A list for the levels begins with their number. Not more of it is made than the file can fill.
 bool Start_List(Book_Reading& reading, std::int64_t size, const char* fault)
 {
     std::int32_t count;
@@ -229,7 +229,7 @@ bool Start_List(Book_Reading& reading, std::int64_t size, const char* fault)
         return false;
     if (count != reading.column->nlevels)
         return reading.source.Corrupt(fault);
-    return size * count <= reading.source.Left() || reading.source.Corrupt();
+    return size * count <= reading.source.Left_In_File() || reading.source.Corrupt();
 }
 
 }  // namespace

@@ -239,18 +239,22 @@ bool Read_Sheet_IPRINT(Book_Reading& reading)
 namespace {
 
 /// A comment may say that its cell counts as missing.
-void Drop_Cell(Sheet& sheet, std::int32_t row, std::int32_t index)
+void Drop_Cell(const Book_Reading& reading, std::int32_t row, std::int32_t index)
 {
-    Column* const column = index < 1 ? nullptr : Column_At(&sheet, index);
-    if (column == nullptr || row < 1)
+    if (index < 1 || index > std::ssize(reading.columns) || row < 1)
         return;
+    Column* const column = reading.columns[static_cast<std::size_t>(index) - 1];
+    const Row_Selection rows{request.Subset_Rows && !reading.in_sheet, request.Subset_Row_Flags};
+    if (column == nullptr || !rows.Keeps(row - 1))
+        return;
+    row = rows.Count(row);  // its place among those that were kept
     Cell_Node* const cell = Cell_At(column, row - 1 - First_Row_Of(*column));
     if (cell == nullptr)
         return;
     if (Is_Text_Like(column->type))
         cell->value.text = Text_Arena::Empty();
     else
-        cell->value.number = sheet.missing_value;
+        cell->value.number = column->sheet->missing_value;
 }
 
 }  // namespace
@@ -269,7 +273,7 @@ bool Read_Cell_Comment(Book_Reading& reading)
         || (marker > 0 && !source.Read(length)) || (length > 0 && !source.Read_Bytes(length, kept, text)))
         return false;
     if (request.Replace_Book_Data && reading.sheet != nullptr && text.starts_with("*M"))
-        Drop_Cell(*reading.sheet, row, column);
+        Drop_Cell(reading, row, column);
     return true;
 }
 

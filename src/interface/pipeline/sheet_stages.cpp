@@ -232,7 +232,8 @@ Request_Status Find_Fixed_Decimals(Request_Run&)
 Request_Status Tell_Summary(Request_Run& run)
 {
     if (request.Print_Summary)
-        Print_Column_Summary(Current_Sheet, run.outfile);
+        Print_Column_Summary(Current_Sheet,
+                             Is_Special_File(run.outfile) ? Native_Path(run.Source()) : run.outfile);
     return Done;
 }
 

@@ -6,6 +6,7 @@
 #include "model/join/column_index.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
+#include "model/sort.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -19,9 +20,11 @@ namespace {
 
 bool Can_Be_Appended(const Sheet* target, const Sheet* source)
 {
-    return target != nullptr && source != nullptr && source != target && source->row_count >= 1
-           && target->type != scalar_sheet && target->type != symmetric_matrix_sheet
-           && source->type != diagonal_matrix_sheet;
+    const bool fits = target != nullptr && source != nullptr && source != target && source->row_count >= 1
+                      && target->type != scalar_sheet && target->type != symmetric_matrix_sheet
+                      && source->type != diagonal_matrix_sheet && source->type != symmetric_matrix_sheet
+                      && target->read_only == 0;
+    return fits || Fail("These data can't go beneath those: one of them holds no rows that could.\n");
 }
 
 /// The Factor that tells where rows came from, and its level for the new ones.
@@ -68,10 +71,10 @@ bool Extend_Source_Column(Column& factor, const Append_Request& wanted)
     constexpr std::int32_t most_levels = Greatest_Level_Table / sizeof(const char*);
     if (factor.type != factor_column)
         return Fail("Selected column to indicate append source is not a factor.\n");
-    factor.nlevels = std::max(factor.nlevels, 0) + 1;
     const bool labelled = factor.label_count > 0 || !wanted.new_label.empty();
-    if (labelled && factor.nlevels > most_levels)
-        return false;
+    if (factor.nlevels >= most_levels)
+        return Fail("Factor %s has too many levels for one more.\n", factor.name.c_str());
+    factor.nlevels = std::max(factor.nlevels, 0) + 1;
     const std::string label = wanted.new_label.empty() ? Format_Text("%li", static_cast<long>(factor.nlevels))
                                                        : std::string(wanted.new_label);
     return (!labelled || Add_Label(factor, label))
@@ -90,7 +93,8 @@ Column* Make_Source_Column(Sheet& target, const Append_Request& wanted)
         labels[1].value.text = texts.Store(wanted.new_label);
         column.labels = labels;
         column.label_count = 2;
-        column.fill = wanted.old_label;
+        if (target.type == vector_sheet)
+            column.fill = wanted.old_label;  // elsewhere numbers stand for the labels
     }
     return Add_Column(&target, column, target.column_count + 1, true);
 }
@@ -111,12 +115,14 @@ bool Find_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark
     return true;
 }
 
-void Mark_New_Rows(const Source_Mark& mark, std::int32_t first_row)
+void Mark_New_Rows(const Source_Mark& mark, std::int32_t first_row, std::int32_t rows)
 {
     if (mark.column == nullptr)
         return;
-    for (Cell_Node* cell = Cell_At(mark.column, first_row); cell != nullptr; cell = cell->next)
+    for (Cell_Node* cell = Cell_At(mark.column, first_row); cell != nullptr && rows > 0; --rows) {
         cell->value.number = mark.level;
+        cell = cell->next;
+    }
 }
 
 /// A column with new cells, and where they come from; without a target the data are left out.
@@ -158,7 +164,7 @@ public:
         any_ = true;
         if (sheet_.type != vector_sheet && sheet_.label_state == 0)
             return;  // numbers would name nothing
-        if (names_.size() + column.name.size() > longest) {
+        if (names_.ends_with("...") || names_.size() + column.name.size() > longest) {
             names_.append(names_.ends_with("...") ? "" : "...");
             return;
         }
@@ -238,11 +244,11 @@ bool Append_Sheet(Sheet* target, const Append_Request& wanted)
     if (!Can_Be_Appended(target, wanted.source))
         return false;
     Source_Mark mark;
-    const std::int32_t first_row = target->row_count;
+    const std::int32_t first_row = Movable_Rows(*target);  // a margin stays the last row
     if (!Find_Source_Column(*target, wanted, mark)
         || !Insert_Rows(target, first_row, wanted.source->row_count, false))
         return false;
-    Mark_New_Rows(mark, first_row);
+    Mark_New_Rows(mark, first_row, wanted.source->row_count);
     Left_Out_List left_out(*wanted.source);
     for (const Column_Pair& pair : wanted.by_name ? Pair_By_Name(*target, *wanted.source)
                                                   : Pair_By_Position(*target, *wanted.source, mark.column))

@@ -49,6 +49,14 @@ Column* Copy_Column_Aside(const Column& column)
 
 namespace {
 
+bool Has_Data(const Column& column)
+{
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
+        if (Cell_Is_Present(column, *cell))
+            return true;
+    return false;
+}
+
 /// The type by which a Sheet takes data like those of `source`; `row_column` when it can't.
 std::int32_t Type_In(const Sheet& sheet, const Column& source)
 {
@@ -135,6 +143,8 @@ bool Cell_Transfer::Prepare_Levels(double tolerance, bool ignore_case)
     const Column& source = *source_;
     if (target.type == factor_column) {
         way_ = Way::level;
+        if (!Has_Data(source))
+            return true;  // and no levels to speak of
         return Merge_Factor_Levels(target, source, level_map_, tolerance, ignore_case);
     }
     if (Is_Text_Like(target.type)) {
@@ -150,8 +160,12 @@ bool Cell_Transfer::Prepare_Levels(double tolerance, bool ignore_case)
     }
     way_ = Way::level_to_number;
     numbers_ = Level_Table(source);
+    constexpr double no_date = 2000000.0;  // level values from 0 up to it stand as they are
     for (double& value : numbers_)
-        value = Is_Present(*source.sheet, value) ? Moved_Date(value) : target.sheet->missing_value;
+        if (!Is_Present(*source.sheet, value))
+            value = target.sheet->missing_value;
+        else if (source.factor_kind != factor_with_levels || value < 0.0 || value >= no_date)
+            value = Moved_Date(value);
     if (!numbers_.empty())
         return true;
     Cell_Node cell{};
@@ -225,7 +239,13 @@ double Cell_Transfer::Find_Level(double value)
     }
     char text[Number_Text_Room];
     Cell_Node cell{};
-    Set_Cell_From_Text(target, cell, {text, Print_General(text, value, all_digits)});
+    const auto length = static_cast<std::size_t>(Print_General(text, value, all_digits) - text);
+    Set_Cell_From_Text(target, cell, {text, length});
+    // A label that only begins so is another one.
+    const Level_Node* label = target.labels;
+    for (double level = 1.0; label != nullptr && level < cell.value.number; level += 1.0)
+        label = label->next;
+    lost_ = lost_ || (label != nullptr && label->Text() != std::string_view(text, length));
     return cell.value.number;
 }
 

@@ -4,6 +4,8 @@
 #include "model/names.h"
 #include "support/text.h"
 
+#include <algorithm>
+#include <set>
 #include <string>
 #include <unordered_map>
 
@@ -70,13 +72,34 @@ Column* First_To_Move(const Sheet& source)
     return column;
 }
 
+/// How many columns of the source find none of their name to replace.
+std::int32_t Columns_To_Move(const Sheet& target, const Sheet& source, bool replace_equal_names)
+{
+    if (!replace_equal_names)
+        return source.column_count;
+    std::set<std::string> names;
+    const auto Upper = [](const Column& column) {
+        std::string name(column.name);
+        std::ranges::transform(name, name.begin(), To_Upper);
+        return name;
+    };
+    for (const Column* column = target.first_column; column != nullptr; column = column->next)
+        names.insert(Upper(*column));
+    std::int32_t count = 0;
+    for (const Column* column = source.first_column->next; column != nullptr; column = column->next)
+        count += names.contains(Upper(*column)) ? 0 : 1;
+    return count;
+}
+
 }  // namespace
 
 bool Concatenate_Sheets(Sheet* target, Sheet* source, bool replace_equal_names)
 {
-    if (!Fit_Together(target, source) || source->column_count > request.Max_Columns - target->column_count)
+    if (!Fit_Together(target, source)
+        || Columns_To_Move(*target, *source, replace_equal_names)
+               > request.Max_Columns - target->column_count)
         return false;
-    if (First_To_Move(*source) == nullptr && !replace_equal_names)
+    if (First_To_Move(*source) == nullptr && (!replace_equal_names || source->type != vector_sheet))
         return false;
     Fit_Missing_Values(*source, target->missing_value);
     if (replace_equal_names)

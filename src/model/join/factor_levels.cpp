@@ -60,6 +60,10 @@ template <class Rules> void Match_Labels(const Column& target, const Column& sou
         }
         map.push_back(levels[number - 1]);
     }
+    while (level < source.nlevels) {  // those without a label have no partner
+        added.push_back(++level);
+        map.push_back(++next);
+    }
 }
 
 /// Level values, sorted, with their levels.
@@ -183,6 +187,8 @@ bool Merge_Factor_Levels(Column& target, const Column& source, std::vector<std::
         target.nlevels = std::max(target.nlevels, source.nlevels);
         return true;
     }
+    if (std::max(target.nlevels, source.nlevels) > Most_Added_Levels)
+        return false;
     std::vector<std::int32_t> added;
     if (target.label_count > 0 && source.label_count > 0) {
         if (ignore_case)

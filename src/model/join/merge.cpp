@@ -4,6 +4,8 @@
 #include "model/join/column_index.h"
 #include "model/join/merge_keys.h"
 #include "model/join/merge_rows.h"
+#include "model/names.h"
+#include "support/text.h"
 
 #include <algorithm>
 #include <deque>
@@ -148,6 +150,10 @@ void Write_Source_Rows(const Merge_Request& wanted, const Merged_Column& merged,
             continue;
         transfer.Put(to, values[from]);
     }
+    if (transfer.Has_Lost())
+        Report_Message(
+            Format_Text("Warning: some values of %s have no equal in %s, and were not kept as they are.\n",
+                        transfer.Source().name.c_str(), transfer.Target().name.c_str()));
 }
 
 bool Add_Rows_At_End(Sheet& sheet, std::size_t count)
@@ -225,6 +231,7 @@ bool Merge_Sheets(const Merge_Request& wanted)
         return false;
     Finish_New_Columns(*wanted.target, columns);
     Clear_Restriction(wanted.target);
+    Make_Column_Names_Unique(wanted.target);
     return true;
 }
 

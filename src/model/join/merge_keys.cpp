@@ -131,6 +131,23 @@ bool Check_Key_Pairs(const Merge_Request& wanted)
                    mixtures.mixed_target->name.c_str(), mixtures.mixed_source->name.c_str());
 }
 
+bool Is_Level_Number(double number)
+{
+    constexpr double greatest = 65535;
+    return number >= 1.0 && number <= greatest && number == std::floor(number);
+}
+
+/// Numbers that are no level's are the keys of no row.
+void Part_From_All_Levels(const Column& source, Sort_Key& key)
+{
+    constexpr double no_key = -2.0;
+    std::size_t row = 0;
+    for (const Cell_Node* cell = source.first_cell; cell != nullptr && row < key.numbers.size();
+         cell = cell->next, ++row)
+        if (Cell_Is_Present(source, *cell) && !Is_Level_Number(cell->value.number))
+            key.numbers[row] = no_key;
+}
+
 /// Numbers that are to match the levels of a Factor. Where it has no level values they are level numbers;
 /// where it has, they become values even if 1, 2, ... need no list.
 const Column* Numbers_As_Levels(const Column& target, const Column& source)
@@ -140,6 +157,17 @@ const Column* Numbers_As_Levels(const Column& target, const Column& source)
     if (copy == nullptr)
         return nullptr;
     copy->type = variate_column;
+    bool present = false;
+    for (Cell_Node* cell = copy->first_cell; cell != nullptr; cell = cell->next) {
+        if (!valued && !Is_Level_Number(cell->value.number))
+            cell->value.number = copy->sheet->missing_value;
+        present = present || Cell_Is_Present(*copy, *cell);
+    }
+    if (!present) {
+        copy->type = factor_column;
+        copy->nlevels = 0;
+        return copy;
+    }
     if (!Variate_To_Factor(copy, valued, 0))
         return nullptr;
     if (!valued || copy->level_values_count > 0)
@@ -212,6 +240,10 @@ Sort_Key Source_Key(const Column& target, const Column& source, Cell_Transfer& t
         Unite_Missing(source, target.sheet->missing_value, key);
     else if (source.level_values_count < 1)
         Unite_Missing(source, target.sheet->missing_value, key);
+    else
+        for (double& number : key.numbers)
+            if (!Is_Present(*source.sheet, number))
+                number = target.sheet->missing_value;
     Count_From_Days(source, target, key);
     return key;
 }
@@ -238,6 +270,8 @@ bool Make_Merge_Keys(const Merge_Request& wanted, Merge_Keys& keys)
             return Fail("Column cannot merge factors %s and %s.\n", target.name.c_str(),
                         source->name.c_str());
         keys.source.push_back(Source_Key(target, *source, keys.transfers[key], source_rows));
+        if (numbers && target.type == factor_column && target.level_values_count < 1)
+            Part_From_All_Levels(*wanted.source_keys[key], keys.source.back());
     }
     return true;
 }
