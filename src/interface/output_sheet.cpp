@@ -49,7 +49,8 @@ bool Find_Output_Sheet(const std::string& output_name)
         return false;
     }
     // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
-    const bool several = Output_Driver_Of(output_name).sheet_names != nullptr;
+    const bool several =
+        Ends_Ignoring_Case(output_name, ".gz") || Output_Driver_Of(output_name).sheet_names != nullptr;
     const auto listed = several ? List_Sheet_Names(output_name) : std::nullopt;
     if (!listed || listed->empty()) {
         request.Add_To_Output = false;

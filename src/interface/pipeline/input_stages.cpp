@@ -223,12 +223,30 @@ Request_Status Take_Clipboard_Output(Request_Run& run)
 
 }  // namespace
 
+namespace {
+
+bool Adds_To_Compressed(std::string_view outfile)
+{
+    const bool adds = request.Add_To_Output || request.Add_Mode != Add_Modes::none;
+    return adds && Ends_Ignoring_Case(outfile, ".gz") && File_Exists(outfile);
+}
+
+/// A compressed book that is there and added to has its extension in front of the last one.
+std::string_view Name_Of_Format(std::string_view outfile)
+{
+    const std::string_view plain = outfile.substr(0, Extension_Start(outfile));
+    const bool book = Adds_To_Compressed(outfile) && Output_Driver_Of(plain).code == book_file;
+    return book ? plain : outfile;
+}
+
+}  // namespace
+
 Request_Status Choose_Output(Request_Run& run)
 {
     if (Is_Clipboard_Output(run.outfile))
         if (const Request_Status status = Take_Clipboard_Output(run); status != Done)
             return status;
-    run.output = &Output_Driver_Of(run.outfile);
+    run.output = &Output_Driver_Of(Name_Of_Format(run.outfile));
     if (run.output->code == r_data_file && request.R_Text_Output)
         run.output = &Output_Driver_Of(r_text_file);
     run.output_code = run.output->code;
@@ -327,6 +345,8 @@ struct Missing_Operation {
 
 constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
+    {[](const Request_Run& run) { return Adds_To_Compressed(run.outfile) && run.output_code != book_file; },
+     "Adding to a compressed output"},
     {[](const Request_Run& run) { return request.Add_To_Output && run.output_code != book_file; },
      "Adding to an existing output"},
 };
