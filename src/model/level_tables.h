@@ -22,4 +22,7 @@ template <class Value> Value Of_Level(const std::vector<Value>& table, double le
                : otherwise;
 }
 
+/// Whether a number can be a level's of a Factor without lists: whole, from 1 to 65535.
+[[nodiscard]] bool Is_Level_Number(double number);
+
 }  // namespace ingester

@@ -222,9 +222,7 @@ bool Select_Rows(Sheet& sheet)
         return false;
     for (Saved_Restriction& saved : sheet.saved_restrictions)
         saved.bits = Kept_Bits(rows, saved.bits, sheet.row_count);
-    for (std::int32_t row = sheet.row_count - 1; row >= 0; --row)
-        if (!rows.Keeps(row))
-            Delete_Row(&sheet, row, true);
+    Keep_Rows(&sheet, rows.flags);  // all of a Scalar Sheet
     return true;
 }
 

@@ -220,7 +220,6 @@ double Cell_Transfer::Level_Of_Number(double value)
 
 double Cell_Transfer::Find_Level(double value)
 {
-    constexpr double greatest_plain_level = 65535;
     constexpr int all_digits = 20;
     Column& target = *target_;
     const double missing = target.sheet->missing_value;
@@ -232,7 +231,7 @@ double Cell_Transfer::Find_Level(double value)
         return level;
     }
     if (target.factor_kind == plain_factor) {
-        if (value < 1.0 || value > greatest_plain_level || value != std::floor(value))
+        if (!Is_Level_Number(value))
             return missing;
         target.nlevels = std::max(target.nlevels, static_cast<std::int32_t>(value));
         return value;

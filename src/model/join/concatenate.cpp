@@ -4,10 +4,9 @@
 #include "model/names.h"
 #include "support/text.h"
 
-#include <algorithm>
-#include <set>
 #include <string>
 #include <unordered_map>
+#include <unordered_set>
 
 namespace ingester {
 
@@ -77,17 +76,13 @@ std::int32_t Columns_To_Move(const Sheet& target, const Sheet& source, bool repl
 {
     if (!replace_equal_names)
         return source.column_count;
-    std::set<std::string> names;
-    const auto Upper = [](const Column& column) {
-        std::string name(column.name);
-        std::ranges::transform(name, name.begin(), To_Upper);
-        return name;
-    };
+    std::unordered_set<std::string> names;
     for (const Column* column = target.first_column; column != nullptr; column = column->next)
-        names.insert(Upper(*column));
+        if (Replaces(*column))
+            names.insert(Folded(column->name));
     std::int32_t count = 0;
     for (const Column* column = source.first_column->next; column != nullptr; column = column->next)
-        count += names.contains(Upper(*column)) ? 0 : 1;
+        count += Replaces(*column) && names.erase(Folded(column->name)) > 0 ? 0 : 1;
     return count;
 }
 

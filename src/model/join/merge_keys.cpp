@@ -131,12 +131,6 @@ bool Check_Key_Pairs(const Merge_Request& wanted)
                    mixtures.mixed_target->name.c_str(), mixtures.mixed_source->name.c_str());
 }
 
-bool Is_Level_Number(double number)
-{
-    constexpr double greatest = 65535;
-    return number >= 1.0 && number <= greatest && number == std::floor(number);
-}
-
 /// Numbers that are no level's are the keys of no row.
 void Part_From_All_Levels(const Column& source, Sort_Key& key)
 {
