@@ -42,10 +42,14 @@ void Cell_Appender::Add_Block()
 {
     constexpr auto greatest = static_cast<std::int64_t>(Cell_Nodes_Per_Block);
     const auto count = static_cast<std::size_t>(std::clamp(block_size_, Least_Block, greatest));
-    Go_On_In(New_Block(column_->blocks, count), count);
+    Cell_Node* const nodes = New_Block(column_->blocks, count);
+    if (ahead_ != nullptr && appended_ == 0)
+        ahead_->Expect(nodes, count * sizeof(Cell_Node));
+    Go_On_In(nodes, count);
 }
 
-std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected)
+std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected,
+                                          Memory_Ahead* ahead)
 {
     constexpr std::int64_t short_column = 20000;
     constexpr std::int32_t many_columns = 64;
@@ -56,7 +60,7 @@ std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int6
     Cell_Node* nodes =
         shared ? New_Block(sheet.shared_blocks, count * static_cast<std::size_t>(columns)) : nullptr;
     for (Column* column = first; column != nullptr; column = column->next) {
-        appenders.emplace_back(*column, expected);
+        appenders.emplace_back(*column, expected, ahead);
         if (shared) {
             appenders.back().Go_On_In(nodes, count);
             nodes += count;

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "platform/memory_ahead.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -13,8 +14,10 @@ namespace ingester {
 /// filled, so that each is touched once; nodes that stay unused cost address space only.
 class Cell_Appender {
 public:
-    /// `expected` cells go into the first block; more may come.
-    Cell_Appender(Column& column, std::int64_t expected) : column_(&column), block_size_(expected) {}
+    /// `expected` cells go into the first block, which `ahead` makes ready; more may come.
+    Cell_Appender(Column& column, std::int64_t expected, Memory_Ahead* ahead = nullptr)
+        : column_(&column), block_size_(expected), ahead_(ahead)
+    {}
 
     /// Puts the next cells into `nodes`, which somebody else owns.
     void Go_On_In(Cell_Node* nodes, std::size_t count);
@@ -46,6 +49,7 @@ private:
 
     Column* column_;
     std::int64_t block_size_;
+    Memory_Ahead* ahead_;
     std::int64_t appended_ = 0;  ///< nodes in all blocks
     Cell_Node* next_ = nullptr;
     Cell_Node* block_end_ = nullptr;
@@ -54,6 +58,7 @@ private:
 
 /// Appenders for the columns from `first` on, of `expected` cells each. Short columns share one block, so
 /// that a wide sheet lies in few pages.
-[[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected);
+[[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected,
+                                                        Memory_Ahead* ahead = nullptr);
 
 }  // namespace ingester

@@ -5,6 +5,7 @@
 #include "hostfiles/shared/selection.h"
 #include "hostfiles/tss/tss_format.h"
 #include "hostfiles/tss/tss_source.h"
+#include "platform/memory_ahead.h"
 
 #include <cstdint>
 #include <string>
@@ -22,7 +23,8 @@ struct TSS_Reading {
     Column_Subset subset = {};
     bool selects_columns = false;
     std::vector<std::int8_t> row_marks = {};  ///< of the rows kept
-    bool colours_corrupt = false;             ///< a record of colours or the like was
+    Memory_Ahead ahead = {};
+    bool colours_corrupt = false;  ///< a record of colours or the like was
 };
 
 /// Reads the record of column `ordinal`. False where the columns end, silently.

@@ -291,7 +291,8 @@ bool Clean_Numbers(const Column& column, std::span<double> numbers)
 bool Read_Number_Cells(TSS_Reading& reading, Column& column, std::int32_t count)
 {
     std::array<double, Numbers_Per_Block> block;
-    Cell_Appender cells(column, reading.source.Possible(reading.rows.Count(count), sizeof(double)));
+    Cell_Appender cells(column, reading.source.Possible(reading.rows.Count(count), sizeof(double)),
+                        &reading.ahead);
     std::int32_t kept = 0;
     for (std::int32_t row = 0; row < count;) {
         const auto size = std::min(static_cast<std::size_t>(count - row), block.size());

@@ -65,7 +65,8 @@ public:
         double number;
         no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number);
         Column* column = sheet.first_column->next;
-        for (const Cell_Appender& cells : Make_Appenders(sheet, sheet.first_column->next, Expected_Rows())) {
+        for (const Cell_Appender& cells :
+             Make_Appenders(sheet, sheet.first_column->next, Expected_Rows(), &ahead_)) {
             Start_Column(*column, cells);
             column = column->next;
         }
@@ -112,6 +113,7 @@ private:
     Cell_Value missing_;
     Cell_Value empty_;
     std::vector<Column_Filling> columns_;
+    Memory_Ahead ahead_;
     std::int64_t row_ = 0;
     std::int64_t row_limit_ = 0;
     const char* told_ = nullptr;  ///< how far progress has been told
@@ -342,6 +344,7 @@ void Sheet_Filler::Tell_Progress()
     if (walker_.Place() - told_ < step)
         return;
     told_ = walker_.Place();
+    ahead_.Come_To(static_cast<std::size_t>(row_) * sizeof(Cell_Node));
     Show_Progress("Reading", told_ - buffer_.first, buffer_.last - buffer_.first);
     if (image_ != nullptr && shape_.nuls + walker_.Nuls() == 0)
         image_->Release_Before(std::min<const char*>(told_, buffer_.last - 1));  // whose line end may be ours
@@ -351,6 +354,7 @@ bool Sheet_Filler::Fill_Rows()
 {
     const char* line = walker_.Place();
     told_ = line;
+    ahead_.Come_To(0);
     for (; walker_.At_Line(); ++row_) {
         line = walker_.Place();
         Fill_Row();
