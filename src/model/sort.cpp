@@ -105,8 +105,9 @@ void Sort_By_Bytes(std::span<Place> places, std::vector<Place>& room)
 /// Sorts by parts of keys: rows that share all parts so far are a group, which the next part sorts.
 class Row_Sorter {
 public:
-    Row_Sorter(std::span<const Sort_Key> keys, bool ascending, bool ignore_case)
-        : keys_(keys), ascending_(ascending), ignore_case_(ignore_case)
+    Row_Sorter(std::span<const Sort_Key> keys, bool ascending, bool ignore_case,
+               std::vector<std::uint8_t>* parted_by)
+        : keys_(keys), ascending_(ascending), ignore_case_(ignore_case), parted_by_(parted_by)
     {}
 
     [[nodiscard]] std::vector<std::uint32_t> Sort(std::size_t rows)
@@ -114,6 +115,8 @@ public:
         places_.resize(rows);
         for (std::size_t row = 0; row < rows; ++row)
             places_[row].row = static_cast<std::uint32_t>(row);
+        if (parted_by_ != nullptr)
+            parted_by_->assign(rows, static_cast<std::uint8_t>(keys_.size()));
         waiting_.push_back({0, rows, 0, 0});
         while (!waiting_.empty()) {
             const Group group = waiting_.back();
@@ -149,6 +152,8 @@ private:
             std::sort(places.begin(), places.end(), Comes_First);
         else
             Sort_By_Bytes(places, room_);
+        if (parted_by_ != nullptr)
+            Note_Parts(group);
         Group next = group;
         if (texts_go_on) {
             next.offset += sizeof(std::uint64_t);
@@ -158,6 +163,13 @@ private:
         }
         if (next.key < keys_.size())
             Add_Groups(next);
+    }
+
+    void Note_Parts(const Group& group)
+    {
+        for (std::size_t i = group.begin + 1; i < group.end; ++i)
+            if (places_[i].image != places_[i - 1].image)
+                (*parted_by_)[i] = static_cast<std::uint8_t>(group.key);
     }
 
     /// The runs of equal images in a group that was sorted have to wait for the next part.
@@ -203,6 +215,7 @@ private:
     std::span<const Sort_Key> keys_;
     bool ascending_;
     bool ignore_case_;
+    std::vector<std::uint8_t>* parted_by_;
     std::vector<Place> places_;
     std::vector<Place> room_;
     std::vector<Group> waiting_;
@@ -210,10 +223,11 @@ private:
 
 }  // namespace
 
-std::vector<std::uint32_t> Sorted_Rows(std::span<const Sort_Key> keys, bool ascending, bool ignore_case)
+std::vector<std::uint32_t> Sorted_Rows(std::span<const Sort_Key> keys, bool ascending, bool ignore_case,
+                                       std::vector<std::uint8_t>* parted_by)
 {
     const std::size_t rows = keys.empty() ? 0 : keys.front().Rows();
-    return Row_Sorter(keys, ascending, ignore_case).Sort(rows);
+    return Row_Sorter(keys, ascending, ignore_case, parted_by).Sort(rows);
 }
 
 std::int32_t Movable_Rows(const Sheet& sheet)

@@ -49,9 +49,12 @@ struct Sort_Key {
 /// The first `rows` cells of a column as a key. Cells that it hasn't are missing, NaN is so as well.
 [[nodiscard]] Sort_Key Make_Sort_Key(const Column& column, std::size_t rows, Factor_Mode mode);
 
-/// The rows from 0, sorted by keys of one length; rows with equal keys stay in their order.
+/// The rows from 0, sorted by at most 255 keys of one length; rows with equal keys stay in their order.
+/// `parted_by` has, for each place in that order, the first key in which its row differs from the row before,
+/// or the number of keys where none does.
 [[nodiscard]] std::vector<std::uint32_t> Sorted_Rows(std::span<const Sort_Key> keys, bool ascending,
-                                                     bool ignore_case);
+                                                     bool ignore_case,
+                                                     std::vector<std::uint8_t>* parted_by = nullptr);
 
 /// The rows of a Sheet that may be moved: all, but for the last one of a small Table with margins.
 [[nodiscard]] std::int32_t Movable_Rows(const Sheet& sheet);

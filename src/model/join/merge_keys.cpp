@@ -39,9 +39,9 @@ int Compare_Numbers(double a, double b, double tolerance)
 }  // namespace
 
 Key_Order Compare_Key_Rows(std::span<const Sort_Key> a, std::span<const Sort_Key> b, std::size_t row_a,
-                           std::size_t row_b, double tolerance, bool ignore_case)
+                           std::size_t row_b, double tolerance, bool ignore_case, std::size_t& key)
 {
-    for (std::size_t key = 0; key < a.size(); ++key) {
+    for (; key < a.size(); ++key) {
         if (row_a >= a[key].Rows())
             return Key_Order::first_ended;
         if (row_b >= b[key].Rows())

@@ -23,9 +23,10 @@ enum class Key_Order : std::int32_t {
 };
 
 /// Compares two rows key by key, the first difference decides; numbers within `tolerance` are equal.
+/// Keys before `key` are taken to be equal; it becomes the one that differs, or the number of keys.
 [[nodiscard]] Key_Order Compare_Key_Rows(std::span<const Sort_Key> a, std::span<const Sort_Key> b,
                                          std::size_t row_a, std::size_t row_b, double tolerance,
-                                         bool ignore_case);
+                                         bool ignore_case, std::size_t& key);
 
 /// The keys of both Sheets, by row, and the ways in which keys of new rows go from one to the other.
 struct Merge_Keys {

@@ -7,15 +7,40 @@ namespace ingester {
 
 namespace {
 
+/// The rows of one Sheet in the order of their keys, and where a walk through them stands.
+struct Sorted_Side {
+    Sorted_Side(const std::vector<Sort_Key>& its_keys, bool ignore_case)
+        : keys(its_keys), order(Sorted_Rows(its_keys, true, ignore_case, &parted_by))
+    {}
+
+    [[nodiscard]] bool Ended() const { return at >= order.size(); }
+    [[nodiscard]] std::uint32_t Row() const { return order[at]; }
+
+    /// Keys are far apart in memory when they are looked at in their order.
+    void Bring_Near() const
+    {
+        const std::size_t soon = at + Sort_Key::ahead;
+        if (soon + Sort_Key::ahead < order.size())
+            for (const Sort_Key& key : keys)
+                key.Prefetch(order[soon], order[soon + Sort_Key::ahead]);
+    }
+
+    const std::vector<Sort_Key>& keys;
+    std::vector<std::uint8_t> parted_by;  ///< see `Sorted_Rows`
+    std::vector<std::uint32_t> order;
+    std::size_t at = 0;
+};
+
 /// Walks both Sheets in the order of their keys.
 class Key_Walk {
 public:
     Key_Walk(const Merge_Request& wanted, const Merge_Keys& keys)
-        : wanted_(wanted), keys_(keys), target_order_(Sorted_Rows(keys.target, true, wanted.ignore_case)),
-          source_order_(Sorted_Rows(keys.source, true, wanted.ignore_case)),
-          partners_(target_order_.size(), -1), copies_(target_order_.size())
+        : wanted_(wanted), key_count_(keys.target.size()), exact_(!(wanted.tolerance > 0.0)),
+          target_(keys.target, wanted.ignore_case), source_(keys.source, wanted.ignore_case),
+          partners_(target_.order.size(), -1), copies_(target_.order.size())
     {
-        while (source_ < source_order_.size())
+        Compare_From(0);
+        while (!source_.Ended())
             Step();
     }
 
@@ -43,90 +68,105 @@ private:
 
     [[nodiscard]] std::int32_t Source_Row(std::size_t at) const
     {
-        return static_cast<std::int32_t>(source_order_[at]);
-    }
-
-    static void Bring_Near(const std::vector<Sort_Key>& keys, const std::vector<std::uint32_t>& order,
-                           std::size_t at)
-    {
-        const std::size_t soon = at + Sort_Key::ahead;
-        if (soon + Sort_Key::ahead < order.size())
-            for (const Sort_Key& key : keys)
-                key.Prefetch(order[soon], order[soon + Sort_Key::ahead]);
+        return static_cast<std::int32_t>(source_.order[at]);
     }
 
     void Step()
     {
-        Bring_Near(keys_.target, target_order_, target_);
-        Bring_Near(keys_.source, source_order_, source_);
-        switch (Compare()) {
+        switch (standing_) {
         case Key_Order::first_ended:
         case Key_Order::above:
             if (wanted_.fill_mode >= fill_all)
-                added_.push_back(Source_Row(source_));
-            ++source_;
+                added_.push_back(Source_Row(source_.at));
+            Go_On(source_, Key_Order::below);
             break;
         case Key_Order::below:
-            ++target_;
+            Go_On(target_, Key_Order::above);
             break;
         default:
             Join();
         }
     }
 
-    [[nodiscard]] Key_Order Compare() const
+    /// Compares the rows that the walk has come to. Keys before `key` are known to be equal.
+    void Compare_From(std::size_t key)
     {
-        if (target_ >= target_order_.size())
-            return Key_Order::first_ended;
-        return Compare_Key_Rows(keys_.target, keys_.source, target_order_[target_], source_order_[source_],
-                                wanted_.tolerance, wanted_.ignore_case);
+        shared_keys_ = key;
+        if (target_.Ended() || source_.Ended())
+            standing_ = Key_Order::first_ended;
+        else
+            standing_ = Compare_Key_Rows(target_.keys, source_.keys, target_.Row(), source_.Row(),
+                                         wanted_.tolerance, wanted_.ignore_case, shared_keys_);
+    }
+
+    /// To the next row of one side. What parted it from the row before mostly tells where it stands to the
+    /// row of the other side, without a look at the keys: `beyond`, where it leaves a key that both had.
+    void Go_On(Sorted_Side& side, Key_Order beyond)
+    {
+        ++side.at;
+        side.Bring_Near();
+        if (!exact_ || side.Ended() || standing_ == Key_Order::first_ended) {
+            Compare_From(0);
+            return;
+        }
+        const std::size_t parted_by = side.parted_by[side.at];
+        if (parted_by == shared_keys_) {
+            Compare_From(parted_by);
+        } else if (parted_by < shared_keys_) {
+            shared_keys_ = parted_by;
+            standing_ = beyond;
+        }
     }
 
     /// Rows of one key meet one by one. When those of the target are at their end, the rest of the source
     /// makes copies of the last; when those of the source are, its last one goes on.
     void Join()
     {
-        partners_[target_order_[target_]] = Source_Row(source_);
-        const bool more_target = Is_Same(keys_.target, target_order_, target_);
-        const bool more_source = Is_Same(keys_.source, source_order_, source_);
+        partners_[target_.Row()] = Source_Row(source_.at);
+        const bool more_target = Next_Is_Same(target_);
+        const bool more_source = Next_Is_Same(source_);
         if (more_source && !more_target)
             Join_Copies();
         if (more_source || !more_target)
-            ++source_;
-        ++target_;
+            Go_On(source_, Key_Order::below);
+        Go_On(target_, Key_Order::above);
     }
 
     void Join_Copies()
     {
-        Run run{static_cast<std::uint32_t>(source_ + 1), 0};
-        for (; Is_Same(keys_.source, source_order_, source_); ++source_)
+        Run run{static_cast<std::uint32_t>(source_.at + 1), 0};
+        for (; Next_Is_Same(source_); ++source_.at)
             ++run.count;
         if (wanted_.fill_mode < fill_copies)
             return;
-        copies_[target_order_[target_]] = run;
+        copies_[target_.Row()] = run;
         copied_ += run.count;
     }
 
     /// Whether the next row of a Sheet has the same key.
-    [[nodiscard]] bool Is_Same(const std::vector<Sort_Key>& keys, const std::vector<std::uint32_t>& order,
-                               std::size_t at) const
+    [[nodiscard]] bool Next_Is_Same(const Sorted_Side& side) const
     {
-        return at + 1 < order.size()
-               && Compare_Key_Rows(keys, keys, order[at], order[at + 1], wanted_.tolerance,
-                                   wanted_.ignore_case)
-                      == Key_Order::equal;
+        const std::size_t next = side.at + 1;
+        if (next >= side.order.size())
+            return false;
+        std::size_t key = 0;
+        return exact_ ? side.parted_by[next] == key_count_
+                      : Compare_Key_Rows(side.keys, side.keys, side.Row(), side.order[next],
+                                         wanted_.tolerance, wanted_.ignore_case, key)
+                            == Key_Order::equal;
     }
 
     const Merge_Request& wanted_;
-    const Merge_Keys& keys_;
-    std::vector<std::uint32_t> target_order_;
-    std::vector<std::uint32_t> source_order_;
+    std::size_t key_count_;
+    bool exact_;  ///< equal keys are so to the bit
+    Sorted_Side target_;
+    Sorted_Side source_;
     std::vector<std::int32_t> partners_;  ///< by row of the target
     std::vector<Run> copies_;             ///< the same
     std::vector<std::int32_t> added_;
     std::size_t copied_ = 0;
-    std::size_t target_ = 0;
-    std::size_t source_ = 0;
+    Key_Order standing_ = Key_Order::equal;  ///< of the target's row to the source's
+    std::size_t shared_keys_ = 0;            ///< leading keys that are equal in both
 };
 
 }  // namespace
