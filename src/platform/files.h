@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/folders.h"
+#include "platform/write_behind.h"
 #include "support/byte_fields.h"
 
 #include <cstddef>
@@ -126,6 +127,7 @@ public:
 private:
     [[nodiscard]] bool Start(int descriptor);
     void Flush();
+    void Settle();
     [[nodiscard]] std::int64_t Copy_In_System(const Input_File& source, std::int64_t count);
     void Write_Directly(const char* bytes, std::size_t count);
 
@@ -135,7 +137,9 @@ private:
     std::size_t buffer_size_;
     std::unique_ptr<char[]> buffer_;
     std::size_t used_ = 0;
-    std::int64_t flushed_ = 0;  ///< bytes given to the system
+    std::int64_t flushed_ = 0;  ///< bytes given to the system, or on their way to it
+    bool is_large_ = false;
+    std::unique_ptr<Write_Behind> behind_;  ///< of a large file
 };
 
 /// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails.

@@ -19,7 +19,6 @@ bool (*file_change_hook)() = nullptr;
 namespace {
 
 constexpr std::size_t Input_Buffer_Size = 1 << 16;
-constexpr std::size_t Greatest_System_Request = 1 << 30;  // the kernel takes no more at once
 
 }  // namespace
 
@@ -91,7 +90,7 @@ std::size_t Input_File::Read_Directly(void* target, std::size_t count)
     auto* at = static_cast<char*>(target);
     std::size_t done = 0;
     while (done < count) {
-        const ::ssize_t got = ::read(descriptor_, at + done, std::min(count - done, Greatest_System_Request));
+        const ::ssize_t got = ::read(descriptor_, at + done, std::min(count - done, Greatest_Request));
         if (got > 0)
             done += static_cast<std::size_t>(got);
         else if (got == 0)
@@ -197,12 +196,14 @@ bool Input_File::Close()
 
 Output_File::~Output_File()
 {
+    behind_.reset();
     if (descriptor_ >= 0 && owned_)
         ::close(descriptor_);
 }
 
 bool Output_File::Start(int descriptor)
 {
+    behind_.reset();
     if (descriptor_ >= 0 && owned_)
         ::close(descriptor_);
     descriptor_ = descriptor;
@@ -210,6 +211,7 @@ bool Output_File::Start(int descriptor)
     failed_ = descriptor < 0;
     used_ = 0;
     flushed_ = 0;
+    is_large_ = false;
     if (!failed_ && buffer_ == nullptr)
         buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
     return !failed_;
@@ -235,22 +237,32 @@ void Output_File::Open_Standard_Output()
 
 void Output_File::Write_Directly(const char* bytes, std::size_t count)
 {
+    Settle();
     failed_ = failed_ || (count > 0 && !File_Change_Allowed());
     flushed_ += static_cast<std::int64_t>(count);
-    while (count > 0 && !failed_) {
-        const ::ssize_t put = ::write(descriptor_, bytes, std::min(count, Greatest_System_Request));
-        if (put >= 0) {
-            bytes += put;
-            count -= static_cast<std::size_t>(put);
-        } else if (errno != EINTR) {
-            failed_ = true;
-        }
-    }
+    failed_ = failed_ || !Write_To_System(descriptor_, bytes, count);
 }
 
+void Output_File::Settle()
+{
+    if (behind_ != nullptr && !behind_->Settle())
+        failed_ = true;
+}
+
+/// The buffers of a large file are written behind its back; a pipe's reader sees them when they are full.
 void Output_File::Flush()
 {
-    Write_Directly(buffer_.get(), used_);
+    constexpr std::int64_t large = std::int64_t{1} << 22;
+    if (owned_ && !is_large_ && flushed_ >= large) {
+        is_large_ = true;
+        behind_ = Write_Behind::Start(descriptor_, buffer_size_);
+    }
+    if (behind_ == nullptr) {
+        Write_Directly(buffer_.get(), used_);
+    } else {
+        failed_ = failed_ || !File_Change_Allowed() || !behind_->Take(buffer_, used_);
+        flushed_ += static_cast<std::int64_t>(used_);
+    }
     used_ = 0;
 }
 
@@ -279,6 +291,7 @@ void Output_File::Write_At(std::int64_t position, const void* bytes, std::size_t
         return;
     }
     const auto* at = static_cast<const char*>(bytes);
+    Settle();
     if (position < flushed_ && count > 0)
         failed_ = failed_ || !File_Change_Allowed();
     while (position < flushed_ && count > 0 && !failed_) {
@@ -321,6 +334,7 @@ bool Output_File::Copy_From(Input_File& source, std::int64_t count)
 {
     constexpr std::int64_t block_size = 1 << 20;
     Flush();
+    Settle();
     if (source.Descriptor() >= 0 && descriptor_ >= 0 && !failed_) {
         const std::int64_t copied = Copy_In_System(source, count);
         count -= copied;
@@ -345,6 +359,8 @@ bool Output_File::Close()
     if (descriptor_ < 0)
         return false;
     Flush();
+    Settle();
+    behind_.reset();
     if (owned_ && ::close(descriptor_) != 0)
         failed_ = true;
     descriptor_ = -1;

@@ -1,11 +1,10 @@
 #include "platform/memory_ahead.h"
+#include "platform/quiet_thread.h"
 
 #include <algorithm>
 #include <condition_variable>
-#include <csignal>
 #include <cstdint>
 #include <mutex>
-#include <system_error>
 #include <thread>
 #include <vector>
 
@@ -73,33 +72,12 @@ void Memory_Ahead::Work::Run()
     }
 }
 
-namespace {
-
-/// Starts a thread that leaves all signals to the host's own ones.
-template <class Function> std::thread Start_Quiet_Thread(Function function)
-{
-    sigset_t all;
-    sigset_t before;
-    sigfillset(&all);
-    pthread_sigmask(SIG_SETMASK, &all, &before);
-    std::thread thread;
-    try {
-        thread = std::thread(function);
-    } catch (const std::system_error&) {
-        // Pages come as they are touched.
-    }
-    pthread_sigmask(SIG_SETMASK, &before, nullptr);
-    return thread;
-}
-
-}  // namespace
-
 void Memory_Ahead::Expect(void* start, std::size_t bytes)
 {
     if (bytes < Least_Region)
         return;
     if (work_ == nullptr) {
-        if (std::thread::hardware_concurrency() < 2)
+        if (!Has_Second_Processor())
             return;
         work_ = std::make_shared<Work>();
         work_->limit = limit_;

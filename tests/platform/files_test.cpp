@@ -3,6 +3,10 @@
 
 #include "support/request_fixture.h"
 
+#include <csignal>
+#include <numeric>
+
+#include <sys/resource.h>
 #include <sys/stat.h>
 
 namespace ingester {
@@ -59,6 +63,47 @@ TEST_F(Files_Test, Output_Is_Whole_Or_Says_So)
     ASSERT_TRUE(file.Open("\\dev\\full"));
     file.Write("lost");
     EXPECT_FALSE(file.Close()) << "no room is noticed at the end at the latest";
+}
+
+// A file that grows large is written by two threads: its bytes, their order, what is put into the place of
+// others, what is copied from elsewhere, and a refusal long after the start.
+TEST_F(Files_Test, Large_Files_Are_Written_As_Told)
+{
+    constexpr std::size_t words = std::size_t{3} << 20;
+    constexpr std::size_t changed[] = {0, 5, words / 2, words - 40'000, words - 1};
+    std::vector<std::uint32_t> numbers(words);
+    std::iota(numbers.begin(), numbers.end(), 0U);
+    const auto write = [&](Output_File& file) {
+        for (std::size_t at = 0, size; at < words; at += size) {
+            size = std::min<std::size_t>(words - at, 1 + at % 30'000);
+            file.Write(&numbers[at], size * sizeof numbers[0]);
+        }
+        const std::uint32_t mark = 4'000'000'000U;
+        for (const std::size_t at : changed)
+            file.Write_At(static_cast<std::int64_t>(at * sizeof mark), &mark, sizeof mark);
+    };
+    Output_File file;
+    ASSERT_TRUE(file.Open(Request_Name("large")));
+    write(file);
+    Put("tail", "the end");
+    Input_File tail;
+    ASSERT_TRUE(tail.Open(Request_Name("tail")) && file.Copy_From(tail, 7) && file.Close());
+    for (const std::size_t at : changed)
+        numbers[at] = 4'000'000'000U;
+    const std::string_view bytes(reinterpret_cast<const char*>(numbers.data()), words * sizeof numbers[0]);
+    EXPECT_TRUE(Get("large") == std::string(bytes) + "the end");
+
+    ::rlimit before;
+    ASSERT_EQ(::getrlimit(RLIMIT_FSIZE, &before), 0);
+    const ::rlimit narrow{std::size_t{9} << 20, before.rlim_max};
+    const auto handler = std::signal(SIGXFSZ, SIG_IGN);
+    ASSERT_EQ(::setrlimit(RLIMIT_FSIZE, &narrow), 0);
+    Output_File refused;
+    const bool opened = refused.Open(Request_Name("refused"));
+    write(refused);
+    EXPECT_TRUE(opened && !refused.Close());
+    EXPECT_EQ(::setrlimit(RLIMIT_FSIZE, &before), 0);
+    std::signal(SIGXFSZ, handler);
 }
 
 TEST_F(Files_Test, Scratch_Files_Are_Private_And_Follow_No_Link)
