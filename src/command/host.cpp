@@ -364,6 +364,19 @@ void Tell_Answer(const Conversion& conversion, const Answer& answer)
         Say(about, told.sentence);
 }
 
+/// A list that was made for the user to fill in comes to stand beside the input, where the next run finds it.
+void Hand_Over_Column_List(const Conversion& conversion)
+{
+    const std::string made = Change_List_Name(conversion);
+    const std::string beside = With_Extension(Request_Path(conversion.options.input), ".VAR");
+    if (!conversion.lists.changes.empty() || conversion.From_Standard_Input() || Is_Url(beside)
+        || !File_Exists(made) || File_Exists(beside))
+        return;
+    Say(Native_Path(beside), Copy_File(made, beside)
+                                 ? "lists the names of the columns; change them there and convert again"
+                                 : "the list of columns could not be written");
+}
+
 /// The lines of a text, to standard output.
 bool Print_Lines(const std::string& name)
 {
@@ -413,6 +426,8 @@ int Run_Command(const Command_Options& options)
     }
     const Answer answer = Convert(conversion);
     Tell_Answer(conversion, answer);
+    if (answer.Is_Good())
+        Hand_Over_Column_List(conversion);
     if (conversion.To_Standard_Output() && answer.Is_Good()
         && !(options.lines ? Print_Lines(conversion.output.request)
                            : Copy_To_Standard_Output(conversion.output.request))) {

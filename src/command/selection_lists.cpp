@@ -61,7 +61,7 @@ bool Holds_Controls(std::string_view text)
     return std::ranges::any_of(text, [](char c) { return static_cast<unsigned char>(c) < ' '; });
 }
 
-/// Columns by number when all entries are numbers: no column of a table is named so.
+/// Columns by number when all entries are numbers; the names of a host never are.
 std::string Column_List(const std::vector<std::string>& keep, std::string& fault)
 {
     std::string lines;

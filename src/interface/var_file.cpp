@@ -5,6 +5,7 @@
 #include "model/date_format.h"
 #include "model/factors.h"
 #include "model/names.h"
+#include "model/subset.h"
 #include "model/text_columns.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -12,7 +13,6 @@
 
 #include <algorithm>
 #include <iterator>
-#include <map>
 #include <set>
 #include <string>
 #include <utility>
@@ -84,6 +84,7 @@ void Read_Var_File(std::string_view file_name)
     if (std::ranges::count(types, 0) == std::ssize(types))
         return;
     request.Column_Wanted_Types = std::move(types);
+    request.Column_Wanted_Count = list.by_name ? 0 : list.count;
     request.Column_Wanted_Names = std::move(names);
 }
 
@@ -183,37 +184,23 @@ std::vector<Column*> Columns_Of(const Sheet& sheet)
     return columns;
 }
 
-/// The lines (from 0) that speak of the columns which a subset left, in their order.
-std::vector<std::size_t> Lines_Of_Subset()
+/// Which line (from 0) goes with which column; false when that can't be told.
+bool Pair_Lines(const std::vector<Column*>& columns, long count, std::vector<std::size_t>& lines)
 {
-    std::set<long> numbers;
-    if (request.Subset_By_Number)
-        for (const std::string& entry : request.Subset_Names)
-            numbers.insert(Leading_Integer(entry));
-    std::vector<std::size_t> lines;
-    for (const long number : numbers)
-        if (number >= 1)
-            lines.push_back(static_cast<std::size_t>(number) - 1);
-    return lines;
-}
-
-/// Which line goes with which column; false when that can't be told.
-bool Pair_Lines(const Sheet& sheet, long count, std::vector<std::size_t>& lines)
-{
-    const auto columns = static_cast<std::size_t>(sheet.column_count);
-    for (std::size_t line = 0; line < columns; ++line)
-        lines.push_back(line);
-    if (count <= sheet.column_count)
-        return true;
-    if (!request.Subset_Columns) {
-        Report_Message("Too many column names provided.\n");
-        return true;
+    const List_Pairing pairing = Pairing_Of_List(count, std::ssize(columns));
+    if (count > std::ssize(columns))
+        Report_Message(request.Subset_Columns
+                           ? "Too many column names provided.\n"
+                             "If subsetting columns, just provide names for remaining columns.\n"
+                             "Attempting to rename correct columns.\n"
+                           : "Too many column names provided.\n");
+    if (pairing == List_Pairing::unknown)
+        return Fail("Could not locate correct columns to rename.\n");
+    for (std::size_t i = 0; i < columns.size(); ++i) {
+        const bool placed = pairing == List_Pairing::by_input_place && columns[i]->input_place > 0;
+        lines.push_back(placed ? static_cast<std::size_t>(columns[i]->input_place) - 1 : i);
     }
-    Report_Message("Too many column names provided.\n"
-                   "If subsetting columns, just provide names for remaining columns.\n"
-                   "Attempting to rename correct columns.\n");
-    lines = Lines_Of_Subset();
-    return !lines.empty() || Fail("Could not locate correct columns to rename.\n");
+    return true;
 }
 
 bool Has_Structure_Name(const Sheet& sheet)
@@ -231,12 +218,12 @@ void Apply_In_Order(Sheet& sheet, const Var_List& list)
         return;
     }
     const long count = list.count > 0 ? list.count : sheet.column_count;
-    std::vector<std::size_t> lines;
-    if (!Pair_Lines(sheet, count, lines))
-        return;
     const std::vector<Column*> columns = Columns_Of(sheet);
+    std::vector<std::size_t> lines;
+    if (!Pair_Lines(columns, count, lines))
+        return;
     const auto named = std::min(list.lines.size(), static_cast<std::size_t>(count));
-    for (std::size_t i = 0; i < columns.size() && i < lines.size(); ++i)
+    for (std::size_t i = 0; i < columns.size(); ++i)
         if (lines[i] < named)
             Change_Column(columns[i], list.lines[lines[i]]);
     if (structure && named < list.lines.size() && !list.lines[named].empty())
@@ -246,22 +233,23 @@ void Apply_In_Order(Sheet& sheet, const Var_List& list)
 /// All are found before the first is changed, so that names may change places.
 void Apply_By_Name(Sheet& sheet, const Var_List& list)
 {
-    std::map<std::string, Column*, std::less<>> columns;
-    for (Column* const column : Columns_Of(sheet))
-        columns.emplace(column->name.view(), column);
+    std::vector<std::string> old_names;
+    std::vector<std::string> new_names;
     for (const std::string& line : list.lines) {
-        if (line.empty())
+        auto [old_name, new_name] = Split_Entry(line);
+        if (old_name.empty())
             continue;
-        const auto [old_name, new_name] = Split_Entry(line);
-        auto found = columns.find(old_name);
-        if (found == columns.end())
-            found = columns.find(Name_In_Lists(old_name));
-        if (found == columns.end()) {
-            Report_Message_Text("Warning: column %.60s was not found and not changed.\n", old_name.c_str());
-            continue;
-        }
-        Change_Column(std::exchange(found->second, nullptr), new_name);
+        old_names.push_back(std::move(old_name));
+        new_names.push_back(std::move(new_name));
     }
+    Missing_Names missing("Warning: column %.60s was not found, or holds no data, and was not changed.\n");
+    std::set<const Column*> changed;
+    const std::vector<Column*> columns = Find_Listed(sheet, old_names);
+    for (std::size_t i = 0; i < columns.size(); ++i)
+        if (columns[i] == nullptr)
+            missing.Tell(old_names[i]);
+        else if (changed.insert(columns[i]).second)
+            Change_Column(columns[i], new_names[i]);
 }
 
 }  // namespace

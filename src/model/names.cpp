@@ -391,10 +391,17 @@ Name_Marks Read_Name_Marks(std::string_view name)
     return marks;
 }
 
-std::string Name_In_Lists(const std::string& name)
+std::string Name_In_Lists(std::string_view name)
 {
-    const bool quoted = name.find(Quoted_Open) != std::string::npos;
-    return name.empty() || quoted ? name : Make_Valid_Name(name);
+    const std::string bare = Strip_Name_Mark(name);
+    if (bare.empty() || bare.find(Quoted_Open) != std::string::npos)
+        return bare;
+    const Name_State state = name_state;
+    const std::int32_t next_column_number = Get_Settings().next_column_number;
+    std::string valid = Make_Valid_Name(bare);
+    name_state = state;
+    Get_Settings().next_column_number = next_column_number;
+    return valid;
 }
 
 std::string Strip_Name_Mark(std::string_view name)

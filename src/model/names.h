@@ -56,9 +56,9 @@ struct Name_Marks {
 };
 [[nodiscard]] Name_Marks Read_Name_Marks(std::string_view name);
 
-/// A name that a list gives, as a Column would bear it. Those with a quoted suffix are left alone: cleaning
-/// numbers them.
-[[nodiscard]] std::string Name_In_Lists(const std::string& name);
+/// A name that a list gives, without its marks and as a Column would bear it. Those with a quoted suffix are
+/// left alone: cleaning numbers them. The numbers of the names to come stay as they are.
+[[nodiscard]] std::string Name_In_Lists(std::string_view name);
 
 /// `name` without its marks: every ":D" and ":T" (in either case), and at the end one "!", "#" or "$" and
 /// one ":E" or ":" with a digit.

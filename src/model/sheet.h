@@ -88,10 +88,12 @@ struct Column : Column_Host_Fields {
     Block_Table blocks;             ///< owns the cells
     Text_Arena texts;               ///< owns the texts of cells and labels
     std::int32_t changed_display = 0;
-    std::int32_t index = 0;      ///< 0 for the `Row` column, then 1, 2, ...
-    std::int32_t length = 0;     ///< number of cells
-    std::int32_t decimals = -1;  ///< -1: not set
-    std::int32_t width = 0;      ///< display width, see `Compute_Column_Width`
+    std::int32_t index = 0;        ///< 0 for the `Row` column, then 1, 2, ...
+    std::int32_t input_place = 0;  ///< `index` before some columns were left out; 0: none were
+    std::string input_name;        ///< where the input spells the name in another way
+    std::int32_t length = 0;       ///< number of cells
+    std::int32_t decimals = -1;    ///< -1: not set
+    std::int32_t width = 0;        ///< display width, see `Compute_Column_Width`
     std::int32_t text_cell_width = Text_Cell_Width;
     std::int32_t cursor_index = -1;  ///< remembered position of `Cell_At`, -1: none
     double table_margin_value = 0;   ///< type 8: what stands for the margin

@@ -5,6 +5,7 @@
 #include "model/names.h"
 #include "support/text.h"
 
+#include <unordered_map>
 #include <vector>
 
 namespace ingester {
@@ -30,6 +31,44 @@ bool Column_Subset::Keeps(std::int32_t ordinal, std::string_view name) const
     return request.Subset_By_Number ? numbers_.contains(ordinal) : names_.contains(name);
 }
 
+std::vector<Column*> Find_Listed(const Sheet& sheet, std::span<const std::string> names)
+{
+    std::unordered_map<std::string_view, Column*> here;
+    std::unordered_map<std::string_view, Column*> in_input;
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        here.emplace(column->name.view(), column);
+        if (!column->input_name.empty())
+            in_input.emplace(column->input_name, column);
+    }
+    std::vector<Column*> columns;
+    columns.reserve(names.size());
+    const auto find = [&columns](const auto& map, std::string_view name) {
+        const auto found = map.find(name);
+        columns.back() = found == map.end() ? nullptr : found->second;
+        return columns.back() != nullptr;
+    };
+    for (const std::string& name : names) {
+        columns.push_back(nullptr);
+        if (!name.empty() && !find(here, name) && !find(in_input, name))
+            find(here, Name_In_Lists(name));
+    }
+    return columns;
+}
+
+List_Pairing Pairing_Of_List(std::int64_t count, std::int64_t columns)
+{
+    if (count <= columns || !request.Subset_Columns)
+        return List_Pairing::by_order;
+    return request.Subset_By_Number ? List_Pairing::by_input_place : List_Pairing::unknown;
+}
+
+void Missing_Names::Tell(const std::string& name)
+{
+    constexpr int most = 10;
+    if (++told_ <= most)
+        Report_Message_Text(warning_, name.c_str());
+}
+
 bool Keep_Column_Subset(Sheet* sheet)
 {
     if (sheet == nullptr)
@@ -38,7 +77,8 @@ bool Keep_Column_Subset(Sheet* sheet)
     const bool has_factors = sheet->type == table_sheet;
     std::vector<bool> wanted;
     bool found = false;
-    for (const Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
+    for (Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
+        column->input_place = column->index;
         const bool kept = subset.Keeps(column->index, column->name);
         wanted.push_back(kept || (has_factors && column->index < sheet->leading_columns));
         found = found || kept;
@@ -50,16 +90,13 @@ bool Keep_Column_Subset(Sheet* sheet)
 
 void Tell_Missing_Columns(const Sheet& sheet)
 {
-    constexpr int most = 10;
     if (!request.Subset_Columns || request.Subset_By_Number)
         return;
-    std::unordered_set<std::string_view> names;
-    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-        names.insert(column->name.view());
-    int told = 0;
-    for (const std::string& entry : request.Subset_Names)
-        if (!names.contains(entry) && !names.contains(Name_In_Lists(entry)) && ++told <= most)
-            Report_Message_Text("Warning: column %.60s was not found in the input.\n", entry.c_str());
+    Missing_Names missing("Warning: column %.60s was not found in the input.\n");
+    const std::vector<Column*> columns = Find_Listed(sheet, request.Subset_Names);
+    for (std::size_t i = 0; i < columns.size(); ++i)
+        if (columns[i] == nullptr)
+            missing.Tell(request.Subset_Names[i]);
 }
 
 }  // namespace ingester

@@ -5,9 +5,11 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <string>
 #include <string_view>
 #include <unordered_set>
+#include <vector>
 
 namespace ingester {
 
@@ -28,6 +30,28 @@ private:
 
     std::unordered_set<long> numbers_;
     std::unordered_set<std::string, Text_Hash, std::equal_to<>> names_;
+};
+
+/// The columns that the names of a list stand for, null for those that aren't there. A column is found by its
+/// name, which the list may spell as the host wouldn't, or else by the name that it has in the input.
+[[nodiscard]] std::vector<Column*> Find_Listed(const Sheet& sheet, std::span<const std::string> names);
+
+/// How the lines of a list go with the columns that a subset has left.
+enum class List_Pairing { by_order, by_input_place, unknown };
+
+/// The pairing of a list that counts `count` lines with `columns` columns. A list that counts more was
+/// written for all columns, and their places tell which line is whose.
+[[nodiscard]] List_Pairing Pairing_Of_List(std::int64_t count, std::int64_t columns);
+
+/// Tells of names that were not found, up to ten of them, by a warning that takes the name.
+class Missing_Names {
+public:
+    explicit Missing_Names(const char* warning) : warning_(warning) {}
+    void Tell(const std::string& name);
+
+private:
+    const char* warning_;
+    int told_ = 0;
 };
 
 /// Leaves the request's columns in a Sheet. The leading Factors of a Table stay, since its cells belong to

@@ -141,6 +141,16 @@ TEST_F(Command_Test, Converts)
     }
 }
 
+TEST_F(Command_Test, Leaves_A_List_Of_Columns_To_Fill_In)
+{
+    const Ran first = Run({"crops.csv", "out.tab", "--column-list"});
+    EXPECT_EQ(Get("crops.VAR"), "3\nplot\nkind\nyield\n") << first.err;
+    EXPECT_NE(first.err.find("crops.VAR: lists the names"), std::string::npos) << first.err;
+    Put("crops.VAR", "3\n\nplant\n*\n");
+    EXPECT_EQ(Run({"crops.csv", "out.tab", "--column-list", "--force"}).err, "");
+    EXPECT_EQ(Get("out.tab"), "plot\tplant\r\n1\toats\r\n2\trye\r\n3\tbarley\r\n");
+}
+
 TEST_F(Command_Test, Adds_Sheets_To_A_Book_And_Lists_Them)
 {
     for (const char* const option :

@@ -144,14 +144,59 @@ TEST_F(Selection_Test, A_List_Beside_The_Input_Changes_Its_Columns)
         {"2\na!\nb!\nc\n", "a!\tb!\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
         {"4\n*\n*\nw:E\n*\n", "w|2.500000e+00|4.000000e+00|"},
         {"9\n*\n*\nv:2\n*\n", "v|2.50|4.00|" + many},
-        {"@names\nb_1=*\n a = b \nb=a$\nx=y\nd\n",
-         "b\ta\td!|1\tx\tp|2\ty\tq|3\tz\tp|Warning: column x was not found and not changed.|"},
+        {"@names\nb_1=*\n a = b \nb=a$\nx=y\nd\n", "b\ta\td!|1\tx\tp|2\ty\tq|3\tz\tp|Warning: column x was "
+                                                   "not found, or holds no data, and was not changed.|"},
         {"@names\na=$\nd=*\nb=*\nb_1=*\n", "a|1|2|3|"},
         {"*\n*\n*\n*\n", "4 All columns in the input file are empty.|"},
         {std::string("\0\1\n\xFF\n", 5), "a\t%\tb_1\td!|1\tx\t2.5\tp|2\ty\t*\tq|3\tz\t4\tp|"},
     };
     for (const auto& [list, told] : cases)
         EXPECT_EQ(Change(list, "", "o.tab/d"), told) << list;
+}
+
+// Columns without data go, columns are selected, and names are cleaned and told apart: a line of a list is
+// for the same column in the reader and behind it, and what it wants as text is there to the letter.
+TEST_F(Selection_Test, Lines_Of_Lists_Stay_With_Their_Columns)
+{
+    const std::string gap = "a,b,c,d\n01,,02,03\n01,*,02,04\n";
+    const std::string many = "Too many column names provided.|"
+                             "If subsetting columns, just provide names for remaining columns.|"
+                             "Attempting to rename correct columns.|";
+    std::string long_gap = "a,b,c\n";
+    for (int i = 0; i < 300; ++i)
+        long_gap += i < 299 ? "1,,01\n" : "1,2,01\n";
+    const auto keep = [](const char* names) { return std::string("9\nN\n").append(names); };
+    const struct {
+        std::string text, columns, list, starts;
+    } cases[] = {
+        {gap, "", "3\nx\ny\nz$\n", "x\ty\tz|1\t2\t03|1\t2\t04|"},
+        {gap, keep("1\n2\n3\n"), "4\np\nq\nr$\ns\n", "p\tr|1\t02|1\t02|" + many},
+        {gap, keep("3\n4\n"), "4\np$\nq\nr\ns$\n", "r\ts|2\t03|2\t04|" + many},
+        {gap, keep("4\n1\n"), "2\nx$\ny\n", "x\ty|01\t3|01\t4|"},
+        {gap, "9\nV\nd\na\n", "2\nx\ny$\n", "x\ty|1\t03|1\t04|"},
+        {gap, "9\nV\nd\na\n", "3\nx\ny\nz\n", "a\td|1\t3|1\t4|" + many + "Could not locate"},
+        {long_gap, "", "3\nx$\ny$\nz\n", "x\ty\tz|1\t\t1|"},
+        {"a,b,b\n1,2,08\n3,4,09\n", "", "@names\nb=$\n", "a\tb\tb_1|1\t2\t8|3\t4\t9|"},
+        {"a,b,b\n1,02,08\n3,4,09\n", "", "@names\nb_1=$\n", "a\tb\tb_1|1\t2\t08|3\t4\t09|"},
+        {"p,t\n\"1,234\",5 kg\nabc,6\n", "", "@names\np=#\nt=w#\n", "p\tw|1.234\t5|*\t6|"},
+        {"Temp [C],n [m],d:D\n1,2,3\n", "9\nV\nTemp [C]\nd:D\n", "@names\nTemp [C]=T\nd:D=when:2\n",
+         "T\twhen|1\t3|"},
+        {"Temp [C],n [m]\n1,2\n", "9\nV\nn [m]\n", "", "n_[2]|2|"},
+    };
+    for (const auto& [text, columns, list, starts] : cases) {
+        Put("f.csv", text);
+        std::filesystem::remove(Path("f.VAR"));
+        if (!list.empty())
+            Put("f.VAR", list);
+        const std::string told = Keep(columns, "", list.empty() ? "f.csv" : "f.csv/v");
+        EXPECT_EQ(told.substr(0, starts.size()), starts) << text.substr(0, 60) << columns << list;
+    }
+    std::string unknown = "@names\n";
+    for (int i = 0; i < 1000; ++i)
+        unknown += "no" + std::to_string(i) + "=x\n";
+    const std::string told = Change(unknown);
+    EXPECT_TRUE(told.find("column no9 ") != std::string::npos
+                && told.find("column no10 ") == std::string::npos);
 }
 
 }  // namespace

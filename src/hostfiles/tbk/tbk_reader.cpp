@@ -208,6 +208,9 @@ void Limit_Rows(Sheet& sheet)
 {
     if (sheet.column_count == 0 && sheet.row_count > Most_Blank_Cells)
         Expect_Rows(&sheet, 0);
+    const std::int32_t square = std::max(sheet.column_count - sheet.leading_columns + 1, 0);
+    if (sheet.type == symmetric_matrix_sheet && sheet.row_count > square)
+        Expect_Rows(&sheet, square);
 }
 
 /// False, silently, when nothing is left: the pipeline tells.

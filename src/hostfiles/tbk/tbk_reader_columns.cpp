@@ -218,6 +218,7 @@ bool End_Column(Book_Reading& reading)
     if (column.width < least_width)
         Compute_Column_Width(&column);
     const auto ordinal = static_cast<std::int32_t>(reading.columns.size());
+    column.input_place = request.Subset_Columns ? ordinal : 0;
     // The rows and columns of a Symmetric Matrix go together, when all are there.
     if (request.Subset_Columns && reading.sheet->type != symmetric_matrix_sheet
         && !Is_Column_Selected(reading.subset, ordinal, column.name)) {

@@ -532,6 +532,7 @@ bool Read_TSS_Column(TSS_Reading& reading, std::int32_t ordinal)
     Column* const column = New_Column(reading.sheet, Type_In_Sheet(record), record.name);
     if (column == nullptr)
         return true;  // the Sheet is full: what follows is looked at as if it were the next record
+    column->input_place = reading.selects_columns ? ordinal : 0;
     if (Fill_TSS_Column(reading, *column, record))
         return true;
     Delete_Column(column, false);

@@ -86,6 +86,8 @@ private:
     void Name_Column(std::size_t index, std::string_view text);
     void Settle_Names();
     void Leave_Out(Column_Filling& state, std::size_t index);
+    void Leave_Out_Unlisted();
+    void Take_Wanted_Types();
     bool Fill_Rows();
     void Finish_Rows(const char* last_line);
     void Report_Oddities() const;
@@ -97,6 +99,7 @@ private:
     void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
     void Append_Blank(Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
+    static void Become(Column_Filling& state, std::int32_t type, Filling filling);
     std::string_view Text_Of(const Field_Content& content);
     void Refuse_Extra_Columns();
     bool Add_Late_Column();
@@ -161,6 +164,7 @@ void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
     scan.make_time = marks.time;
     column.name = Make_Valid_Name(Strip_Name_Mark(text));
     Use_Bracket_Text(column);
+    column.input_name = Trim_Copy(text);
 }
 
 /// An empty field leaves a column the name it has.
@@ -184,17 +188,67 @@ void Sheet_Filler::Settle_Names()
     for (Column_Filling& state : columns_)
         Cut_Type_Mark(*state.column);
     Make_Column_Names_Unique(&sheet_);
-    for (std::size_t index = 0; index < columns_.size(); ++index)
-        Leave_Out(columns_[index], index);
+    Leave_Out_Unlisted();
+    Take_Wanted_Types();
 }
 
 /// A column that nobody wants is not filled: its fields are only passed over.
 void Sheet_Filler::Leave_Out(Column_Filling& state, std::size_t index)
 {
-    if (subset_.Keeps(static_cast<std::int32_t>(index) + 1, state.column->name))
-        return;
     state.filling = Filling::left_out;
     shape_.types[index] = Column_Scan{};
+}
+
+void Sheet_Filler::Leave_Out_Unlisted()
+{
+    if (!request.Subset_Columns)
+        return;
+    std::vector<const Column*> listed;
+    if (!request.Subset_By_Number)
+        for (const Column* column : Find_Listed(sheet_, request.Subset_Names))
+            listed.push_back(column);
+    std::ranges::sort(listed);
+    for (std::size_t index = 0; index < columns_.size(); ++index) {
+        Column& column = *columns_[index].column;
+        column.input_place = column.index;
+        const bool wanted = request.Subset_By_Number ? subset_.Keeps(column.index, {})
+                                                     : std::ranges::binary_search(listed, &column);
+        if (!wanted)
+            Leave_Out(columns_[index], index);
+    }
+}
+
+/// Before there is a cell. Columns that are to hold numbers decide by their fields, so that texts are there
+/// to be converted.
+void Sheet_Filler::Take_Wanted_Types()
+{
+    if (request.Column_Wanted_Types.empty())
+        return;
+    std::vector<bool> kept;
+    for (const Column_Filling& state : columns_)
+        kept.push_back(state.filling != Filling::left_out);
+    const std::vector<std::int32_t> types = Wanted_Types(sheet_, shape_, kept);
+    for (std::size_t index = 0; index < columns_.size(); ++index) {
+        const std::int32_t type = types[index];
+        if (type <= 0)
+            continue;
+        Column_Filling& state = columns_[index];
+        shape_.types[index].make_factor = type == factor_column;
+        if (type == text_column)
+            Become(state, text_column, Filling::texts);
+        else if (type == variate_column)
+            Become(state, variate_column, Filling::numbers_so_far);
+    }
+}
+
+void Sheet_Filler::Become(Column_Filling& state, std::int32_t type, Filling filling)
+{
+    Column& column = *state.column;
+    const bool text = type == text_column;
+    column.type = type;
+    column.format = text ? general_format : significant_digits_format;
+    column.decimals = text ? 0 : -1;
+    state.filling = filling;
 }
 
 /// A field's text, doubled quotes made single, cut and trimmed.
@@ -229,13 +283,9 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
 /// The column's numbers so far are taken back; their texts are fetched when all rows are in.
 void Sheet_Filler::Turn_To_Text(Column_Filling& state)
 {
-    Column& column = *state.column;
-    column.type = text_column;
-    column.format = general_format;
-    column.decimals = 0;
+    Become(state, text_column, Filling::texts);
     for (Cell_Node* cell = &state.cells.Last(); cell != nullptr; cell = cell->prev)
         cell->value = empty_;
-    state.filling = Filling::texts;
     state.rows_to_redo = row_;
 }
 
@@ -297,9 +347,11 @@ bool Sheet_Filler::Add_Late_Column()
     shape_.types.emplace_back();
     shape_.columns = number;
     Start_Column(*column, Cell_Appender(*column, row_ + Spare_Rows));
-    Leave_Out(columns_.back(), columns_.size() - 1);
-    if (columns_.back().filling == Filling::left_out)
+    column->input_place = request.Subset_Columns ? column->index : 0;
+    if (!subset_.Keeps(column->index, column->name)) {
+        Leave_Out(columns_.back(), columns_.size() - 1);
         return true;
+    }
     for (std::int64_t row = 0; row < row_; ++row)
         columns_.back().cells.Append(missing_);
     Limit_Rows();

@@ -156,6 +156,7 @@ constexpr std::int32_t Undecided_Type = 99;
 /// A column as the scan sees it.
 struct Column_Scan {
     std::int32_t type = Undecided_Type;
+    bool has_data = false;     ///< a field is not missing
     bool make_factor = false;  ///< marked: becomes a Factor when it is filled
     bool make_date = false;    ///< marked for dates
     bool make_time = false;    ///< marked for times
@@ -178,6 +179,13 @@ constexpr std::int64_t All_Lines = std::numeric_limits<std::int64_t>::max();
 /// all, columns whose type isn't sure stay undecided.
 bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                           std::int64_t lines = All_Lines);
+
+/// Whether the first lines don't tell which columns a list of types is for: it counts those that hold data.
+bool Wanted_Types_Need_All_Lines(const Text_Shape& shape);
+
+/// For each column the type that a list asks for, or 0. `kept` tells which columns go on.
+std::vector<std::int32_t> Wanted_Types(const Sheet& sheet, const Text_Shape& shape,
+                                       const std::vector<bool>& kept);
 
 /// Makes the Sheet of a shape, without rows: one column a type, undecided ones of `default_type`.
 /// Null when it can't be made; the earlier `Current_Sheet` is back then.

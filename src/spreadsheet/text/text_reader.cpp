@@ -64,6 +64,8 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     Text_Shape shape;
     if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1)
         return false;
+    if (Wanted_Types_Need_All_Lines(shape) && !Scan_Text_Dimensions(shape, options, buffer))
+        return false;
     Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);
     Current_Sheet = earlier;

@@ -1,14 +1,10 @@
 // The shape of a text: how many rows and columns, whether names come first, what the columns are.
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
-#include "model/names.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
 
 #include <algorithm>
-#include <optional>
-#include <string>
-#include <unordered_map>
 #include <vector>
 
 namespace ingester {
@@ -72,65 +68,15 @@ void Take_Name_Mark(std::string_view name, Column_Scan& column)
         column.type = variate_column;
 }
 
-/// Finds the entry of the wanted types that speaks of a column: by its name, by its place, or by its place
-/// among the columns of the subset that the list was written for.
-class Wanted_Entries {
-public:
-    Wanted_Entries()
-    {
-        const bool by_number = request.Subset_Columns && request.Subset_By_Number;
-        const std::vector<std::string>& names =
-            request.Column_Wanted_Names.empty() ? request.Subset_Names : request.Column_Wanted_Names;
-        for (std::size_t i = 0; i < names.size(); ++i) {
-            if (request.Column_Wanted_Names.empty() && by_number)
-                places_.emplace(Leading_Integer(names[i]), i);
-            else
-                names_.emplace(names[i], i);
-            names_.emplace(Name_In_Lists(names[i]), i);
-        }
-    }
-
-    /// Nothing for a column that no entry speaks of.
-    [[nodiscard]] std::optional<std::size_t> Find(std::size_t column, std::string_view name) const
-    {
-        if (request.Column_Wanted_Names.empty() && !request.Subset_Columns)
-            return column;
-        if (!places_.empty())
-            return Find_In(places_, static_cast<long>(column) + 1);
-        const std::string stripped = Strip_Name_Mark(name);
-        const auto found = Find_In(names_, stripped);
-        return found ? found : Find_In(names_, Name_In_Lists(stripped));
-    }
-
-private:
-    template <class Map, class Key> static std::optional<std::size_t> Find_In(const Map& map, const Key& key)
-    {
-        const auto found = map.find(key);
-        return found == map.end() ? std::nullopt : std::optional(found->second);
-    }
-
-    std::unordered_map<long, std::size_t> places_;
-    std::unordered_map<std::string, std::size_t> names_;
-};
-
-/// A list of wanted types overrules the marks of the names.
-void Take_Wanted_Type(std::size_t entry, Column_Scan& column)
-{
-    if (entry >= request.Column_Wanted_Types.size())
-        return;
-    const std::int32_t wanted = request.Column_Wanted_Types[entry];
-    if (wanted <= 0)
-        return;
-    column.make_factor = wanted == factor_column;
-    if (!column.make_factor)
-        column.type = wanted;
-}
-
 /// Whether Text has to be Long Text shows when it is kept.
 void Take_Field(const Field_Content& content, Column_Scan& column)
 {
     double value;
-    if (column.type == Undecided_Type && Kind_Of_Field(content, value) == Field_Kind::text)
+    if (column.has_data && column.type != Undecided_Type)
+        return;
+    const Field_Kind kind = Kind_Of_Field(content, value);
+    column.has_data = column.has_data || kind != Field_Kind::nothing;
+    if (column.type == Undecided_Type && kind == Field_Kind::text)
         column.type = text_column;
 }
 
@@ -154,31 +100,6 @@ void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape)
         else
             Take_Field(walker.Content(field), column);
     } while (walker.Has_More());
-}
-
-/// The names of the columns, for lists that go by name.
-std::vector<std::string> Names_Of_Line(Field_Walker& walker)
-{
-    std::vector<std::string> names;
-    walker.Go_To(walker.First_Line());
-    do
-        names.emplace_back(Trim_Copy(walker.Content(walker.Next()).text));
-    while (walker.Has_More());
-    return names;
-}
-
-void Take_Wanted_Types(Field_Walker& walker, Text_Shape& shape)
-{
-    if (request.Column_Wanted_Types.empty())
-        return;
-    std::vector<std::string> names;
-    if (shape.has_names)
-        names = Names_Of_Line(walker);
-    names.resize(shape.types.size());
-    const Wanted_Entries entries;
-    for (std::size_t index = 0; index < names.size(); ++index)
-        if (const auto entry = entries.Find(index, names[index]))
-            Take_Wanted_Type(*entry, shape.types[index]);
 }
 
 }  // namespace
@@ -206,7 +127,6 @@ bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, c
     shape.whole = !walker.At_Line();
     if (shape.whole && walker.Is_Blank_Line(line))
         --shape.rows;
-    Take_Wanted_Types(walker, shape);
     shape.nuls = walker.Nuls();
     if (!shape.whole)
         return true;
