@@ -1,9 +1,10 @@
-// Times one read of delimited text or of a spreadsheet of the host into a Sheet and, if asked, one write of
-// the Sheet as comma text, as a command script or as a spreadsheet; then also a plain copy of that file
-// through the same streams. Or times one read of some columns only, told by number. Prints "name value"
-// lines: seconds, counts and bytes.
+// Times one read of delimited text or of a spreadsheet or book of the host into a Sheet and, if asked, one
+// write of the Sheet as comma text, as a command script, as a spreadsheet or as a book; of the last two then
+// also a plain copy through the same streams. Or times one read of some columns only, told by number. Prints
+// "name value" lines: seconds, counts and bytes.
 
 #include "hostfiles/script/script.h"
+#include "hostfiles/tbk/tbk.h"
 #include "hostfiles/tss/tss.h"
 #include "interface/process_request.h"
 #include "interface/request/messages.h"
@@ -64,17 +65,22 @@ void Keep_Columns_Of(std::string_view list)
     }
 }
 
-constexpr std::string_view Forms[] = {"packed", "padded", "script", "tss"};
+constexpr std::string_view Forms[] = {"packed", "padded", "script", "tss", "tbk"};
 
 bool Read_Input(const char* name)
 {
-    return std::string_view(name).ends_with(".tss") ? Read_TSS_File(name) : Read_CSV_File(name);
+    const std::string_view file = name;
+    if (file.ends_with(".tss"))
+        return Read_TSS_File(name);
+    return file.ends_with(".tbk") ? Read_TBK_File(name) : Read_CSV_File(name);
 }
 
 bool Write_As(std::string_view form, const char* name)
 {
     if (form == "tss")
         return Write_TSS_File(Current_Sheet, name);
+    if (form == "tbk")
+        return Write_TBK_File(Current_Sheet, name);
     return form == "script" ? Write_Host_Script(Current_Sheet, name)
                             : Write_Text_File(Current_Sheet, name, false);
 }
@@ -85,7 +91,7 @@ int main(int count, char** arguments)
 {
     const std::string_view form = count == 4 ? arguments[3] : "packed";
     if (count < 2 || count > 4 || std::ranges::find(Forms, form) == std::end(Forms)) {
-        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script|tss]\n"
+        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script|tss|tbk]\n"
                    "       time_text FILE COLUMN,COLUMN...\n",
                    stderr);
         return 2;
@@ -117,7 +123,7 @@ int main(int count, char** arguments)
         }
     }
     Free_Sheets();
-    if (form == "tss") {
+    if (form == "tss" || form == "tbk") {
         const std::string copy = std::string(arguments[2]) + ".copy";
         const bool copied = Time("copy_seconds", [&] { return Copy_File(arguments[2], copy); });
         Delete_File(copy);

@@ -3,6 +3,7 @@
 
 #include "hostfiles/shared/selection.h"
 #include "hostfiles/tbk/book_source.h"
+#include "platform/memory_ahead.h"
 
 #include <cstdint>
 #include <string>
@@ -38,6 +39,7 @@ struct Book_Reading {
     std::int32_t stored_columns = 0;
     Column* column = nullptr;
     std::int32_t stored_length = 0;
+    Memory_Ahead ahead = {};
     bool has_cells = false;
     bool no_rows = false;  ///< a selection left none of the Sheet read last
     std::string hidden_map = {};

@@ -56,7 +56,7 @@ bool Read_Number_Record(Book_Reading& reading)
     if (!source.Skip(size * above))
         return false;
     // No more room is made at first than the file can fill.
-    Cell_Appender cells(*reading.column, std::min<std::int64_t>(left, source.Size() / size));
+    Cell_Appender cells(*reading.column, std::min<std::int64_t>(left, source.Size() / size), &reading.ahead);
     while (left > 0) {
         const std::int32_t count = std::min(left, numbers_at_once);
         const std::byte* bytes = source.Take(static_cast<std::size_t>(count) * sizeof(double));
