@@ -30,6 +30,14 @@ struct Cell_Node {
     }
 };
 
+/// Has the nodes that a sweep comes to next brought near. They mostly lie behind each other, but processors
+/// don't look beyond the page that they are on.
+inline void Bring_Nodes_Near(const Cell_Node* node)
+{
+    constexpr std::size_t nodes_ahead = 300;
+    __builtin_prefetch(node + nodes_ahead);
+}
+
 /// A level value or a label of a Factor: the same shape as a cell.
 using Level_Node = Cell_Node;
 

@@ -124,7 +124,10 @@ void Write_Cells(const Cell_Node* cell, std::int64_t count, std::size_t size, Bo
         }
         put(cell, block.data() + used);
         used += size;
-        cell = cell == nullptr ? nullptr : cell->next;
+        if (cell == nullptr)
+            continue;
+        Bring_Nodes_Near(cell);
+        cell = cell->next;
     }
     sink.Put_Bytes(block.data(), used);
 }

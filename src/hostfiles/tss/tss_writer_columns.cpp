@@ -95,6 +95,7 @@ void Write_Numbers(const Cell_Node* node, std::int64_t count, TSS_Sink& sink, In
         for (double& number : std::span(block.data(), size)) {
             number = Missing_Value;
             if (node != nullptr) {
+                Bring_Nodes_Near(node);
                 number = in_file(node->value.number);
                 node = node->next;
             }

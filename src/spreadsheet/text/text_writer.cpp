@@ -318,6 +318,7 @@ inline void Text_Table_Writer::Put_Field(Column_Writing& state, std::int32_t row
     if (layout_.layout == Layout::fixed && state.left)
         line_.Put(' ');
     if (row >= state.first_row && state.cell != nullptr) {
+        Bring_Nodes_Near(state.cell);
         Put_Cell(state, *state.cell);
         state.cell = state.cell->next;
     }
