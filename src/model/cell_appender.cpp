@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <new>
+#include <utility>
 
 namespace ingester {
 
@@ -38,8 +39,22 @@ void Cell_Appender::Go_On_In(Cell_Node* nodes, std::size_t count)
     block_size_ = appended_;  // the length doubles, so blocks stay few
 }
 
+void Cell_Appender::Go_On_In_Tiles(Cell_Node* first, std::size_t tiles, std::size_t tile_size,
+                                   std::size_t stride)
+{
+    next_tile_ = first;
+    tiles_left_ = tiles;
+    tile_size_ = tile_size;
+    tile_stride_ = stride;
+}
+
 void Cell_Appender::Add_Block()
 {
+    if (tiles_left_ > 0) {
+        --tiles_left_;
+        Go_On_In(std::exchange(next_tile_, next_tile_ + tile_stride_), tile_size_);
+        return;
+    }
     constexpr auto greatest = static_cast<std::int64_t>(Cell_Nodes_Per_Block);
     const auto count = static_cast<std::size_t>(std::clamp(block_size_, Least_Block, greatest));
     Cell_Node* const nodes = New_Block(column_->blocks, count);
@@ -52,19 +67,22 @@ std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int6
                                           Memory_Ahead* ahead)
 {
     constexpr std::int64_t short_column = 20000;
-    constexpr std::int32_t many_columns = 64;
-    const std::int32_t columns = first == nullptr ? 0 : sheet.column_count + 1 - first->index;
+    constexpr std::size_t many_columns = 64;
+    constexpr std::size_t tile_size = 16;
     std::vector<Cell_Appender> appenders;
-    const auto count = static_cast<std::size_t>(expected);
-    const bool shared = columns >= many_columns && expected < short_column;
-    Cell_Node* nodes =
-        shared ? New_Block(sheet.shared_blocks, count * static_cast<std::size_t>(columns)) : nullptr;
-    for (Column* column = first; column != nullptr; column = column->next) {
+    for (Column* column = first; column != nullptr; column = column->next)
         appenders.emplace_back(*column, expected, ahead);
-        if (shared) {
-            appenders.back().Go_On_In(nodes, count);
-            nodes += count;
-        }
+    const std::size_t columns = appenders.size();
+    if (columns < many_columns || expected >= short_column || expected < 1)
+        return appenders;
+    const std::size_t tiles = (static_cast<std::size_t>(expected) + tile_size - 1) / tile_size;
+    const std::size_t stride = columns * tile_size;
+    Cell_Node* tile = New_Block(sheet.shared_blocks, tiles * stride);
+    if (ahead != nullptr)
+        ahead->Expect(tile, tiles * stride * sizeof(Cell_Node), columns);
+    for (Cell_Appender& cells : appenders) {
+        cells.Go_On_In_Tiles(tile, tiles, tile_size, stride);
+        tile += tile_size;
     }
     return appenders;
 }

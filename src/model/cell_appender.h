@@ -19,8 +19,9 @@ public:
         : column_(&column), block_size_(expected), ahead_(ahead)
     {}
 
-    /// Puts the next cells into `nodes`, which somebody else owns.
-    void Go_On_In(Cell_Node* nodes, std::size_t count);
+    /// Puts the next cells into tiles of a block that somebody else owns: `tiles` of `tile_size` nodes, each
+    /// of them `stride` nodes behind the one before.
+    void Go_On_In_Tiles(Cell_Node* first, std::size_t tiles, std::size_t tile_size, std::size_t stride);
 
     /// Throws std::bad_alloc, after the message, when there is no room.
     Cell_Node& Append(Cell_Value value)
@@ -45,19 +46,25 @@ public:
     void Finish(std::int32_t length);
 
 private:
+    void Go_On_In(Cell_Node* nodes, std::size_t count);
     void Add_Block();
 
     Column* column_;
     std::int64_t block_size_;
     Memory_Ahead* ahead_;
     std::int64_t appended_ = 0;  ///< nodes in all blocks
+    Cell_Node* next_tile_ = nullptr;
+    std::size_t tiles_left_ = 0;
+    std::size_t tile_size_ = 0;
+    std::size_t tile_stride_ = 0;
     Cell_Node* next_ = nullptr;
     Cell_Node* block_end_ = nullptr;
     Cell_Node* last_ = nullptr;
 };
 
-/// Appenders for the columns from `first` on, of `expected` cells each. Short columns share one block, so
-/// that a wide sheet lies in few pages.
+/// Appenders for the columns from `first` on, of `expected` cells each. Short columns share one block, in
+/// which some rows of all columns lie together: a wide sheet is filled row by row, and would else touch more
+/// pages with each row than a processor remembers.
 [[nodiscard]] std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int64_t expected,
                                                         Memory_Ahead* ahead = nullptr);
 

@@ -17,10 +17,11 @@ public:
     Memory_Ahead& operator=(const Memory_Ahead&) = delete;
     ~Memory_Ahead();
 
-    /// `bytes` from `start` on are filled soon, from the start on. Several regions are filled side by side.
-    void Expect(void* start, std::size_t bytes);
+    /// `bytes` from `start` on are filled soon, from the start on. Several regions are filled side by side;
+    /// `lists` is how many of equal length lie one behind the other in this one.
+    void Expect(void* start, std::size_t bytes, std::size_t lists = 1);
 
-    /// Keeps to a distance ahead of `bytes`, the place that is filled next in each region. Without this all
+    /// Keeps to a distance ahead of `bytes`, the place that is filled next in each list. Without this all
     /// that is expected is made ready.
     void Come_To(std::size_t bytes);
 

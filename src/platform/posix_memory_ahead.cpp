@@ -26,7 +26,10 @@ constexpr std::size_t Page = 4096;
 struct Region {
     std::byte* start;
     std::size_t bytes;
+    std::size_t lists;
     std::size_t ready = 0;
+
+    [[nodiscard]] std::size_t Ready_In_Each() const { return ready / lists; }
 };
 
 }  // namespace
@@ -49,8 +52,8 @@ private:
 Region* Memory_Ahead::Work::Next_Region()
 {
     std::erase_if(regions, [](const Region& region) { return region.ready >= region.bytes; });
-    const auto least = std::ranges::min_element(regions, {}, &Region::ready);
-    return least == regions.end() || least->ready >= limit ? nullptr : &*least;
+    const auto least = std::ranges::min_element(regions, {}, &Region::Ready_In_Each);
+    return least == regions.end() || least->Ready_In_Each() >= limit ? nullptr : &*least;
 }
 
 void Memory_Ahead::Work::Run()
@@ -72,7 +75,7 @@ void Memory_Ahead::Work::Run()
     }
 }
 
-void Memory_Ahead::Expect(void* start, std::size_t bytes)
+void Memory_Ahead::Expect(void* start, std::size_t bytes, std::size_t lists)
 {
     if (bytes < Least_Region)
         return;
@@ -87,7 +90,8 @@ void Memory_Ahead::Expect(void* start, std::size_t bytes)
     const auto address = reinterpret_cast<std::uintptr_t>(start);
     const std::size_t skipped = (Page - address % Page) % Page;
     const std::lock_guard lock(work_->mutex);
-    work_->regions.push_back({static_cast<std::byte*>(start) + skipped, (bytes - skipped) / Page * Page});
+    work_->regions.push_back(
+        {static_cast<std::byte*>(start) + skipped, (bytes - skipped) / Page * Page, lists});
     work_->changed.notify_one();
 }
 
