@@ -143,8 +143,8 @@ bool Run_Request(const Call_Files& files, Request_Status& status)
         answer = call.Run();
         status = Check_Sheet_Name(call.Status());
     } catch (const std::exception&) {  // no room, or a length beyond what any room could hold
-        Free_Sheets();                 // room for the words
-        Report_Message("Error: Not enough memory to read data.\n");
+        Free_Sheets();                 // room for the answer
+        Report_In_Fault("Error: Not enough memory to read data.\n", true);
         status = Request_Status::no_data;
     }
     Close_Message_File();

@@ -54,6 +54,7 @@ constexpr Stage Stages[] = {
     Tell_Summary,
 
     Make_Output_Form,
+    Refuse_Losses,
     Write_Output,
     Write_Column_List,
     Fill_Clipboard,

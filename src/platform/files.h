@@ -124,6 +124,7 @@ public:
     [[nodiscard]] bool Close();
 
 private:
+    [[nodiscard]] bool Make(std::string_view name, int how, unsigned permissions);
     [[nodiscard]] bool Start(int descriptor);
     void Flush();
     [[nodiscard]] std::int64_t Copy_In_System(const Input_File& source, std::int64_t count);
@@ -149,6 +150,8 @@ public:
     Scratch_File& operator=(const Scratch_File&) = delete;
     ~Scratch_File();
     [[nodiscard]] const std::string& Name() const { return name_; }
+    /// It stays after all.
+    void Keep() { name_.clear(); }
 
 private:
     std::string name_;

@@ -1,6 +1,6 @@
 #include "platform/folders.h"
 
-#include "platform/file_changes.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
 #include <array>
@@ -119,7 +119,7 @@ bool Same_File(std::string_view a, std::string_view b)
 
 bool Delete_File(std::string_view name) noexcept
 {
-    return ::unlink(Stack_Path(name).c_str()) == 0 || !File_Exists(name);
+    return (Allowed(Asked::remove) && ::unlink(Stack_Path(name).c_str()) == 0) || !File_Exists(name);
 }
 
 bool Replace_File(std::string_view from, std::string_view to)
@@ -128,7 +128,7 @@ bool Replace_File(std::string_view from, std::string_view to)
     struct stat facts;
     if (Look_At(to, facts))
         static_cast<void>(::chmod(from_path.c_str(), facts.st_mode & 07777));  // where that is ours to do
-    return File_Change_Allowed() && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
+    return Allowed(Asked::rename) && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
 std::string Resolved_Name(std::string_view name)

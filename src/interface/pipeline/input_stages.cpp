@@ -201,10 +201,10 @@ Request_Status Read_Merge_Keys(Request_Run& run)
             request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
     while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
         Take_Merge_Keys(line);
-    file.Close();
+    const bool whole = file.Close();
     if (downloaded)
         Delete_File(name);
-    if (request.Merge_Keys.empty())
+    if (request.Merge_Keys.empty() || !whole)
         return Stop(Request_Status::merge_failed, "Merge columns not found in files.\n");
     return Done;
 }
@@ -293,8 +293,8 @@ Request_Status Know_Host_Scratch_File(Request_Run& run)
 
 Request_Status Take_Wanted_Types(Request_Run&)
 {
-    if (request.Use_Var_File)
-        Read_Var_File(request.Var_File_Name);
+    if (request.Use_Var_File && !Read_Var_File(request.Var_File_Name))
+        return Request_Status::input_unreadable;
     return Done;
 }
 
