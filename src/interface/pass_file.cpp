@@ -114,9 +114,9 @@ bool Take_Secondary_File(std::string text, Pass_Request& asked)
         asked.secondary_failed = true;
         return Fail("Could not download secondary file URL:\n%.500s\n", text.c_str());
     }
-    if (downloaded)
-        asked.secondary_scratch = text;
     request.Secondary_File = text;
+    if (downloaded)
+        asked.secondary_scratch = std::move(text);
     return true;
 }
 

@@ -124,6 +124,7 @@ public:
     [[nodiscard]] bool Close();
 
 private:
+    void Need_Buffer();
     [[nodiscard]] bool Make(std::string_view name, int how, unsigned permissions);
     [[nodiscard]] bool Start(int descriptor);
     void Flush();

@@ -213,17 +213,21 @@ bool Output_File::Start(int descriptor)
     failed_ = descriptor < 0;
     used_ = 0;
     flushed_ = 0;
-    if (!failed_ && buffer_ == nullptr)
-        buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
     return !failed_;
+}
+
+void Output_File::Need_Buffer()
+{
+    if (buffer_ == nullptr)
+        buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
 }
 
 bool Output_File::Make(std::string_view name, int how, unsigned permissions)
 {
+    Need_Buffer();  // before there is a file
     const std::string path = Native_Path(name);
-    return Start(Allowed(Asked::open)
-                     ? ::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC | how, permissions)
-                     : -1);
+    return Start(
+        Allowed(Asked::open) ? ::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC | how, permissions) : -1);
 }
 
 bool Output_File::Open(std::string_view name)
@@ -239,6 +243,7 @@ bool Output_File::Open_Scratch(std::string_view name)
 
 void Output_File::Open_Standard_Output()
 {
+    Need_Buffer();
     static_cast<void>(Start(STDOUT_FILENO));
     owned_ = false;
 }
@@ -368,9 +373,9 @@ bool Copy_File(std::string_view from, std::string_view to)
     constexpr std::size_t block_size = std::size_t{1} << 20;
     Input_File source;
     Output_File target;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
     if (!source.Open(from) || !target.Open_Scratch(to))
         return false;
-    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
     while (const std::size_t got = source.Read(block.get(), block_size))
         target.Write(block.get(), got);
     const bool good = target.Close() && source.Close();

@@ -10,7 +10,7 @@ namespace ingester {
 
 /// Which of the things asked is refused.
 struct Refusal {
-    int number = 0;  ///< from 1; 0 for none
+    int number = 0;                           ///< from 1; 0 for none
     std::initializer_list<Asked> kinds = {};  ///< that are counted; all of them when there are none
     bool onwards = false;                     ///< those behind it are refused as well
     bool kills = false;                       ///< the process ends in the place of the refusal

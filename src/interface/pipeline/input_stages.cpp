@@ -14,6 +14,7 @@
 #include <algorithm>
 #include <iterator>
 #include <limits>
+#include <utility>
 
 namespace ingester {
 
@@ -113,15 +114,14 @@ Request_Status Keep_Stream(Request_Run& run)
 {
     if (!Is_Special_File(run.infile))
         return Done;
-    const std::string copy = Get_Temp_Folder()
-                                 .append("IN")
-                                 .append(request.Scratch_Stem)
-                                 .append(run.infile.substr(Extension_Start(run.infile)));
-    if (!Copy_File(run.infile, copy))
-        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
-    run.source_name = run.infile;
-    run.infile = copy;
+    std::string copy = Get_Temp_Folder()
+                           .append("IN")
+                           .append(request.Scratch_Stem)
+                           .append(run.infile.substr(Extension_Start(run.infile)));
+    run.source_name = std::exchange(run.infile, std::move(copy));
     run.kept_stream = true;
+    if (!Copy_File(run.source_name, run.infile))
+        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
     return Done;
 }
 

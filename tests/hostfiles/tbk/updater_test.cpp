@@ -261,18 +261,6 @@ TEST_F(Book_Updater, Takes_Compressed_Books_And_Nothing_Else)
         << "packed as closely as can be";
     ASSERT_TRUE(Add_Sheet(Plain_Sheet("D"), Request_Name("plain").c_str()));
     EXPECT_EQ(Pages("plain"), (Texts{"A", "D"}));
-    // The packed book is whole or as it was.
-    const std::string packed = Get("b.tbk");
-    bool good = false;
-    for (int refused = 1; !good; ++refused) {
-        Sheet* const sheet = Plain_Sheet("E");
-        {
-            const Refusing refusing({.number = refused, .kinds = {Asked::write, Asked::rename}});
-            good = Add_Sheet(sheet, name.c_str());
-        }
-        EXPECT_EQ(Get("b.tbk") == packed, !good);
-    }
-    EXPECT_NE(Messages(), "");
     Put("no.tbk", "a,b\n1,2\n");
     const std::string other = Request_Name("no.tbk");
     EXPECT_FALSE(Add_Sheet(Plain_Sheet("N"), other.c_str())
