@@ -133,18 +133,16 @@ bool Replace_File(std::string_view from, std::string_view to)
 
 std::string Resolved_Name(std::string_view name)
 {
-    char* const whole = ::realpath(Native_Path(name).c_str(), nullptr);
-    std::string resolved = whole == nullptr ? std::string(name) : Request_Path(whole);
-    std::free(whole);
-    return resolved;
+    std::array<char, PATH_MAX> whole;
+    const bool there = ::realpath(Native_Path(name).c_str(), whole.data()) != nullptr;
+    return there ? Request_Path(whole.data()) : std::string(name);
 }
 
 bool Make_Link(std::string_view name, std::string_view file)
 {
-    char* const whole = ::realpath(Native_Path(file).c_str(), nullptr);
-    const bool made = whole != nullptr && ::symlink(whole, Native_Path(name).c_str()) == 0;
-    std::free(whole);
-    return made;
+    std::array<char, PATH_MAX> whole;
+    return ::realpath(Native_Path(file).c_str(), whole.data()) != nullptr
+           && ::symlink(whole.data(), Native_Path(name).c_str()) == 0;
 }
 
 std::string_view Folder_Of(std::string_view name)
