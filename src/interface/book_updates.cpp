@@ -29,13 +29,9 @@ Book_Kind Kind_Of(const char* file_name)
 /// Packs the changed book beside the old one, which it then replaces.
 bool Compress_Over(const std::string& plain, const char* file_name)
 {
-    const std::string packed = std::string(file_name).append(".$$$");
-    if (!Compress_File(plain, packed))
-        return Fail("Document not saved.\n");
-    if (Replace_File(packed, file_name))
-        return true;
-    Delete_File(packed);
-    return Fail("Document not saved.\n");
+    const Scratch_File packed(std::string(file_name).append(".$$$"));
+    return (Compress_File(plain, packed.Name()) && Replace_File(packed.Name(), file_name))
+           || Fail("Document not saved.\n");
 }
 
 /// Runs `update` on the book, or on what a compressed one holds.

@@ -98,6 +98,13 @@ Request_Status Check_Sheet_Name(Request_Status status)
 class Ingester_Call {
 public:
     explicit Ingester_Call(Call_Files files) : files_(std::move(files)) {}
+    Ingester_Call(const Ingester_Call&) = delete;
+    Ingester_Call& operator=(const Ingester_Call&) = delete;
+    ~Ingester_Call()
+    {
+        if (!asked_.secondary_scratch.empty())
+            Delete_File(asked_.secondary_scratch);
+    }
 
     /// False when no answer may be given.
     [[nodiscard]] bool Run()
@@ -120,8 +127,6 @@ private:
             return Fail("Pass file %s not found./n", files_.pass.c_str());
         const bool good = Read_Pass_File(file, asked_);
         file.Close();
-        if (!asked_.secondary_scratch.empty())
-            Delete_File(asked_.secondary_scratch);
         if (good)
             Delete_File(files_.pass);
         return good;
@@ -143,8 +148,8 @@ bool Run_Request(const Call_Files& files, Request_Status& status)
         answer = call.Run();
         status = Check_Sheet_Name(call.Status());
     } catch (const std::exception&) {  // no room, or a length beyond what any room could hold
-        Free_Sheets();                 // room for the words
-        Report_Message("Error: Not enough memory to read data.\n");
+        Free_Sheets();                 // room for the answer
+        Report_In_Fault("Error: Not enough memory to read data.\n", true);
         status = Request_Status::no_data;
     }
     Close_Message_File();

@@ -32,6 +32,8 @@ std::int32_t Detect_File_Type(std::string_view file_name)
         return Unreadable("Input file could not be opened.\n");
     Detection_Head head{file_name};
     head.length = file.Read_Head(head.bytes.data(), head.bytes.size());
+    if (file.Failed())
+        return Unreadable("Input file could not be read.\n");
     return head.length == 0 ? Unreadable("Input file is empty.\n") : Code_Of_Head(head);
 }
 

@@ -148,8 +148,10 @@ std::optional<std::vector<std::string>> List_Sheet_Names(const std::string& file
                                                                 : std::nullopt;
     }
     const auto* const found = std::ranges::find(Format_Drivers, type, &Format_Driver::code);
-    if (found == std::end(Format_Drivers) || found->sheet_names == nullptr)
+    if (type == unreadable_file)
         return std::nullopt;
+    if (found == std::end(Format_Drivers) || found->sheet_names == nullptr)
+        return std::vector<std::string>{};
     auto names = found->sheet_names(file_name.c_str());
     if (names)
         names->resize(std::min(names->size(), most_names));

@@ -41,7 +41,8 @@ struct Format_Driver {
 /// The format of an output code.
 [[nodiscard]] const Format_Driver& Output_Driver_Of(std::int32_t code);
 
-/// The names of the sheets in a file of several, 4096 at most; nothing for any other file.
+/// The names of the sheets in a file of several, 4096 at most; none for any other file. Nothing when the
+/// file can't be read.
 [[nodiscard]] std::optional<std::vector<std::string>> List_Sheet_Names(const std::string& file_name);
 
 /// Reads a file of a known type. Messages name it by `source_name`, or by the URL that it was fetched

@@ -37,6 +37,7 @@ public:
     ~Output_Reading()
     {
         const Settings settings = request.settings;  // counters go on
+        asked_.Out_Of_Memory = asked_.Out_Of_Memory || request.Out_Of_Memory;
         request = std::move(asked_);
         request.settings = settings;
     }

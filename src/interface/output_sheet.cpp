@@ -43,18 +43,20 @@ bool Find_Output_Sheet(const std::string& output_name)
 {
     const std::string wanted(request.Merge_Sheet_Name);
     if (!File_Exists(output_name))
-        return false;
+        return true;
     if (wanted.empty() && !request.Worksheet_Name.empty() && request.Worksheet_Name.view() != Only_Sheet) {
         request.Update_Sheet_Name = request.Worksheet_Name;
-        return false;
+        return true;
     }
     // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
     const bool several =
         Ends_Ignoring_Case(output_name, ".gz") || Output_Driver_Of(output_name).sheet_names != nullptr;
-    const auto listed = several ? List_Sheet_Names(output_name) : std::nullopt;
-    if (!listed || listed->empty()) {
-        request.Add_To_Output = false;
+    const auto listed = several ? List_Sheet_Names(output_name) : std::vector<std::string>{};
+    if (!listed)
         return false;
+    if (listed->empty()) {
+        request.Add_To_Output = false;
+        return true;
     }
     const auto found = std::ranges::find_if(
         *listed, [&wanted](const std::string& name) { return Equal_Ignoring_Case(name, wanted); });
@@ -67,7 +69,7 @@ bool Find_Output_Sheet(const std::string& output_name)
         Update_Sheet(wanted.empty() ? std::string_view(listed->front()) : wanted, wanted.empty());
     else
         Use_First_Sheet(*listed, output_name);
-    return false;
+    return true;
 }
 
 }  // namespace ingester

@@ -114,9 +114,9 @@ bool Take_Secondary_File(std::string text, Pass_Request& asked)
         asked.secondary_failed = true;
         return Fail("Could not download secondary file URL:\n%.500s\n", text.c_str());
     }
-    if (downloaded)
-        asked.secondary_scratch = text;
     request.Secondary_File = text;
+    if (downloaded)
+        asked.secondary_scratch = std::move(text);
     return true;
 }
 
@@ -131,8 +131,8 @@ bool Take_Column_Subset(Pass_File& pass)
     else if (pass.Count() > 5 && !pass.Read_Text(Subset_Words, list))
         return false;
     Expand_Path_Tokens(list, Get_Temp_Folder());
-    request.Subset_Columns = Read_Column_Subset(list);
-    return true;
+    request.Subset_Columns = File_Exists(list);
+    return !request.Subset_Columns || Read_Column_Subset(list);
 }
 
 bool Take_Row_Subset(Pass_File& pass, bool columns_asked)
@@ -145,8 +145,8 @@ bool Take_Row_Subset(Pass_File& pass, bool columns_asked)
         list = request.Secondary_File.view();
     else if ((count >= 6 || (count == 5 && !columns_asked)) && !pass.Read_Text(Subset_Rows_Words, list))
         return false;
-    request.Subset_Rows = Read_Row_Subset(list);
-    return true;
+    request.Subset_Rows = File_Exists(list);
+    return !request.Subset_Rows || Read_Row_Subset(list);
 }
 
 template <class Text>
@@ -218,7 +218,8 @@ void Write_Result_File(std::string_view name, Request_Status status)
         return;  // silent by design: the host sees that there is no result
     file.Write_Little(static_cast<std::int32_t>(status));
     file.Write_Little(std::int32_t{0});
-    static_cast<void>(file.Close());
+    if (!file.Close())
+        Delete_File(name);  // half an answer is none
 }
 
 }  // namespace ingester

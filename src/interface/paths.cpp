@@ -201,12 +201,12 @@ bool Fetch_Url(std::string& name, std::string_view label, std::string& source_ur
     std::string url = name;
     std::replace(url.begin(), url.begin() + static_cast<std::ptrdiff_t>(std::min(url.size(), longest)), '\\',
                  '/');
-    const std::string scratch =
+    std::string scratch =
         Get_Temp_Folder().append(label).append(request.Scratch_Stem).append(Scratch_Extension(name));
     if (!Download(url, scratch, Limits_Of_Host()))
         return false;
-    source_url = url;
-    name = scratch;
+    source_url = std::move(url);
+    name = std::move(scratch);  // nothing may fail from here to the mark that has it deleted
     downloaded = true;
     return true;
 }

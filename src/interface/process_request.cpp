@@ -54,6 +54,7 @@ constexpr Stage Stages[] = {
     Tell_Summary,
 
     Make_Output_Form,
+    Refuse_Losses,
     Write_Output,
     Write_Column_List,
     Fill_Clipboard,
@@ -82,14 +83,12 @@ void Start_Request(std::string_view stem)
     Start_Message_File();
 }
 
-Request_Status Process_Request(std::string& infile, std::string& outfile, std::int32_t& rows)
+Request_Status Process_Request(std::string infile, std::string outfile, std::int32_t& rows)
 {
     Request_Run run;
-    run.infile = infile;
-    run.outfile = outfile;
+    run.infile = std::move(infile);
+    run.outfile = std::move(outfile);
     const Request_Status status = Run_Stages(run);
-    infile = run.infile;
-    outfile = run.outfile;
     rows = Current_Sheet == nullptr ? 0 : Current_Sheet->row_count;
     return status;
 }

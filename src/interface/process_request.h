@@ -13,8 +13,8 @@ namespace ingester {
 /// `stem` names the message file, `<temp><stem>.ERR`.
 void Start_Request(std::string_view stem = {});
 
-/// Runs every stage on the two strings, which become plain file names. `rows` gets the number of
-/// rows of the Sheet that was written. Start the request first.
-[[nodiscard]] Request_Status Process_Request(std::string& infile, std::string& outfile, std::int32_t& rows);
+/// Runs every stage on the two strings. `rows` gets the number of rows of the Sheet that was written.
+/// Start the request first.
+[[nodiscard]] Request_Status Process_Request(std::string infile, std::string outfile, std::int32_t& rows);
 
 }  // namespace ingester

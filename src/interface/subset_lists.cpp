@@ -1,5 +1,6 @@
 #include "interface/subset_lists.h"
 
+#include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -21,13 +22,27 @@ long Read_List_Count(Input_File& file)
     return file.Read_Line(line, Count_Line_Width) ? Leading_Integer(line) : 0;
 }
 
+bool Unreadable(const Input_File& file)
+{
+    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+}
+
+/// A list that was read to its end has done its service.
+bool Finish_List(Input_File& file)
+{
+    if (!file.Close())
+        return Unreadable(file);
+    Delete_File(file.Name());
+    return true;
+}
+
 }  // namespace
 
 bool Read_Column_Subset(std::string_view name)
 {
     Input_File file;
-    if (name.empty() || !file.Open(name))
-        return false;
+    if (!file.Open(name))
+        return Unreadable(file);
     const long count = Read_List_Count(file);
     std::string line;
     const bool has_kind = file.Read_Line(line, Count_Line_Width);
@@ -36,25 +51,21 @@ bool Read_Column_Subset(std::string_view name)
     for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
         request.Subset_Names.emplace_back(Trim_Copy(line));
     request.Subset_Name_Count = static_cast<std::int32_t>(request.Subset_Names.size());
-    file.Close();
-    Delete_File(name);
-    return true;
+    return Finish_List(file);
 }
 
 bool Read_Row_Subset(std::string_view name)
 {
     Input_File file;
-    if (name.empty() || !file.Open(name))
-        return false;
+    if (!file.Open(name))
+        return Unreadable(file);
     const long count = Read_List_Count(file);
     std::string line;
     request.Subset_Row_Flags.clear();
     for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
         request.Subset_Row_Flags.push_back(Leading_Integer(line) != 0 ? 1 : 0);
     request.Subset_Row_Count = static_cast<std::int32_t>(request.Subset_Row_Flags.size());
-    file.Close();
-    Delete_File(name);
-    return true;
+    return Finish_List(file);
 }
 
 }  // namespace ingester

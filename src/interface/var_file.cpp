@@ -63,14 +63,23 @@ std::pair<std::string, std::string> Split_Entry(std::string_view line)
     return {std::string(Trim_Copy(line.substr(0, equals))), std::string(Trim_Copy(changed))};
 }
 
+bool Unreadable(const Input_File& file)
+{
+    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+}
+
 }  // namespace
 
-void Read_Var_File(std::string_view file_name)
+bool Read_Var_File(std::string_view file_name)
 {
     Input_File file;
-    if (file_name.empty() || !file.Open(file_name))
-        return;
+    if (!File_Exists(file_name))
+        return true;
+    if (!file.Open(file_name))
+        return Unreadable(file);
     const Var_List list = Load_Var_List(file);
+    if (!file.Close())
+        return Unreadable(file);
     std::vector<std::int32_t> types;
     std::vector<std::string> names;
     for (const std::string& line : list.lines) {
@@ -82,10 +91,11 @@ void Read_Var_File(std::string_view file_name)
             names.push_back(old_name);
     }
     if (std::ranges::count(types, 0) == std::ssize(types))
-        return;
+        return true;
     request.Column_Wanted_Types = std::move(types);
     request.Column_Wanted_Count = list.by_name ? 0 : list.count;
     request.Column_Wanted_Names = std::move(names);
+    return true;
 }
 
 namespace {
@@ -257,7 +267,7 @@ void Apply_By_Name(Sheet& sheet, const Var_List& list)
 bool Apply_Var_File(Sheet* sheet, std::string_view file_name)
 {
     Input_File file;
-    return sheet != nullptr && !file_name.empty() && file.Open(file_name) && Apply_Var_List(*sheet, file);
+    return (file.Open(file_name) && Apply_Var_List(*sheet, file) && file.Close()) || Unreadable(file);
 }
 
 bool Apply_Var_List(Sheet& sheet, Input_File& file)
@@ -272,28 +282,36 @@ bool Apply_Var_List(Sheet& sheet, Input_File& file)
 
 namespace {
 
-/// Opens a list file, or one of its name in the temporary folder.
-bool Make_Var_File(Output_File& file, std::string_view file_name)
+std::string Var_List_Text(const Sheet& sheet)
 {
-    return file.Open(file_name)
-           || file.Open(Get_Temp_Folder().append(With_Extension(File_Part_Of(file_name), ".VAR")));
+    if (Has_Structure_Name(sheet))
+        return Format_Text("1\n%s\n", sheet.structure_name.c_str());
+    std::string text = Format_Text("%li\n", static_cast<long>(sheet.column_count));
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        text.append(column->name.view()).append("\n");
+    return text;
+}
+
+/// Writes beside an old list, which stays until the new one is whole.
+bool Put_In_Place(const std::string& text, std::string_view file_name)
+{
+    const Scratch_File scratch(std::string(file_name).append(".$$$"));
+    Output_File file(Output_File::small_buffer);
+    if (!Delete_File(scratch.Name()) || !file.Open(scratch.Name()))
+        return false;
+    file.Write(text);
+    return file.Close() && Replace_File(scratch.Name(), file_name);
 }
 
 }  // namespace
 
 bool Write_Var_File(const Sheet& sheet, std::string_view file_name)
 {
-    Output_File file(Output_File::small_buffer);
-    if (!Make_Var_File(file, file_name))
-        return false;  // silent by design: the list is an extra, the output stands
-    if (Has_Structure_Name(sheet)) {
-        file.Write(Format_Text("1\n%s\n", sheet.structure_name.c_str()));
-        return file.Close();
-    }
-    file.Write(Format_Text("%li\n", static_cast<long>(sheet.column_count)));
-    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-        file.Write(Format_Text("%s\n", column->name.c_str()));
-    return file.Close();
+    const std::string text = Var_List_Text(sheet);
+    return Put_In_Place(text, file_name)
+           || Put_In_Place(text, Get_Temp_Folder().append(With_Extension(File_Part_Of(file_name), ".VAR")))
+           || Fail("Warning: The list of columns %.500s could not be written.\n",
+                   std::string(file_name).c_str());
 }
 
 }  // namespace ingester

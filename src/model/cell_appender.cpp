@@ -1,9 +1,9 @@
 #include "model/cell_appender.h"
 
 #include "interface/request/messages.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <new>
 #include <utility>
 
@@ -16,13 +16,13 @@ constexpr std::int64_t Least_Block = 8;
 /// A block of nodes for `blocks` to own. Throws std::bad_alloc after the message.
 Cell_Node* New_Block(Block_Table& blocks, std::size_t count)
 {
-    void* const block = std::malloc(count * sizeof(Cell_Node));
-    if (block == nullptr) {
+    blocks.emplace_back();  // room for the owner comes first
+    blocks.back().reset(Take_Memory(nullptr, count * sizeof(Cell_Node)));
+    if (blocks.back() == nullptr) {
         Report_Message("Ingester out of memory.\n");
         throw std::bad_alloc();
     }
-    blocks.emplace_back(block);
-    return static_cast<Cell_Node*>(block);
+    return static_cast<Cell_Node*>(blocks.back().get());
 }
 
 }  // namespace

@@ -1,7 +1,9 @@
 #include "model/cells.h"
 
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
 #include "model/sheet.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
 
@@ -17,7 +19,7 @@ void* Alloc_Zeroed(std::size_t bytes)
 
 void* Realloc_Checked(void* pointer, std::size_t bytes)
 {
-    void* const memory = std::realloc(pointer, std::max<std::size_t>(bytes, 1));
+    void* const memory = Take_Memory(pointer, std::max<std::size_t>(bytes, 1));
     if (memory == nullptr)
         Report_Message("Error: Not enough memory to read data.\n");
     return memory;
@@ -56,13 +58,15 @@ template <class Node, class Set> std::size_t Alloc_Nodes(std::int64_t count, std
     const std::size_t blocks_before = blocks.size();
     for (auto left = static_cast<std::size_t>(count); left > 0;) {
         const std::size_t size = std::min(left, per_block);
-        blocks.emplace_back(std::malloc(size * sizeof(Node)));
+        blocks.emplace_back();  // room for the owner comes first
+        blocks.back().reset(Take_Memory(nullptr, size * sizeof(Node)));
         void* const block = blocks.back().get();
         if (block == nullptr) {
             blocks.resize(blocks_before);
             first = nullptr;
             last = nullptr;
             Report_Message("Ingester out of memory.\n");
+            request.Out_Of_Memory = true;
             return 0;
         }
         Link_Block(static_cast<Node*>(block), size, first, last, set);

@@ -69,6 +69,14 @@ enum Justification : std::int32_t { default_side = 0, left_side = 1, right_side 
 /// What a Factor's cell prints as.
 enum Factor_Kind : std::int32_t { plain_factor = 0, factor_with_levels = 1, factor_with_labels = 2 };
 
+/// How the columns of a Matrix or a Table, and the rows of a Matrix, are labelled.
+enum Label_State : std::int32_t {
+    labels_by_position = 0,
+    labels_by_level = 1,
+    labels_by_text = 2,
+    labels_by_text_and_level = 3,
+};
+
 /// Text-like cells hold texts, all others numbers.
 [[nodiscard]] constexpr bool Is_Text_Like(std::int32_t type)
 {
@@ -129,7 +137,7 @@ struct Sheet : Sheet_Host_Fields {
     Row_Node* first_row = nullptr;
     Row_Node* last_row = nullptr;
     Row_Node* cursor_row = nullptr;
-    std::int32_t label_state = 0;  ///< 0 named by position, 1 and 2 real labels, -1 from a Matrix
+    std::int32_t label_state = labels_by_position;  ///< also -1: comes from a Matrix
     Settings settings;
     std::string title_lines;  ///< title and comment lines, a NUL behind each
     std::int32_t title_line_count = 0;

@@ -17,14 +17,6 @@ namespace ingester {
 
 namespace {
 
-/// How the rows or columns of a Matrix, and the columns of a Table, are labelled.
-enum Label_State : std::int32_t {
-    no_labels = 0,
-    value_labels = 1,
-    text_labels = 2,
-    value_and_text_labels = 3,
-};
-
 /// One old data column, which becomes a row.
 struct Old_Column {
     const Column* column;
@@ -139,7 +131,7 @@ double Label_Number(std::string_view name, double missing)
 bool Add_Label_Column(Transposition& work)
 {
     const Sheet& from = *work.from;
-    const bool texts = from.type != matrix_sheet || from.label_state == text_labels;
+    const bool texts = from.type != matrix_sheet || from.label_state == labels_by_text;
     Column* const labels =
         New_Data_Column(work.to, texts ? units_text_column : units_variate_column, Label_Column_Name(work),
                         static_cast<std::int32_t>(work.data.size()));
@@ -168,8 +160,8 @@ std::int32_t New_Level_Count(const Transposition& work)
 bool Label_Levels(const Transposition& work, Column& factor)
 {
     const std::int32_t state = work.from->label_state;
-    const bool valued = state == value_labels || state == value_and_text_labels;
-    const bool labelled = state == text_labels || state == value_and_text_labels;
+    const bool valued = state == labels_by_level || state == labels_by_text_and_level;
+    const bool labelled = state == labels_by_text || state == labels_by_text_and_level;
     if ((valued && !Make_Level_Values(factor, factor.nlevels))
         || (labelled && !Make_Labels(factor, factor.nlevels)))
         return false;
@@ -224,8 +216,8 @@ void Describe_Column_Factor(Transposition& work)
         return;
     to.row_label_name = factor->name.view();
     to.column_label_name = factor->extra.view();
-    to.label_state = (factor->level_values != nullptr ? value_labels : no_labels)
-                     + (factor->labels != nullptr ? text_labels : no_labels);
+    to.label_state = (factor->level_values != nullptr ? labels_by_level : labels_by_position)
+                     + (factor->labels != nullptr ? labels_by_text : labels_by_position);
     to.labelled_columns = factor->factor_kind == factor_with_labels ? 1 : 0;
 }
 
@@ -237,7 +229,7 @@ bool Add_Row_Labels(Transposition& work)
         Describe_Column_Factor(work);
         return true;
     }
-    if (work.to->type == matrix_sheet && work.from->label_state == value_and_text_labels)
+    if (work.to->type == matrix_sheet && work.from->label_state == labels_by_text_and_level)
         return true;
     return Add_Label_Column(work);
 }
@@ -250,7 +242,9 @@ void Describe_Matrix_Columns(const Transposition& work)
     if (work.to->type != matrix_sheet)
         return;
     const std::int32_t type = work.name_column == nullptr ? row_column : work.name_column->type;
-    work.to->label_state = type == row_column ? no_labels : Is_Text_Like(type) ? text_labels : value_labels;
+    work.to->label_state = type == row_column   ? labels_by_position
+                           : Is_Text_Like(type) ? labels_by_text
+                                                : labels_by_level;
 }
 
 /// What the labels of the rows make of themselves as names. Numbers that label a Matrix or a Table stay

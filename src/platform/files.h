@@ -125,6 +125,8 @@ public:
     [[nodiscard]] bool Close();
 
 private:
+    void Need_Buffer();
+    [[nodiscard]] bool Make(std::string_view name, int how, unsigned permissions);
     [[nodiscard]] bool Start(int descriptor);
     void Flush();
     void Settle();
@@ -153,6 +155,8 @@ public:
     Scratch_File& operator=(const Scratch_File&) = delete;
     ~Scratch_File();
     [[nodiscard]] const std::string& Name() const { return name_; }
+    /// It stays after all.
+    void Keep() { name_.clear(); }
 
 private:
     std::string name_;

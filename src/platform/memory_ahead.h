@@ -27,6 +27,7 @@ public:
 
 private:
     struct Work;
+    void Start_On(void* start, std::size_t bytes, std::size_t lists);
     std::shared_ptr<Work> work_;  ///< the thread's as well: it may outlive a reader that a fault ended
     std::size_t limit_ = std::numeric_limits<std::size_t>::max();
 };

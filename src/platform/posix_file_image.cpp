@@ -1,5 +1,6 @@
 #include "platform/file_image.h"
 
+#include "platform/refusals.h"
 #include "support/progress.h"
 
 #include <algorithm>
@@ -101,6 +102,8 @@ bool File_Image::Map(const Input_File& file)
     const auto size = static_cast<std::size_t>(file.Size());
     const std::size_t page = Page_Size();
     const std::size_t length = (size + slack + page - 1) / page * page;
+    if (!Allowed(Asked::memory))
+        return false;
     void* const whole =
         ::mmap(nullptr, length, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
     if (whole == MAP_FAILED)
@@ -126,7 +129,7 @@ bool File_Image::Read_All(Input_File& file)
     for (;;) {
         if (bytes_ == nullptr || size_ == room) {
             room = bytes_ == nullptr ? room : room * 2;
-            void* const larger = std::realloc(bytes_, room + slack);
+            void* const larger = Take_Memory(bytes_, room + slack);
             if (larger == nullptr)
                 return false;
             bytes_ = static_cast<char*>(larger);

@@ -1,7 +1,7 @@
 #include "platform/files.h"
 
-#include "platform/file_changes.h"
 #include "platform/folders.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -14,7 +14,7 @@
 
 namespace ingester {
 
-bool (*file_change_hook)() = nullptr;
+bool (*refusal_hook)(Asked what) = nullptr;
 
 namespace {
 
@@ -37,7 +37,8 @@ bool Input_File::Open(std::string_view name)
     position_ = read_so_far_ = 0;
     buffer_next_ = buffer_end_ = 0;
     failed_ = false;
-    descriptor_ = ::open(Native_Path(name).c_str(), O_RDONLY | O_CLOEXEC);
+    if (Allowed(Asked::open))
+        descriptor_ = ::open(Native_Path(name).c_str(), O_RDONLY | O_CLOEXEC);
     struct stat facts;
     if (descriptor_ >= 0 && (::fstat(descriptor_, &facts) != 0 || S_ISDIR(facts.st_mode)))
         Close();
@@ -74,7 +75,7 @@ bool Input_File::Seek(std::int64_t position)
     if (position < 0)
         return false;
     if (descriptor_ >= 0) {
-        if (::lseek(descriptor_, position, SEEK_SET) != position)
+        if (!Allowed(Asked::seek) || ::lseek(descriptor_, position, SEEK_SET) != position)
             return false;
         read_so_far_ = position;
         buffer_next_ = buffer_end_ = 0;
@@ -90,12 +91,14 @@ std::size_t Input_File::Read_Directly(void* target, std::size_t count)
     auto* at = static_cast<char*>(target);
     std::size_t done = 0;
     while (done < count) {
-        const ::ssize_t got = ::read(descriptor_, at + done, std::min(count - done, Greatest_Request));
+        const bool allowed = Allowed(Asked::read);
+        const std::size_t part = std::min(count - done, Greatest_Request);
+        const ::ssize_t got = allowed ? ::read(descriptor_, at + done, part) : -1;
         if (got > 0)
             done += static_cast<std::size_t>(got);
         else if (got == 0)
             break;
-        else if (errno != EINTR) {
+        else if (!allowed || errno != EINTR) {
             failed_ = true;
             break;
         }
@@ -212,25 +215,37 @@ bool Output_File::Start(int descriptor)
     used_ = 0;
     flushed_ = 0;
     is_large_ = false;
-    if (!failed_ && buffer_ == nullptr)
-        buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
     return !failed_;
+}
+
+void Output_File::Need_Buffer()
+{
+    if (buffer_ == nullptr)
+        buffer_ = std::make_unique_for_overwrite<char[]>(buffer_size_);
+}
+
+bool Output_File::Make(std::string_view name, int how, unsigned permissions)
+{
+    Need_Buffer();  // before there is a file
+    const std::string path = Native_Path(name);
+    return Start(
+        Allowed(Asked::open) ? ::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC | how, permissions) : -1);
 }
 
 bool Output_File::Open(std::string_view name)
 {
-    return Start(::open(Native_Path(name).c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
+    return Make(name, O_TRUNC, 0666);
 }
 
 bool Output_File::Open_Scratch(std::string_view name)
 {
-    const std::string path = Native_Path(name);
-    ::unlink(path.c_str());
-    return Start(::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600));
+    Delete_File(name);
+    return Make(name, O_EXCL | O_NOFOLLOW, 0600);
 }
 
 void Output_File::Open_Standard_Output()
 {
+    Need_Buffer();
     static_cast<void>(Start(STDOUT_FILENO));
     owned_ = false;
 }
@@ -238,7 +253,7 @@ void Output_File::Open_Standard_Output()
 void Output_File::Write_Directly(const char* bytes, std::size_t count)
 {
     Settle();
-    failed_ = failed_ || (count > 0 && !File_Change_Allowed());
+    failed_ = failed_ || (count > 0 && !Allowed(Asked::write));
     flushed_ += static_cast<std::int64_t>(count);
     failed_ = failed_ || !Write_To_System(descriptor_, bytes, count);
 }
@@ -260,7 +275,7 @@ void Output_File::Flush()
     if (behind_ == nullptr) {
         Write_Directly(buffer_.get(), used_);
     } else {
-        failed_ = failed_ || !File_Change_Allowed() || !behind_->Take(buffer_, used_);
+        failed_ = failed_ || !Allowed(Asked::write) || !behind_->Take(buffer_, used_);
         flushed_ += static_cast<std::int64_t>(used_);
     }
     used_ = 0;
@@ -293,7 +308,7 @@ void Output_File::Write_At(std::int64_t position, const void* bytes, std::size_t
     const auto* at = static_cast<const char*>(bytes);
     Settle();
     if (position < flushed_ && count > 0)
-        failed_ = failed_ || !File_Change_Allowed();
+        failed_ = failed_ || !Allowed(Asked::write);
     while (position < flushed_ && count > 0 && !failed_) {
         const auto part = std::min(count, static_cast<std::size_t>(flushed_ - position));
         const ::ssize_t put = ::pwrite(descriptor_, at, part, position);
@@ -316,10 +331,12 @@ std::int64_t Output_File::Copy_In_System(const Input_File& source, std::int64_t 
     std::int64_t done = 0;
     ::off_t from = source.Position();
     while (done < count && !failed_) {
-        if (!File_Change_Allowed()) {
+        if (!Allowed(Asked::write)) {
             failed_ = true;
             break;
         }
+        if (!Allowed(Asked::read))
+            break;
         const auto part = static_cast<std::size_t>(std::min(count - done, at_once));
         const ::ssize_t copied = ::copy_file_range(source.Descriptor(), &from, descriptor_, nullptr, part, 0);
         if (copied <= 0)
@@ -361,7 +378,7 @@ bool Output_File::Close()
     Flush();
     Settle();
     behind_.reset();
-    if (owned_ && ::close(descriptor_) != 0)
+    if (owned_ && (::close(descriptor_) != 0 || !Allowed(Asked::close)))
         failed_ = true;
     descriptor_ = -1;
     return !failed_;
@@ -372,9 +389,9 @@ bool Copy_File(std::string_view from, std::string_view to)
     constexpr std::size_t block_size = std::size_t{1} << 20;
     Input_File source;
     Output_File target;
+    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
     if (!source.Open(from) || !target.Open_Scratch(to))
         return false;
-    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
     while (const std::size_t got = source.Read(block.get(), block_size))
         target.Write(block.get(), got);
     const bool good = target.Close() && source.Close();
@@ -385,7 +402,8 @@ bool Copy_File(std::string_view from, std::string_view to)
 
 Scratch_File::~Scratch_File()
 {
-    Delete_File(name_);
+    if (!name_.empty())
+        Delete_File(name_);
 }
 
 }  // namespace ingester

@@ -1,6 +1,6 @@
 #include "platform/folders.h"
 
-#include "platform/file_changes.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
 #include <array>
@@ -119,7 +119,7 @@ bool Same_File(std::string_view a, std::string_view b)
 
 bool Delete_File(std::string_view name) noexcept
 {
-    return ::unlink(Stack_Path(name).c_str()) == 0 || !File_Exists(name);
+    return (Allowed(Asked::remove) && ::unlink(Stack_Path(name).c_str()) == 0) || !File_Exists(name);
 }
 
 bool Replace_File(std::string_view from, std::string_view to)
@@ -128,23 +128,21 @@ bool Replace_File(std::string_view from, std::string_view to)
     struct stat facts;
     if (Look_At(to, facts))
         static_cast<void>(::chmod(from_path.c_str(), facts.st_mode & 07777));  // where that is ours to do
-    return File_Change_Allowed() && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
+    return Allowed(Asked::rename) && ::rename(from_path.c_str(), Native_Path(to).c_str()) == 0;
 }
 
 std::string Resolved_Name(std::string_view name)
 {
-    char* const whole = ::realpath(Native_Path(name).c_str(), nullptr);
-    std::string resolved = whole == nullptr ? std::string(name) : Request_Path(whole);
-    std::free(whole);
-    return resolved;
+    std::array<char, PATH_MAX> whole;
+    const bool there = ::realpath(Native_Path(name).c_str(), whole.data()) != nullptr;
+    return there ? Request_Path(whole.data()) : std::string(name);
 }
 
 bool Make_Link(std::string_view name, std::string_view file)
 {
-    char* const whole = ::realpath(Native_Path(file).c_str(), nullptr);
-    const bool made = whole != nullptr && ::symlink(whole, Native_Path(name).c_str()) == 0;
-    std::free(whole);
-    return made;
+    std::array<char, PATH_MAX> whole;
+    return ::realpath(Native_Path(file).c_str(), whole.data()) != nullptr
+           && ::symlink(whole.data(), Native_Path(name).c_str()) == 0;
 }
 
 std::string_view Folder_Of(std::string_view name)

@@ -1,9 +1,11 @@
-#include "platform/file_changes.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/gzip_file.h"
+#include "platform/refusals.h"
 
 #include <algorithm>
+#include <span>
+#include <vector>
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -23,7 +25,8 @@ bool Gzip_File::Open(std::string_view name)
     if (stream_ != nullptr)
         gzclose_r(stream_);
     failed_ = false;
-    const int descriptor = ::open(Native_Path(name).c_str(), O_RDONLY | O_CLOEXEC);
+    const std::string path = Native_Path(name);
+    const int descriptor = Allowed(Asked::open) ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC) : -1;
     stream_ = descriptor < 0 ? nullptr : gzdopen(descriptor, "rb");
     if (stream_ == nullptr && descriptor >= 0)
         ::close(descriptor);
@@ -37,7 +40,7 @@ std::size_t Gzip_File::Read(void* target, std::size_t count)
     std::size_t done = 0;
     while (stream_ != nullptr && done < count) {
         const auto part = static_cast<unsigned>(std::min(count - done, greatest_request));
-        const int got = gzread(stream_, at + done, part);
+        const int got = Allowed(Asked::read) ? gzread(stream_, at + done, part) : -1;
         failed_ = failed_ || got < 0;
         if (got <= 0)
             break;
@@ -55,12 +58,10 @@ bool Gzip_File::Close()
 
 namespace {
 
-bool Compress(Input_File& source, gzFile target)
+bool Compress(Input_File& source, gzFile target, std::span<char> block)
 {
-    constexpr std::size_t block_size = std::size_t{1} << 20;
-    const auto block = std::make_unique_for_overwrite<char[]>(block_size);
-    while (const std::size_t got = source.Read(block.get(), block_size))
-        if (!File_Change_Allowed() || gzwrite(target, block.get(), static_cast<unsigned>(got)) <= 0)
+    while (const std::size_t got = source.Read(block.data(), block.size()))
+        if (!Allowed(Asked::write) || gzwrite(target, block.data(), static_cast<unsigned>(got)) <= 0)
             return false;
     return !source.Failed();
 }
@@ -71,15 +72,17 @@ bool Compress_File(std::string_view from, std::string_view to)
 {
     Input_File source;
     const std::string path = Native_Path(to);
+    std::vector<char> block(std::size_t{1} << 20);  // before there is anything to be cleared away
     if (!source.Open(from))
         return false;
-    ::unlink(path.c_str());
-    const int descriptor = ::open(path.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC, 0600);
+    Delete_File(to);
+    const int flags = O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC;
+    const int descriptor = Allowed(Asked::open) ? ::open(path.c_str(), flags, 0600) : -1;
     gzFile target = descriptor < 0 ? nullptr : gzdopen(descriptor, "wb9");
     if (target == nullptr && descriptor >= 0)
         ::close(descriptor);
-    const bool packed = target != nullptr && Compress(source, target);
-    const bool closed = target != nullptr && gzclose_w(target) == Z_OK;
+    const bool packed = target != nullptr && Compress(source, target, block);
+    const bool closed = target != nullptr && gzclose_w(target) == Z_OK && Allowed(Asked::close);
     if (!packed || !closed)
         Delete_File(to);
     return packed && closed;

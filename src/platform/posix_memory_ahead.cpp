@@ -5,6 +5,7 @@
 #include <condition_variable>
 #include <cstdint>
 #include <mutex>
+#include <new>
 #include <thread>
 #include <vector>
 
@@ -77,11 +78,18 @@ void Memory_Ahead::Work::Run()
 
 void Memory_Ahead::Expect(void* start, std::size_t bytes, std::size_t lists)
 {
-    if (bytes < Least_Region)
+    if (bytes < Least_Region || !Has_Second_Processor())
         return;
+    try {
+        Start_On(start, bytes, lists);
+    } catch (const std::bad_alloc&) {
+        // Pages come as they are touched.
+    }
+}
+
+void Memory_Ahead::Start_On(void* start, std::size_t bytes, std::size_t lists)
+{
     if (work_ == nullptr) {
-        if (!Has_Second_Processor())
-            return;
         work_ = std::make_shared<Work>();
         work_->limit = limit_;
         work_->thread = Start_Quiet_Thread([work = work_] { work->Run(); });

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <new>
 #include <utility>
 
 #include <unistd.h>
@@ -31,9 +32,13 @@ std::unique_ptr<Write_Behind> Write_Behind::Start(int descriptor, std::size_t bu
 {
     if (!Has_Second_Processor())
         return nullptr;
-    std::unique_ptr<Write_Behind> behind(new Write_Behind(descriptor, buffer_size));
-    behind->thread_ = Start_Quiet_Thread([work = behind.get()] { work->Run(); });
-    return behind->thread_.joinable() ? std::move(behind) : nullptr;
+    try {
+        std::unique_ptr<Write_Behind> behind(new Write_Behind(descriptor, buffer_size));
+        behind->thread_ = Start_Quiet_Thread([work = behind.get()] { work->Run(); });
+        return behind->thread_.joinable() ? std::move(behind) : nullptr;
+    } catch (const std::bad_alloc&) {
+        return nullptr;  // one buffer has to do
+    }
 }
 
 void Write_Behind::Run()

@@ -2,7 +2,7 @@
 #pragma once
 
 #include <csignal>
-#include <system_error>
+#include <exception>
 #include <thread>
 
 namespace ingester {
@@ -23,7 +23,7 @@ template <class Function> [[nodiscard]] std::thread Start_Quiet_Thread(Function 
     std::thread thread;
     try {
         thread = std::thread(function);
-    } catch (const std::system_error&) {
+    } catch (const std::exception&) {
         // Whoever asked goes on alone.
     }
     pthread_sigmask(SIG_SETMASK, &before, nullptr);

@@ -38,6 +38,15 @@ inline std::string Pass_Bytes(double count, const Texts& records)
     return bytes;
 }
 
+/// Files that this process has open.
+inline int Descriptors()
+{
+    int count = 0;
+    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd"))
+        count += entry.exists() ? 1 : 0;
+    return count;
+}
+
 /// What came back: the status, -1 for no result file, and the messages, empty for no message file.
 using Host_Answer = std::pair<int, std::string>;
 

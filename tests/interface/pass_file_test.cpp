@@ -188,6 +188,8 @@ TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
         EXPECT_TRUE(Read_Row_Subset(Request_Name("list")) && Files().empty());
         EXPECT_EQ(request.Subset_Row_Flags, flags) << text;
         EXPECT_FALSE(Read_Column_Subset(Request_Name("list")) || Read_Row_Subset(""));
+        EXPECT_TRUE(Messages().starts_with("Error: Could not read all of file "));
+        std::filesystem::remove(Path("t.ERR"));
     }
 }
 

@@ -25,14 +25,6 @@ std::string Repeated(std::string_view part, std::size_t count)
     return text;
 }
 
-int Descriptors()
-{
-    int count = 0;
-    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd"))
-        count += entry.exists() ? 1 : 0;
-    return count;
-}
-
 class Pipeline_Test : public Host_Test {
 protected:
     /// The status of a request in a process of its own that has no more than `most` of a resource; 100 when

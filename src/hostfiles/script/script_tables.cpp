@@ -12,14 +12,6 @@ namespace ingester {
 
 namespace {
 
-/// How the columns of a Table of two or more ways are labelled.
-enum Table_Label_State : std::int32_t {
-    labels_by_position = 0,
-    labels_by_level = 1,
-    labels_by_text = 2,
-    labels_by_level_and_text = 3,
-};
-
 /// In a Table each Column is a structure or, with more than one way, a level of the last factor.
 constexpr Attribute_Words Table_Words = {" ; decimals=", "; extra=", "; drep="};
 

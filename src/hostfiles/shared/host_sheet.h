@@ -37,14 +37,6 @@ constexpr double Least_Sure_Number = -1e36;
 /// The marker that a file gives must lie below the numbers and the levels that it is told from.
 [[nodiscard]] double Missing_Marker(double value);
 
-/// How a Table's columns are labelled, and what their names in the file are.
-enum Table_Labels : std::int32_t {
-    labels_by_position = 0,
-    labels_by_level = 1,
-    labels_by_text = 2,
-    labels_by_text_and_level = 3,
-};
-
 /// The state of a Sheet's labels as files hold it: one without a code of its own is that of columns named
 /// by their place.
 [[nodiscard]] std::int32_t Label_State_In_File(const Sheet& sheet);

@@ -309,22 +309,21 @@ bool Write_Copy(Input_File& book, const std::string& shown, const std::string& s
     const std::endian order = source.Order();
     Book_Copy copy{std::move(source), Book_Sink(file, order), change};
     const bool copied = good && Copy_Book(copy);
-    if (file.Close() && copied)
-        return true;
-    Delete_File(scratch);
-    return Fail("Document not saved.\n");
+    return (file.Close() && copied) || Fail("Document not saved.\n");
 }
 
 bool Update_Book(Input_File& book, const char* file_name, const std::string& shown, const Book_Change& change)
 {
-    const std::string scratch = Scratch_Name(file_name);
-    if (!Write_Copy(book, shown, scratch, change))
+    Scratch_File scratch(Scratch_Name(file_name));
+    if (!Write_Copy(book, shown, scratch.Name(), change))
         return false;
-    if (!Replace_File(scratch, file_name))
-        return Fail("Error: Temporary file %.100s could not be renamed to %.100s\nDocument is saved in "
-                    "Temporary file only.\n",
-                    scratch.c_str(), shown.c_str());
-    return true;
+    if (Replace_File(scratch.Name(), file_name))
+        return true;
+    Fail("Error: Temporary file %.100s could not be renamed to %.100s\nDocument is saved in "
+         "Temporary file only.\n",
+         scratch.Name().c_str(), shown.c_str());
+    scratch.Keep();
+    return false;
 }
 
 /// The names of the sheets that there are.

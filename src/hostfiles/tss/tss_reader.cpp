@@ -296,7 +296,10 @@ bool Read_Sheet(TSS_Reading& reading)
 bool Read_TSS(Input_File& file)
 {
     TSS_Reading reading{.source = TSS_Source(file)};
-    if (!Read_Sheet(reading))
+    const bool read = Read_Sheet(reading);
+    if (file.Failed())  // which is no short file
+        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+    if (!read)
         return false;
     Current_Sheet = reading.sheet;
     return true;

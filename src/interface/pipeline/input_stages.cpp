@@ -14,6 +14,7 @@
 #include <algorithm>
 #include <iterator>
 #include <limits>
+#include <utility>
 
 namespace ingester {
 
@@ -113,15 +114,14 @@ Request_Status Keep_Stream(Request_Run& run)
 {
     if (!Is_Special_File(run.infile))
         return Done;
-    const std::string copy = Get_Temp_Folder()
-                                 .append("IN")
-                                 .append(request.Scratch_Stem)
-                                 .append(run.infile.substr(Extension_Start(run.infile)));
-    if (!Copy_File(run.infile, copy))
-        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
-    run.source_name = run.infile;
-    run.infile = copy;
+    std::string copy = Get_Temp_Folder()
+                           .append("IN")
+                           .append(request.Scratch_Stem)
+                           .append(run.infile.substr(Extension_Start(run.infile)));
+    run.source_name = std::exchange(run.infile, std::move(copy));
     run.kept_stream = true;
+    if (!Copy_File(run.source_name, run.infile))
+        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
     return Done;
 }
 
@@ -201,10 +201,10 @@ Request_Status Read_Merge_Keys(Request_Run& run)
             request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
     while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
         Take_Merge_Keys(line);
-    file.Close();
+    const bool whole = file.Close();
     if (downloaded)
         Delete_File(name);
-    if (request.Merge_Keys.empty())
+    if (request.Merge_Keys.empty() || !whole)
         return Stop(Request_Status::merge_failed, "Merge columns not found in files.\n");
     return Done;
 }
@@ -293,8 +293,8 @@ Request_Status Know_Host_Scratch_File(Request_Run& run)
 
 Request_Status Take_Wanted_Types(Request_Run&)
 {
-    if (request.Use_Var_File)
-        Read_Var_File(request.Var_File_Name);
+    if (request.Use_Var_File && !Read_Var_File(request.Var_File_Name))
+        return Request_Status::input_unreadable;
     return Done;
 }
 

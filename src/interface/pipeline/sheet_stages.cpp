@@ -96,7 +96,9 @@ Request_Status Find_Sheet_Of_Output(Request_Run& run)
 {
     if (request.Add_Mode == Add_Modes::none && !request.Source_Key_Given)
         return Done;
-    Find_Output_Sheet(run.outfile);
+    if (!Find_Output_Sheet(run.outfile))
+        return Stop(Request_Status::input_unreadable, "Sheets of %.500s could not be listed.\n",
+                    run.outfile.c_str());
     if (run.output_code == book_file || run.output_code == xml_workbook_file)
         request.Add_To_Output = File_Exists(run.outfile);
     if (!request.Merge_Sheet_Name.empty())
@@ -148,11 +150,12 @@ Request_Status Change_By_List(Request_Run& run)
 {
     if (!request.Use_Var_File)
         return Done;
-    const bool changed = Apply_Var_File(Current_Sheet, request.Var_File_Name);
-    if (changed && run.host_scratch)
-        Delete_File(request.Var_File_Name);
-    else if (!changed)
+    if (!File_Exists(request.Var_File_Name))
         Write_Var_File(*Current_Sheet, request.Var_File_Name);
+    else if (!Apply_Var_File(Current_Sheet, request.Var_File_Name))
+        return Request_Status::input_unreadable;
+    else if (run.host_scratch)
+        Delete_File(request.Var_File_Name);
     if (Current_Sheet->column_count < 1)
         return Stop(Request_Status::no_data, "All columns in the input file are empty.\n");
     return Done;
@@ -220,6 +223,12 @@ Request_Status Drop_Empty_Rows(Request_Run&)
         return Stop(Request_Status::no_data,
                     "All rows in the input file are empty.\nUse KEEPEMTPY=rows to return the empty rows.\n");
     return Done;
+}
+
+/// What could not be kept for want of memory must not be missing in the output.
+Request_Status Refuse_Losses(Request_Run&)
+{
+    return request.Out_Of_Memory ? Request_Status::no_data : Done;
 }
 
 Request_Status Find_Fixed_Decimals(Request_Run&)

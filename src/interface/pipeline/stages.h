@@ -106,6 +106,7 @@ Request_Status Keep_Range_Of_Columns(Request_Run& run);
 Request_Status Make_Names_Unique(Request_Run& run);
 Request_Status Drop_Empty_Rows(Request_Run& run);
 Request_Status Find_Fixed_Decimals(Request_Run& run);
+Request_Status Refuse_Losses(Request_Run& run);
 Request_Status Tell_Summary(Request_Run& run);
 
 // --- The output ----------------------------------------------------------------------------------

@@ -35,6 +35,8 @@ struct Lasting_Globals {
 
 /// Everything else a request sets. A fresh value is assigned at the start of each, so nothing lingers.
 struct Request_Globals : Lasting_Globals {
+    bool Out_Of_Memory = false;  ///< some cells were not made, which has been told
+
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
     Fixed_Text<Short_Name_Width> Cell_Range;

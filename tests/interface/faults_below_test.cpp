@@ -1,0 +1,320 @@
+// Whole requests on a system that refuses: whatever they ask of it, one thing after the other.
+#include "host_fixture.h"
+#include "platform/gzip_file.h"
+#include "support/refusing.h"
+
+#include <map>
+
+#include <fcntl.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace ingester {
+namespace {
+
+const std::string Table = "plot,kind!,name,day,yield\n1,oats,ann,3/2/2001,2.5\n2,rye,bob,4/2/2001,*\n"
+                          "3,oats,cy,5/2/2001,4\n4,bean,,6/2/2001,5\n5,rye,\"d, e\",*,6.25\n";
+
+using Files_And_Bytes = std::map<std::string, std::string>;
+
+/// One kind of request: its records, and the files that are there before. "pipe" and "url" bring
+/// what is in "in.csv".
+struct Request_Kind {
+    Texts records;
+    Texts before;
+};
+
+const Request_Kind Kinds[] = {
+    {{"in.csv", "new.tab"}, {"in.csv"}},
+    {{"pipe", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"url", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv/tr", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv/lt=1/z=;", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv/c=2:3/s=3/e=5", "o.txt"}, {"in.csv", "o.txt"}},
+    {{"in.csv", "o.csv/rewrite=7"}, {"in.csv", "o.csv"}},
+    {{"in.csv/v", "o.csv"}, {"in.csv", "in.VAR", "o.csv"}},
+    {{"in.csv/v", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv", "o.csv", "", "", "columns/s"}, {"in.csv", "columns", "o.csv"}},
+    {{"in.csv", "o.csv", "", "", "rows/r"}, {"in.csv", "rows", "o.csv"}},
+    {{"in.csv.gz", "o.csv"}, {"in.csv.gz", "o.csv"}},
+    {{"in.csv", "new.tss"}, {"in.csv"}},
+    {{"in.csv", "o.tss"}, {"in.csv", "o.tss"}},
+    {{"in.tss/db", "o.csv"}, {"in.tss", "o.csv"}},
+    {{"long.tss", "o.csv"}, {"long.tss", "o.csv"}},
+    {{"in.csv", "new.tbk"}, {"in.csv"}},
+    {{"in.tbk", "o.csv"}, {"in.tbk", "o.csv"}},
+    {{"in.tbk/w", "o.csv"}, {"in.tbk", "o.csv"}},
+    {{"in.tbk.gz", "o.csv"}, {"in.tbk.gz", "o.csv"}},
+    {{"long.tbk", "o.csv"}, {"long.tbk", "o.csv"}},
+    {{"in.csv", "o.tbk/a=Added"}, {"in.csv", "o.tbk"}},
+    {{"in.csv", "long.tbk/a=Added"}, {"in.csv", "long.tbk"}},
+    {{"in.csv", "o.tbk/r=Second"}, {"in.csv", "o.tbk"}},
+    {{"in.csv", "o.tbk.gz/a=Added"}, {"in.csv", "o.tbk.gz"}},
+    {{"in.csv", "o.gen/p"}, {"in.csv", "o.gen", "o.$V$"}},
+    {{"in.csv", "o.csv/@"}, {"in.csv", "o.csv"}},
+    {{"in.csv", "o.tss/@,from"}, {"in.csv", "o.tss"}},
+    {{"in.csv", "o.tbk/@/!=Second"}, {"in.csv", "o.tbk"}},
+    {{"in.csv", "o.csv/&"}, {"in.csv", "o.csv"}},
+    {{"in.csv", "o.csv/%=1"}, {"in.csv", "in.mrg", "o.csv"}},
+    {{"in.csv", "o.tss/%=1"}, {"in.csv", "in.mrg", "o.tss"}},
+    {{"in.csv", "o.tbk/%=1U/!=Second"}, {"in.csv", "in.mrg", "o.tbk"}},
+};
+
+/// What goes wrong. Where others follow the first, nobody asks for words: they may be refused as well.
+const Refusal Ways[] = {
+    {},
+    {.kinds = {Asked::memory}, .onwards = true},
+    {.kinds = {Asked::write, Asked::close}, .onwards = true},
+    {.kinds = {Asked::open, Asked::read, Asked::seek}, .onwards = true},
+};
+
+constexpr int no_rows = 7;  ///< the status of requests that join lines
+
+/// Where a list of columns goes that can't be beside the output.
+constexpr const char* other_list = "o.VAR";
+
+/// What a request left.
+struct Outcome {
+    Host_Answer answer;
+    Files_And_Bytes files;
+    int asked = 0;
+    std::optional<Asked> refused;
+    bool not_begun = false;  ///< the pass file lies there as it was
+    std::string faults;      ///< of the process
+};
+
+/// Summaries of columns go to standard output, which is nowhere for the time.
+class Silence {
+public:
+    Silence()
+    {
+        std::fflush(stdout);
+        const int nowhere = ::open("/dev/null", O_WRONLY | O_CLOEXEC);
+        ::dup2(nowhere, STDOUT_FILENO);
+        ::close(nowhere);
+    }
+    Silence(const Silence&) = delete;
+    Silence& operator=(const Silence&) = delete;
+    ~Silence()
+    {
+        ::dup2(kept_, STDOUT_FILENO);
+        ::close(kept_);
+    }
+
+private:
+    int kept_ = ::dup(STDOUT_FILENO);
+};
+
+class Faults_Below : public Host_Test {
+protected:
+    void SetUp() override
+    {
+        Host_Test::SetUp();
+        std::string rows = "plot,yield\n";
+        for (int row = 0; row < 5000; ++row)
+            rows += std::to_string(row) + "," + std::to_string(row % 7) + ".5\n";
+        Put("long.csv", rows);
+        Put("in.csv", Table);
+        Put("o.csv", "plot,kind!,wet\n3,rye,0\n4,oats,1\n9,rice,2\n10,rice,2\n11,rye,4\n");
+        for (const char* const name : {"o.txt", "o.gen", "o.$V$"})
+            Put(name, "old\n");
+        Put("in.VAR", "5\nplot\nsort!\nname\nday\nweight\n");
+        Put("in.mrg", "1\nplot\n");
+        Put("columns", "2\nV\nplot\nyield\n");
+        Put("rows", "5\n1\n0\n1\n1\n0\n");
+        const std::pair<const char*, const char*> made[] = {
+            {"in.csv", "in.tss"},         {"in.csv", "in.tbk/a=First"}, {"in.csv", "in.tbk/a=Second"},
+            {"o.csv", "o.tss"},           {"o.csv", "o.tbk/a=First"},   {"o.csv", "o.tbk/a=Second"},
+            {"o.csv", "o.tbk/a=Third"},   {"long.csv", "long.tss"},     {"long.csv", "long.tbk/a=First"},
+            {"in.csv", "long.tbk/a=Last"}};
+        for (const auto& [input, output] : made)
+            ASSERT_EQ(Convert(input, output).first, 0) << output;
+        for (const char* const name : {"in.csv", "in.tbk", "o.tbk"})
+            ASSERT_TRUE(Compress_File(Request_Name(name), Request_Name(name) + ".gz"));
+        stock_ = All_Files();
+    }
+
+    [[nodiscard]] Files_And_Bytes All_Files() const
+    {
+        Files_And_Bytes files;
+        for (const auto& entry : std::filesystem::directory_iterator(Path("")))
+            files[entry.path().filename()] = Get(entry.path().filename());
+        return files;
+    }
+
+    /// The folder as it is before a request of that kind.
+    void Prepare(const Request_Kind& kind) const
+    {
+        for (const auto& entry : std::filesystem::directory_iterator(Path("")))
+            std::filesystem::remove(entry.path());
+        for (const std::string& name : kind.before)
+            Put(name, stock_.at(name));
+        Put_Pass_File(kind);
+    }
+
+    /// The end to read of a pipe that holds a table; there is one at a time.
+    [[nodiscard]] static int Filled_Pipe()
+    {
+        static int ends[2] = {-1, -1};
+        ::close(ends[0]);
+        EXPECT_EQ(::pipe(ends), 0);
+        EXPECT_GT(::write(ends[1], Table.data(), Table.size()), 0);
+        ::close(ends[1]);
+        return ends[0];
+    }
+
+    void Put_Pass_File(const Request_Kind& kind) const
+    {
+        Texts records = kind.records;
+        for (const std::size_t name : {0, 1, 4})
+            if (name < records.size())
+                records[name] = Request_Name(records[name]);
+        if (kind.records[0] == "url")
+            records[0] = "file:\\\\" + Request_Name("in.csv");
+        if (kind.records[0] == "pipe")
+            records[0] = Request_Path("/dev/fd/" + std::to_string(Filled_Pipe()));
+        Put(Stem() + ".inp", Pass_Bytes(static_cast<double>(records.size()), records));
+    }
+
+    /// Carries out the request whose pass file is there.
+    [[nodiscard]] Outcome Run(const Refusal& refusal) const
+    {
+        Outcome outcome;
+        request = Request_Globals{};
+        Start_Request("t");
+        const std::string pass = Get(Stem() + ".inp");
+        const int descriptors = Descriptors();
+        const long blocks = Living_Blocks();
+        {
+            const Silence silence;
+            const Refusing refusing(refusal);
+            INGESTER("", "", 0, 0);
+            outcome.asked = refusing.Count();
+            outcome.refused = refusing.Refused();
+        }
+        request = Request_Globals{};
+        Start_Request("t");
+        if (Living_Blocks() != blocks)
+            outcome.faults += " memory is lost,";
+        if (Descriptors() != descriptors)
+            outcome.faults += " a file stays open,";
+        outcome.not_begun = Get(Stem() + ".inp") == pass;
+        std::filesystem::remove(Path(Stem() + ".inp"));
+        outcome.answer = Take_Answer(Stem(), Stem() + ".out");
+        outcome.files = All_Files();
+        return outcome;
+    }
+
+    /// What a request that was refused something did wrong; empty for nothing.
+    [[nodiscard]] std::string Faults_Of(const Request_Kind& kind, const Outcome& plain,
+                                        const Outcome& disturbed, bool onwards) const
+    {
+        std::string faults = disturbed.faults;
+        Files_And_Bytes before;
+        for (const std::string& name : kind.before)
+            before[name] = stock_.at(name);
+        const auto is = [](const Files_And_Bytes& files, const auto& one) {
+            const auto found = files.find(one.first);
+            return found != files.end() && found->second == one.second;
+        };
+        const auto& [status, said] = disturbed.answer;
+        const auto says = [&said = said](const char* words) { return said.find(words) != std::string::npos; };
+        const bool may_stay =
+            disturbed.refused == Asked::remove || says("Document is saved in Temporary file only.\n");
+        for (const auto& one : disturbed.files)
+            if (!is(before, one) && !is(plain.files, one)
+                && (one.first != other_list || one.second != plain.files.at("o.$V$"))
+                && (before.contains(one.first) || plain.files.contains(one.first) || !may_stay))
+                faults += " " + one.first + " is neither old nor new,";
+        bool whole = true;
+        for (const auto& one : plain.files) {
+            whole = whole && is(disturbed.files, one);
+            if (before.contains(one.first) && !disturbed.files.contains(one.first))
+                faults += " " + one.first + " is lost,";
+        }
+        const bool good = status == plain.answer.first;
+        // Of lines joined and of a list beside the output the words tell alone.
+        const bool told = says("Warning: The list of columns") || disturbed.files.contains(other_list)
+                          || (says("\n") && status == no_rows);
+        if (good && !whole && !told)
+            faults += " good status without the output,";
+        if (!good && status >= 0 && whole)
+            faults += " bad status " + std::to_string(status) + " with the output,";
+        if (!whole && !told && said.empty() && !onwards && !disturbed.not_begun)
+            faults += " nothing is said,";
+        if (good && whole && said != plain.answer.second && !said.empty())
+            faults += " other words: " + said;
+        return faults;
+    }
+
+    Files_And_Bytes stock_;
+};
+
+TEST_F(Faults_Below, Leave_The_Old_Output_Or_The_New_One)
+{
+    for (const Request_Kind& kind : Kinds) {
+        const std::string name = kind.records[0] + " to " + kind.records[1];
+        Prepare(kind);
+        static_cast<void>(Run({}));  // what is made once is made now
+        Prepare(kind);
+        const Outcome plain = Run({});
+        EXPECT_TRUE(plain.answer.first == 0 || plain.answer.first == no_rows) << name << "\n"
+                                                                              << plain.answer.second;
+        EXPECT_EQ(plain.faults, "") << name;
+        std::map<std::string, std::string> found;
+        for (Refusal refusal : Ways)
+            for (std::optional<Asked> refused = Asked::memory; refused;) {
+                ++refusal.number;
+                Prepare(kind);
+                const Outcome disturbed = Run(refusal);
+                refused = disturbed.refused;
+                const std::string faults = Faults_Of(kind, plain, disturbed, refusal.onwards);
+                if (refused && !faults.empty())
+                    found[faults] += Format_Text(" %li/%li", static_cast<long>(refusal.number),
+                                                 static_cast<long>(*refused));
+            }
+        for (const auto& [faults, numbers] : found)
+            ADD_FAILURE() << name << ":" << faults << " when refused" << numbers;
+        EXPECT_GT(plain.asked, 60) << name;  // else nothing was tried
+    }
+}
+
+TEST_F(Faults_Below, Leave_The_Old_Output_Or_The_New_One_When_The_Process_Ends)
+{
+    for (const Request_Kind& kind : Kinds) {
+        Prepare(kind);
+        const Outcome plain = Run({});
+        int how = SIGKILL;
+        for (int number = 1; WIFSIGNALED(how); ++number) {
+            Prepare(kind);
+            const ::pid_t child = ::fork();
+            if (child == 0) {
+                Put_Pass_File(kind);  // named by the process
+                const Silence silence;
+                const Refusing refusing(
+                    {.number = number, .kinds = {Asked::write, Asked::rename}, .kills = true});
+                ::_exit(INGESTER("", "", 0, 0));
+            }
+            ::waitpid(child, &how, 0);
+            Files_And_Bytes left = All_Files();
+            bool untouched = true;
+            for (const std::string& name : kind.before) {
+                const bool old = left[name] == stock_.at(name);
+                const bool used_up = !plain.files.contains(name) && left[name].empty();
+                EXPECT_TRUE(old || used_up
+                            || (plain.files.contains(name) && left[name] == plain.files.at(name)))
+                    << kind.records[0] << " to " << kind.records[1] << " " << number << " " << name;
+                untouched = untouched && old;
+            }
+            // What lies about doesn't keep the next request from its work.
+            Put_Pass_File(kind);
+            const Outcome next = Run({});
+            for (const auto& [name, bytes] : plain.files)
+                EXPECT_TRUE(!untouched || next.files.at(name) == bytes)
+                    << kind.records[0] << " to " << kind.records[1] << " " << number << " " << name;
+        }
+    }
+}
+
+}  // namespace
+}  // namespace ingester
