@@ -76,7 +76,7 @@ Request_Status Write_Output(Request_Run& run)
 
 Request_Status Write_Column_List(Request_Run& run)
 {
-    if (request.Write_Var_List)
+    if (request.Write_Var_List && !run.clipboard_output)  // which has no file to stand beside
         Write_Var_File(*Current_Sheet, With_Extension(run.outfile, ".$V$"));
     return Done;
 }
