@@ -35,7 +35,7 @@ Request_Status Name_Temporary_Output(Request_Run& run)
 /// that is asked for.
 Request_Status Make_Output_Form(Request_Run& run)
 {
-    const bool host_file = run.output_code == spreadsheet_file || run.output_code == book_file;
+    const bool host_file = Is_Host_File(run.output_code);
     if (host_file && !A_Host_File_Was_Read())
         Vector_To_Scalars(Current_Sheet);
     if (request.Output_Matrix && (host_file || run.output_code == script_file))
