@@ -4,7 +4,9 @@
 #include "command/request_text.h"
 #include "command/selection_lists.h"
 #include "ingester/ingester.h"
+#include "interface/clipboard.h"
 #include "interface/paths.h"
+#include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/host_process.h"
@@ -20,12 +22,6 @@
 namespace ingester {
 
 namespace {
-
-/// For what can't be asked of the library: among the codes of wrong command lines.
-constexpr int Unusable_Arguments = 105;
-
-constexpr std::size_t Longest_File_Record = 1120;
-constexpr std::size_t Longest_Sheet_Record = 280;
 
 /// Names in the private folder. The library knows the first one.
 constexpr const char* Standard_Input_Name = "$Std_In$";
@@ -129,12 +125,28 @@ bool Request_Can_Carry(const Conversion& conversion)
     return Name_Is_Carried(options.input) && Name_Is_Carried(options.output)
            && Length_Is_Carried(conversion.input.native,
                                 conversion.input.request.size() + options.input_options.size(),
-                                Longest_File_Record)
+                                Long_Name_Width)
            && Length_Is_Carried(conversion.output.native,
                                 conversion.output.request.size() + options.output_options.size(),
-                                Longest_File_Record)
-           && Length_Is_Carried("--sheet", options.sheet.size(), Longest_Sheet_Record)
-           && Length_Is_Carried("--range", options.range.size(), Longest_Sheet_Record);
+                                Long_Name_Width)
+           && Length_Is_Carried("--sheet", options.sheet.size(), Short_Name_Width)
+           && Length_Is_Carried("--range", options.range.size(), Short_Name_Width);
+}
+
+/// What the library would take in a way that the user can't have meant.
+bool Output_Makes_Sense(const Conversion& conversion)
+{
+    const char* refusal = nullptr;
+    if (Equal_Ignoring_Case(conversion.options.output, "clipboard"))
+        refusal = "as an output the clipboard needs an extension: clipboard.csv, .tab, .txt or .gen; "
+                  "a file of this name is ./clipboard";
+    else if (Options_Name_Joined_Sheet(conversion.options.output_options))
+        refusal =
+            "a table that is joined with a sheet takes the place and the name of that; leave --add-sheet, "
+            "--replace-sheet and --sheet-name out, and choose the sheet by --update-sheet";
+    if (refusal != nullptr)
+        Say(conversion.output.native, refusal);
+    return refusal == nullptr;
 }
 
 bool Output_May_Be_Written(const Conversion& conversion)
@@ -142,7 +154,8 @@ bool Output_May_Be_Written(const Conversion& conversion)
     const Command_Options& options = conversion.options;
     const Sent_Name& output = conversion.output;
     const char* refusal = nullptr;
-    if (options.summary || (conversion.To_Standard_Output() && !conversion.Joins()))
+    if (options.summary || Is_Clipboard_Output(output.request)
+        || (conversion.To_Standard_Output() && !conversion.Joins()))
         return true;
     if (conversion.Joins() && !File_Exists(output.request))
         refusal = "there is no such file that the input could be joined with";
@@ -292,7 +305,7 @@ int Read_Status(const std::string& name)
     Input_File file;
     std::int32_t status = 0;
     const bool read = file.Open(name) && file.Read_Little(status);
-    return read && status >= 0 && status < Unusable_Arguments ? status : INGESTER_NO_REQUEST;
+    return read && status >= 0 && status < Wrong_Values ? status : INGESTER_NO_REQUEST;
 }
 
 std::string Read_Messages(const std::string& name)
@@ -408,8 +421,9 @@ int Run_Command(const Command_Options& options)
                           folder.Name(), Make_Lists(options.chosen, fault)};
     if (!fault.empty())
         std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", fault.c_str());
-    if (!fault.empty() || !Request_Can_Carry(conversion) || !Change_List_Is_Free(conversion))
-        return Unusable_Arguments;
+    if (!fault.empty() || !Request_Can_Carry(conversion) || !Output_Makes_Sense(conversion)
+        || !Change_List_Is_Free(conversion))
+        return Wrong_Values;
     if (options.dry_run) {
         Print_Request(conversion);
         return INGESTER_SUCCESS;

@@ -95,6 +95,13 @@ bool Is_Taken_Whole(const Given_Option& given)
     return end == text.size();
 }
 
+/// "2:5", "2:" or ":5". Of other values the option would take what it knows, and be silent.
+bool Is_Range(std::string_view value)
+{
+    return std::ranges::count(value, ':') == 1 && value.size() > 1
+           && value.find_first_not_of("0123456789:") == std::string_view::npos;
+}
+
 std::string Fault_Of(const Given_Options& all, const Given_Option& given)
 {
     const std::string_view value = given.value;
@@ -112,7 +119,8 @@ std::string Fault_Of(const Given_Options& all, const Given_Option& given)
         return "this value can't hold both kinds of quotes";
     if (Holds_Path_Token(value) || value.find("/rewrite=") != std::string_view::npos)
         return "this value holds a name between per cent signs or '/rewrite=', which a request acts on";
-    if (!Is_Taken_Whole(given))
+    const bool range = given.option->named.form == Value_Form::range;
+    if (!Is_Taken_Whole(given) || (range && !Is_Range(value)))
         return "this value is not of the form that the option takes";
     if (const Slash_Option* const other = Option_In_Value(all, given))
         return std::string("this value can't hold '")

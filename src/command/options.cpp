@@ -10,9 +10,6 @@ namespace ingester {
 
 namespace {
 
-/// The exit status for values that no request can carry: among the codes of wrong command lines.
-constexpr int Wrong_Values = 105;
-
 constexpr const char* Description = "Converts a table from one file format to another.\n"
                                     "The input's content decides how it is read, the output's extension how "
                                     "it is written.";

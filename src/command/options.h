@@ -10,6 +10,9 @@
 
 namespace ingester {
 
+/// The exit status for what can't be asked of the library: among those of wrong command lines.
+constexpr int Wrong_Values = 105;
+
 /// The name that stands for standard input or output.
 constexpr const char* Standard_Stream = "-";
 

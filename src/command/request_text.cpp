@@ -119,6 +119,12 @@ bool Options_Join_With_Output(std::string_view options)
     return Options_Ask_For(options, [] { return request.Add_Mode != Add_Modes::none; });
 }
 
+bool Options_Name_Joined_Sheet(std::string_view options)
+{
+    return Options_Ask_For(
+        options, [] { return request.Add_Mode != Add_Modes::none && !request.Output_Sheet_Name.empty(); });
+}
+
 std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)
 {
     const std::array<std::array<Spelling, 4>, 2> all{Spellings_Of(input), Spellings_Of(output)};

@@ -22,6 +22,9 @@ struct Sent_Name {
 /// The output options ask for a table that is joined with the one in an existing output.
 [[nodiscard]] bool Options_Join_With_Output(std::string_view options);
 
+/// The output options give a name to a sheet although the result keeps that of the sheet it is joined with.
+[[nodiscard]] bool Options_Name_Joined_Sheet(std::string_view options);
+
 /// `message` with the request form of both names turned into the native one: in full, cut short as
 /// messages cut long names, without extension, or the folder alone. All else stays.
 [[nodiscard]] std::string With_Native_Names(std::string_view message, const Sent_Name& input,

@@ -82,7 +82,7 @@ constexpr Format_Driver Format_Drivers[] = {
     {54, "Affymetrix CDF, text"},
     {55, "GeneChip sequences"},
     {compressed_file, "gzip, of any format here", Read_Compressed_File},
-    {book_file, "Tabulon Book", Read_TBK_File, ".tbk", Write_TBK_File, 10000000, Read_Page_Names},
+    {book_file, "Tabulon Book", Read_TBK_File, ".tbk", Write_TBK_File, Book_Max_Columns, Read_Page_Names},
     {xml_workbook_file, "Excel 2007 workbook", nullptr, ".xlsx .xlsm"},
     {60, "JPEG image", nullptr, ".jpg"},
     {61, "TIFF image", nullptr, ".tif .tiff"},
@@ -167,9 +167,14 @@ bool Read_Data_File(const std::string& file_name, std::int32_t type, std::string
     return readable && found->read(file_name.c_str());
 }
 
+bool Is_Host_File(std::int32_t type)
+{
+    return type == spreadsheet_file || type == book_file;
+}
+
 bool A_Host_File_Was_Read()
 {
-    return request.Content_Code == spreadsheet_file || request.Content_Code == book_file;
+    return Is_Host_File(request.Content_Code);
 }
 
 }  // namespace ingester

@@ -50,6 +50,9 @@ struct Format_Driver {
 [[nodiscard]] bool Read_Data_File(const std::string& file_name, std::int32_t type,
                                   std::string_view source_name);
 
+/// Whether a type is one of the host's own.
+[[nodiscard]] bool Is_Host_File(std::int32_t type);
+
 /// Whether what was read last is a file of the host's own, be it inside a compressed one.
 [[nodiscard]] bool A_Host_File_Was_Read();
 

@@ -24,10 +24,20 @@ void Update_Sheet(std::string_view name, bool already_there)
     request.Sheet_Already_There = already_there;
 }
 
-/// The first sheet, in the place of one that isn't there or wasn't named.
-void Use_First_Sheet(const std::vector<std::string>& names, const std::string& output_name)
+/// The sheet to update; where none is named, the one of the same name as a sheet asked of the input.
+std::string Wanted_Sheet()
 {
-    const std::string wanted(request.Merge_Sheet_Name);
+    if (!request.Merge_Sheet_Name.empty())
+        return std::string(request.Merge_Sheet_Name);
+    if (request.Worksheet_Name.empty() || request.Worksheet_Name.view() == Only_Sheet)
+        return {};
+    return std::string(request.Used_Sheet_Name.empty() ? request.Worksheet_Name : request.Used_Sheet_Name);
+}
+
+/// The first sheet, in the place of one that isn't there or wasn't named.
+void Use_First_Sheet(const std::vector<std::string>& names, const std::string& wanted,
+                     const std::string& output_name)
+{
     if (!wanted.empty())
         Report_Message(
             Format_Text("Warning: sheet %s not found in file %s.\n", wanted.c_str(), output_name.c_str()));
@@ -41,13 +51,17 @@ void Use_First_Sheet(const std::vector<std::string>& names, const std::string& o
 
 bool Find_Output_Sheet(const std::string& output_name)
 {
-    const std::string wanted(request.Merge_Sheet_Name);
+    const std::string wanted = Wanted_Sheet();
     if (!File_Exists(output_name))
+<<<<<<< HEAD
         return true;
     if (wanted.empty() && !request.Worksheet_Name.empty() && request.Worksheet_Name.view() != Only_Sheet) {
         request.Update_Sheet_Name = request.Worksheet_Name;
         return true;
     }
+=======
+        return false;
+>>>>>>> h-c6
     // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
     const bool several =
         Ends_Ignoring_Case(output_name, ".gz") || Output_Driver_Of(output_name).sheet_names != nullptr;
@@ -68,8 +82,13 @@ bool Find_Output_Sheet(const std::string& output_name)
     if (request.Add_Mode == Add_Modes::none && request.Source_Key_Given)
         Update_Sheet(wanted.empty() ? std::string_view(listed->front()) : wanted, wanted.empty());
     else
+<<<<<<< HEAD
         Use_First_Sheet(*listed, output_name);
     return true;
+=======
+        Use_First_Sheet(*listed, wanted, output_name);
+    return false;
+>>>>>>> h-c6
 }
 
 }  // namespace ingester

@@ -107,10 +107,11 @@ bool Take_Secondary_File(std::string text, Pass_Request& asked)
     if (text.empty())
         return true;
     Cut_Secondary_Markers(text);
-    Expand_Path_Tokens(text, Get_Temp_Folder());
+    const std::string temp = Get_Temp_Folder();
+    Expand_Path_Tokens(text, temp);
     std::string source_url;
     bool downloaded = false;
-    if (!Fetch_Url(text, "SEC", source_url, downloaded)) {
+    if (!Fetch_Url(text, "SEC", source_url, temp, downloaded)) {
         asked.secondary_failed = true;
         return Fail("Could not download secondary file URL:\n%.500s\n", text.c_str());
     }

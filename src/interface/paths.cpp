@@ -128,12 +128,24 @@ void Expand_Path_Tokens(std::string& name, std::string_view temp_folder)
         name.resize(Longest_Expanded_Name);
 }
 
+namespace {
+
+bool Starts_As_Number(std::string_view text)
+{
+    if (text.starts_with('-') || text.starts_with('+'))
+        text.remove_prefix(1);
+    return !text.empty() && Is_Digit(text.front());
+}
+
+}  // namespace
+
 std::int32_t Read_Host_Setting(std::string_view group, std::string_view key, std::int32_t low,
                                std::int32_t high, std::int32_t otherwise)
 {
     const std::string text = Host_Setting(group, key);
     const long number = Leading_Integer(text);
-    return text.empty() || number < low || number > high ? otherwise : static_cast<std::int32_t>(number);
+    return !Starts_As_Number(text) || number < low || number > high ? otherwise
+                                                                    : static_cast<std::int32_t>(number);
 }
 
 std::string Host_Delete_Marker()
@@ -180,30 +192,38 @@ std::string_view Scratch_Extension(std::string_view url)
     return extension.empty() || extension.size() > longest ? ".dat" : extension;
 }
 
-Download_Limits Limits_Of_Host()
+Download_Limits Limits_Of_Host(const std::string& temp_folder)
 {
     constexpr std::int32_t longest = 86400;
     Download_Limits limits;
     limits.connect_seconds = Read_Host_Setting("Download", "ConnectSeconds", 1, longest, 30);
     limits.total_seconds = Read_Host_Setting("Download", "TotalSeconds", 1, longest, 1800);
-    limits.bytes = Free_Space(Get_Temp_Folder()) / 10 * 9;
+    limits.bytes = Free_Space(temp_folder) / 10 * 9;
     return limits;
 }
 
 }  // namespace
 
-bool Fetch_Url(std::string& name, std::string_view label, std::string& source_url, bool& downloaded)
+bool Fetch_Url(std::string& name, std::string_view label, std::string& source_url,
+               const std::string& temp_folder, bool& downloaded)
 {
-    constexpr std::size_t longest = 1120;
     downloaded = false;
     if (!Is_Url(name))
         return true;
     std::string url = name;
+<<<<<<< HEAD
     std::replace(url.begin(), url.begin() + static_cast<std::ptrdiff_t>(std::min(url.size(), longest)), '\\',
                  '/');
     std::string scratch =
         Get_Temp_Folder().append(label).append(request.Scratch_Stem).append(Scratch_Extension(name));
     if (!Download(url, scratch, Limits_Of_Host()))
+=======
+    std::replace(url.begin(),
+                 url.begin() + static_cast<std::ptrdiff_t>(std::min(url.size(), Long_Name_Width)), '\\', '/');
+    const std::string scratch =
+        std::string(temp_folder).append(label).append(request.Scratch_Stem).append(Scratch_Extension(name));
+    if (!Download(url, scratch, Limits_Of_Host(temp_folder)))
+>>>>>>> h-c6
         return false;
     source_url = std::move(url);
     name = std::move(scratch);  // nothing may fail from here to the mark that has it deleted

@@ -22,7 +22,7 @@ constexpr std::size_t Longest_Expanded_Name = 280;
 /// variable at its start. A token without a value stands. URLs stay as they are.
 void Expand_Path_Tokens(std::string& name, std::string_view temp_folder);
 
-/// The host's stored number, or `otherwise` when there is none from `low` to `high`.
+/// The host's stored number, or `otherwise` when it is none or not from `low` to `high`.
 [[nodiscard]] std::int32_t Read_Host_Setting(std::string_view group, std::string_view key, std::int32_t low,
                                              std::int32_t high, std::int32_t otherwise);
 
@@ -37,10 +37,10 @@ void Expand_Path_Tokens(std::string& name, std::string_view temp_folder);
 /// small or capital letters; as it stands when there is none.
 [[nodiscard]] std::string Find_Companion(const std::string& name);
 
-/// Makes a local copy of a URL, under a scratch name that begins with `label`, and puts that into
-/// `name`. True without doing anything for other names. False when the copy could not be made, and
+/// Makes a local copy of a URL, under a scratch name in `temp_folder` that begins with `label`, and puts that
+/// into `name`. True without doing anything for other names. False when the copy could not be made, and
 /// `name` is as it was.
 [[nodiscard]] bool Fetch_Url(std::string& name, std::string_view label, std::string& source_url,
-                             bool& downloaded);
+                             const std::string& temp_folder, bool& downloaded);
 
 }  // namespace ingester

@@ -25,11 +25,11 @@ bool Delete_Empty_Rows(Sheet* sheet)
     return true;
 }
 
-Subset_Result Apply_Subset(Sheet* sheet)
+Subset_Result Apply_Subset(Sheet* sheet, std::int32_t type)
 {
     if (sheet == nullptr)
         return Subset_Result::no_columns;
-    const bool host_file = A_Host_File_Was_Read();
+    const bool host_file = Is_Host_File(type);
     if (request.Subset_Columns && !host_file && !request.Columns_Were_Selected && !Keep_Column_Subset(sheet))
         return Subset_Result::no_columns;
     if (request.Subset_Columns && sheet->column_count < 1)

@@ -12,9 +12,10 @@ bool Delete_Empty_Rows(Sheet* sheet);
 
 enum class Subset_Result : std::uint8_t { kept, no_columns, no_rows };
 
-/// Leaves the columns and rows of the request's lists, where the reader hasn't done so already. Names of
+/// Leaves the columns and rows of the request's lists, where the reader of the input's `type` hasn't done so
+/// already. Names of
 /// the list that aren't there are told.
-[[nodiscard]] Subset_Result Apply_Subset(Sheet* sheet);
+[[nodiscard]] Subset_Result Apply_Subset(Sheet* sheet, std::int32_t type);
 
 /// Keeps the data columns from `first` to `last`, counted from 1; below 1 is the first. Columns that
 /// aren't there are told. False after a message when nothing would be kept.

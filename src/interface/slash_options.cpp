@@ -263,6 +263,11 @@ constexpr Named_Option Bare(std::string_view name, std::string_view value, std::
     return {name, Value_Form::bare, value, join};
 }
 
+constexpr Named_Option Range(std::string_view name, std::string_view value)
+{
+    return {name, Value_Form::range, value};
+}
+
 constexpr Named_Option Quoted(std::string_view name, std::string_view value)
 {
     return {name, Value_Form::quoted, value};
@@ -287,7 +292,7 @@ constexpr Slash_Option Input_Table[] = {
      Flag("no-probe-statistics")},
     {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks", Flag("keep-blanks")},
     {"/csv", Take_Lines_Per_Record, "lines that make one record of a text", Bare("lines-per-record", "N")},
-    {"/c", Take_Column_Range, "columns to keep, first:last", Bare("columns", "FIRST:LAST")},
+    {"/c", Take_Column_Range, "columns to keep, first:last", Range("columns", "FIRST:LAST")},
     {"/db", Set<&R::Print_Summary, true>, "print a summary of the columns", Flag("print-summary")},
     {"/m", Take_Missing_Codes, "up to three numbers that mean missing", Bare("missing-codes", "A,B,C")},
     {"/d", Take_Title_Row, "row of column descriptions in a grid", Optional("description-row", "[$]N")},

@@ -13,6 +13,7 @@ namespace ingester {
 enum class Value_Form : std::uint8_t {
     none,      ///< a flag
     bare,      ///< up to the next "/"
+    range,     ///< "FIRST:LAST", numbers of which one may be left out
     quoted,    ///< any text
     path,      ///< a file: any text, with the separators of requests
     optional,  ///< bare, or left out

@@ -6,6 +6,7 @@
 #include "platform/folders.h"
 #include "support/text.h"
 
+#include <algorithm>
 #include <string>
 
 namespace ingester {
@@ -43,13 +44,14 @@ bool Read_Column_Subset(std::string_view name)
     Input_File file;
     if (!file.Open(name))
         return Unreadable(file);
-    const long count = Read_List_Count(file);
+    const long count = std::min<long>(Read_List_Count(file), Book_Max_Columns);
     std::string line;
     const bool has_kind = file.Read_Line(line, Count_Line_Width);
     request.Subset_By_Number = !(has_kind && !line.empty() && To_Upper(line.front()) == 'V');
     request.Subset_Names.clear();
     for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
-        request.Subset_Names.emplace_back(Trim_Copy(line));
+        if (const std::string_view entry = Trim_Copy(line); !entry.empty())  // which no column is known by
+            request.Subset_Names.emplace_back(entry);
     request.Subset_Name_Count = static_cast<std::int32_t>(request.Subset_Names.size());
     return Finish_List(file);
 }

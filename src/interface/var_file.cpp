@@ -46,7 +46,8 @@ Var_List Load_Var_List(Input_File& file)
     if (list.by_name || list.count > 0)
         more = file.Read_Line(line, Longest_Line);
     const bool counted = list.count > 0;
-    const long most = list.by_name ? Every_Column : (counted ? list.count : Lines_Without_Count);
+    const long told = list.by_name ? Every_Column : (counted ? list.count : Lines_Without_Count);
+    const long most = std::min<long>(told, request.Max_Columns);  // no table has more columns
     // One more than the names: the structure's own.
     for (long read = 0; more && read <= most; ++read, more = file.Read_Line(line, Longest_Line)) {
         std::ranges::replace(line, '\0', ' ');  // which would end a name

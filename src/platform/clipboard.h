@@ -13,10 +13,10 @@ enum class Clipboard_Answer : std::uint8_t {
     failed,       ///< the file could not be made, or the program didn't end well
 };
 
-/// Copies the clipboard's text to a scratch file.
+/// Copies the clipboard's text to a scratch file, in Windows-1252.
 [[nodiscard]] Clipboard_Answer Copy_Clipboard_To(std::string_view scratch_name);
 
-/// Makes the bytes of a file the clipboard's text.
+/// Makes a file's text, in Windows-1252 or UTF-8, the clipboard's.
 [[nodiscard]] Clipboard_Answer Copy_To_Clipboard(std::string_view name);
 
 }  // namespace ingester

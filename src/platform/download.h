@@ -14,8 +14,9 @@ struct Download_Limits {
     std::uint64_t bytes = 0;
 };
 
-/// Copies what an ftp, http, https or file URL names into a scratch file. At most ten redirections are
-/// followed, and none from the network to a local file. False when the copy isn't complete; it is gone then.
+/// Copies what an ftp, http, https or file URL names into a scratch file. Blanks in it are sent escaped. At
+/// most ten redirections are followed, and none from the network to a local file. False when the copy isn't
+/// complete; it is gone then.
 [[nodiscard]] bool Download(const std::string& url, std::string_view scratch_name,
                             const Download_Limits& limits);
 

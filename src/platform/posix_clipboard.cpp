@@ -1,6 +1,6 @@
 #include "platform/clipboard.h"
 #include "platform/files.h"
-#include "platform/folders.h"
+#include "support/windows_1252.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -11,6 +11,8 @@
 
 #include <fcntl.h>
 #include <spawn.h>
+#include <sys/mman.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -25,13 +27,74 @@ struct Clipboard_Service {
     const char* variable;
     const char* get[6];
     const char* put[6];
+    const char* unreachable;  ///< in the words of a program that found no desktop
 };
 
 constexpr Clipboard_Service Services[] = {
-    {"WAYLAND_DISPLAY", {"wl-paste", "--no-newline", "--type", "text"}, {"wl-copy", "--type", "text/plain"}},
+    {"WAYLAND_DISPLAY",
+     {"wl-paste", "--no-newline", "--type", "text"},
+     {"wl-copy", "--type", "text/plain"},
+     "Failed to connect"},
     {"DISPLAY",
      {"xclip", "-selection", "clipboard", "-o", "-t", "UTF8_STRING"},
-     {"xclip", "-selection", "clipboard", "-i"}},
+     {"xclip", "-selection", "clipboard", "-i"},
+     "Can't open display"},
+};
+
+/// A file without a name, behind a stream of a program.
+class Memory_File {
+public:
+    Memory_File() : descriptor_(::memfd_create("ingester", MFD_CLOEXEC))
+    {
+        if (descriptor_ < 0 || descriptor_ > STDERR_FILENO)
+            return;
+        const int low = descriptor_;  // a host may have closed its streams
+        descriptor_ = ::fcntl(low, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+        ::close(low);
+    }
+    Memory_File(const Memory_File&) = delete;
+    Memory_File& operator=(const Memory_File&) = delete;
+    ~Memory_File()
+    {
+        if (descriptor_ >= 0)
+            ::close(descriptor_);
+    }
+
+    [[nodiscard]] int Descriptor() const { return descriptor_; }
+
+    /// For the next program, which begins at its start.
+    [[nodiscard]] bool Rewind() const { return ::lseek(descriptor_, 0, SEEK_SET) == 0; }
+
+    [[nodiscard]] bool Set_Text(std::string_view text) const
+    {
+        while (!text.empty()) {
+            const ::ssize_t put = ::write(descriptor_, text.data(), text.size());
+            if (put < 0 && errno != EINTR)
+                return false;
+            text.remove_prefix(static_cast<std::size_t>(std::max<::ssize_t>(put, 0)));
+        }
+        return true;
+    }
+
+    [[nodiscard]] std::string Text() const
+    {
+        struct stat facts {};
+        ::fstat(descriptor_, &facts);
+        std::string text(static_cast<std::size_t>(facts.st_size), '\0');
+        std::size_t got = 0;
+        for (::ssize_t part = 1; part > 0; got += static_cast<std::size_t>(std::max<::ssize_t>(part, 0)))
+            part = ::pread(descriptor_, text.data() + got, text.size() - got, static_cast<::off_t>(got));
+        text.resize(got);
+        return text;
+    }
+
+private:
+    int descriptor_;
+};
+
+/// What a program reads and writes.
+struct Streams {
+    Memory_File input, output, words;
 };
 
 bool Is_Set(const char* variable)
@@ -40,7 +103,7 @@ bool Is_Set(const char* variable)
     return value != nullptr && *value != '\0';
 }
 
-/// How a program ended.
+/// How a program ended. Without a desktop it counts as not there.
 enum class Ending : std::uint8_t { good, bad, not_there };
 
 /// Waits for a program, which the owner of the clipboard may keep waiting for ever.
@@ -62,51 +125,77 @@ Ending Wait_For(::pid_t child)
     return Ending::bad;
 }
 
-/// Runs a program between two files, without words of its own.
-Ending Run(const char* const (&words)[6], const char* input, const char* output)
+/// Runs a program between two files, and keeps its words.
+Ending Run(const char* const (&words)[6], const Streams& streams)
 {
     char* arguments[7] = {};
     std::transform(std::begin(words), std::end(words), arguments,
                    [](const char* word) { return const_cast<char*>(word); });
-    ::posix_spawn_file_actions_t streams;
-    ::posix_spawn_file_actions_init(&streams);
-    ::posix_spawn_file_actions_addopen(&streams, STDIN_FILENO, input, O_RDONLY, 0);
-    ::posix_spawn_file_actions_addopen(&streams, STDOUT_FILENO, output, O_WRONLY, 0);
-    ::posix_spawn_file_actions_addopen(&streams, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
+    const Memory_File* const files[] = {&streams.input, &streams.output, &streams.words};
+    if (!std::ranges::all_of(files, [](const Memory_File* file) { return file->Rewind(); }))
+        return Ending::bad;
+    ::posix_spawn_file_actions_t actions;
+    ::posix_spawn_file_actions_init(&actions);
+    for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream)
+        ::posix_spawn_file_actions_adddup2(&actions, files[stream]->Descriptor(), stream);
     ::pid_t child = 0;
-    const int fault = ::posix_spawnp(&child, words[0], &streams, nullptr, arguments, environ);
-    ::posix_spawn_file_actions_destroy(&streams);
+    const int fault = ::posix_spawnp(&child, words[0], &actions, nullptr, arguments, environ);
+    ::posix_spawn_file_actions_destroy(&actions);
     if (fault != 0)
         return fault == ENOENT ? Ending::not_there : Ending::bad;
     return Wait_For(child);
 }
 
 /// Runs the program of the first service that is there.
-template <class Words_Of> Ending Run_Service(Words_Of words_of, const char* input, const char* output)
+template <class Words_Of> Ending Run_Service(Words_Of words_of, const Streams& streams)
 {
     for (const Clipboard_Service& service : Services) {
         if (!Is_Set(service.variable))
             continue;
-        if (const Ending ending = Run(words_of(service), input, output); ending != Ending::not_there)
+        const Ending ending = Run(words_of(service), streams);
+        const bool reached =
+            ending == Ending::good || streams.words.Text().find(service.unreachable) == std::string::npos;
+        if (ending != Ending::not_there && reached)
             return ending;
     }
     return Ending::not_there;
+}
+
+/// What desktops carry is UTF-8, and a NUL ends it.
+bool Keep_Text(std::string text, std::string_view scratch_name)
+{
+    text.resize(std::min(text.find('\0'), text.size()));
+    Output_File file;
+    if (!file.Open_Scratch(scratch_name))
+        return false;
+    file.Write(Is_Utf8(text) ? Utf8_To_Windows_1252(text) : text);
+    return file.Close();
+}
+
+/// A text that came from a file in UTF-8 is what a desktop wants already.
+bool Load_Text(std::string_view name, const Memory_File& target)
+{
+    Input_File file;
+    if (!file.Open(name))
+        return false;
+    std::string text(static_cast<std::size_t>(file.Size()), '\0');
+    return file.Read_Exactly(text.data(), text.size())
+           && target.Set_Text(Is_Utf8(text) ? text : Windows_1252_To_Utf8(text));
 }
 
 }  // namespace
 
 Clipboard_Answer Copy_Clipboard_To(std::string_view scratch_name)
 {
-    Output_File made;
-    if (!made.Open_Scratch(scratch_name) || !made.Close())
-        return Clipboard_Answer::failed;
     const auto get = [](const Clipboard_Service& service) -> const auto&
     {
         return service.get;
     };
-    switch (Run_Service(get, "/dev/null", Native_Path(scratch_name).c_str())) {
+    const Streams streams;
+    switch (Run_Service(get, streams)) {
     case Ending::good:
-        return Clipboard_Answer::done;
+        return Keep_Text(streams.output.Text(), scratch_name) ? Clipboard_Answer::done
+                                                              : Clipboard_Answer::failed;
     case Ending::bad:
         return Clipboard_Answer::no_text;
     default:
@@ -120,7 +209,10 @@ Clipboard_Answer Copy_To_Clipboard(std::string_view name)
     {
         return service.put;
     };
-    switch (Run_Service(put, Native_Path(name).c_str(), "/dev/null")) {
+    const Streams streams;
+    if (!Load_Text(name, streams.input))
+        return Clipboard_Answer::failed;
+    switch (Run_Service(put, streams)) {
     case Ending::good:
         return Clipboard_Answer::done;
     case Ending::bad:

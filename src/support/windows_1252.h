@@ -1,7 +1,9 @@
-// The upper half of Windows-1252, folded to plain letters.
+// Windows-1252: the upper half folded to plain letters, and texts of it in UTF-8 and back.
 #pragma once
 
 #include <array>
+#include <string>
+#include <string_view>
 
 namespace ingester {
 
@@ -13,5 +15,13 @@ extern const std::array<char, 127> Latin_Fold_Table;
 {
     return Latin_Fold_Table[byte - 128U];
 }
+
+[[nodiscard]] bool Is_Utf8(std::string_view text);
+
+/// A valid UTF-8 text in Windows-1252, with "?" for characters that it lacks.
+[[nodiscard]] std::string Utf8_To_Windows_1252(std::string_view text);
+
+/// Every byte comes back as it was: those that stand for no letter become controls of their number.
+[[nodiscard]] std::string Windows_1252_To_Utf8(std::string_view text);
 
 }  // namespace ingester

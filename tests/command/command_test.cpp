@@ -273,8 +273,9 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
         ++examples;
         std::filesystem::remove_all(Path("try"));
         std::filesystem::create_directory(Path("try"));
-        for (const char* const file : {"crops.csv", "raw.csv", "out.tab"})
-            Put(std::string("try/") + file, file[0] == 'r' ? "1,2,3\n4,5,6\n" : Crops);
+        for (const char* const file : {"raw.csv", "out.tab"})
+            Put(std::string("try/") + file, "1,2,3\n4,5,6\n");
+        std::filesystem::copy(INGESTER_DOCS "/../examples/crops.csv", Path("try"));
         Put("try/plots.txt", "1-2\n");
         if (line.find("--force") == std::string::npos)
             std::filesystem::remove(Path("try/out.tab"));
@@ -282,6 +283,7 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
         const std::string words = "cd '" + Path("try") + "' && PATH='" + command + "':$PATH && TMPDIR=. && ("
                                   + line + "\n) >shown 2>&1";
         EXPECT_EQ(std::system(words.c_str()), 0) << line << "\n" << Get("try/shown");
+        EXPECT_EQ(Get("try/shown").find("was not found"), std::string::npos) << line;
     }
     EXPECT_GT(examples, 8);
 }
@@ -317,6 +319,13 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
          {"crops.csv", "out.tab", "--in-options", "/n", "--no-names"}},
         {Wrong_Command_Line, "both kinds of quotes", {"crops.csv", "out.tab", "--missing", "'\""}},
         {Wrong_Command_Line, "can't hold a '/'", {"crops.csv", "out.tab", "--columns", "1/2"}},
+        {Wrong_Command_Line, "not of the form", {"crops.csv", "out.tab", "--columns", "B:C"}},
+        {Wrong_Command_Line, "not of the form", {"crops.csv", "out.tab", "--columns", "2"}},
+        {Wrong_Command_Line, "clipboard.csv", {"crops.csv", "Clipboard"}},
+        {Wrong_Command_Line, "--update-sheet", {"crops.csv", "old.tab", "--append", "--add-sheet", "New"}},
+        {Wrong_Command_Line,
+         "--update-sheet",
+         {"crops.csv", "old.tab", "--concatenate", "--sheet-name", "Other"}},
         {Wrong_Command_Line,
          "--separators: the value is empty",
          {"crops.csv", "out.tab", "--separators", ""}},

@@ -65,21 +65,60 @@ private:
     ::pid_t display_ = -1;
 };
 
+const std::string Took = "Data read from the clipboard.\n:\n";
+const std::string Gave = "Data written to the clipboard.\n:\n";
+
 TEST_F(Clipboard_Test, Takes_And_Gives_Text)
 {
-    const std::string took = "Data read from the clipboard.\n:\n";
-    const std::string gave = "Data written to the clipboard.\n:\n";
     EXPECT_EQ(Convert("none.csv", "o.tab").first, 2);
-    EXPECT_EQ(Call({"clipboard", Request_Name("o.tab")}).first, 9) << "there is nothing on it";
+    EXPECT_EQ(Call({"clipboard", Request_Name("o.tab")}),
+              (Host_Answer{9, "Clipboard does not contain text.\n:\n"}));
     Put("c.csv", "plot,kind\n1,oats\n2,rye\n");
-    EXPECT_EQ(Call({Request_Name("c.csv"), "clipboard.tab"}), (Host_Answer{0, gave}));
+    EXPECT_EQ(Call({Request_Name("c.csv"), "clipboard.tab/p"}), (Host_Answer{0, Gave}));
+    EXPECT_FALSE(std::filesystem::exists("clipboard.$V$")) << "in the folder of the test";
     EXPECT_EQ(Files(), "c.csv");
     for (const char* const name : {"clipboard", "Clipboard.tab"}) {
-        EXPECT_EQ(Call({name, Request_Name("o.csv") + "/h"}), (Host_Answer{0, took})) << name;
+        EXPECT_EQ(Call({name, Request_Name("o.csv") + "/h"}), (Host_Answer{0, Took})) << name;
         EXPECT_EQ(Get("o.csv"), "plot,kind\r\n1,\"oats\"\r\n2,\"rye\"\r\n");
         std::filesystem::remove(Path("o.csv"));
     }
     EXPECT_EQ(Files(), "c.csv");
+}
+
+TEST_F(Clipboard_Test, Converts_Its_Text)
+{
+    const std::string head =
+        "a,b\r\n" + std::string(60, 'x') + ",y\r\n";  // a text is known by its first bytes
+    const std::pair<std::string, std::string> cases[] = {
+        {"Gr\xC3\xBCn,\xE2\x82\xAC\r\n", "Gr\xFCn,\x80\r\n"},
+        {"Gr\xFCn,x\r\n", "Gr\xFCn,x\r\n"},  // no UTF-8
+        {"x,\xC5\x91\r\n", "x,?\r\n"},
+        {std::string("x,y\r\n\0z,z\r\n", 11), "x,y\r\n"},
+    };
+    for (const auto& [carried, text] : cases) {
+        Put("carried", head + carried);
+        ASSERT_EQ(std::system(("xclip -selection clipboard -i <" + Path("carried")).c_str()), 0);
+        EXPECT_EQ(Call({"clipboard.csv", Request_Name("o.csv") + "/h/-"}), (Host_Answer{0, Took}));
+        EXPECT_EQ(Get("o.csv"), head + text);
+    }
+    for (const char* const written : {"Gr\xFCn,x\r\n", "Gr\xC3\xBCn,x\r\n"}) {
+        Put("c.csv", head + written);
+        EXPECT_EQ(Call({Request_Name("c.csv"), "clipboard.csv/h/-"}), (Host_Answer{0, Gave}));
+        const std::string get = "xclip -selection clipboard -o -t UTF8_STRING >" + Path("carried");
+        ASSERT_EQ(std::system(get.c_str()), 0);
+        EXPECT_EQ(Get("carried"), head + "Gr\xC3\xBCn,x\r\n");
+    }
+}
+
+TEST_F(Clipboard_Test, That_Can_Not_Be_Reached_Is_Told)
+{
+    ::setenv("DISPLAY", ":9999", 1);
+    Put("c.csv", "plot,kind\n1,oats\n");
+    EXPECT_EQ(Call({"clipboard", Request_Name("o.tab")}),
+              (Host_Answer{9, "Read Error: Cannot open clipboard for read.\n:\n"}));
+    EXPECT_EQ(Call({Request_Name("c.csv"), "clipboard.tab"}),
+              (Host_Answer{9, "Copy Error: Cannot open clipboard for write.\n"
+                              "Could not put data on the clipboard.\n:\n"}));
 }
 
 }  // namespace

@@ -84,15 +84,27 @@ TEST_F(Output_Joins, Join_With_One_Sheet_Of_A_Book)
     Put("n.csv", "plot,b\n1,x\n");
     ASSERT_EQ(Convert("n.csv", "o.tbk/a=A").first, 0);
     ASSERT_EQ(Convert("n.csv", "o.tbk/a=B").first, 0);
-    const std::tuple<std::string, std::string, std::string> steps[] = {
-        {"o.tbk/@/!=b", "", "1,x |1,x 1,x |A B "},
-        {"o.tbk/@", "Using sheet A within the file.\n:\n", "1,x 1,x |1,x 1,x |A B "},
-        {"o.tbk/%=U/!=none", "Warning: sheet none not found in file " + Request_Name("o.tbk") + ".\n:\n",
+    ASSERT_EQ(Convert("n.csv", "i.tbk/a=B").first, 0);
+    ASSERT_EQ(Convert("n.csv", "i.tbk/a=A").first, 0);
+    const struct {
+        std::string input, sheet, output, said, sheets;
+    } steps[] = {
+        {"n.csv", "", "o.tbk/@/!=b", "", "1,x |1,x 1,x |A B "},
+        {"n.csv", "", "o.tbk/@", "Using sheet A within the file.\n:\n", "1,x 1,x |1,x 1,x |A B "},
+        {"n.csv", "", "o.tbk/%=U/!=none",
+         "Warning: sheet none not found in file " + Request_Name("o.tbk") + ".\n:\n",
          "1,x 1,x |1,x 1,x |A B "},
-        {"o.tbk/&/!='B'", "Could not concatenate data.\n:\n", "1,x 1,x |1,x 1,x |A B "},
+        {"n.csv", "", "o.tbk/&/!='B'", "Could not concatenate data.\n:\n", "1,x 1,x |1,x 1,x |A B "},
+        {"n.csv", "b", "o.tbk/@", "", "1,x 1,x |1,x 1,x 1,x |A B "},
+        {"i.tbk", "2", "o.tbk/@", "", "1,x 1,x 1,x |1,x 1,x 1,x |A B "},
+        {"i.tbk", "A", "o.tbk/@/!=B", "", "1,x 1,x 1,x |1,x 1,x 1,x 1,x |A B "},
+        {"n.csv", "foo", "o.tbk/@",
+         "Warning: sheet foo not found in file " + Request_Name("o.tbk") + ".\n:\n",
+         "1,x 1,x 1,x 1,x |1,x 1,x 1,x 1,x |A B "},
     };
-    for (const auto& [output, said, sheets] : steps) {
-        EXPECT_EQ(Convert("n.csv", output), (Host_Answer{said.starts_with("Could") ? 15 : 0, said}))
+    for (const auto& [input, sheet, output, said, sheets] : steps) {
+        EXPECT_EQ(Call({Request_Name(input), Request_Name(output), sheet}),
+                  (Host_Answer{said.starts_with("Could") ? 15 : 0, said}))
             << output;
         EXPECT_EQ(Sheets(), sheets) << output;
     }

@@ -19,7 +19,7 @@ protected:
     {
         Host_Test::SetUp();
         Put("settings.ini", "; of the host\n[options]\nAddInFolder = /add/ins/\n[Host]\nVersion=19.2\n"
-                            "[Spreadsheet]\nAllow HTML Formatting=7\n");
+                            "[Spreadsheet]\nAllow HTML Formatting=7\nOdd=yes\nSign=-\n");
         ::setenv("TABULON_SETTINGS", Path("settings.ini").c_str(), 1);
         ::setenv("INGESTER_PLACE", "/some/place/", 1);
         Start_Request("t");
@@ -87,6 +87,8 @@ TEST_F(Paths_Test, The_Hosts_Settings_Tell_Its_Version_And_Its_Scratch_Files)
 {
     EXPECT_EQ(Read_Host_Setting("spreadsheet", "allow html formatting", 0, 1, 0), 0) << "out of its range";
     EXPECT_EQ(Read_Host_Setting("Spreadsheet", "Allow HTML Formatting", 0, 9, 0), 7);
+    for (const char* const no_number : {"Odd", "Sign", "None"})
+        EXPECT_EQ(Read_Host_Setting("Spreadsheet", no_number, 0, 9, 3), 3) << no_number;
     EXPECT_EQ(request.Return_Delete_Marker.view(), "T192D");
     EXPECT_TRUE(Is_Host_Scratch_File(Request_Name("t192d7.tbk")));
     for (const char* const other : {"T192D7.csv", "xT192D7.tss", "T181D7.tss"})
@@ -98,16 +100,48 @@ TEST_F(Paths_Test, The_Hosts_Settings_Tell_Its_Version_And_Its_Scratch_Files)
 
 TEST_F(Paths_Test, Urls_Become_Scratch_Files_That_Go_Again)
 {
-    Put("c.csv", "plot,yield\n1,2.5\n");
-    const std::string url = "file:\\\\" + Request_Name("c.csv");
-    EXPECT_EQ(Call({url, Request_Name("o.tab")}), (Host_Answer{0, ""}));
-    EXPECT_EQ(Get("o.tab"), "plot\tyield\r\n1\t2.5\r\n");
-    EXPECT_EQ(Files(), "c.csv o.tab settings.ini");
+    for (const char* const name : {"c.csv", "my c.csv"}) {
+        Put(name, "plot,yield\n1,2.5\n");
+        const std::string url = "file:\\\\" + Request_Name(name);
+        EXPECT_EQ(Call({url, Request_Name("o.tab")}), (Host_Answer{0, ""})) << name;
+        EXPECT_EQ(Get("o.tab"), "plot\tyield\r\n1\t2.5\r\n");
+        std::filesystem::remove(Path(name));
+        EXPECT_EQ(Files(), "o.tab settings.ini");
+    }
     const std::string none = "file:\\\\" + Request_Name("none.csv");
     std::string told = none;
     EXPECT_EQ(Call({none, Request_Name("p.tab")}),
               (Host_Answer{19, "Could not download input URL:\n" + told + "\n:\n"}));
-    EXPECT_EQ(Files(), "c.csv o.tab settings.ini");
+    EXPECT_EQ(Files(), "o.tab settings.ini");
+}
+
+/// Whether a broken pipe is pending here, and whether it is held back.
+std::pair<bool, bool> Broken_Pipe()
+{
+    sigset_t pending;
+    sigset_t held;
+    ::sigpending(&pending);
+    ::pthread_sigmask(SIG_BLOCK, nullptr, &held);
+    return {::sigismember(&pending, SIGPIPE) == 1, ::sigismember(&held, SIGPIPE) == 1};
+}
+
+TEST_F(Paths_Test, Broken_Pipes_Of_The_Host_Stay_Its_Own)
+{
+    const auto download = [this] {
+        EXPECT_EQ(Call({"file:\\\\" + Request_Name("none.csv"), Request_Name("p.tab")}).first, 19);
+    };
+    download();
+    EXPECT_EQ(Broken_Pipe(), std::pair(false, false));
+    sigset_t broken_pipe;
+    ::sigemptyset(&broken_pipe);
+    ::sigaddset(&broken_pipe, SIGPIPE);
+    ::pthread_sigmask(SIG_BLOCK, &broken_pipe, nullptr);
+    ::raise(SIGPIPE);
+    download();
+    EXPECT_EQ(Broken_Pipe(), std::pair(true, true));
+    int taken = 0;
+    ::sigwait(&broken_pipe, &taken);
+    ::pthread_sigmask(SIG_UNBLOCK, &broken_pipe, nullptr);
 }
 
 /// What the server of the test below says to each path.
@@ -116,7 +150,7 @@ std::string Web_Page(const std::string& path)
     const std::string good = "HTTP/1.1 200 OK\r\nConnection: close\r\n";
     const std::string crops = "plot,yield\n1,2.5\n";
     const std::string moved = "HTTP/1.1 302 Found\r\nContent-Length: 0\r\nConnection: close\r\nLocation: ";
-    if (path == "/a/crops.csv?x=1")
+    if (path == "/a/crops.csv?x=1" || path == "/my%20crops.csv")
         return good + "\r\n" + crops;
     if (path == "/moved.csv")
         return moved + "/a/crops.csv?x=1\r\n\r\n";
@@ -143,7 +177,7 @@ TEST_F(Paths_Test, The_Web_Is_Read_And_Its_Faults_Leave_Nothing_Behind)
     Put("settings.ini", "[Download]\nConnectSeconds=1\nTotalSeconds=1\n");
     Put("o.tab", "old");
     const std::string host = "http:\\\\127.0.0.1:" + std::to_string(server.Port()) + "\\";
-    for (const char* const good : {"a\\crops.csv?x=1", "moved.csv"}) {
+    for (const char* const good : {"a\\crops.csv?x=1", "my crops.csv", "moved.csv"}) {
         EXPECT_EQ(Call({host + good, Request_Name("o.tab")}), (Host_Answer{0, ""})) << good;
         EXPECT_EQ(Get("o.tab"), "plot\tyield\r\n1\t2.5\r\n");
         Put("o.tab", "old");

@@ -77,6 +77,7 @@ TEST_F(Selection_Test, Keeps_Columns_And_Rows_Of_Lists)
         {"1\nV\na\nb\n", "", "a|1|2|3|"},  // the count is less
         {"3\nN\n4\n1\n9\n", "", "a\td!|1\tp|2\tq|3\tp|"},
         {"2147483648\nN\n2\n", "", "b|x|y|z|"},
+        {"2147483647\nV\n\n \na\n\n", "", "a|1|2|3|"},  // blank lines stand for no column
         {"1\nN\n4294967297\n", "", "13 " + none},
         {"1\nV\nB\n", "", "13 " + none},
         {"0\nV\n", "", "13 " + none},
@@ -125,13 +126,26 @@ TEST_F(Selection_Test, Reading_A_Part_Is_Reading_All_And_Leaving_Out)
         request.Columns_Were_Selected = false;
         if (sheet == nullptr)
             continue;  // a line of numbers for names
-        if (Apply_Subset(sheet) != Subset_Result::kept) {
+        if (Apply_Subset(sheet, request.Content_Code) != Subset_Result::kept) {
             EXPECT_TRUE(part.starts_with("13 ")) << text << list << part;
             continue;
         }
         EXPECT_EQ(Check_Sheet(*sheet), "");
         ASSERT_TRUE(Output_Driver_Of("o.tab").write(sheet, Request_Name("o.tab").c_str()));
         EXPECT_TRUE(part.starts_with(Told(0, ""))) << text << list << part;
+    }
+}
+
+TEST_F(Selection_Test, A_List_Is_Read_As_Far_As_Tables_Have_Columns)
+{
+    for (const char* const start : {"2147483647\n", "@names\n"}) {
+        std::string list = start;
+        for (int line = 0; line < 60000; ++line)
+            list += "a=b!\n";
+        Put("f.VAR", list);
+        Read_Var_File(Request_Name("f.VAR"));
+        EXPECT_GE(std::ssize(request.Column_Wanted_Types), Default_Max_Columns);
+        EXPECT_LE(std::ssize(request.Column_Wanted_Types), Default_Max_Columns + 1);
     }
 }
 

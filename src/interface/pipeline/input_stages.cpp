@@ -47,7 +47,7 @@ Request_Status Fetch_Map(Request_Run& run)
 {
     std::string map(request.Qtl_Map_File.view());
     std::string source_url;
-    if (!Fetch_Url(map, "MAP", source_url, run.map_downloaded))
+    if (!Fetch_Url(map, "MAP", source_url, Get_Temp_Folder(), run.map_downloaded))
         return Stop(Request_Status::download_failed, "Could not download map file URL:\n%.500s\n",
                     map.c_str());
     request.Qtl_Map_File = map;
@@ -79,7 +79,7 @@ Request_Status Cut_Input_Options(Request_Run& run)
 Request_Status Fetch_Input(Request_Run& run)
 {
     std::string source_url;
-    if (!Fetch_Url(run.infile, "IN", source_url, run.downloaded))
+    if (!Fetch_Url(run.infile, "IN", source_url, Get_Temp_Folder(), run.downloaded))
         return Stop(Request_Status::download_failed, "Could not download input URL:\n%.500s\n",
                     run.infile.c_str());
     request.Source_Url = source_url;
@@ -191,7 +191,7 @@ Request_Status Read_Merge_Keys(Request_Run& run)
         With_Extension(run.downloaded ? request.Source_Url.view() : std::string_view(run.infile), ".mrg");
     std::string source_url;
     bool downloaded = false;
-    if (!Fetch_Url(name, "MRG", source_url, downloaded))
+    if (!Fetch_Url(name, "MRG", source_url, Get_Temp_Folder(), downloaded))
         return Stop(Request_Status::download_failed, "Could not download merge file URL:\n%.500s\n",
                     name.c_str());
     Input_File file;

@@ -35,7 +35,7 @@ Request_Status Name_Temporary_Output(Request_Run& run)
 /// that is asked for.
 Request_Status Make_Output_Form(Request_Run& run)
 {
-    const bool host_file = run.output_code == spreadsheet_file || run.output_code == book_file;
+    const bool host_file = Is_Host_File(run.output_code);
     if (host_file && !A_Host_File_Was_Read())
         Vector_To_Scalars(Current_Sheet);
     if (request.Output_Matrix && (host_file || run.output_code == script_file))
@@ -76,7 +76,7 @@ Request_Status Write_Output(Request_Run& run)
 
 Request_Status Write_Column_List(Request_Run& run)
 {
-    if (request.Write_Var_List)
+    if (request.Write_Var_List && !run.clipboard_output)  // which has no file to stand beside
         Write_Var_File(*Current_Sheet, With_Extension(run.outfile, ".$V$"));
     return Done;
 }

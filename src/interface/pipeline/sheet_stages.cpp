@@ -111,7 +111,7 @@ Request_Status Keep_Subset(Request_Run& run)
     request.Current_File_Name = run.outfile;
     if (!request.Subset_Columns && !request.Subset_Rows)
         return Done;
-    switch (Apply_Subset(Current_Sheet)) {
+    switch (Apply_Subset(Current_Sheet, request.Content_Code)) {
     case Subset_Result::no_columns:
         return Stop(Request_Status::nothing_selected, No_Columns_Selected);
     case Subset_Result::no_rows:

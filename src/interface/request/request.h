@@ -14,8 +14,9 @@ namespace ingester {
 /// How the result is joined with an existing output.
 enum class Add_Modes : std::int32_t { none = 0, append = 1, concatenate = 2, merge = 3 };
 
-/// Column limit of outputs without one of their own.
+/// Column limit of outputs without one of their own, and that of books, the greatest.
 constexpr std::int32_t Default_Max_Columns = 50000;
+constexpr std::int32_t Book_Max_Columns = 10000000;
 
 /// Among the missing codes: what is missing already.
 constexpr double Star_Code = -1e307;
