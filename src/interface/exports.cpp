@@ -148,6 +148,7 @@ bool Run_Request(const Call_Files& files, Request_Status& status)
         status = Request_Status::no_data;
     }
     Close_Message_File();
+    Free_Sheets();  // the next request may be hours away
     return answer;
 }
 
