@@ -103,6 +103,7 @@ const std::vector<Request> Plain_Requests = {
     {"in\\crops.csv|clipboard.tab"},
     {"in\\none.csv|out\\o.tab", "", "", true},
     {"in\\large.csv/c=2|out\\o.tab", "", "", true},
+    {"in\\none.csv|out\\o.tab|sheet|2:3|none/s"},
     {"in\\crops.csv"},
     {""},
 };
@@ -273,6 +274,24 @@ void Add_Hostile_Requests(std::vector<Request>& requests)
         }
 }
 
+/// What the options of one leave behind would reach the next.
+void Add_Random_Requests(std::vector<Request>& requests)
+{
+    const std::vector<std::string> inputs = {"crops.csv", "more.csv", "none.csv", "void.csv"};
+    const std::vector<std::string> ins = {"/n", "/x=1",   "/c=2:3", "/k",   "/b",   "/o=V", "/z=;", "/lt=1",
+                                          "/u", "/csv=2", "/y",     "/s=1", "/e=2", "/tr",  "/#",   "/g=9"};
+    const std::vector<std::string> outs = {"/n", "/mv=NA", "/d", "/f", "/e", "/h", "/-",
+                                           "/u", "/z",     "/m", "/q", "/b", "/p", "/av"};
+    const std::vector<std::string> endings = {".tab", ".csv", ".txt", ".gen", ".tss"};
+    std::minstd_rand random;
+    const auto one_of = [&](const auto& texts) { return texts[random() % texts.size()]; };
+    for (int i = 0; i < 200; ++i) {
+        std::string records = "in\\" + one_of(inputs) + one_of(ins) + one_of(ins);
+        records += "|out\\o" + one_of(endings) + one_of(outs) + one_of(outs);
+        requests.push_back({records, i % 5 == 0 ? "crops.csv" : ""});
+    }
+}
+
 std::vector<Request> Make_Requests()
 {
     std::vector<Request> requests = Plain_Requests;
@@ -282,6 +301,7 @@ std::vector<Request> Make_Requests()
         if (const std::size_t at = request.records.find("FOLDER"); at != std::string::npos)
             request.records.replace(at, 6, folder);
     Add_Hostile_Requests(requests);
+    Add_Random_Requests(requests);
     return requests;
 }
 
