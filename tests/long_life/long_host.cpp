@@ -2,6 +2,7 @@
 // in a process of its own and leaves the process as it was, and together they leave no memory behind.
 // Usage: ingester_long_host LIBRARY; the variable INGESTER_LONG_REQUESTS holds their number.
 #include <algorithm>
+#include <bit>
 #include <cfenv>
 #include <csignal>
 #include <cstdint>
@@ -130,6 +131,8 @@ void Put(const fs::path& name, const std::string& bytes)
 template <class T> void Add(std::string& bytes, T value)
 {
     bytes.append(reinterpret_cast<const char*>(&value), sizeof value);
+    if constexpr (std::endian::native == std::endian::big)
+        std::reverse(bytes.end() - sizeof value, bytes.end());
 }
 
 std::string Pass_Bytes(std::string_view records)
