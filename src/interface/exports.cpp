@@ -53,8 +53,8 @@ Call_Files Find_Call_Files(const std::string& carrier)
 {
     const std::string temp = Get_Temp_Folder();
     const long pid = Process_Id();
-    const Call_Files by_process = {temp + Format_Text("IG%li.inp", pid), temp + Format_Text("IG%li.out", pid),
-                                   Format_Text("IG%li", pid)};
+    Call_Files by_process = {temp + Format_Text("IG%li.inp", pid), temp + Format_Text("IG%li.out", pid),
+                             Format_Text("IG%li", pid)};
     if (File_Exists(by_process.pass))
         return by_process;
     if (const auto id = static_cast<unsigned long>(Read_Carrier_Id(carrier)); id > 0)
