@@ -354,7 +354,7 @@ Answer Convert(const Conversion& conversion)
 {
     const std::string unfinished = Unfinished_File(conversion.output);
     Remove_On_Signal(unfinished);
-    const Answer answer = Call_Library(conversion);
+    Answer answer = Call_Library(conversion);
     if (!answer.Is_Good() && !unfinished.empty())
         Delete_File(unfinished);
     Remove_On_Signal({});

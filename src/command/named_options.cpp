@@ -55,7 +55,7 @@ bool Is_Quoted(const Given_Option& given)
 std::string Carried_Value(const Given_Option& given)
 {
     const bool path = given.option->named.form == Value_Form::path;
-    const std::string value = path ? Request_Path(given.value) : given.value;
+    std::string value = path ? Request_Path(given.value) : given.value;
     if (!Is_Quoted(given))
         return value;
     const char quote = value.find('\'') == std::string::npos ? '\'' : '"';

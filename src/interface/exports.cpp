@@ -53,8 +53,8 @@ Call_Files Find_Call_Files(const std::string& carrier)
 {
     const std::string temp = Get_Temp_Folder();
     const long pid = Process_Id();
-    const Call_Files by_process = {temp + Format_Text("IG%li.inp", pid), temp + Format_Text("IG%li.out", pid),
-                                   Format_Text("IG%li", pid)};
+    Call_Files by_process = {temp + Format_Text("IG%li.inp", pid), temp + Format_Text("IG%li.out", pid),
+                             Format_Text("IG%li", pid)};
     if (File_Exists(by_process.pass))
         return by_process;
     if (const auto id = static_cast<unsigned long>(Read_Carrier_Id(carrier)); id > 0)
@@ -153,6 +153,7 @@ bool Run_Request(const Call_Files& files, Request_Status& status)
         status = Request_Status::no_data;
     }
     Close_Message_File();
+    Free_Sheets();  // the next request may be hours away
     return answer;
 }
 

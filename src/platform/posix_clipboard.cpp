@@ -16,7 +16,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-extern char** environ;
+extern char** environ;  // NOLINT(readability-redundant-declaration): not every system declares it
 
 namespace ingester {
 

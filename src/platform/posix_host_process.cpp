@@ -116,10 +116,10 @@ void Watch_Ending_Signals()
 void Start_Host_Process()
 {
     // Each stream is opened the wrong way round, so that using it fails as it does when closed.
-    constexpr int Useless_Modes[] = {O_WRONLY, O_RDONLY, O_RDONLY};
+    constexpr int useless_modes[] = {O_WRONLY, O_RDONLY, O_RDONLY};
     for (int stream = 0; stream < 3; ++stream)
         if (::fcntl(stream, F_GETFD) < 0 && errno == EBADF)
-            static_cast<void>(::open("/dev/null", Useless_Modes[stream]));  // takes the lowest free number
+            static_cast<void>(::open("/dev/null", useless_modes[stream]));  // takes the lowest free number
     std::signal(SIGXFSZ, SIG_IGN);
 }
 

@@ -2,7 +2,6 @@
 #include "host_fixture.h"
 
 #include <csignal>
-#include <random>
 
 #include <fcntl.h>
 #include <malloc.h>
@@ -245,72 +244,6 @@ TEST_F(Pipeline_Test, Lack_Of_Memory_Is_A_Fault_Like_Any_Other)
     EXPECT_EQ(Get("old.tab"), "old");
     EXPECT_EQ(Files(), "large.csv old.tab");
 #endif
-}
-
-TEST_F(Pipeline_Test, Calls_Follow_Each_Other_Without_Leftovers)
-{
-    Put("c.csv", Crops);
-    int descriptors = 0;
-    for (int round = 0; round < 20; ++round) {
-        EXPECT_EQ(Convert("c.csv/n/x=1/c=2:3/z=;/o=V", "o.tab/mv=NA/n/d").first, 5);
-        EXPECT_EQ(Call({"none.csv", "o.tab", "sheet", "2:3", "none/s"}).first, 2);
-        EXPECT_EQ(Call_With_Bytes(Pass_Bytes(2, {"c.csv"})).first, 1);
-        std::filesystem::remove(Path(Stem() + ".inp"));
-        EXPECT_EQ(Convert("c.csv", "o.tab"), (Host_Answer{0, ""}));
-        EXPECT_EQ(Get("o.tab"), Crops_Tab);
-        if (round == 0)
-            descriptors = Descriptors();
-    }
-    EXPECT_EQ(Descriptors(), descriptors);
-    EXPECT_EQ(Files(), "c.csv o.tab");
-}
-
-/// A thousand requests, each in a process of its own first and then all in this one: nothing of a request
-/// reaches the next.
-TEST_F(Pipeline_Test, Requests_In_One_Process_Are_Those_Of_Many)
-{
-    constexpr std::string_view inputs[] = {"c.csv", "d.csv", "none.csv", "empty.csv"};
-    constexpr std::string_view ins[] = {"/n", "/x=1", "/c=2:3", "/k", "/b",   "/o=V", "/z=;", "/lt=1",
-                                        "/w", "/u",   "/csv=2", "/y", "/s=1", "/e=2", "/tr",  "/#"};
-    constexpr std::string_view outs[] = {"/n", "/mv=NA", "/d", "/f", "/e", "/h",
-                                         "/-", "/u",     "/z", "/m", "/av"};
-    constexpr std::string_view endings[] = {".tab", ".csv", ".txt"};
-    Put("c.csv", Crops);
-    Put("d.csv", "a!,b:2\n 1.50,\n,\n'x y',1e10\n");
-    Put("empty.csv", "a,b\n,\n");
-    std::minstd_rand random;
-    const auto some = [&](auto& options) {
-        std::string text;
-        for (auto count = random() % 4; count > 0; --count)
-            text += options[random() % std::size(options)];
-        return text;
-    };
-    std::vector<std::pair<std::string, std::string>> requests;
-    for (int i = 0; i < 1000; ++i)
-        requests.emplace_back(std::string(inputs[random() % 4]) + some(ins),
-                              std::string("o") + std::string(endings[random() % 3]) + "/z" + some(outs));
-    const auto run = [&](const std::pair<std::string, std::string>& strings) {
-        const auto [status, messages] = Convert(strings.first, strings.second);
-        const std::string output = "o" + strings.second.substr(1, 4);
-        const std::string all = std::to_string(status) + messages + Get(output);
-        std::filesystem::remove(Path(output));
-        return all;
-    };
-    for (std::size_t i = 0; i < requests.size(); ++i) {
-        if (const ::pid_t child = ::fork(); child == 0) {
-            Put("answer" + std::to_string(i), run(requests[i]));
-            ::_exit(0);
-        } else {
-            ::waitpid(child, nullptr, 0);
-        }
-    }
-    int succeeded = 0;
-    for (std::size_t i = 0; i < requests.size(); ++i) {
-        const std::string all = run(requests[i]);
-        succeeded += all.starts_with('0') ? 1 : 0;
-        EXPECT_EQ(all, Get("answer" + std::to_string(i))) << requests[i].first << " " << requests[i].second;
-    }
-    EXPECT_GT(succeeded, 200);
 }
 
 TEST_F(Pipeline_Test, Hostile_Texts_End_In_Good_Time)

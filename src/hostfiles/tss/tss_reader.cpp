@@ -243,7 +243,7 @@ bool Set_Row_Marks(TSS_Reading& reading)
     if (!Need_Rows(&sheet))
         return false;
     Row_Node* row = sheet.first_row;
-    for (const std::int8_t mark : reading.row_marks) {
+    for (const std::uint8_t mark : reading.row_marks) {
         if (row == nullptr)
             break;
         row->restricted = mark;

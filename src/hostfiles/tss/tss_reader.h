@@ -22,7 +22,7 @@ struct TSS_Reading {
     Row_Selection rows = {};
     Column_Subset subset = {};
     bool selects_columns = false;
-    std::vector<std::int8_t> row_marks = {};  ///< of the rows kept
+    std::vector<std::uint8_t> row_marks = {};  ///< of the rows kept
     Memory_Ahead ahead = {};
     bool colours_corrupt = false;  ///< a record of colours or the like was
 };

@@ -493,13 +493,13 @@ bool Fill_TSS_Column(TSS_Reading& reading, Column& column, const Column_Record& 
 
 bool Read_TSS_Row_Marks(TSS_Reading& reading, std::int32_t count)
 {
-    std::vector<std::int8_t> marks;
+    std::vector<std::uint8_t> marks;
     for (std::int32_t row = 0; row < count; ++row) {
         std::int32_t mark;
         if (!reading.source.Read_Count(mark) || mark > 1)
             return false;
         if (reading.rows.Keeps(row))
-            marks.push_back(static_cast<std::int8_t>(mark));
+            marks.push_back(static_cast<std::uint8_t>(mark));
     }
     reading.row_marks = std::move(marks);
     return true;

@@ -122,7 +122,8 @@ void Spread_New_Cells(Column& column, const std::vector<Merged_Row>& plan, std::
             before->next = cell;
         before = cell;
     }
-    before->next = nullptr;
+    if (before != nullptr)
+        before->next = nullptr;
     column.last_cell = before;
     column.cursor_node = nullptr;
     column.cursor_index = -1;

@@ -230,9 +230,7 @@ Sort_Key Source_Key(const Column& target, const Column& source, Cell_Transfer& t
         key.width = std::max(key.width, target.type == long_text_column ? Long_Text_Width : Text_Cell_Width);
         return key;
     }
-    if (source.type != factor_column)
-        Unite_Missing(source, target.sheet->missing_value, key);
-    else if (source.level_values_count < 1)
+    if (source.type != factor_column || source.level_values_count < 1)
         Unite_Missing(source, target.sheet->missing_value, key);
     else
         for (double& number : key.numbers)
