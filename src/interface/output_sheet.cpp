@@ -53,15 +53,7 @@ bool Find_Output_Sheet(const std::string& output_name)
 {
     const std::string wanted = Wanted_Sheet();
     if (!File_Exists(output_name))
-<<<<<<< HEAD
         return true;
-    if (wanted.empty() && !request.Worksheet_Name.empty() && request.Worksheet_Name.view() != Only_Sheet) {
-        request.Update_Sheet_Name = request.Worksheet_Name;
-        return true;
-    }
-=======
-        return false;
->>>>>>> h-c6
     // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
     const bool several =
         Ends_Ignoring_Case(output_name, ".gz") || Output_Driver_Of(output_name).sheet_names != nullptr;
@@ -82,13 +74,8 @@ bool Find_Output_Sheet(const std::string& output_name)
     if (request.Add_Mode == Add_Modes::none && request.Source_Key_Given)
         Update_Sheet(wanted.empty() ? std::string_view(listed->front()) : wanted, wanted.empty());
     else
-<<<<<<< HEAD
-        Use_First_Sheet(*listed, output_name);
-    return true;
-=======
         Use_First_Sheet(*listed, wanted, output_name);
-    return false;
->>>>>>> h-c6
+    return true;
 }
 
 }  // namespace ingester

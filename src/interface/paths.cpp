@@ -211,19 +211,11 @@ bool Fetch_Url(std::string& name, std::string_view label, std::string& source_ur
     if (!Is_Url(name))
         return true;
     std::string url = name;
-<<<<<<< HEAD
-    std::replace(url.begin(), url.begin() + static_cast<std::ptrdiff_t>(std::min(url.size(), longest)), '\\',
-                 '/');
-    std::string scratch =
-        Get_Temp_Folder().append(label).append(request.Scratch_Stem).append(Scratch_Extension(name));
-    if (!Download(url, scratch, Limits_Of_Host()))
-=======
     std::replace(url.begin(),
                  url.begin() + static_cast<std::ptrdiff_t>(std::min(url.size(), Long_Name_Width)), '\\', '/');
-    const std::string scratch =
+    std::string scratch =
         std::string(temp_folder).append(label).append(request.Scratch_Stem).append(Scratch_Extension(name));
     if (!Download(url, scratch, Limits_Of_Host(temp_folder)))
->>>>>>> h-c6
         return false;
     source_url = std::move(url);
     name = std::move(scratch);  // nothing may fail from here to the mark that has it deleted

@@ -77,7 +77,7 @@ std::string With_Escaped_Blanks(const std::string& url)
 void Set_Up_Transfer(CURL* transfer, const std::string& url, const Download_Limits& limits,
                      Arriving_File& target)
 {
-    curl_easy_setopt(transfer, CURLOPT_URL, With_Escaped_Blanks(url).c_str());
+    curl_easy_setopt(transfer, CURLOPT_URL, url.c_str());
     curl_easy_setopt(transfer, CURLOPT_PROTOCOLS_STR, "ftp,http,https,file");
     curl_easy_setopt(transfer, CURLOPT_REDIR_PROTOCOLS_STR, "ftp,http,https");
     curl_easy_setopt(transfer, CURLOPT_FOLLOWLOCATION, 1L);
@@ -97,11 +97,12 @@ bool Download(const std::string& url, std::string_view scratch_name, const Downl
 {
     static const bool ready = curl_global_init(CURL_GLOBAL_DEFAULT) == CURLE_OK;
     const Broken_Pipes_Held held;  // to the end of the transfer's life, which may send a last word
+    const std::string escaped = With_Escaped_Blanks(url);  // nothing may fail for want of memory from here on
     const std::unique_ptr<CURL, Curl_Deleter> transfer(ready ? curl_easy_init() : nullptr);
     Arriving_File target{Output_File(), limits.bytes};
     if (transfer == nullptr || !target.file.Open_Scratch(scratch_name))
         return false;
-    Set_Up_Transfer(transfer.get(), url, limits, target);
+    Set_Up_Transfer(transfer.get(), escaped, limits, target);
     const bool good = curl_easy_perform(transfer.get()) == CURLE_OK;
     if (target.file.Close() && good)
         return true;
