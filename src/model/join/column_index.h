@@ -1,16 +1,17 @@
 // Columns by name, for many look-ups.
 #pragma once
 
-#include "model/sheet.h"
+#include "model/names.h"
 
-#include <string>
+#include <cstddef>
+#include <functional>
 #include <string_view>
 #include <unordered_map>
 
 namespace ingester {
 
 /// Finds what `Find_Column` finds, however wide the Sheet is; and each Column once, since one Column takes
-/// no more than one other.
+/// no more than one other. Columns keep their names as long as it lives.
 class Column_Index {
 public:
     explicit Column_Index(const Sheet& sheet);
@@ -22,7 +23,15 @@ public:
     void Remove(const Column& column);
 
 private:
-    std::unordered_map<std::string, Column*> columns_;
+    struct Parts_Hash {
+        std::size_t operator()(const Telling_Parts& parts) const
+        {
+            const std::hash<std::string_view> hash;
+            return hash(parts.stem) + 31 * hash(parts.suffix);
+        }
+    };
+
+    std::unordered_map<Telling_Parts, Column*, Parts_Hash> columns_;
 };
 
 }  // namespace ingester
