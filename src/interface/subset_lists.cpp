@@ -23,16 +23,11 @@ long Read_List_Count(Input_File& file)
     return file.Read_Line(line, Count_Line_Width) ? Leading_Integer(line) : 0;
 }
 
-bool Unreadable(const Input_File& file)
-{
-    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
-}
-
 /// A list that was read to its end has done its service.
 bool Finish_List(Input_File& file)
 {
     if (!file.Close())
-        return Unreadable(file);
+        return Fail_To_Read(file.Name());
     Delete_File(file.Name());
     return true;
 }
@@ -43,7 +38,7 @@ bool Read_Column_Subset(std::string_view name)
 {
     Input_File file;
     if (!file.Open(name))
-        return Unreadable(file);
+        return Fail_To_Read(file.Name());
     const long count = std::min<long>(Read_List_Count(file), Book_Max_Columns);
     std::string line;
     const bool has_kind = file.Read_Line(line, Count_Line_Width);
@@ -60,7 +55,7 @@ bool Read_Row_Subset(std::string_view name)
 {
     Input_File file;
     if (!file.Open(name))
-        return Unreadable(file);
+        return Fail_To_Read(file.Name());
     const long count = Read_List_Count(file);
     std::string line;
     request.Subset_Row_Flags.clear();

@@ -64,11 +64,6 @@ std::pair<std::string, std::string> Split_Entry(std::string_view line)
     return {std::string(Trim_Copy(line.substr(0, equals))), std::string(Trim_Copy(changed))};
 }
 
-bool Unreadable(const Input_File& file)
-{
-    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
-}
-
 }  // namespace
 
 bool Read_Var_File(std::string_view file_name)
@@ -77,10 +72,10 @@ bool Read_Var_File(std::string_view file_name)
     if (!File_Exists(file_name))
         return true;
     if (!file.Open(file_name))
-        return Unreadable(file);
+        return Fail_To_Read(file.Name());
     const Var_List list = Load_Var_List(file);
     if (!file.Close())
-        return Unreadable(file);
+        return Fail_To_Read(file.Name());
     std::vector<std::int32_t> types;
     std::vector<std::string> names;
     for (const std::string& line : list.lines) {
@@ -268,7 +263,8 @@ void Apply_By_Name(Sheet& sheet, const Var_List& list)
 bool Apply_Var_File(Sheet* sheet, std::string_view file_name)
 {
     Input_File file;
-    return (file.Open(file_name) && Apply_Var_List(*sheet, file) && file.Close()) || Unreadable(file);
+    return (file.Open(file_name) && Apply_Var_List(*sheet, file) && file.Close())
+           || Fail_To_Read(file.Name());
 }
 
 bool Apply_Var_List(Sheet& sheet, Input_File& file)

@@ -298,7 +298,7 @@ bool Read_TSS(Input_File& file)
     TSS_Reading reading{.source = TSS_Source(file)};
     const bool read = Read_Sheet(reading);
     if (file.Failed())  // which is no short file
-        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+        return Fail_To_Read(file.Name());
     if (!read)
         return false;
     Current_Sheet = reading.sheet;

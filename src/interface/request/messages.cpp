@@ -74,6 +74,11 @@ bool Fail(std::string_view text)
     return false;
 }
 
+bool Fail_To_Read(const std::string& file_name)
+{
+    return Fail("Error: Could not read all of file %.500s.\n", file_name.c_str());
+}
+
 void Report_In_Fault(std::string_view text, bool ending)
 {
     if (!ending) {

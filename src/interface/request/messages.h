@@ -3,6 +3,7 @@
 
 #include "support/text.h"
 
+#include <string>
 #include <string_view>
 
 namespace ingester {
@@ -23,6 +24,9 @@ template <class First, class... Rest> bool Fail(const char* format, First first,
     Report_Message(Format_Text(format, first, rest...));
     return false;
 }
+
+/// Reports that a file, or a list, could not be read to its end. Always false.
+bool Fail_To_Read(const std::string& file_name);
 
 /// Ends the request's messages: closes the file, behind the mark the host looks for.
 void Close_Message_File();

@@ -257,7 +257,7 @@ bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Tex
     if (range.first > range.last)
         return Fail("Error: First line > Last line in cell range.\n");
     if (!image.Load(file))
-        return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+        return Fail_To_Read(file.Name());
     if (image.Size() == 0)
         return true;
     rewritten = !Keeps_Every_Line(range);

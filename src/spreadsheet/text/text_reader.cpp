@@ -105,7 +105,7 @@ bool Read_CSV(Input_File& file)
     if (!changed && !image.Changed())
         return good;
     Current_Sheet = earlier;
-    return Fail("Error: Could not read all of file %.500s.\n", file.Name().c_str());
+    return Fail_To_Read(file.Name());
 }
 
 bool Read_CSV_File(const char* file_name)
