@@ -97,7 +97,11 @@ TEST_F(Clipboard_Test, Converts_Its_Text)
     };
     for (const auto& [carried, text] : cases) {
         Put("carried", head + carried);
-        ASSERT_EQ(std::system(("xclip -selection clipboard -i <" + Path("carried")).c_str()), 0);
+        // The owner before may still answer for a moment.
+        const std::string xclip = "xclip -selection clipboard ";
+        const std::string put = xclip + "-i <" + Path("carried") + "; for wait in $(seq 100); do " + xclip
+                                + "-o | cmp -s - " + Path("carried") + " && exit 0; sleep 0.05; done; exit 1";
+        ASSERT_EQ(std::system(put.c_str()), 0);
         EXPECT_EQ(Call({"clipboard.csv", Request_Name("o.csv") + "/h/-"}), (Host_Answer{0, Took}));
         EXPECT_EQ(Get("o.csv"), head + text);
     }
