@@ -120,8 +120,9 @@ Request_Status Keep_Stream(Request_Run& run)
                            .append(run.infile.substr(Extension_Start(run.infile)));
     run.source_name = std::exchange(run.infile, std::move(copy));
     run.kept_stream = true;
-    if (!Copy_File(run.source_name, run.infile))
-        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
+    if (!Copy_File(run.source_name, run.infile, Scratch_Room(Get_Temp_Folder())))
+        return Stop(Request_Status::input_unreadable,
+                    "Input could not be read to its end and kept in the temporary folder.\n");
     return Done;
 }
 
