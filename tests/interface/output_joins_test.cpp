@@ -125,6 +125,10 @@ TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
     Put("one.csv", "plot\n1\n");
     Put("two.mrg", "2\nplot\n");
     Put("two.csv", "plot\n1\n");
+    Put("gap.csv", "plot\n1\n");
+    Put("gap.mrg", "2\nplot\n\n");
+    Put("five.csv", "plot\n1\n");
+    Put("five.mrg", "5\nplot\nx\nx\nx\nx\n");
     Put("zip.csv", "PK\3\4");
     Put("none.csv", "");
     Put("odd.csv", std::string("\1\2\3\4", 4));
@@ -136,7 +140,12 @@ TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
         {"n.csv", "o.csv/%=1", 17, "Merge key absent in WITH not found in OUTFILE.\n" + merged},
         {"m.csv", "o.csv/%=1", 17, "Merge key absent in MATCH not found in " + f + "o.csv.\n" + merged},
         {"t.csv", "o.csv/%=1", 17, "Columns kind and plot data types do not match.\n" + merged},
-        {"two.csv", "o.csv/%=2", 17, merged},
+        {"two.csv", "o.csv/%=2", 17, "Merge columns not found in files.\n"},
+        {"gap.csv", "o.csv/%=2", 17, "Merge columns not found in files.\n"},
+        {"five.csv", "o.csv/%=5", 17,
+         "Warning: A merge has four keys at the most; the first four of 5 were used.\n"
+         "Merge key x in WITH not found in OUTFILE.\n"
+             + merged},
         {"n.csv", "absent.csv/@", 2, "Input file could not be opened.\n" + appended},
         {"n.csv", "none.csv/&", 2, "Input file is empty.\n" + concatenated},
         {"n.csv", "odd.csv/%", 3, merged},
