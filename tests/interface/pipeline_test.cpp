@@ -72,6 +72,7 @@ TEST_F(Pipeline_Test, Converts)
         {sparse, "c.csv", "o.tab", "o.tab", "a\r\n1\r\n3\r\n"},
         {sparse, "c.csv/k", "o.tab/e", "o.tab", "a\tb\r\n1\t*\r\n*\t*\r\n3\t*\r\n"},
         {"a,b\n,\n,\n", "c.csv/k", "o.tab", "o.tab", "a\tb\r\n*\t*\r\n", empty_words},
+        {"a,b\n1,*\n2,3\n", "c.csv", "o.csv/h/mv=','", "o.csv", "a,b\r\n1,\",\"\r\n2,3\r\n"},
         {nul, "c.csv", "o.tab", "o.tab", "a\tb\r\n1\tx y\r\n", nul_words},
         {"a,b,c\n1\n2,3\n", "c.csv", "o.txt/rewrite=3", "o.txt", "a,b,c\n1,2,3\n", "", 7},
         {"m!,d!\nMar,10\nJan,30\n", "c.csv", "o.csv/n", "o.csv", " \"Mar\", 10\r\n \"Jan\", 30\r\n"},
