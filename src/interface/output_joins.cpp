@@ -7,6 +7,8 @@
 #include "model/join/append.h"
 #include "model/join/concatenate.h"
 #include "model/join/merge.h"
+#include "platform/files.h"
+#include "spreadsheet/text/text.h"
 
 #include <algorithm>
 #include <utility>
@@ -47,6 +49,15 @@ private:
     Request_Globals asked_;
 };
 
+/// Only a text in columns of fixed width can lose its cells' places.
+bool Cells_Have_Shifted(const std::string& path)
+{
+    Input_File file;
+    const Format_Driver& driver = Output_Driver_Of(path);
+    return driver.code == text_file && driver.extensions.empty() && file.Open(path)
+           && !Fields_Stand_In_Columns(file);
+}
+
 /// The Sheet in an existing output becomes the `Current_Sheet`. `refused` when it lacks a part of the file,
 /// which the result would replace.
 Request_Status Read_Output(const std::string& path, Request_Status refused)
@@ -66,6 +77,8 @@ Request_Status Read_Output(const std::string& path, Request_Status refused)
     }
     if (!Read_Data_File(path, type, path) || Current_Sheet == nullptr)
         return Request_Status::no_data;
+    if (request.Left_Unread == nullptr && Cells_Have_Shifted(path))
+        request.Left_Unread = "texts with blanks, or empty ones, have put its cells out of their columns";
     if (request.Left_Unread != nullptr) {
         Report_Message_Text("Error: The output was left as it is, since %s.\n", request.Left_Unread);
         return refused;

@@ -181,6 +181,8 @@ TEST_F(Output_Joins, That_Would_Lose_Old_Data_Are_Refused)
         {"a t b\n1 x 2\n3   4\n", "o.txt", 13,
          kept + "its lines differ in their number of fields.\n" + appended},
         {"a\n1\n2 3\n", "o.txt", 13, kept + "its lines differ in their number of fields.\n" + appended},
+        {" a   t  u\n 1 a b   \n 2 xyz yy\n", "o.txt", 13,
+         kept + "texts with blanks, or empty ones, have put its cells out of their columns.\n" + appended},
         {"\"a\" \"t\"\n1 x\n", "o.txt", 13, kept + "lines in quotes at its head would be lost.\n" + appended},
         {"a t\n1 x\n", "o.txt", 6,
          kept
