@@ -5,8 +5,9 @@
  * INGESTER, and reads the answer from the same folder. With <pid> the number of the calling process:
  *
  *   IG<pid>.inp   the request ("pass file"), written by the host, deleted by the library unless it
- *                 is faulty
- *   IG<pid>.out   the result: a 32-bit status and a 32-bit 0
+ *                 is faulty or its secondary file can't be fetched
+ *   IG<pid>.out   the result: a 32-bit status and a 32-bit 0; absent when a secondary file that a URL
+ *                 names can't be fetched
  *   IG<pid>.ERR   messages for the user; absent when there are none, else closed by a line ":"
  *
  * A pass file is little-endian: a double, the number of arguments (2 to 6); then as many text
@@ -45,7 +46,7 @@ enum ingester_status {
     INGESTER_CLIPBOARD_FAILED = 9,
     INGESTER_RENAME_FAILED = 10, /* the finished output could not take its name */
     INGESTER_ZIP_UNSUPPORTED = 11,
-    INGESTER_NOTHING_SELECTED = 13, /* no columns or rows selected */
+    INGESTER_NOTHING_SELECTED = 13, /* no columns or rows selected, or data could not be appended */
     INGESTER_QTL_FAILED = 14,
     INGESTER_CONCATENATE_FAILED = 15, /* the tables can't stand beside each other */
     INGESTER_QTL_OPTIONS = 16,
@@ -63,7 +64,8 @@ enum ingester_status {
  *                they are ingester.inp, ingester.out and TxtToNum.ERR
  *   result_name  replaces the name of the result file
  *
- * Always returns 0: success or failure is in the result file.
+ * Always returns 0: success or failure is in the result file, and failure to fetch a secondary file is that
+ * there is none.
  */
 INGESTER_EXPORT int32_t INGESTER(const char* pass_name, const char* result_name, int32_t pass_name_length,
                                  int32_t result_name_length);

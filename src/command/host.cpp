@@ -63,7 +63,8 @@ std::string Packed_Option(const Command_Options& options, std::string_view outpu
 {
     constexpr std::string_view packed = "/h";
     const bool comma_text = Ends_Ignoring_Case(output, ".csv");
-    const bool said = options.padded || options.output_options.find(packed) != std::string::npos;
+    const bool said = options.padded || options.output_options.find(packed) != std::string::npos
+                      || options.output_options.find("/rewrite=") != std::string::npos;
     return comma_text && !said ? std::string(packed) : std::string();
 }
 
@@ -144,6 +145,11 @@ bool Output_Makes_Sense(const Conversion& conversion)
         refusal =
             "a table that is joined with a sheet takes the place and the name of that; leave --add-sheet, "
             "--replace-sheet and --sheet-name out, and choose the sheet by --update-sheet";
+    else if (conversion.Joins() && Options_Keep_Columns(conversion.options.input_options))
+        refusal = "--columns would act on the joined table, and take columns of the old one away; "
+                  "choose those of the input by --keep";
+    else if (conversion.To_Standard_Output() && Options_Print_Summary(conversion.options.input_options))
+        refusal = "the summary would stand in the table; name a file, or run 'ingester summary'";
     if (refusal != nullptr)
         Say(conversion.output.native, refusal);
     return refusal == nullptr;
@@ -224,9 +230,9 @@ std::vector<std::string> Request_Records(const Conversion& conversion)
     const Choice_Lists& lists = conversion.lists;
     const bool chosen = !lists.columns.empty() || !lists.rows.empty();
     const std::string change = lists.changes.empty() ? "" : "/v";
-    // In front of the options that were written as they stand: a pointer's name takes all that follows it.
+    // In front of the options that were written as they stand: a value without an end takes all that follows.
     std::vector<std::string> records = {conversion.input.request + change + options.input_options,
-                                        output + options.output_options + Packed_Option(options, output)};
+                                        output + Packed_Option(options, output) + options.output_options};
     if (chosen || !options.sheet.empty() || !options.range.empty())
         records.push_back(options.sheet);
     if (chosen || !options.range.empty())

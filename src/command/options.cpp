@@ -88,7 +88,8 @@ std::string Check_Slash_Options(const std::string& text)
     return text.empty() || text.front() == '/' ? "" : "options begin with '/', as in '/csv=2/n'";
 }
 
-/// Behind those that were written as they stand: a pointer's name takes all that follows it.
+/// In front of those that were written as they stand, where a value without an end takes all that follows;
+/// but a pointer's name does so, too.
 bool Add_Named_Options(Command_Options& options)
 {
     const std::string fault = Fault_Of_Options(options.named_input_options);
@@ -104,8 +105,10 @@ bool Add_Named_Options(Command_Options& options)
                          std::string(key).c_str());
             return false;
         }
-    options.input_options += Spell_Options(options.named_input_options);
-    options.output_options += Spell_Options(options.named_output_options);
+    const std::string named = Spell_Options(options.named_input_options);
+    const bool takes_the_rest = named.find("/p=") != std::string::npos;
+    options.input_options.insert(takes_the_rest ? options.input_options.size() : 0, named);
+    options.output_options.insert(0, Spell_Options(options.named_output_options));
     return true;
 }
 
@@ -125,7 +128,7 @@ bool Add_Merge_Option(Command_Options& options, const Merge_Choice& merge)
         std::fprintf(stderr, "ingester: --merge: %s\n", fault);
         return false;
     }
-    options.output_options += Merge_Option(options.merge_keys.size(), merge);
+    options.output_options.insert(0, Merge_Option(options.merge_keys.size(), merge));
     return true;
 }
 

@@ -95,6 +95,17 @@ std::string Fault_Of_Name(std::string_view native)
 
 namespace {
 
+/// Whether input options, once they are taken, make `asked` true.
+template <class Asked> bool Input_Options_Ask_For(std::string_view options, Asked asked)
+{
+    std::string rest(options);
+    Cut_Options(Genotype_Options(), rest);
+    Cut_Options(Input_Options(), rest);
+    const bool result = asked();
+    request = Request_Globals{};
+    return result;
+}
+
 /// Whether output options, once they are taken, make `asked` true.
 template <class Asked> bool Options_Ask_For(std::string_view options, Asked asked)
 {
@@ -123,6 +134,17 @@ bool Options_Name_Joined_Sheet(std::string_view options)
 {
     return Options_Ask_For(
         options, [] { return request.Add_Mode != Add_Modes::none && !request.Output_Sheet_Name.empty(); });
+}
+
+bool Options_Keep_Columns(std::string_view options)
+{
+    return Input_Options_Ask_For(
+        options, [] { return request.First_Column > 0 || request.Last_Column < Every_Column; });
+}
+
+bool Options_Print_Summary(std::string_view options)
+{
+    return Input_Options_Ask_For(options, [] { return request.Print_Summary && !request.List_Sheets_Only; });
 }
 
 std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)

@@ -25,6 +25,12 @@ struct Sent_Name {
 /// The output options give a name to a sheet although the result keeps that of the sheet it is joined with.
 [[nodiscard]] bool Options_Name_Joined_Sheet(std::string_view options);
 
+/// The input options keep a range of columns.
+[[nodiscard]] bool Options_Keep_Columns(std::string_view options);
+
+/// The input options ask for a summary on standard output.
+[[nodiscard]] bool Options_Print_Summary(std::string_view options);
+
 /// `message` with the request form of both names turned into the native one: in full, cut short as
 /// messages cut long names, without extension, or the folder alone. All else stays.
 [[nodiscard]] std::string With_Native_Names(std::string_view message, const Sent_Name& input,

@@ -3,6 +3,7 @@
 #include "interface/file_detection.h"
 #include "interface/format_drivers.h"
 #include "interface/request/messages.h"
+#include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/gzip_file.h"
@@ -55,7 +56,7 @@ bool Decompress_To(const std::string& scratch, const char* file_name)
         return Fail("Cannot open compressed file.\n");
     if (!plain.Open_Scratch(scratch))
         return Fail("Temporary file for decompressing could not be made.\n");
-    if (!Decompress(packed, plain, Free_Space(Get_Temp_Folder()) / 10 * 9))
+    if (!Decompress(packed, plain, Scratch_Room(Get_Temp_Folder())))
         return false;
     if (!plain.Close())
         return Fail("Temporary file for decompressing could not be written.\n");
@@ -65,12 +66,13 @@ bool Decompress_To(const std::string& scratch, const char* file_name)
 bool Read_Compressed_File(const char* file_name)
 {
     const Scratch_File scratch(Decompressed_Name(file_name));
+    const std::string source_name(request.Current_File_Name);
     if (!Decompress_To(scratch.Name(), file_name))
         return false;
     const std::int32_t type = Detect_File_Type(scratch.Name());
     if (type == compressed_file)
         return Fail("Compressed file holds another compressed file. Decompress it first.\n");
-    return Read_Data_File(scratch.Name(), type, file_name);
+    return Read_Data_File(scratch.Name(), type, source_name);
 }
 
 }  // namespace ingester

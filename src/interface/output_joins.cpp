@@ -7,6 +7,8 @@
 #include "model/join/append.h"
 #include "model/join/concatenate.h"
 #include "model/join/merge.h"
+#include "platform/files.h"
+#include "spreadsheet/text/text.h"
 
 #include <algorithm>
 #include <utility>
@@ -30,6 +32,7 @@ public:
         // As an output of these options was written before:
         own.Missing_Input_Text = asked_.Missing_Text.view();
         own.No_Names = asked_.Omit_Header;
+        own.Names_Given = asked_.Names_Given && !asked_.Omit_Header;
         request = std::move(own);
     }
     Output_Reading(const Output_Reading&) = delete;
@@ -46,8 +49,18 @@ private:
     Request_Globals asked_;
 };
 
-/// The Sheet in an existing output becomes the `Current_Sheet`.
-Request_Status Read_Output(const std::string& path)
+/// Only a text in columns of fixed width can lose its cells' places.
+bool Cells_Have_Shifted(const std::string& path)
+{
+    Input_File file;
+    const Format_Driver& driver = Output_Driver_Of(path);
+    return driver.code == text_file && driver.extensions.empty() && file.Open(path)
+           && !Fields_Stand_In_Columns(file);
+}
+
+/// The Sheet in an existing output becomes the `Current_Sheet`. `refused` when it lacks a part of the file,
+/// which the result would replace.
+Request_Status Read_Output(const std::string& path, Request_Status refused)
 {
     const Output_Reading reading;
     Current_Sheet = nullptr;
@@ -64,6 +77,12 @@ Request_Status Read_Output(const std::string& path)
     }
     if (!Read_Data_File(path, type, path) || Current_Sheet == nullptr)
         return Request_Status::no_data;
+    if (request.Left_Unread == nullptr && Cells_Have_Shifted(path))
+        request.Left_Unread = "texts with blanks, or empty ones, have put its cells out of their columns";
+    if (request.Left_Unread != nullptr) {
+        Report_Message_Text("Error: The output was left as it is, since %s.\n", request.Left_Unread);
+        return refused;
+    }
     return Request_Status::success;
 }
 
@@ -110,7 +129,8 @@ bool Find_Keys(Merge_Request& wanted, const std::string& path)
 
 Request_Status Concatenate_With_Output(Sheet* sheet, const std::string& path)
 {
-    if (const Request_Status status = Read_Output(path); status != Request_Status::success)
+    if (const Request_Status status = Read_Output(path, Request_Status::concatenate_failed);
+        status != Request_Status::success)
         return status;
     if (sheet->column_count < 1)
         return Request_Status::no_data;
@@ -120,7 +140,8 @@ Request_Status Concatenate_With_Output(Sheet* sheet, const std::string& path)
 
 Request_Status Append_To_Output(Sheet* sheet, const std::string& path)
 {
-    if (const Request_Status status = Read_Output(path); status != Request_Status::success)
+    if (const Request_Status status = Read_Output(path, Request_Status::nothing_selected);
+        status != Request_Status::success)
         return status;
     const Append_Request wanted{.source = sheet,
                                 .by_name = request.Keep_Sorted,
@@ -131,7 +152,8 @@ Request_Status Append_To_Output(Sheet* sheet, const std::string& path)
 
 Request_Status Merge_With_Output(Sheet* sheet, const std::string& path)
 {
-    if (const Request_Status status = Read_Output(path); status != Request_Status::success)
+    if (const Request_Status status = Read_Output(path, Request_Status::merge_failed);
+        status != Request_Status::success)
         return status;
     Merge_Request wanted;
     wanted.target = Current_Sheet;

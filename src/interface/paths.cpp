@@ -198,7 +198,7 @@ Download_Limits Limits_Of_Host(const std::string& temp_folder)
     Download_Limits limits;
     limits.connect_seconds = Read_Host_Setting("Download", "ConnectSeconds", 1, longest, 30);
     limits.total_seconds = Read_Host_Setting("Download", "TotalSeconds", 1, longest, 1800);
-    limits.bytes = Free_Space(temp_folder) / 10 * 9;
+    limits.bytes = Scratch_Room(temp_folder);
     return limits;
 }
 

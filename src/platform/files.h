@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <span>
 #include <string>
@@ -144,8 +145,10 @@ private:
     std::unique_ptr<Write_Behind> behind_;  ///< of a large file
 };
 
-/// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails.
-[[nodiscard]] bool Copy_File(std::string_view from, std::string_view to);
+/// Copies all bytes of `from` into the scratch file `to`. False, and no copy, when either fails or there are
+/// more than `most`.
+[[nodiscard]] bool Copy_File(std::string_view from, std::string_view to,
+                             std::uint64_t most = std::numeric_limits<std::uint64_t>::max());
 
 /// Deletes the named file when it goes out of sight.
 class Scratch_File {

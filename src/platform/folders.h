@@ -27,8 +27,9 @@ namespace ingester {
 [[nodiscard]] bool File_Exists(std::string_view name);
 [[nodiscard]] bool Folder_Exists(std::string_view name);
 
-/// Bytes that may still be written in a folder; 0 when that can't be told.
-[[nodiscard]] std::uint64_t Free_Space(std::string_view folder);
+/// Bytes that one scratch file may take in a folder: not all that is free, since others need the disk as
+/// well; 0 when that can't be told.
+[[nodiscard]] std::uint64_t Scratch_Room(std::string_view folder);
 
 /// Something of that name exists that is no file on a disk: a device, a pipe, a socket.
 [[nodiscard]] bool Is_Special_File(std::string_view name);

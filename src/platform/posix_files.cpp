@@ -384,7 +384,7 @@ bool Output_File::Close()
     return !failed_;
 }
 
-bool Copy_File(std::string_view from, std::string_view to)
+bool Copy_File(std::string_view from, std::string_view to, std::uint64_t most)
 {
     constexpr std::size_t block_size = std::size_t{1} << 20;
     Input_File source;
@@ -392,9 +392,14 @@ bool Copy_File(std::string_view from, std::string_view to)
     const auto block = std::make_unique_for_overwrite<char[]>(block_size);
     if (!source.Open(from) || !target.Open_Scratch(to))
         return false;
-    while (const std::size_t got = source.Read(block.get(), block_size))
+    std::uint64_t copied = 0;
+    while (const std::size_t got = source.Read(block.get(), block_size)) {
+        copied += got;
+        if (copied > most || target.Failed())
+            break;
         target.Write(block.get(), got);
-    const bool good = target.Close() && source.Close();
+    }
+    const bool good = target.Close() && source.Close() && copied <= most;
     if (!good)
         Delete_File(to);
     return good;

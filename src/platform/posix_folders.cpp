@@ -95,12 +95,12 @@ bool Folder_Exists(std::string_view name)
     return Look_At(name, facts) && S_ISDIR(facts.st_mode);
 }
 
-std::uint64_t Free_Space(std::string_view folder)
+std::uint64_t Scratch_Room(std::string_view folder)
 {
     struct statvfs space;
     if (::statvfs(Native_Path(folder).c_str(), &space) != 0)
         return 0;
-    return std::uint64_t{space.f_bavail} * space.f_frsize;
+    return std::uint64_t{space.f_bavail} * space.f_frsize / 10 * 9;
 }
 
 bool Is_Special_File(std::string_view name)

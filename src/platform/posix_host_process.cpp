@@ -162,12 +162,15 @@ bool Copy_Standard_Input(std::string_view name)
     if (!target.Open_Scratch(name))
         return false;
     const auto buffer = std::make_unique_for_overwrite<char[]>(Copy_Size);
+    const std::uint64_t most = Scratch_Room(Folder_Of(name));
+    std::uint64_t copied = 0;
     ::ssize_t got;
     do {
         got = ::read(STDIN_FILENO, buffer.get(), Copy_Size);
         if (got > 0)
             target.Write(buffer.get(), static_cast<std::size_t>(got));
-    } while (!target.Failed() && (got > 0 || (got < 0 && errno == EINTR)));
+        copied += got > 0 ? static_cast<std::uint64_t>(got) : 0;
+    } while (!target.Failed() && copied <= most && (got > 0 || (got < 0 && errno == EINTR)));
     return got == 0 && target.Close();
 }
 

@@ -114,6 +114,9 @@ TEST_F(Command_Test, Converts)
         {{"few.csv", "few.tab", "--in-options", "/b/n"}, "few.tab", "C1\tC2\r\nx\ty\r\n1\toats\r\n"},
         {{"--out-options=/mv=NA", "crops.csv", "na.tab"}, "na.tab", head + "2\trye\tNA\r\n3\tbarley\t4\r\n"},
         {{"--range", "1:2", "crops.csv", "r.tab"}, "r.tab", head},
+        {{"few.csv", "q.csv", "--no-names", "--no-quotes", "--out-options=/mv='-"},
+         "q.csv",
+         "C1,C2\r\nx,y\r\n1,oats\r\n"},
         {{"crops.csv", "c.tab", "--columns", "2:2", "--no-header"}, "c.tab", "oats\r\nrye\r\nbarley\r\n"},
         {{"few.csv", "y.tab", "--no-names", "--write-missing=it is"},
          "y.tab",
@@ -139,6 +142,12 @@ TEST_F(Command_Test, Converts)
         EXPECT_EQ(Get(output), text) << output;
         EXPECT_EQ(ran.out + ran.err, "") << output;
     }
+}
+
+TEST_F(Command_Test, Joins_Lines_Of_A_Comma_File)
+{
+    EXPECT_EQ(Run({"crops.csv", "lines.csv", "--out-options=/rewrite=6"}).status, 7) << "it has no rows";
+    EXPECT_EQ(Get("lines.csv"), "plot,kind,yield,1,oats,2.5\n2,rye,*,3,barley,4\n");
 }
 
 TEST_F(Command_Test, Leaves_A_List_Of_Columns_To_Fill_In)
@@ -322,6 +331,8 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {Wrong_Command_Line, "not of the form", {"crops.csv", "out.tab", "--columns", "B:C"}},
         {Wrong_Command_Line, "not of the form", {"crops.csv", "out.tab", "--columns", "2"}},
         {Wrong_Command_Line, "clipboard.csv", {"crops.csv", "Clipboard"}},
+        {Wrong_Command_Line, "--keep", {"crops.csv", "old.tab", "--append", "--columns", "2:3"}},
+        {Wrong_Command_Line, "ingester summary", {"crops.csv", "-", "--print-summary"}},
         {Wrong_Command_Line, "--update-sheet", {"crops.csv", "old.tab", "--append", "--add-sheet", "New"}},
         {Wrong_Command_Line,
          "--update-sheet",

@@ -125,6 +125,10 @@ TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
     Put("one.csv", "plot\n1\n");
     Put("two.mrg", "2\nplot\n");
     Put("two.csv", "plot\n1\n");
+    Put("gap.csv", "plot\n1\n");
+    Put("gap.mrg", "2\nplot\n\n");
+    Put("five.csv", "plot\n1\n");
+    Put("five.mrg", "5\nplot\nx\nx\nx\nx\n");
     Put("zip.csv", "PK\3\4");
     Put("none.csv", "");
     Put("odd.csv", std::string("\1\2\3\4", 4));
@@ -136,7 +140,12 @@ TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
         {"n.csv", "o.csv/%=1", 17, "Merge key absent in WITH not found in OUTFILE.\n" + merged},
         {"m.csv", "o.csv/%=1", 17, "Merge key absent in MATCH not found in " + f + "o.csv.\n" + merged},
         {"t.csv", "o.csv/%=1", 17, "Columns kind and plot data types do not match.\n" + merged},
-        {"two.csv", "o.csv/%=2", 17, merged},
+        {"two.csv", "o.csv/%=2", 17, "Merge columns not found in files.\n"},
+        {"gap.csv", "o.csv/%=2", 17, "Merge columns not found in files.\n"},
+        {"five.csv", "o.csv/%=5", 17,
+         "Warning: A merge has four keys at the most; the first four of 5 were used.\n"
+         "Merge key x in WITH not found in OUTFILE.\n"
+             + merged},
         {"n.csv", "absent.csv/@", 2, "Input file could not be opened.\n" + appended},
         {"n.csv", "none.csv/&", 2, "Input file is empty.\n" + concatenated},
         {"n.csv", "odd.csv/%", 3, merged},
@@ -150,6 +159,54 @@ TEST_F(Output_Joins, That_Fail_Leave_The_Old_Output_As_It_Was)
         EXPECT_EQ(Get("o.csv"), Old);
         EXPECT_EQ(Files(), before);
     }
+}
+
+TEST_F(Output_Joins, That_Would_Lose_Old_Data_Are_Refused)
+{
+    const std::string kept = "Error: The output was left as it is, since ";
+    const std::string appended = "Could not append data.\n";
+    const std::string end = "Warning: An empty line stands behind row 1, and what follows it was not read.\n";
+    std::string names = "a,t";
+    std::string row = "1,x";
+    for (int i = 10000; i < 16000; ++i) {
+        names += ",column" + std::to_string(i);
+        row += ",1";
+    }
+    const std::tuple<std::string, std::string, int, std::string> cases[] = {
+        {"a,t\n1,x\n\n2,y\n", "o.csv", 13,
+         end + kept + "lines behind an empty line of it would be lost.\n" + appended},
+        {"a,t\n1," + std::string(10001, 'x') + "\n", "o.tab", 13,
+         "Warning: 1 texts of more than 10000 characters were cut.\n" + kept + "texts of it would be cut.\n"
+             + appended},
+        {"a t b\n1 x 2\n3   4\n", "o.txt", 13,
+         kept + "its lines differ in their number of fields.\n" + appended},
+        {"a\n1\n2 3\n", "o.txt", 13, kept + "its lines differ in their number of fields.\n" + appended},
+        {" a   t  u\n 1 a b   \n 2 xyz yy\n", "o.txt", 13,
+         kept + "texts with blanks, or empty ones, have put its cells out of their columns.\n" + appended},
+        {"\"a\" \"t\"\n1 x\n", "o.txt", 13, kept + "lines in quotes at its head would be lost.\n" + appended},
+        {"a t\n1 x\n", "o.txt", 6,
+         kept
+             + "texts with blanks, or empty ones, can't be told apart in columns of fixed width.\n"
+               "Output file not written.\n"},
+        {names + "\n" + row + "\n", "o.csv", 6,
+         kept + "lines of it would be broken.\nOutput file not written.\n"},
+    };
+    for (const auto& [old, output, status, said] : cases) {
+        Put(output, old);
+        Put("n.csv", "a,t\n5,two words\n");
+        EXPECT_EQ(Convert("n.csv", output + "/h/@"), (Host_Answer{status, said + ":\n"}))
+            << old.substr(0, 50);
+        EXPECT_EQ(Get(output), old);
+    }
+    Put("n.csv", "a,t\n5,z\n");
+    for (const char* const output : {"new.txt", "new.txt/@"})
+        EXPECT_EQ(Convert("n.csv", output), (Host_Answer{0, ""})) << "its own title is no loss";
+    const std::string joined = Get("new.txt");
+    EXPECT_EQ(joined.substr(joined.find('\n')), "\n a t\r\n 5 z\r\n 5 z\r\n");
+    Put("n.csv", "1,b\n7,8\n");
+    Put("o.csv", "1,b\n5,6\n");
+    EXPECT_EQ(Convert("n.csv/y", "o.csv/h/@"), (Host_Answer{0, ""}));
+    EXPECT_EQ(Get("o.csv"), "%1,b\r\n5,6\r\n7,8\r\n") << "told that both have names";
 }
 
 }  // namespace

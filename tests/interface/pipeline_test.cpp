@@ -61,7 +61,7 @@ TEST_F(Pipeline_Test, Converts)
         {Crops, "c.csv", "O.TAB/mv=NA/n", "O.TAB", "1\toats\t2.5\r\n2\trye\tNA\r\n"},
         {Crops, "c.csv", "o.csv/n", "o.csv", "    1,\"oats\" ,   2.5\r\n    2,\"rye\"  ,     *\r\n"},
         {Crops, "c.csv", "o.xyz/z/n", "o.xyz", "    1 oats   2.5\r\n    2 rye      *\r\n"},
-        {Crops, "c.csv/w/tr/c=2:3/db", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
+        {Crops, "c.csv/w/v/tr/c=2:3/db", "o.tab/a/e", "o.tab", "Worksheets\r\nSheet1\r\n"},
         {Crops, "c.csv/tr", "o.tab", "o.tab", "kind\toats\trye\r\nplot\t1\t2\r\nyield\t2.5\t*\r\n"},
         {Crops, "c.csv/tr=N", "o.tab", "o.tab",
          "C1\tC2\tC3\r\nplot\t1\t2\r\nkind\toats\trye\r\nyield\t2.5\t*\r\n"},
@@ -72,6 +72,7 @@ TEST_F(Pipeline_Test, Converts)
         {sparse, "c.csv", "o.tab", "o.tab", "a\r\n1\r\n3\r\n"},
         {sparse, "c.csv/k", "o.tab/e", "o.tab", "a\tb\r\n1\t*\r\n*\t*\r\n3\t*\r\n"},
         {"a,b\n,\n,\n", "c.csv/k", "o.tab", "o.tab", "a\tb\r\n*\t*\r\n", empty_words},
+        {"a,b\n1,*\n2,3\n", "c.csv", "o.csv/h/mv=','", "o.csv", "a,b\r\n1,\",\"\r\n2,3\r\n"},
         {nul, "c.csv", "o.tab", "o.tab", "a\tb\r\n1\tx y\r\n", nul_words},
         {"a,b,c\n1\n2,3\n", "c.csv", "o.txt/rewrite=3", "o.txt", "a,b,c\n1,2,3\n", "", 7},
         {"m!,d!\nMar,10\nJan,30\n", "c.csv", "o.csv/n", "o.csv", " \"Mar\", 10\r\n \"Jan\", 30\r\n"},
@@ -201,6 +202,16 @@ TEST_F(Pipeline_Test, An_Old_Output_Is_Replaced_Whole)
     EXPECT_EQ(::read(pipe, bytes, sizeof bytes), static_cast<::ssize_t>(Crops_Tab.size()));
     EXPECT_TRUE(std::filesystem::is_fifo(Path("pipe.tab"))) << "a file took the place of a pipe";
     ::close(pipe);
+}
+
+TEST_F(Pipeline_Test, An_Output_Of_Options_Alone_Has_The_Usual_Name)
+{
+    const std::filesystem::path folder = std::filesystem::current_path();
+    Put("c.csv", Crops);
+    std::filesystem::current_path(Path(""));
+    EXPECT_EQ(Call({"c.csv", "/q"}), (Host_Answer{0, ""}));
+    EXPECT_EQ(Files(), "Ingester.TBK c.csv");
+    std::filesystem::current_path(folder);
 }
 
 TEST_F(Pipeline_Test, A_Pipe_Is_Read_Whole)

@@ -123,6 +123,15 @@ TEST_F(Files_Test, Scratch_Files_Are_Private_And_Follow_No_Link)
     EXPECT_EQ(Files() + " " + Get("victim"), "victim untouched");
 }
 
+TEST_F(Files_Test, Copies_Are_Whole_Or_Not_There)
+{
+    Put("from", "four");
+    EXPECT_TRUE(Copy_File(Path("from"), Path("to"), 4));
+    EXPECT_EQ(Get("to"), "four");
+    EXPECT_FALSE(Copy_File(Path("from"), Path("to"), 3));
+    EXPECT_EQ(Files(), "from");
+}
+
 TEST_F(Files_Test, Extensions_Are_Those_Of_The_File_Not_Of_Its_Folders)
 {
     for (const std::string folder : {"", "d.e\\", "\\d/"})

@@ -6,6 +6,7 @@
 #include "interface/request/request.h"
 #include "interface/slash_options.h"
 #include "interface/var_file.h"
+#include "model/join/merge.h"
 #include "model/sheet.h"
 #include "platform/files.h"
 #include "spreadsheet/text/text.h"
@@ -120,8 +121,9 @@ Request_Status Keep_Stream(Request_Run& run)
                            .append(run.infile.substr(Extension_Start(run.infile)));
     run.source_name = std::exchange(run.infile, std::move(copy));
     run.kept_stream = true;
-    if (!Copy_File(run.source_name, run.infile))
-        return Stop(Request_Status::input_unreadable, "Input file could not be opened.\n");
+    if (!Copy_File(run.source_name, run.infile, Scratch_Room(Get_Temp_Folder())))
+        return Stop(Request_Status::input_unreadable,
+                    "Input could not be read to its end and kept in the temporary folder.\n");
     return Done;
 }
 
@@ -157,9 +159,9 @@ Request_Status Detect_Input(Request_Run& run)
 
 Request_Status Cut_Output_Options(Request_Run& run)
 {
+    Cut_Options(Output_Options(), run.outfile);
     if (run.outfile.empty())
         run.outfile = "Ingester.TBK";
-    Cut_Options(Output_Options(), run.outfile);
     if (request.Add_Mode != Add_Modes::none)
         request.Add_File_Name = run.outfile;
     if (request.Replace_Sheet_Asked && request.Output_Sheet_Name.empty())
@@ -177,6 +179,15 @@ void Take_Merge_Keys(std::string_view line)
     const std::string_view with = equals < line.size() ? Trim_Copy(line.substr(equals + 1)) : key;
     request.Merge_Keys.emplace_back(key);
     request.Merge_With_Keys.emplace_back(with);
+}
+
+/// As many as were counted, and none without a name: the place of a column is no substitute for one.
+bool Merge_Keys_Are_Whole()
+{
+    const auto is_empty = [](const std::string& key) { return key.empty(); };
+    return !request.Merge_Keys.empty() && std::ssize(request.Merge_Keys) == request.Merge_Key_Count
+           && std::ranges::none_of(request.Merge_Keys, is_empty)
+           && std::ranges::none_of(request.Merge_With_Keys, is_empty);
 }
 
 }  // namespace
@@ -201,11 +212,14 @@ Request_Status Read_Merge_Keys(Request_Run& run)
             request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
     while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
         Take_Merge_Keys(line);
-    const bool whole = file.Close();
+    const bool whole = file.Close() && Merge_Keys_Are_Whole();
     if (downloaded)
         Delete_File(name);
-    if (request.Merge_Keys.empty() || !whole)
+    if (!whole)
         return Stop(Request_Status::merge_failed, "Merge columns not found in files.\n");
+    if (std::cmp_greater(request.Merge_Key_Count, Most_Merge_Keys))
+        Report_Message_Long("Warning: A merge has four keys at the most; the first four of %li were used.\n",
+                            request.Merge_Key_Count);
     return Done;
 }
 
@@ -329,6 +343,10 @@ Request_Status Switch_Off_For_List(Request_Run&)
     request.Fixed_Number_Text = false;
     request.Output_Matrix = false;
     request.Print_Summary = false;
+    request.Use_Var_File = false;
+    request.Column_Wanted_Types.clear();
+    request.Column_Wanted_Names.clear();
+    request.Column_Wanted_Count = 0;
     request.First_Column = 0;
     request.Last_Column = Every_Column;
     Get_Settings().delete_empty_rows = 0;

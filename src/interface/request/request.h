@@ -60,6 +60,7 @@ struct Request_Globals : Lasting_Globals {
     bool Sheet_Name_Was_Exact = false;
     bool Columns_Were_Selected = false;  ///< by the reader: the Sheet holds those of the subset only
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
+    const char* Left_Unread = nullptr;   ///< what of a text isn't in its Sheet, so that it can't be replaced
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int64_t Column_Wanted_Count = 0;           ///< of the list's lines, as it says; 0 where it doesn't
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place

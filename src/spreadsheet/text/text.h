@@ -22,6 +22,10 @@ bool Read_Text_Lines(Input_File& file);
 /// Copies a text, joining lines until they hold `fields_per_record` commas.
 bool Reflow_Lines_By_Fields(const char* input, const char* output, std::int32_t fields_per_record);
 
+/// Whether the fields of a text that was written in columns of fixed width stand in them. Where a text with a
+/// blank and an empty one make up for each other, nothing else tells.
+bool Fields_Stand_In_Columns(Input_File& file);
+
 /// Writes a Sheet as text: with tabs in `tab_mode`, with commas under `CSV_Output`, else in columns
 /// of fixed width. An empty name writes to standard output. False when there is nothing to write, or
 /// when the file could not be written whole.

@@ -57,8 +57,8 @@ class Sheet_Filler {
 public:
     Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
                  File_Image* image)
-        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells), buffer_(buffer),
-          image_(image)
+        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells),
+          cells_may_shift_(options.cells_may_shift), buffer_(buffer), image_(image)
     {
         missing_.number = sheet.missing_value;
         empty_.text = Text_Arena::Empty();
@@ -91,6 +91,7 @@ private:
     bool Fill_Rows();
     void Finish_Rows(const char* last_line);
     void Report_Oddities() const;
+    void Report_Cut_Texts() const;
     void Redo_Rows(const char* first_row);
     void Redo_Row();
     void Fill_Row();
@@ -111,6 +112,7 @@ private:
     Text_Shape& shape_;
     Field_Walker walker_;
     bool trim_;
+    bool cells_may_shift_;
     const Text_Buffer& buffer_;
     File_Image* image_;
     Cell_Value missing_;
@@ -121,6 +123,8 @@ private:
     std::int64_t row_limit_ = 0;
     const char* told_ = nullptr;  ///< how far progress has been told
     bool columns_full_ = false;
+    std::int64_t uneven_lines_ = 0;  ///< with fewer fields than there are columns
+    long cut_texts_ = 0;
     Column_Subset subset_;
     bool no_number_is_missing_;  ///< else one does by `Missing_Input_Text`, and all are looked at
     std::string undoubled_;
@@ -180,6 +184,7 @@ void Sheet_Filler::Fill_Names()
             Name_Column(index, name);
         ++index;
     } while (walker_.Has_More());
+    uneven_lines_ += index < columns_.size() ? 1 : 0;
 }
 
 /// The names as they will be, which is what a list of columns goes by.
@@ -266,6 +271,7 @@ std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
         }
         text = undoubled_;
     }
+    cut_texts_ += text.size() > Long_Text_Width ? 1 : 0;
     text = text.substr(0, Long_Text_Width);
     return trim_ ? Trim_Copy(text) : text;
 }
@@ -332,6 +338,7 @@ void Sheet_Filler::Refuse_Extra_Columns()
         Report_Message_Long("Maximum number of columns (%li) exceeded.\nIgnoring extra columns.\n",
                             request.Max_Columns);
     columns_full_ = true;
+    request.Left_Unread = "columns beyond the greatest number would be lost";
 }
 
 /// A line with more fields than any before it. Columns have as many cells as there are rows.
@@ -344,6 +351,7 @@ bool Sheet_Filler::Add_Late_Column()
         return false;
     }
     column->width = New_Column_Width;
+    ++uneven_lines_;  // some before this one
     shape_.types.emplace_back();
     shape_.columns = number;
     Start_Column(*column, Cell_Appender(*column, row_ + Spare_Rows));
@@ -376,6 +384,9 @@ void Sheet_Filler::Fill_Row()
         else if (state.filling == Filling::texts)
             Fill_Text(field, *state.column, state.cells.Append(empty_));
     } while (walker_.Has_More());
+    if (index == columns_.size()) [[likely]]
+        return;
+    ++uneven_lines_;
     for (; index < columns_.size(); ++index)
         Append_Blank(columns_[index]);
 }
@@ -421,8 +432,10 @@ bool Sheet_Filler::Fill_Rows()
 /// A blank line at the end is no row.
 void Sheet_Filler::Finish_Rows(const char* last_line)
 {
-    if (row_ > 0 && walker_.Is_Blank_Line(last_line))
+    if (row_ > 0 && walker_.Is_Blank_Line(last_line)) {
         --row_;
+        uneven_lines_ -= columns_.size() > 1 ? 1 : 0;
+    }
     Expect_Rows(&sheet_, static_cast<std::int32_t>(row_));
     for (Column_Filling& state : columns_)
         state.cells.Finish(sheet_.row_count);
@@ -433,10 +446,22 @@ void Sheet_Filler::Report_Oddities() const
     if (const long nuls = shape_.nuls + walker_.Nuls(); nuls > 0)
         Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", nuls);
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
-    if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos)
+    if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos) {
         Report_Message_Long(
             "Warning: An empty line stands behind row %li, and what follows it was not read.\n",
             sheet_.row_count);
+        request.Left_Unread = "lines behind an empty line of it would be lost";
+    }
+    if (uneven_lines_ > 0 && cells_may_shift_)
+        request.Left_Unread = "its lines differ in their number of fields";
+}
+
+void Sheet_Filler::Report_Cut_Texts() const
+{
+    if (cut_texts_ == 0)
+        return;
+    Report_Message_Long("Warning: %li texts of more than 10000 characters were cut.\n", cut_texts_);
+    request.Left_Unread = "texts of it would be cut";
 }
 
 /// One line once more, for the columns whose texts are still wanted.
@@ -514,6 +539,7 @@ bool Sheet_Filler::Fill()
         return false;
     Report_Oddities();
     Redo_Rows(first_row);
+    Report_Cut_Texts();
     Make_Dates();
     return sheet_.row_count > 0;
 }

@@ -18,6 +18,9 @@ namespace ingester {
 /// Longest line, or joined record, in characters.
 constexpr std::size_t Greatest_Line = 262140;
 
+/// Stand behind the name in the title that is written over columns of fixed width.
+constexpr std::string_view Title_Words = " (Created by Ingester: ";
+
 /// The lines of a text in memory, the last one ended like the others.
 struct Text_Buffer {
     char* first = nullptr;
@@ -46,6 +49,7 @@ struct Text_Scan_Options {
     bool separators_given = false;
     Fixed_Text<20> separators;
     bool trim_cells = true;
+    bool cells_may_shift = false;  ///< nothing stands for an empty text, nor around one with blanks
 };
 
 /// A field between its separators; the blanks in front are not part of it.

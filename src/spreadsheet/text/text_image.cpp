@@ -81,33 +81,51 @@ bool Is_Title_Line(std::string_view line)
     return line.size() >= 2 && line.front() == '"' && line.back() == '"';
 }
 
+/// Tabs are content where they separate fields.
+std::string_view Blanks_Of(std::string_view file_name)
+{
+    const bool tabs_separate = Ends_Ignoring_Case(file_name, ".tab")
+                               || request.Custom_Separators.view().find('\t') != std::string_view::npos;
+    return tabs_separate ? " " : " \t";
+}
+
 /// Copies the kept lines to the head of the image; they never outrun the lines still to be read.
 class Line_Keeper {
 public:
-    Line_Keeper(File_Image& image, bool strip_titles)
-        : image_(image), lines_(std::string_view(image.Bytes(), image.Size())), next_(image.Bytes()),
+    Line_Keeper(File_Image& image, const Line_Range& range, std::string_view blanks, bool strip_titles)
+        : image_(image), range_(range), blanks_(blanks),
+          lines_(std::string_view(image.Bytes(), image.Size())), next_(image.Bytes()),
           titles_pending_(strip_titles), start_pending_(!request.Start_Text.empty())
     {}
 
     /// The kept lines are in `buffer` then. False after a message.
-    bool Keep(const Line_Range& range, Text_Buffer& buffer);
+    bool Keep(Text_Buffer& buffer);
 
 private:
+    bool Next_In_Range(std::string_view& line);
     bool Starts_Data(std::string_view line);
+    bool Ends_Data(std::string_view line);
     bool Is_Title(std::string_view line);
     void Take_Line(std::string_view line);
     void Take_Record(std::string_view line);
     bool Append_To_Record(std::size_t& length, std::string_view line, bool first);
-    void End_Line();
-    void Report_Missed_Marks(bool end_found) const;
+    void Report_Missed_Marks() const;
 
     File_Image& image_;
+    Line_Range range_;
+    std::string_view blanks_;
     Line_Source lines_;
     char* next_;
     bool titles_pending_;
     bool start_pending_;
+    bool end_found_ = false;
     bool content_kept_ = false;
 };
+
+bool Line_Keeper::Next_In_Range(std::string_view& line)
+{
+    return !end_found_ && lines_.Number() < range_.last && lines_.Next(line);
+}
 
 /// `Start_Text` not yet met: its line is the first that counts.
 bool Line_Keeper::Starts_Data(std::string_view line)
@@ -120,6 +138,12 @@ bool Line_Keeper::Starts_Data(std::string_view line)
     return true;
 }
 
+bool Line_Keeper::Ends_Data(std::string_view line)
+{
+    end_found_ = !request.End_Text.empty() && line.starts_with(request.End_Text.view());
+    return end_found_;
+}
+
 bool Line_Keeper::Is_Title(std::string_view line)
 {
     titles_pending_ = titles_pending_ && Is_Title_Line(line);
@@ -127,21 +151,17 @@ bool Line_Keeper::Is_Title(std::string_view line)
 }
 
 /// Leading blank lines vanish, later ones stay.
-void Line_Keeper::End_Line()
-{
-    if (content_kept_)
-        *next_++ = '\n';
-}
-
 void Line_Keeper::Take_Line(std::string_view line)
 {
     if (Is_Title(line))
         return;
+    content_kept_ = content_kept_ || line.find_first_not_of(blanks_) != std::string_view::npos;
+    if (!content_kept_)
+        return;
     if (next_ != line.data())
         std::memmove(next_, line.data(), line.size());
     next_ += line.size();
-    content_kept_ = content_kept_ || !line.empty();
-    End_Line();
+    *next_++ = '\n';
 }
 
 /// Puts a line behind those of the record so far, which end with a "," then. False when it is full.
@@ -161,41 +181,37 @@ bool Line_Keeper::Append_To_Record(std::size_t& length, std::string_view line, b
 }
 
 /// Joins `Lines_Per_Record` lines. Lines of a record that ran full are passed over, so that the
-/// records behind it begin where they should.
+/// records behind it begin where they should. The last one ends where the lines do.
 void Line_Keeper::Take_Record(std::string_view line)
 {
     std::size_t length = 0;
     bool open = true;
     for (std::int32_t i = 1;; ++i) {
         open = open && Append_To_Record(length, line, i == 1);
-        if (i >= request.Lines_Per_Record || !lines_.Next(line))
+        if (i >= request.Lines_Per_Record || !Next_In_Range(line) || Ends_Data(line))
             break;
     }
     Take_Line({next_, length});
 }
 
-void Line_Keeper::Report_Missed_Marks(bool end_found) const
+void Line_Keeper::Report_Missed_Marks() const
 {
     if (start_pending_)
         Report_Message_Text("Warning: Starting cell contents '%s' NOT found.\n", request.Start_Text.c_str());
-    if (!request.End_Text.empty() && !end_found)
+    if (!request.End_Text.empty() && !end_found_)
         Report_Message_Text("Warning: Ending line start text '%s' NOT found.\n", request.End_Text.c_str());
 }
 
-bool Line_Keeper::Keep(const Line_Range& range, Text_Buffer& buffer)
+bool Line_Keeper::Keep(Text_Buffer& buffer)
 {
-    bool end_found = false;
     std::string_view line;
-    while (lines_.Next(line)) {
-        if (lines_.Number() < range.first)
+    while (Next_In_Range(line)) {
+        if (lines_.Number() < range_.first)
             continue;
-        if (lines_.Number() > range.last)
-            break;
         const bool pending = start_pending_;
         if (!Starts_Data(line))
             continue;
-        end_found = !pending && !request.End_Text.empty() && line.starts_with(request.End_Text.view());
-        if (end_found)
+        if (!pending && Ends_Data(line))
             break;
         if (!Line_Is_Short_Enough(line, lines_.Number()))
             return false;
@@ -204,7 +220,7 @@ bool Line_Keeper::Keep(const Line_Range& range, Text_Buffer& buffer)
         else
             Take_Line(line);
     }
-    Report_Missed_Marks(end_found);
+    Report_Missed_Marks();
     buffer = {image_.Bytes(), next_};
     return true;
 }
@@ -217,7 +233,7 @@ bool Keeps_Every_Line(const Line_Range& range)
 }
 
 /// The text without its leading blank lines and titles.
-void Cut_Head(const File_Image& image, bool strip_titles, Text_Buffer& buffer)
+void Cut_Head(const File_Image& image, std::string_view blanks, bool strip_titles, Text_Buffer& buffer)
 {
     buffer = {image.Bytes(), image.Bytes() + image.Size()};
     if (buffer.last[-1] != '\n' && buffer.last[-1] != '\r')
@@ -225,7 +241,10 @@ void Cut_Head(const File_Image& image, bool strip_titles, Text_Buffer& buffer)
     Line_Source lines(buffer.Text());
     for (std::string_view line; lines.Next(line);) {
         strip_titles = strip_titles && Is_Title_Line(line);
-        if (!line.empty() && !strip_titles) {
+        const bool own_title = lines.Number() == 1 && line.find(Title_Words) != std::string_view::npos;
+        if (strip_titles && !own_title)
+            request.Left_Unread = "lines in quotes at its head would be lost";
+        if (!strip_titles && line.find_first_not_of(blanks) != std::string_view::npos) {
             buffer.first += line.data() - buffer.first;
             buffer.lines_before = lines.Number() - 1;
             return;
@@ -260,10 +279,11 @@ bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Tex
         return Fail_To_Read(file.Name());
     if (image.Size() == 0)
         return true;
+    const std::string_view blanks = Blanks_Of(file.Name());
     rewritten = !Keeps_Every_Line(range);
     if (rewritten)
-        return Line_Keeper(image, strip_titles).Keep(range, buffer);
-    Cut_Head(image, strip_titles, buffer);
+        return Line_Keeper(image, range, blanks, strip_titles).Keep(buffer);
+    Cut_Head(image, blanks, strip_titles, buffer);
     return true;
 }
 

@@ -10,8 +10,49 @@
 
 #include <algorithm>
 #include <string>
+#include <string_view>
+#include <vector>
 
 namespace ingester {
+
+namespace {
+
+/// From the first to behind the last place that a field of a column takes in any line.
+struct Column_Extent {
+    std::size_t first;
+    std::size_t last;
+};
+
+void Widen(std::vector<Column_Extent>& columns, std::string_view line)
+{
+    std::size_t index = 0;
+    for (std::size_t at = 0; (at = line.find_first_not_of(' ', at)) != std::string_view::npos; ++index) {
+        const std::size_t end = std::min(line.find(' ', at), line.size());
+        if (index == columns.size())
+            columns.push_back({at, end});
+        columns[index] = {std::min(columns[index].first, at), std::max(columns[index].last, end)};
+        at = end;
+    }
+}
+
+}  // namespace
+
+bool Fields_Stand_In_Columns(Input_File& file)
+{
+    std::vector<Column_Extent> columns;
+    std::size_t length = 0;
+    for (std::string line; file.Read_Line(line, Greatest_Line) && !line.empty();) {
+        if (line.find(Title_Words) != std::string::npos)
+            continue;
+        const bool padded = length == 0 || line.size() == length;
+        if (!padded || line.find_first_of(",\t") != std::string::npos)
+            return true;  // written by others, or not in such columns
+        length = line.size();
+        Widen(columns, line);
+    }
+    const auto overlap = [](const Column_Extent& a, const Column_Extent& b) { return a.last > b.first; };
+    return std::ranges::adjacent_find(columns, overlap) == columns.end();
+}
 
 bool Read_Text_Lines(const char* file_name)
 {

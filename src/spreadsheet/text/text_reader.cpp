@@ -61,6 +61,7 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     Text_Scan_Options options = Options_Of_Settings();
     options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
     options.separators_given = !options.separators.empty();
+    options.cells_may_shift = !csv_file && !tab_file;
     Text_Shape shape;
     if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1)
         return false;

@@ -5,6 +5,7 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "spreadsheet/text/text.h"
+#include "spreadsheet/text/text_format.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -151,20 +152,40 @@ std::string_view Name_Mark(const Column& column)
     return column.type == factor_column ? "!" : column.format == date_format_mark ? ":D" : "";
 }
 
+/// Whether a field of fixed width is read as one, by the blanks around it; a separator of others, too, would
+/// mislead the reader.
+bool Stays_In_Place(std::string_view printed)
+{
+    return !printed.empty() && printed.front() != '"' && printed.front() != '\''
+           && printed.find_first_of(" \t,\r\n") == std::string_view::npos;
+}
+
+/// The old data of a join come through the new file, and the old file is there until that is whole.
+bool Keeps_Old_Output()
+{
+    return request.Add_Mode != Add_Modes::none && request.Write_Via_Temp;
+}
+
 class Text_Table_Writer {
 public:
     Text_Table_Writer(Sheet& sheet, const Text_Layout& layout, Output_File& file)
         : sheet_(sheet), layout_(layout), file_(file)
     {
+        Print_Missing();
         for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
             Start_Column(*column);
     }
 
+    /// Whether a reader would find each cell of fixed width in its column.
+    [[nodiscard]] bool Cells_Stay() const { return layout_.layout != Layout::fixed || cells_stay_; }
+
     void Write_Title(std::string_view name);
     void Write_Names();
-    void Write_Rows();
+    /// False when lines had to be broken that must stay whole.
+    [[nodiscard]] bool Write_Rows();
 
 private:
+    void Print_Missing();
     void Start_Column(const Column& column);
     std::int32_t Measured_Width(const Column_Writing& state);
     void Put_Level(const Column_Writing& state, std::int32_t level);
@@ -181,8 +202,21 @@ private:
     Output_File& file_;
     std::vector<Column_Writing> columns_;
     Line_Buffer line_;
+    std::string missing_;  ///< as a missing value prints
     long broken_lines_ = 0;
+    bool cells_stay_ = true;
 };
+
+/// The text for missing values may hold a separator, too.
+void Text_Table_Writer::Print_Missing()
+{
+    missing_ = request.Missing_Text.view();
+    if (layout_.layout == Layout::fixed || !Would_Be_Misread(missing_))
+        return;
+    Put_Quoted(missing_);
+    missing_ = line_.View();
+    line_.Clear();
+}
 
 void Text_Table_Writer::Start_Column(const Column& column)
 {
@@ -206,6 +240,7 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
     std::size_t widest = column.name.size() + (factor ? 1 : Name_Mark(column).size());
     const auto take_printed = [&] {
         widest = std::max(widest, line_.Size());
+        cells_stay_ = cells_stay_ && Stays_In_Place(line_.View());
         line_.Clear();
     };
     line_.Clear();
@@ -283,7 +318,7 @@ void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
         Put_Level(state, static_cast<std::int32_t>(value));
     else
         line_.Put(state.column->factor_kind == factor_with_labels ? std::string_view(" ")
-                                                                  : request.Missing_Text.view());
+                                                                  : std::string_view(missing_));
 }
 
 inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
@@ -292,13 +327,13 @@ inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_
     switch (state.kind) {
     case Cell_Kind::number:
         if (!(value > sheet_.missing_value))
-            line_.Put(request.Missing_Text.view());
+            line_.Put(missing_);
         else
             line_.Advance_To(Print_General(line_.Reserve(Number_Text_Room), value, General_Digits));
         break;
     case Cell_Kind::formatted_number:
         if (!(value > sheet_.missing_value))
-            line_.Put(request.Missing_Text.view());
+            line_.Put(missing_);
         else
             line_.Advance_To(Format_Cell_Number(line_.Reserve(Number_Text_Room), *state.column, value));
         break;
@@ -350,8 +385,9 @@ void Text_Table_Writer::Write_Title(std::string_view name)
     line_.Clear();
     line_.Put('"');
     line_.Put(name);
-    line_.Put(Format_Text(" (Created by Ingester: %02d:%02d:%02d %02d/%02d/%02d)", now.hour, now.minute,
-                          now.second, now.month, now.day, now.year % 100));
+    line_.Put(Title_Words);
+    line_.Put(Format_Text("%02d:%02d:%02d %02d/%02d/%02d)", now.hour, now.minute, now.second, now.month,
+                          now.day, now.year % 100));
     line_.Put('"');
     Write_Line();
 }
@@ -379,7 +415,7 @@ void Text_Table_Writer::Write_Names()
     Write_Line();
 }
 
-void Text_Table_Writer::Write_Rows()
+bool Text_Table_Writer::Write_Rows()
 {
     constexpr std::int32_t progress_step = 1 << 14;
     line_.Clear();
@@ -395,8 +431,11 @@ void Text_Table_Writer::Write_Rows()
         if (row % progress_step == 0)
             Show_Progress("Writing", row, sheet_.row_count);
     }
+    if (broken_lines_ > 0 && Keeps_Old_Output())
+        return Fail("Error: The output was left as it is, since lines of it would be broken.\n");
     if (broken_lines_ > 0)
         Report_Message_Long("Warning: %li lines were too long and have been broken.\n", broken_lines_);
+    return true;
 }
 
 /// What the title calls the output.
@@ -420,17 +459,20 @@ bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
     const bool real_file = *file_name != '\0';
     const Text_Layout layout = Layout_Of_Request(tab_mode);
     Output_File file;
+    Text_Table_Writer writer(*sheet, layout, file);
+    if (request.Add_Mode != Add_Modes::none && !writer.Cells_Stay())
+        return Fail(
+            "Error: The output was left as it is, since texts with blanks, or empty ones, can't be told "
+            "apart in columns of fixed width.\n");
     if (!real_file)
         file.Open_Standard_Output();
     else if (!file.Open(file_name))
         return false;  // silent by design: the pipeline tells that the output was not written
-    Text_Table_Writer writer(*sheet, layout, file);
     if (layout.layout == Layout::fixed && Get_Settings().csv_title != 0 && real_file)
         writer.Write_Title(Title_Name(file_name));
     if (!request.Omit_Header)
         writer.Write_Names();
-    writer.Write_Rows();
-    return file.Close();
+    return writer.Write_Rows() && file.Close();
 }
 
 }  // namespace ingester

@@ -74,6 +74,7 @@ TEST_F(Text_Reader, Numbers_Texts_And_Missing_Cells)
 {
     const auto numbered = [](std::size_t count) { return "a\n" + std::string(count, 'x') + "\n"; };
     const auto missing = [](std::string_view text) { return [text] { request.Missing_Input_Text = text; }; };
+    const std::string cut = "Warning: 1 texts of more than 10000 characters were cut.\n";
     const auto types = [] { request.Column_Wanted_Types = {4, 3}; };
     const Case cases[] = {
         {"forms of numbers", "a\n.5\n5.\n+3\n-1e3\n1E-2\n007\n12* \n", "a V0.5|5|3|-1000|0.01|7|12"},
@@ -88,7 +89,7 @@ TEST_F(Text_Reader, Numbers_Texts_And_Missing_Cells)
         {"90 characters", numbered(90), "a T90 characters"},
         {"90 are kept", "a\n\"" + std::string(89, 'x') + "\"\" \"\n", "a T90 characters"},
         {"91 characters", numbered(91), "a L91 characters"},
-        {"12000 characters", numbered(12000), "a L10000 characters"},
+        {"12000 characters", numbered(12000), "a L10000 characters", {}, cut},
     };
     Try(cases);
 }
@@ -113,6 +114,16 @@ TEST_F(Text_Reader, Takes_The_Lines_That_Are_Asked_For)
         {"no start, no end", text, "", between("A", "z"),
          "Warning: Starting cell contents 'A' NOT found.\nWarning: Ending line start text 'z' NOT found.\n"},
         {"two lines to a record", "a \t\nb,\n1\n2,\n3,\n4\n", "a V1|3; b V2|4; C3 V*|*", joined},
+        {"to the end of the range", "a\nb\n1\n2\n3\n4\n", "a V1|3; b V2|*",
+         [] {
+             request.Lines_Per_Record = 2;
+             request.Cell_Range = ":5";
+         }},
+        {"to the end of the data", "a\nb\n1\nend\n2\n", "a V1; b V*",
+         [] {
+             request.Lines_Per_Record = 2;
+             request.End_Text = "end";
+         }},
         {"long", halves, "C1 V*|1; C2 V*|2", joined, "Error: Combined CSV line length > 262140.\n"},
         {"long",
          "a\n" + std::string(262141, '1') + "\n",
@@ -153,15 +164,17 @@ TEST_F(Text_Reader, Reads_Files_That_Change_And_That_Do_Not)
 
 using Slow_Field = std::pair<std::string, bool>;  ///< its text, and whether it stood between quotes
 
-Texts Slow_Lines(const std::string& text, bool strip_titles)
+Texts Slow_Lines(const std::string& text, const std::string& name)
 {
     Texts kept;
+    bool strip_titles = name == "x.txt";
+    const char* const blanks = name == "x.tab" ? " " : " \t";
     for (std::size_t at = 0; at < text.size(); ++at) {
         const std::size_t end = std::min(text.find_first_of("\r\n", at), text.size());
         const std::string line = text.substr(at, end - at);
         at = text.compare(end, 2, "\r\n") == 0 ? end + 1 : end;
         strip_titles = strip_titles && line.size() > 1 && line.front() == '"' && line.back() == '"';
-        if (!strip_titles && !(kept.empty() && line.empty()))
+        if (!strip_titles && !(kept.empty() && line.find_first_not_of(blanks) == line.npos))
             kept.push_back(line);
     }
     return kept;
@@ -229,7 +242,7 @@ bool Slow_Is_Text(const Slow_Field& field, std::string& cell)
 /// The types and cells of a text.
 std::string Slow_Read(const std::string& text, const std::string& name)
 {
-    const Texts lines = Slow_Lines(text, name == "x.txt");
+    const Texts lines = Slow_Lines(text, name);
     const auto holds = [&](char c) {
         return std::any_of(lines.begin(), lines.end(), [c](auto& line) { return line.find(c) != line.npos; });
     };
