@@ -179,6 +179,7 @@ void Change_Column(Column* column, const std::string& line)
     if (name.empty())
         return;  // nothing but marks: the column keeps its name
     column->name = Make_Valid_Name(name);
+    column->table_label.clear();  // the name is what labels it from now on
     Use_Bracket_Text(*column);
 }
 

@@ -101,7 +101,7 @@ void Describe_Column(const Column& column, long number, std::string& text)
 {
     if (column.type == factor_column)
         Describe_Factor(column, number, text);
-    else if (column.type == text_column || column.type == units_text_column)
+    else if (Is_Text_Like(column.type))  // Long Text as well, of which numbers tell nothing
         text += Format_Text("%4li: %s - Text  Maximum width: %li\n", number, column.name.c_str(),
                             static_cast<long>(column.nlevels));
     else
@@ -114,7 +114,8 @@ void Add_Title(const Sheet& sheet, std::string& text)
     if (sheet.title_lines.empty())
         return;
     text += "Sheet Title:\n";
-    for (std::size_t at = 0; at < sheet.title_lines.size();) {
+    std::int32_t lines = sheet.title_line_count;
+    for (std::size_t at = 0; at < sheet.title_lines.size() && lines-- > 0;) {
         const char* const line = sheet.title_lines.c_str() + at;
         text += Format_Text("%s\n", line);
         at += std::string_view(line).size() + 1;

@@ -10,6 +10,7 @@ enum Date_Format : std::int32_t {
     day_month_year_format = 2,     ///< dd/mm/yyyy
     year_format = 31,              ///< of two digits; 32 of four
     date_time_format = 33,         ///< dd/mm/yy hh:mm:ss.cc; codes from here on show the time of day
+    full_date_time_format = 34,    ///< yyyy-mm-dd hh:mm:ss
     marked_date_time_format = 35,  ///< d-Month-yyyy h:mm:ss and a marker
     time_format = 36,              ///< h:mm:ss; codes from here on show no date
     marked_time_format = 37,       ///< h:mm:ss am or pm

@@ -480,8 +480,7 @@ std::vector<const char*> Stored_Levels(Column& column)
     std::vector<const char*> stored;
     if (column.factor_kind == factor_with_levels)
         for (const Level_Node* node = column.level_values; node != nullptr; node = node->next)
-            stored.push_back(
-                column.texts.Store({text, Format_Cell_Number(text, column, node->value.number)}));
+            stored.push_back(column.texts.Store({text, Format_Cell_Fully(text, column, node->value.number)}));
     return stored;
 }
 
@@ -507,7 +506,7 @@ bool Variate_To_Text(Column* column)
         return false;
     return Turn_Into_Text(*column, false, [&](double value) {
         char text[Number_Text_Room];
-        return column->texts.Store({text, Format_Cell_Number(text, *column, value)});
+        return column->texts.Store({text, Format_Cell_Fully(text, *column, value)});
     });
 }
 

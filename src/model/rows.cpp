@@ -98,9 +98,25 @@ bool Insert_Square_Columns(Sheet& sheet, std::int32_t position, std::int32_t cou
 
 }  // namespace
 
+bool Fill_Short_Columns(Sheet* sheet)
+{
+    if (sheet == nullptr || sheet->has_short_columns == 0)
+        return sheet != nullptr;
+    for (Column* column = sheet->first_column->next; column != nullptr; column = column->next) {
+        std::int32_t lacking = Cells_For_Rows(*column, sheet->row_count) - std::max(column->length, 0);
+        for (std::int32_t some; lacking > 0; lacking -= some) {
+            some = std::min(lacking, Greatest_Insertion);
+            if (!Insert_Cells(column, std::max(column->length, 0), some))
+                return false;
+        }
+    }
+    sheet->has_short_columns = 0;
+    return true;
+}
+
 bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool keep_square)
 {
-    if (sheet == nullptr || position < 0 || !Insertion_Fits(count))
+    if (sheet == nullptr || position < 0 || !Insertion_Fits(count) || !Fill_Short_Columns(sheet))
         return false;
     const bool square = keep_square && sheet->type == symmetric_matrix_sheet;
     if (square && (sheet->read_only != 0 || count > request.Max_Columns - sheet->column_count))

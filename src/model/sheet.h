@@ -112,7 +112,7 @@ struct Column : Column_Host_Fields {
     std::int16_t range_selected = 0;  ///< a writer keeps marked columns only
     std::int16_t modified = 0;
     std::int16_t all_empty = 1;
-    std::int16_t protected_column = 0;  ///< neither deleted as empty nor converted
+    std::int16_t protected_column = 0;  ///< not deleted as empty; `Convert_Column` leaves it
     std::int16_t date_form = 0;         ///< 0 spreadsheet serials, 1 day count
     std::int32_t date_format = 1;
     Cell_Node* first_cell = nullptr;
@@ -128,6 +128,12 @@ struct Column : Column_Host_Fields {
     Block_Table label_blocks;
     Block_Table level_blocks;
 };
+
+/// The text that labels a Table's column.
+[[nodiscard]] inline std::string_view Label_Text(const Column& column)
+{
+    return column.table_label.empty() ? column.name.view() : column.table_label.view();
+}
 
 struct Sheet : Sheet_Host_Fields {
     std::int32_t type = vector_sheet;
@@ -284,6 +290,10 @@ constexpr std::int32_t Greatest_Insertion = 33554432;
 bool Insert_Cells(Column* column, std::int32_t position, std::int32_t count);
 bool Insert_Row_Nodes(Sheet* sheet, std::int32_t position, std::int32_t count);
 bool Insert_Rows(Sheet* sheet, std::int32_t position, std::int32_t count, bool keep_square);
+
+/// Gives columns that end before the last row (see `has_short_columns`) the blank cells that they lack, as
+/// everything that moves rows needs. False for want of memory.
+[[nodiscard]] bool Fill_Short_Columns(Sheet* sheet);
 
 bool Remove_Cell(Column* column, std::int32_t index);
 /// Not the last row of a Sheet, and none of a Scalar Sheet.

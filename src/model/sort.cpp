@@ -290,7 +290,7 @@ bool Sort_Sheet(const Sort_Request& wanted)
     Sheet& sheet = *wanted.sheet;
     if (wanted.key_index.empty() || sheet.type == scalar_sheet)
         return true;
-    if (sheet.type == symmetric_matrix_sheet || sheet.row_count < 1)
+    if (sheet.type == symmetric_matrix_sheet || sheet.row_count < 1 || !Fill_Short_Columns(&sheet))
         return false;
     std::vector<Sort_Key> keys;
     if (!Make_Sort_Keys(wanted, static_cast<std::size_t>(Movable_Rows(sheet)), keys))

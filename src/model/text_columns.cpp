@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <array>
 #include <bit>
+#include <cmath>
 #include <string>
 #include <vector>
 
@@ -22,6 +23,8 @@ namespace {
 void Become_Variate(Column& column)
 {
     Set_Column_Type(column, variate_column);
+    column.format = significant_digits_format;
+    column.decimals = -1;
     column.nlevels = 0;
     column.text_cell_width = Text_Cell_Width;
     column.texts = Text_Arena{};
@@ -241,6 +244,16 @@ void Read_Date_Cells(Column& column, std::int32_t format)
     }
 }
 
+/// Whether a time of day would not be seen if only dates were shown.
+bool Has_Times(const Column& column)
+{
+    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
+        if (Is_Present(*column.sheet, cell->value.number)
+            && cell->value.number != std::floor(cell->value.number))
+            return true;
+    return false;
+}
+
 }  // namespace
 
 bool Text_Column_To_Date(Column* column, bool time_mode)
@@ -258,9 +271,8 @@ bool Text_Column_To_Date(Column* column, bool time_mode)
         Read_Date_Cells(*column, format);
     Become_Variate(*column);
     column->format = date_format_mark;
-    column->date_format = format;
+    column->date_format = format < date_time_format && Has_Times(*column) ? full_date_time_format : format;
     column->date_form = 1;
-    column->decimals = -1;
     return true;
 }
 

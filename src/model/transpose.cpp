@@ -174,8 +174,7 @@ bool Label_Levels(const Transposition& work, Column& factor)
             value = value->next;
         }
         if (label != nullptr) {
-            label->value.text = factor.texts.Store(column.table_label.empty() ? column.name.view()
-                                                                              : column.table_label.view());
+            label->value.text = factor.texts.Store(Label_Text(column));
             label = label->next;
         }
     }
@@ -196,8 +195,8 @@ bool Add_Row_Factor(Transposition& work)
     if (factor->nlevels > 0 && !Label_Levels(work, *factor))
         return false;
     std::int32_t level = 0;
-    for (Cell_Node* cell = factor->first_cell; cell != nullptr && level < factor->nlevels; cell = cell->next)
-        cell->value.number = ++level;
+    for (Cell_Node* cell = factor->first_cell; cell != nullptr; cell = cell->next)
+        cell->value.number = ++level;  // up to that of a margin
     Compute_Column_Width(factor);
     return true;
 }

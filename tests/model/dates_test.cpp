@@ -311,6 +311,9 @@ TEST_F(Dates, Text_Columns_Become_Dates)
     EXPECT_EQ((std::vector{dates->format, dates->date_format, 1 * dates->date_form, dates->decimals}),
               (std::vector{5, 1, 1, -1}));
     EXPECT_EQ(times->date_format, 37);
+    Column* const some_times = Text_Of({"2020-01-05 10:30:15", "2020-01-07", "2020-01-08"});
+    ASSERT_TRUE(Text_Column_To_Date(some_times, false));
+    EXPECT_EQ(some_times->date_format, 34) << "a time that was read is shown";
     EXPECT_EQ(Messages(), "Text to Date Conversion Warnings\n \n"
                           "Column d Row    5: some day read as *\n"
                           "Column d Row    2: noon read as *\n:\n");

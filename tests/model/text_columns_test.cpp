@@ -48,6 +48,7 @@ TEST_F(Text_Columns, Changed_Labels_Are_Told)
     Column* const other = Add_Cells(sheet, text_column, "y", {"7", "8 9", "", "", ""});
     ASSERT_TRUE(Text_Column_To_Number(other) && !Text_Column_To_Number(other));
     EXPECT_EQ(Render(sheet), "x V1.5|12|*|*|*; y V7|8|*|*|*");
+    EXPECT_TRUE(column->format == significant_digits_format && column->decimals == -1) << "no digit goes";
     EXPECT_EQ(Messages(), "Text to Number Conversion Warnings\n \n"
                           "Column x Row    2: l2 read as 12\n"
                           "Column x Row    4: none read as *\n"

@@ -80,7 +80,7 @@ TEST_F(Transpose, A_Table_Changes_Its_Factors)
 {
     Sheet* const sheet = Make({table_sheet,
                                3,
-                               {{2, "site", {"1", "2", "*"}},
+                               {{2, "site", {"1", "2", "3"}},
                                 {8, "A", {"1", "2", "3"}},
                                 {8, "B", {"4", "5", "9"}},
                                 {22, "All", {"5", "7", "12"}}}});
@@ -93,7 +93,7 @@ TEST_F(Transpose, A_Table_Changes_Its_Factors)
     Column_At(sheet, 3)->table_margin_value = 8;
     ASSERT_TRUE(Transpose_Sheet(sheet));
     const Sheet& once = *Current_Sheet;
-    EXPECT_EQ(Render(&once), "kind F1|2|*; north T1|4|5; south T2|5|7; All T3|9|12");
+    EXPECT_EQ(Render(&once), "kind F1|2|3; north T1|4|5; south T2|5|7; All T3|9|12");
     EXPECT_EQ(once.last_column->type, table_margin_column);
     EXPECT_EQ(once.first_column->next->level_values->next->value.number, 8);
     EXPECT_EQ(once.first_column->next->labels->Text(), "A");

@@ -113,7 +113,7 @@ bool Take_Levels(Column& factor, const Table_Shape& shape)
             value = value->next;
         }
         if (label != nullptr) {
-            label->value.text = factor.texts.Store(column->name);
+            label->value.text = factor.texts.Store(Label_Text(*column));
             label = label->next;
         }
     }

@@ -71,7 +71,7 @@ std::int32_t Type_In(const Sheet& sheet, const Column& source)
     case matrix_sheet:
         return Is_Text_Like(source.type) ? row_column : matrix_column;
     case diagonal_matrix_sheet:
-        return Is_Text_Like(source.type) ? row_column : diagonal_matrix_column;
+        return row_column;  // it has one column of data
     default:
         return source.type;
     }
@@ -218,6 +218,43 @@ double Cell_Transfer::Level_Of_Number(double value)
     return met_levels_[number - 1];
 }
 
+/// As `Nearest_Level` of the target, whose level values are sorted for the first number that asks.
+std::int32_t Cell_Transfer::Nearest_Value(double value)
+{
+    if (sorted_values_.empty()) {
+        std::int32_t level = 0;
+        for (const double level_value : Level_Table(*target_))
+            if (++level; std::isfinite(level_value))
+                sorted_values_.emplace_back(level_value, level);
+        std::ranges::sort(sorted_values_);
+    }
+    const auto first_of = [this](double wanted) {
+        return std::ranges::lower_bound(sorted_values_, wanted, {}, &Valued_Level::first);
+    };
+    const auto above = first_of(value);
+    const auto below = above == sorted_values_.begin() ? above : first_of(std::prev(above)->first);
+    const auto away = [&](auto place) {
+        return place == sorted_values_.end() ? HUGE_VAL : std::fabs(place->first - value);
+    };
+    if (!(away(above) < HUGE_VAL) && !(away(below) < HUGE_VAL))
+        return 0;
+    if (away(above) == away(below))
+        return std::min(above->second, below->second);
+    return away(above) < away(below) ? above->second : below->second;
+}
+
+/// The first level of the target with that label, or 0.
+std::int32_t Cell_Transfer::Exact_Label(std::string_view text)
+{
+    if (labels_.empty()) {
+        std::int32_t level = 0;
+        for (const Level_Node* label = target_->labels; label != nullptr; label = label->next)
+            labels_.try_emplace(label->Text(), ++level);
+    }
+    const auto found = text.empty() ? labels_.end() : labels_.find(text);
+    return found == labels_.end() ? 0 : found->second;
+}
+
 double Cell_Transfer::Find_Level(double value)
 {
     constexpr int all_digits = 20;
@@ -226,7 +263,7 @@ double Cell_Transfer::Find_Level(double value)
     if (!Is_Present(*target.sheet, value))
         return missing;
     if (target.level_values_count > 0) {
-        const std::int32_t level = Nearest_Level(target, value);
+        const std::int32_t level = Nearest_Value(value);
         lost_ = lost_ || !Doubles_Equal(Factor_Level_Value(target, level), value);
         return level;
     }
@@ -239,6 +276,8 @@ double Cell_Transfer::Find_Level(double value)
     char text[Number_Text_Room];
     Cell_Node cell{};
     const auto length = static_cast<std::size_t>(Print_General(text, value, all_digits) - text);
+    if (const std::int32_t level = Exact_Label({text, length}); level > 0)
+        return level;
     Set_Cell_From_Text(target, cell, {text, length});
     // A label that only begins so is another one.
     const Level_Node* label = target.labels;

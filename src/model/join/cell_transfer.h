@@ -5,6 +5,9 @@
 #include "support/distinct_keys.h"
 
 #include <cstdint>
+#include <string_view>
+#include <unordered_map>
+#include <utility>
 #include <vector>
 
 namespace ingester {
@@ -57,6 +60,8 @@ private:
     [[nodiscard]] double Moved_Date(double value) const;
     [[nodiscard]] double Level_Of_Number(double value);
     [[nodiscard]] double Find_Level(double value);
+    [[nodiscard]] std::int32_t Nearest_Value(double value);
+    [[nodiscard]] std::int32_t Exact_Label(std::string_view text);
     void Put_Missing(Cell_Node& to) const;
 
     Column* target_ = nullptr;
@@ -68,6 +73,9 @@ private:
     std::vector<const char*> texts_;          ///< the same
     Distinct_Keys<double, Number_Keys> met_;  ///< numbers that were looked up as levels
     std::vector<double> met_levels_;
+    using Valued_Level = std::pair<double, std::int32_t>;
+    std::vector<Valued_Level> sorted_values_;  ///< level values of the target, when numbers look for them
+    std::unordered_map<std::string_view, std::int32_t> labels_;  ///< those of the target, likewise
 };
 
 }  // namespace ingester

@@ -71,9 +71,12 @@ Column* First_To_Move(const Sheet& source)
     return column;
 }
 
-/// How many columns of the source find none of their name to replace.
+/// How many columns of the source go behind those of the target, since they find none of their name to
+/// replace.
 std::int32_t Columns_To_Move(const Sheet& target, const Sheet& source, bool replace_equal_names)
 {
+    if (First_To_Move(source) == nullptr)
+        return 0;
     if (!replace_equal_names)
         return source.column_count;
     std::unordered_set<std::string> names;
@@ -94,7 +97,8 @@ bool Concatenate_Sheets(Sheet* target, Sheet* source, bool replace_equal_names)
         || Columns_To_Move(*target, *source, replace_equal_names)
                > request.Max_Columns - target->column_count)
         return false;
-    if (First_To_Move(*source) == nullptr && (!replace_equal_names || source->type != vector_sheet))
+    if (First_To_Move(*source) == nullptr
+        && (!replace_equal_names || (source->type != vector_sheet && source->type != matrix_sheet)))
         return false;
     Fit_Missing_Values(*source, target->missing_value);
     if (replace_equal_names)

@@ -5,10 +5,12 @@
 #include "model/join/merge.h"
 #include "model/join/merge_keys.h"
 #include "model/number_format.h"
+#include "model/sort.h"
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
 
 #include <algorithm>
+#include <functional>
 #include <map>
 #include <random>
 
@@ -390,6 +392,57 @@ TEST_F(Join, A_Column_That_Cannot_Take_The_Data_Is_Told)
         EXPECT_EQ(Render(target, false).substr(1), std::string("1|") + cells);
         EXPECT_EQ(Messages(), said + ":\n");
     }
+}
+
+// A Vector of a file may have columns that end early: what moves rows gives them all of theirs first.
+TEST_F(Join, Short_Columns_Lose_Nothing)
+{
+    const auto table = [](const Texts& keys, const Texts& cells) {
+        Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(keys.size()));
+        Add_Cells(sheet, variate_column, "k", keys);
+        Add_Cells(sheet, text_column, "t", cells);
+        sheet->has_short_columns = cells.size() < keys.size() ? 1 : 0;
+        return sheet;
+    };
+    const std::tuple<std::function<bool(Sheet*, Sheet*)>, const char*> cases[] = {
+        {[](Sheet* target, Sheet* source) { return Append_Sheet(target, {.source = source}); },
+         "k V4|3|2|1|2|9; t Tx|y|||p|q"},
+        {[](Sheet* target, Sheet* source) {
+             return Merge_Sheets({.target = target,
+                                  .source = source,
+                                  .key_count = 1,
+                                  .target_keys = {Column_At(target, 1)},
+                                  .source_keys = {Column_At(source, 1)},
+                                  .update_columns = true});
+         },
+         "k V4|3|2|1|9; t Tx|y|p||q"},
+        {[](Sheet* target, Sheet*) { return Sort_Sheet({.sheet = target, .key_index = {1}}); },
+         "k V1|2|3|4; t T||y|x"},
+    };
+    for (const auto& [join, expected] : cases) {
+        Start_Request("t");
+        Sheet* const target = table({"4", "3", "2", "1"}, {"x", "y"});
+        ASSERT_TRUE(join(target, table({"2", "9"}, {"p", "q"})));
+        EXPECT_EQ(Check_Sheet(*target), "");
+        EXPECT_EQ(Render(target), expected);
+    }
+}
+
+TEST_F(Join, Matrices_Replace_Their_Columns_And_Diagonal_Ones_Take_None)
+{
+    Sheet* const sheets[] = {New_Sheet_With_Rows(2), New_Sheet_With_Rows(2), New_Sheet_With_Rows(2)};
+    for (Sheet* const sheet : sheets)
+        sheet->type = matrix_sheet;
+    Add_Cells(sheets[0], matrix_column, "a", {"1", "2"});
+    Add_Cells(sheets[0], matrix_column, "b", {"3", "4"});
+    Add_Cells(sheets[1], matrix_column, "B", {"5", "6"});
+    EXPECT_TRUE(Concatenate_Sheets(sheets[0], sheets[1], true));
+    EXPECT_EQ(Numbers_Of(*Column_At(sheets[0], 2)), (std::vector<double>{5, 6}));
+    sheets[2]->type = diagonal_matrix_sheet;
+    Add_Cells(sheets[2], diagonal_matrix_column, "d", {"1", "2"});
+    Sheet* const more = New_Sheet_With_Rows(1);
+    Add_Cells(more, variate_column, "e", {"7"});
+    EXPECT_FALSE(Append_Sheet(sheets[2], {.source = more}));
 }
 
 TEST_F(Join, Columns_Stand_Beside_Each_Other_Or_Take_The_Place_Of_Others)
