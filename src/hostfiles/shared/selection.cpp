@@ -2,6 +2,7 @@
 
 #include "interface/request/request.h"
 #include "model/names.h"
+#include "model/row_fields.h"
 
 #include <algorithm>
 #include <vector>
@@ -15,6 +16,17 @@ std::int32_t Row_Selection::Count(std::int32_t rows) const
     const auto listed = std::min(static_cast<std::size_t>(rows), flags.size());
     return static_cast<std::int32_t>(listed
                                      - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
+}
+
+std::vector<std::int32_t> Row_Selection::New_Rows(std::int32_t rows) const
+{
+    const auto listed = flags.first(std::min(static_cast<std::size_t>(rows), flags.size()));
+    std::vector<std::int32_t> places;
+    places.reserve(listed.size());
+    std::int32_t next = 0;
+    for (const std::int32_t flag : listed)
+        places.push_back(flag != 0 ? next++ : -1);
+    return places;
 }
 
 std::string Valid_Name_Of_No_Column(std::string_view name)
@@ -36,34 +48,21 @@ bool Select_Symmetric(Sheet& sheet)
     const Row_Selection rows{request.Subset_Rows, request.Subset_Row_Flags};
     const Column_Subset columns;
     std::vector<std::int32_t> left_out;
+    std::vector<std::int32_t> new_rows;
     for (std::int32_t row = 0; row < sheet.row_count; ++row) {
         const Column* const column = Column_At(&sheet, sheet.leading_columns + row);
         const bool named = column == nullptr || Is_Column_Selected(columns, column->index, column->name);
-        if (!named || !rows.Keeps(row))
+        const bool kept = named && rows.Keeps(row);
+        new_rows.push_back(kept ? row - static_cast<std::int32_t>(left_out.size()) : -1);
+        if (!kept)
             left_out.push_back(row);
     }
     if (static_cast<std::int32_t>(left_out.size()) == sheet.row_count)
         return false;
     for (; !left_out.empty(); left_out.pop_back())
         Delete_Row(&sheet, left_out.back(), sheet.leading_columns + left_out.back() <= sheet.column_count);
+    Move_Row_Fields(sheet, new_rows);
     return true;
-}
-
-std::string Kept_Bits(const Row_Selection& selection, const std::string& bits, std::int32_t rows)
-{
-    if (!selection.active)
-        return bits;
-    std::string kept(static_cast<std::size_t>(selection.Count(rows)) / 8 + 1, '\0');
-    std::size_t to = 0;
-    for (std::int32_t row = 0; row < rows; ++row) {
-        if (!selection.Keeps(row))
-            continue;
-        const auto from = static_cast<std::size_t>(row);
-        if ((static_cast<unsigned char>(bits[from / 8]) >> from % 8 & 1U) != 0)
-            kept[to / 8] = static_cast<char>(kept[to / 8] | 1 << to % 8);
-        ++to;
-    }
-    return kept;
 }
 
 }  // namespace ingester

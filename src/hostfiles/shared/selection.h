@@ -8,6 +8,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace ingester {
 
@@ -24,6 +25,8 @@ struct Row_Selection {
     }
     /// How many of the first `rows`.
     [[nodiscard]] std::int32_t Count(std::int32_t rows) const;
+    /// The places (from 0) that an active selection gives the first `rows`, -1 for one that is left out.
+    [[nodiscard]] std::vector<std::int32_t> New_Rows(std::int32_t rows) const;
 };
 
 /// A cleaned name that no Column gets: what its brackets held must not come to the next Column that is made.
@@ -35,9 +38,5 @@ struct Row_Selection {
 
 /// Leaves out rows of a Symmetric Matrix, and their columns with them. False when none would be left.
 [[nodiscard]] bool Select_Symmetric(Sheet& sheet);
-
-/// Of a bit for each of `rows` rows, those of the rows that are kept.
-[[nodiscard]] std::string Kept_Bits(const Row_Selection& selection, const std::string& bits,
-                                    std::int32_t rows);
 
 }  // namespace ingester

@@ -7,6 +7,7 @@
 #include "interface/request/messages.h"
 #include "interface/request/request.h"
 #include "model/names.h"
+#include "model/row_fields.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -160,6 +161,7 @@ void Forget_Sheet(Book_Reading& reading)
         Free_Sheet(reading.sheet);
     reading.sheet = nullptr;
     reading.hidden_map.clear();
+    reading.dropped_cells.clear();
     reading.columns.clear();
     reading.origins.clear();
 }
@@ -223,15 +225,16 @@ bool Select_Rows(Sheet& sheet)
         return true;
     if (rows.Count(sheet.row_count) == 0)
         return false;
-    for (Saved_Restriction& saved : sheet.saved_restrictions)
-        saved.bits = Kept_Bits(rows, saved.bits, sheet.row_count);
-    Keep_Rows(&sheet, rows.flags);  // all of a Scalar Sheet
+    const std::vector<std::int32_t> new_rows = rows.New_Rows(sheet.row_count);
+    if (Keep_Rows(&sheet, rows.flags))  // not of a Scalar Sheet, which keeps its one row
+        Move_Row_Fields(sheet, new_rows);
     return true;
 }
 
 bool End_Sheet(Book_Reading& reading)
 {
     Sheet& sheet = *reading.sheet;
+    Drop_Cells(reading);  // before rows are left out
     reading.in_sheet = false;
     Resolve_Colour_Sources(reading);
     reading.origins.clear();
@@ -491,6 +494,7 @@ bool Read_Book(Book_Reading& reading)
 {
     if (!reading.source.Read_Head() || !Walk_Records(reading))
         return false;
+    Drop_Cells(reading);
     Tell_Soft_Fault(reading);
     if (reading.chooses && (!reading.chosen || reading.sheet == nullptr))
         return Tell_Not_Found(reading);

@@ -7,6 +7,7 @@
 
 #include <cstdint>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace ingester {
@@ -46,6 +47,9 @@ struct Book_Reading {
     std::vector<Column*> columns = {};       ///< by their place in the book; null for one left out
     std::vector<std::int32_t> origins = {};  ///< of the colours of each: a place in the book, 0 for none
 
+    /// Cells that comments take the data from: the column's place in the book (from 0), and the row there.
+    std::vector<std::pair<std::size_t, std::int32_t>> dropped_cells = {};
+
     std::int64_t blank_cells = Most_Blank_Cells;  ///< that are left
     const char* soft_fault = nullptr;             ///< the first
     bool unknown_told = false;
@@ -77,6 +81,8 @@ bool Not_Loaded(Book_Reading& reading, const char* fault);
 [[nodiscard]] bool Read_DDE_Record(Book_Reading& reading);
 [[nodiscard]] bool Read_Split_Record(Book_Reading& reading);
 [[nodiscard]] bool Read_Restriction(Book_Reading& reading);
+/// Makes the cells missing that comments told so far.
+void Drop_Cells(Book_Reading& reading);
 [[nodiscard]] bool Read_Hidden_Map(Book_Reading& reading);
 [[nodiscard]] bool Read_Sheet_IPRINT(Book_Reading& reading);
 [[nodiscard]] bool Read_Cell_Comment(Book_Reading& reading);

@@ -5,6 +5,7 @@
 #include "support/text.h"
 
 #include <algorithm>
+#include <limits>
 
 namespace ingester {
 
@@ -238,26 +239,57 @@ bool Read_Sheet_IPRINT(Book_Reading& reading)
 
 namespace {
 
-/// A comment may say that its cell counts as missing.
-void Drop_Cell(const Book_Reading& reading, std::int32_t row, std::int32_t index)
+void Drop_Cell(const Column& column, Cell_Node& cell)
 {
-    if (index < 1 || index > std::ssize(reading.columns) || row < 1)
-        return;
-    Column* const column = reading.columns[static_cast<std::size_t>(index) - 1];
-    const Row_Selection rows{request.Subset_Rows && !reading.in_sheet, request.Subset_Row_Flags};
-    if (column == nullptr || !rows.Keeps(row - 1))
-        return;
-    row = rows.Count(row);  // its place among those that were kept
-    Cell_Node* const cell = Cell_At(column, row - 1 - First_Row_Of(*column));
-    if (cell == nullptr)
-        return;
-    if (Is_Text_Like(column->type))
-        cell->value.text = Text_Arena::Empty();
+    if (Is_Text_Like(column.type))
+        cell.value.text = Text_Arena::Empty();
     else
-        cell->value.number = column->sheet->missing_value;
+        cell.value.number = column.sheet->missing_value;
+}
+
+/// Sorts the cells, by the rows that a selection has left them; some are gone with theirs.
+void Settle_Dropped_Cells(Book_Reading& reading)
+{
+    constexpr auto all_rows = std::numeric_limits<std::int32_t>::max();
+    auto& cells = reading.dropped_cells;
+    const Row_Selection rows{request.Subset_Rows && !reading.in_sheet, request.Subset_Row_Flags};
+    if (rows.active) {
+        const std::vector<std::int32_t> places = rows.New_Rows(all_rows);
+        std::erase_if(cells, [&](auto& cell) {
+            const bool listed = cell.second < std::ssize(places);
+            cell.second = listed ? places[static_cast<std::size_t>(cell.second)] : -1;
+            return cell.second < 0;
+        });
+    }
+    std::ranges::sort(cells);
 }
 
 }  // namespace
+
+void Drop_Cells(Book_Reading& reading)
+{
+    if (reading.dropped_cells.empty())
+        return;
+    Settle_Dropped_Cells(reading);
+    const Column* swept = nullptr;
+    Cell_Node* cell = nullptr;
+    std::int32_t at = 0;
+    for (const auto& [place, row] : reading.dropped_cells) {
+        Column* const column = reading.columns[place];
+        if (column == nullptr)
+            continue;
+        if (column != swept) {
+            swept = column;
+            cell = column->first_cell;
+            at = First_Row_Of(*column);
+        }
+        for (; cell != nullptr && at < row; ++at)
+            cell = cell->next;
+        if (cell != nullptr && at == row)
+            Drop_Cell(*column, *cell);
+    }
+    reading.dropped_cells.clear();
+}
 
 bool Read_Cell_Comment(Book_Reading& reading)
 {
@@ -272,8 +304,9 @@ bool Read_Cell_Comment(Book_Reading& reading)
     if (!source.Skip(number) || !source.Read(row, column) || !source.Skip(2 * number) || !source.Read(marker)
         || (marker > 0 && !source.Read(length)) || (length > 0 && !source.Read_Bytes(length, kept, text)))
         return false;
-    if (request.Replace_Book_Data && reading.sheet != nullptr && text.starts_with("*M"))
-        Drop_Cell(reading, row, column);
+    const bool has_cell = row >= 1 && column >= 1 && column <= std::ssize(reading.columns);
+    if (request.Replace_Book_Data && has_cell && text.starts_with("*M"))
+        reading.dropped_cells.emplace_back(static_cast<std::size_t>(column) - 1, row - 1);
     return true;
 }
 

@@ -24,12 +24,13 @@ bool Is_Sheet_Type(std::int32_t type)
 }
 
 /// Finds version and order, and the Sheet's type where that is the first word.
-bool Read_Magic(TSS_Source& source)
+bool Read_Magic(TSS_Reading& reading)
 {
+    TSS_Source& source = reading.source;
     std::byte bytes[sizeof(std::uint32_t)];
     const std::int64_t start = source.File().Position();
     if (!source.File().Read_Exactly(bytes, sizeof bytes))
-        return false;
+        return reading.Ends_Early();
     for (const TSS_Magic& magic : TSS_Magics)
         for (const std::endian order : {std::endian::little, std::endian::big})
             if (Number_At<std::uint32_t>(bytes, order) == magic.word) {
@@ -71,7 +72,7 @@ bool Read_Head(TSS_Reading& reading)
     const std::int64_t beyond_square = std::int64_t{head.column_count} - head.row_count;
     if (head.sheet_type == symmetric_matrix_sheet && beyond_square != 0 && beyond_square != 1)
         return Fail("Spreadsheet Read Error: Symmetric Matrix is not symmetric.\n");
-    return complete;
+    return complete || reading.Ends_Early();
 }
 
 bool Has_Flag(const TSS_Reading& reading, Present_Flag flag)
@@ -101,6 +102,8 @@ bool Start_Sheet(TSS_Reading& reading)
     const std::span<const std::int32_t> flags = request.Subset_Row_Flags;
     const auto rows = static_cast<std::size_t>(head.row_count);
     reading.rows = {request.Subset_Rows && !symmetric, flags.first(std::min(flags.size(), rows))};
+    if (reading.rows.active)
+        reading.new_rows = reading.rows.New_Rows(head.row_count);
     Expect_Rows(sheet, reading.rows.Count(head.row_count));
     return true;
 }
@@ -111,8 +114,10 @@ bool Read_Variate_Pointer(TSS_Reading& reading)
     constexpr std::int32_t variates = 4;
     const std::int32_t length = reading.head.pointer_length;
     std::string name;
-    if (length < 0 || !reading.source.Read_Bytes(length, greatest_length, name))
+    if (length < 0)
         return false;
+    if (!reading.source.Read_Bytes(length, greatest_length, name))
+        return reading.Ends_Early();
     if (length > greatest_length)
         Report_Message("Pointer to Variate columns was truncated in reading TSS file.\n");
     return length == 0 || Define_Pointer(reading.sheet, Valid_Name_Of_No_Column(name), variates);
@@ -127,7 +132,7 @@ bool Read_Name(TSS_Source& source, std::string& name, const char* none, const ch
         return Fail(none);
     if (length > static_cast<std::int32_t>(Name_Width))
         Report_Message(too_long);
-    return source.Read_Bytes(length, Name_Width, name);
+    return source.Read_Bytes(length, Name_Width, name) || Fail(none);
 }
 
 bool Read_Matrix_Block(TSS_Reading& reading)
@@ -257,6 +262,8 @@ bool Set_Row_Marks(TSS_Reading& reading)
 bool Finish_Sheet(TSS_Reading& reading)
 {
     Sheet& sheet = *reading.sheet;
+    if (sheet.column_count == 0 && reading.source.Ended())
+        return reading.Ends_Early();
     if (sheet.column_count == 0 || (reading.rows.active && sheet.row_count == 0))
         return false;  // silent by design: the pipeline tells what was left out
     if (!Set_Row_Marks(reading) || !Select_Symmetric(sheet))
@@ -277,8 +284,8 @@ bool Read_Columns(TSS_Reading& reading)
 
 bool Read_Sheet(TSS_Reading& reading)
 {
-    if (!Read_Magic(reading.source) || !Read_Head(reading) || !Start_Sheet(reading)
-        || !Read_Variate_Pointer(reading) || !Read_Type_Block(reading))
+    if (!Read_Magic(reading) || !Read_Head(reading) || !Start_Sheet(reading) || !Read_Variate_Pointer(reading)
+        || !Read_Type_Block(reading))
         return false;
     const bool whole = Read_Columns(reading);
     Limit_Rows(reading);
@@ -297,7 +304,7 @@ bool Read_TSS(Input_File& file)
 {
     TSS_Reading reading{.source = TSS_Source(file)};
     const bool read = Read_Sheet(reading);
-    if (file.Failed())  // which is no short file
+    if (file.Failed() || reading.ends_early)
         return Fail_To_Read(file.Name());
     if (!read)
         return false;

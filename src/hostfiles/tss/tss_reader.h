@@ -20,11 +20,22 @@ struct TSS_Reading {
     Head_Record head = {};
     std::int32_t columns = 0;  ///< records to read
     Row_Selection rows = {};
+    std::vector<std::int32_t> new_rows = {};  ///< the places that `rows` gives them
     Column_Subset subset = {};
     bool selects_columns = false;
     std::vector<std::uint8_t> row_marks = {};  ///< of the rows kept
     Memory_Ahead ahead = {};
-    bool colours_corrupt = false;  ///< a record of colours or the like was
+    std::vector<Column*> columns_read = {};  ///< for the records behind them, which name them by ordinals
+    std::int32_t factors_read = 0;           ///< of these
+    bool colours_corrupt = false;            ///< a record of colours or the like was
+    bool ends_early = false;                 ///< the file does, which is to be told
+
+    /// For a read that came short, where no other message is due. Always false.
+    [[nodiscard]] bool Ends_Early()
+    {
+        ends_early = true;
+        return false;
+    }
 };
 
 /// Reads the record of column `ordinal`. False where the columns end, silently.

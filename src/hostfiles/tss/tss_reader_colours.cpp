@@ -2,6 +2,7 @@
 #include "hostfiles/tss/tss_reader_extras.h"
 #include "interface/request/messages.h"
 #include "model/date_format.h"
+#include "model/row_fields.h"
 #include "support/number_text.h"
 
 #include <algorithm>
@@ -33,7 +34,7 @@ void Print_Date_Headings(Sheet& sheet, std::int32_t code, std::int32_t form)
     }
 }
 
-bool Set_Column_Factor(Sheet& sheet, const Column_Factor_Record& record)
+void Set_Column_Factor(Sheet& sheet, const Column_Factor_Record& record)
 {
     constexpr std::int32_t most_decimals = 18;
     std::int32_t code = record.date_word % Date_Word_Base;
@@ -52,7 +53,6 @@ bool Set_Column_Factor(Sheet& sheet, const Column_Factor_Record& record)
     sheet.column_factor_date = form >= 1 ? -code : code;
     if (sheet.label_state == labels_by_level && sheet.column_factor_format == date_format_mark && code != 0)
         Print_Date_Headings(sheet, code, form >= 1 ? 1 : 0);
-    return true;
 }
 
 }  // namespace
@@ -64,7 +64,10 @@ bool Read_Column_Factor(TSS_Reading& reading)
     if (!reading.source.Read_Text(Extra_Width, description))
         return Fail("Spreadsheet Read Error: Invalid Table Column Factor description.\n");
     reading.sheet->column_label_name = description;
-    return reading.source.Read(record, Column_Factor_Fields) && Set_Column_Factor(*reading.sheet, record);
+    if (!reading.source.Read(record, Column_Factor_Fields))
+        return reading.Ends_Early();
+    Set_Column_Factor(*reading.sheet, record);
+    return true;
 }
 
 bool Read_Reference_Levels(TSS_Reading& reading)
@@ -85,13 +88,9 @@ namespace {
 bool Skip_Factor_Colours(TSS_Reading& reading, std::int32_t ordinal)
 {
     TSS_Source& source = reading.source;
-    const Sheet& sheet = *reading.sheet;
-    std::int32_t factors = 0;
-    for (const Column* column = sheet.first_column; column != nullptr; column = column->next)
-        factors += column->type == factor_column;
     std::int32_t count;
     return source.Skip(sizeof(std::int32_t))
-           && (sheet.type != table_sheet || ordinal >= factors
+           && (reading.sheet->type != table_sheet || ordinal >= reading.factors_read
                || (source.Read_Count(count) && source.Skip(std::int64_t{4} * count)));
 }
 
@@ -171,7 +170,9 @@ bool Read_Cell_Colours_Of(TSS_Reading& reading, Column& column, std::int32_t cou
             return true;
         }))
         return false;
-    if (count > 0)
+    if (reading.rows.active)
+        Move_Cell_Colours(colours, reading.new_rows);
+    if (!colours.empty())
         Set_Cell_Colours(column, colours);
     return true;
 }

@@ -480,7 +480,7 @@ bool Fill_TSS_Column(TSS_Reading& reading, Column& column, const Column_Record& 
 {
     std::int32_t text_width = 0;
     Set_Column_Fields(reading, column, record);
-    if (!Read_Levels(reading.source, column, record))
+    if (column.type == factor_column && !Read_Levels(reading.source, column, record))
         return false;
     Set_Table_Column(column, record);
     if (!Read_TSS_Cells(reading, column, record.length, text_width) || !Is_Length_Lawful(column))

@@ -2,15 +2,17 @@
 #include "hostfiles/tss/tss_reader_extras.h"
 #include "interface/request/messages.h"
 #include "model/calendar.h"
+#include "model/row_fields.h"
 
 #include <algorithm>
 #include <string>
 
 namespace ingester {
 
-Column* Column_Of(TSS_Reading& reading, std::int32_t ordinal)
+Column* Column_Of(const TSS_Reading& reading, std::int32_t ordinal)
 {
-    return ordinal < 1 ? nullptr : Column_At(reading.sheet, ordinal);
+    const bool known = ordinal >= 1 && ordinal <= std::ssize(reading.columns_read);
+    return known ? reading.columns_read[static_cast<std::size_t>(ordinal) - 1] : nullptr;
 }
 
 namespace {
@@ -226,7 +228,8 @@ bool Read_Saved_Restrictions(TSS_Reading& reading)
         const std::int64_t bytes = rows / 8 + 1;
         if (!source.Read_Bytes(bytes, static_cast<std::size_t>(bytes), restriction.bits))
             return false;
-        restriction.bits = Kept_Bits(reading.rows, restriction.bits, rows);
+        if (reading.rows.active)
+            restriction.bits = Moved_Bits(restriction.bits, reading.new_rows, reading.rows.Count(rows));
         reading.sheet->saved_restrictions.push_back(std::move(restriction));
     }
     return true;
@@ -283,10 +286,19 @@ void Tell_Corrupt(TSS_Reading& reading, const Auxiliary_Record& record)
     Report_Message(text.substr(0, longest_message));
 }
 
+void List_Columns(TSS_Reading& reading)
+{
+    for (Column* column = reading.sheet->first_column->next; column != nullptr; column = column->next) {
+        reading.columns_read.push_back(column);
+        reading.factors_read += column->type == factor_column;
+    }
+}
+
 }  // namespace
 
 bool Read_Auxiliary_Records(TSS_Reading& reading)
 {
+    List_Columns(reading);
     const auto flags = static_cast<std::uint32_t>(reading.head.present_flags);
     for (const Auxiliary_Record& record : Auxiliary_Records) {
         if ((flags & record.flag) == 0) {

@@ -11,7 +11,7 @@
 namespace ingester {
 
 /// The column of an ordinal; null for none.
-[[nodiscard]] Column* Column_Of(TSS_Reading& reading, std::int32_t ordinal);
+[[nodiscard]] Column* Column_Of(const TSS_Reading& reading, std::int32_t ordinal);
 
 /// `count` records of a layout, each given to `take`, until one is refused.
 template <class Record, class... Fields, class Take> [[nodiscard]] bool

@@ -37,7 +37,6 @@ bool Read_Text_Block(TSS_Source& source, std::int32_t bytes, std::string& block,
         if (length > 0)
             block.append(text).push_back('\0');
     }
-    block.resize(std::max(block.size(), size));
     return true;
 }
 

@@ -17,7 +17,7 @@ bool TSS_Source::Read_Bytes(std::int64_t length, std::size_t kept, std::string& 
         const auto part = static_cast<std::size_t>(std::min(left, Bytes_At_Once));
         const std::size_t held = text.size();
         text.resize(held + part);
-        if (!file_->Read_Exactly(text.data() + held, part))
+        if (!Read_Raw(text.data() + held, part))
             return false;
         left -= static_cast<std::int64_t>(part);
     }
@@ -29,7 +29,7 @@ bool TSS_Source::Skip(std::int64_t bytes)
     char passed[Bytes_At_Once];
     while (bytes > 0) {
         const std::int64_t part = std::min(bytes, Bytes_At_Once);
-        if (!file_->Read_Exactly(passed, static_cast<std::size_t>(part)))
+        if (!Read_Raw(passed, static_cast<std::size_t>(part)))
             return false;
         bytes -= part;
     }

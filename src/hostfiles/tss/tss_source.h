@@ -40,7 +40,7 @@ public:
 
     [[nodiscard]] bool Read_Numbers(std::span<double> numbers)
     {
-        if (!file_->Read_Exactly(numbers.data(), numbers.size_bytes()))
+        if (!Read_Raw(numbers.data(), numbers.size_bytes()))
             return false;
         Turn_Native(numbers, order);
         return true;
@@ -67,17 +67,28 @@ public:
     /// How many items of `size` bytes, of `claimed` ones, the rest of the file can hold.
     [[nodiscard]] std::int64_t Possible(std::int64_t claimed, std::int64_t size) const;
 
+    /// Whether the file was found to end before what was to be read.
+    [[nodiscard]] bool Ended() const { return ended_; }
+
 private:
+    [[nodiscard]] bool Read_Raw(void* target, std::size_t count)
+    {
+        const bool whole = file_->Read_Exactly(target, count);
+        ended_ = ended_ || !whole;
+        return whole;
+    }
+
     template <class T> [[nodiscard]] bool Read_Value(T& value)
     {
         std::byte bytes[sizeof(T)];
-        if (!file_->Read_Exactly(bytes, sizeof bytes))
+        if (!Read_Raw(bytes, sizeof bytes))
             return false;
         value = Number_At<T>(bytes, order);
         return true;
     }
 
     Input_File* file_;
+    bool ended_ = false;
 };
 
 }  // namespace ingester

@@ -18,11 +18,21 @@ std::string_view Name_For_File(Fixed_Text<Name_Width>& name)
 
 namespace {
 
+/// The marks of a restriction count as a column. Square and diagonal matrices are refused when they have more
+/// columns than the matrix itself and one of labels.
+bool Has_Row_Marks(const Sheet& sheet)
+{
+    const std::int32_t most_with_marks = sheet.type == symmetric_matrix_sheet  ? sheet.row_count
+                                         : sheet.type == diagonal_matrix_sheet ? 1
+                                                                               : sheet.column_count;
+    return sheet.restriction_active != 0 && sheet.column_count <= most_with_marks;
+}
+
 void Write_Head(const Sheet& sheet, TSS_Sink& sink)
 {
     const Head_Record head = {
         .sheet_type = sheet.type,
-        .column_count = sheet.column_count + (sheet.restriction_active != 0 ? 1 : 0),
+        .column_count = sheet.column_count + (Has_Row_Marks(sheet) ? 1 : 0),
         .row_count = sheet.row_count,
         .missing_value = Missing_Value,
         .host_flag_a = sheet.host_flag_a,
@@ -60,6 +70,10 @@ bool Write_Row_Marks(Sheet& sheet, TSS_Sink& sink)
 {
     if (sheet.restriction_active == 0)
         return true;
+    if (!Has_Row_Marks(sheet)) {
+        Report_Message("Warning: The restriction of the rows is not saved with a matrix that has labels.\n");
+        return true;
+    }
     if (!Need_Rows(&sheet))
         return false;
     sink.Put(Row_Marks_Type);

@@ -45,7 +45,7 @@ inline void Decorate(Column& column)
     column.gradient_reversed = 1;
     column.gradient_high = 9.5;
     column.text_colour = 0x010203;
-    column.cell_colours = {{1, 2, 3}, {2, 0, 0xFFFFFF}};
+    column.cell_colours = {{1, 2, 3}, {2, 8, 9}, {3, 0, 0xFFFFFF}};
     column.iprint = 2;
     column.hidden = 1;
     column.width = 12;

@@ -203,7 +203,8 @@ TEST_F(Book_Reader, Reads_Records_That_Are_No_Longer_Written)
     };
     const std::string comments = b.Record(128) + b.Record(130, std::string(24, '\0'))
                                  + comment(2, 2, "*Missing") + comment(1, 1, "*M") + comment(3, 2, "no")
-                                 + comment(9, 9, "*M") + b.Record(129);
+                                 + comment(9, 9, "*M") + comment(9, 1, "*M") + comment(1, 2, "*M")
+                                 + b.Record(129);
     const std::string book = b.Book({b.Sheet("S", 1, 2, 3, sheet + b.Record(12, "\7"))}, old, comments);
     EXPECT_EQ(Outcome(book), "kind_of F2|*|*; t Ta|b|c");
     EXPECT_EQ(Current_Sheet->population_code, 7);
@@ -211,7 +212,10 @@ TEST_F(Book_Reader, Reads_Records_That_Are_No_Longer_Written)
     EXPECT_EQ(Current_Sheet->dde_flags[3], 4);
     EXPECT_EQ(Current_Sheet->first_column->next->extra, "told");
     request.Replace_Book_Data = true;
-    EXPECT_EQ(Outcome(book), "kind_of F*|*|*; t Ta||c");
+    EXPECT_EQ(Outcome(book), "kind_of F*|*|*; t T||c");
+    request.Subset_Rows = true;
+    request.Subset_Row_Flags = {1, 0, 1};
+    EXPECT_EQ(Outcome(book), "kind_of F*|*; t T|c") << "rows are those of the book";
 }
 
 TEST_F(Book_Reader, Settles_What_A_Record_Leaves_Open)
@@ -312,6 +316,11 @@ TEST_F(Book_Reader, Leaves_Out_Columns_And_Rows)
     request.Subset_Row_Flags = {1, 0, 1, 1, 0, 0, 0, 0, 1};
     EXPECT_EQ(Outcome(bytes), "v V1|*|1e+300; t Ta|c|90 characters");
     EXPECT_EQ(Current_Sheet->saved_restrictions[0].bits, std::string("\3"));
+    const std::vector<Cell_Colour>& colours = Column_At(Current_Sheet, 1)->cell_colours;
+    ASSERT_EQ(colours.size(), 2U);
+    EXPECT_EQ(colours[0].row, 1);
+    EXPECT_EQ(colours[1].row, 2);
+    EXPECT_EQ(colours[1].back_colour, 0xFFFFFF);
     EXPECT_EQ(Column_At(Current_Sheet, 1)->colour_source, nullptr) << "the Factor is gone";
     request.Subset_Names = {"none"};
     EXPECT_EQ(Outcome(bytes), "-") << "the pipeline tells";

@@ -11,6 +11,7 @@ using TSS_Messages = TSS_Test;
 
 constexpr double M = Missing_Value;
 constexpr std::int32_t Too_Large = 10000001;
+constexpr const char* Ends_Early = "Error: Could not read all of file ";
 const Maker Make;
 
 /// A file, what is reported of it, and how many columns are left of it: 0 for no Sheet.
@@ -28,6 +29,11 @@ const Message_Case Message_Cases[] = {
     {Make.Head(0, 1, 1),
      "Spreadsheet Read Error: Unknown sheet type.\nCheck this is a Tabulon spreadsheet.\n"},
     {Make.Head(1, 0, 1), ""},
+    {Of(54415441, 1, 1, 1), Ends_Early},
+    {Of(Make.Head(2, 1, 1), 2, Raw{"m"}), "Spreadsheet Read Error: Matrix name length should positive.\n"},
+    {Make.Head(1, 1, 1), Ends_Early},
+    {Of(Make.Head(1, 2, 1), Make.Column(4, 1, "x")), Ends_Early},
+    {Of(54415441, 1, 1, 1, M, 0, 0, 0, 0, 9), Ends_Early},
     {Make.Head(1, 1, -1), "Spreadsheet Read Error: Number of rows should be positive.\n"},
     {Make.Head(3, 4, 2), "Spreadsheet Read Error: Symmetric Matrix is not symmetric.\n"},
     {Make.Head(3, 1, 2), "Spreadsheet Read Error: Symmetric Matrix is not symmetric.\n"},
@@ -125,7 +131,7 @@ const struct {
     {18, Of(-1), "Spreadsheet Read Error: Invalid Sheet pagename.\n", 0},
     {18, Of(), "Spreadsheet Read Error: Invalid Sheet pagename.\n", 0},
     {19, Of(-1), "Spreadsheet Read Error: Invalid Table Column Factor description.\n", 0},
-    {19, Of("d", 1, 2), "", 0},
+    {19, Of("d", 1, 2), Ends_Early, 0},
     {20, Of(1, 1, -1), "", 0},
     {20, Of(1, 1), "", 0},
     {21, Of(1, 9, 1, 1, 2, 3), "TSS file has corrupt cell colours.\n"},

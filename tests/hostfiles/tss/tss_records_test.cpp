@@ -60,6 +60,8 @@ const Record_Case Record_Cases[] = {
      "616200636400 2 6"},
     {"an empty title line takes no room", 3, Of(5, 3, "", "a", "bc"),
      [](S s) { return Text_Of(Hex(s.title_lines), s.title_line_count); }, "6100626300 3", false},
+    {"a title of less than its size", 3, Of(10000000, 1, "a"),
+     [](S s) { return Text_Of(s.title_lines.size(), s.title_line_count, s.title_bytes); }, "2 1 2", false},
     {"a cleared title", 3, Of(0), [](S s) { return Text_Of(s.title_cleared, s.title_bytes); }, "0 0", false},
     {"current cell", 4, Of(2, 3), [](S s) { return Text_Of(s.current_column, s.current_row); }, "2 2"},
     {"a current cell beyond", 4, Of(9, 9), [](S s) { return Text_Of(s.current_column, s.current_row); },
@@ -199,6 +201,7 @@ TEST_F(TSS_Records, Head_And_Column_Fields_Come_Back)
     EXPECT_EQ(Text_Of(x.extra.view(), x.format, x.width, x.justify, x.date_form, x.date_format,
                       x.protected_column, x.attached_text, x.attached_mode, x.decimals),
               "what it is 5 80 3 1 7 259 y + 1\2 0 2");
+    EXPECT_EQ(Text_Of(x.nlevels, Col(s, 2).nlevels), "0 1");
     EXPECT_EQ(Hex(Written(Current_Sheet)), Hex(Encode(items)));
     Column& text = *Column_At(Current_Sheet, 2);
     Current_Sheet->read_only = Current_Sheet->host_flag_a = 0;
@@ -429,6 +432,26 @@ TEST_F(TSS_Records, Row_Marks_Restrict)
     EXPECT_EQ(Text_Of(Current_Sheet->restriction_active, Current_Sheet->restricted_rows), "0 0");
 }
 
+/// Where the marks would make more columns than a file may have, they are left out.
+TEST_F(TSS_Records, Row_Marks_Do_Not_Spoil_A_Matrix)
+{
+    const Items labels = Maker().Texts(-3, "labels", {"p", "q"}, 1);
+    Items square = Of(Maker().Head(3, 3, 2), "S", 1, labels, Maker().Numbers(7, "a", {1.0, 2.0}));
+    square << Maker().Numbers(7, "b", {3.0});
+    const Items diagonal = Of(Maker().Head(4, 2, 2), labels, Maker().Numbers(6, "d", {1.0, 2.0}));
+    for (const Items& items : {square, diagonal}) {
+        ASSERT_NE(Read(items), nullptr);
+        const std::string cells = Render(Current_Sheet);
+        Row_At(Current_Sheet, 0)->restricted = Current_Sheet->restricted_rows = 1;
+        Current_Sheet->restriction_active = 1;
+        const std::string written = Written(Current_Sheet);
+        EXPECT_NE(Messages().find("The restriction of the rows is not saved"), std::string::npos);
+        ASSERT_NE(Read(written), nullptr);
+        EXPECT_EQ(Render(Current_Sheet), cells);
+        EXPECT_EQ(Messages(), "");
+    }
+}
+
 /// Without the record of dates, everything is as old as the file.
 TEST_F(TSS_Records, Files_Without_Dates_Have_Their_Own)
 {
@@ -444,7 +467,8 @@ TEST_F(TSS_Records, Files_Without_Dates_Have_Their_Own)
 
 TEST_F(TSS_Records, Selections_Leave_Out_Columns_And_Rows)
 {
-    const Items items = With_Records({{16, Of(1, "r", 3, Raw{"\6"})}});
+    const Items items = With_Records({{16, Of(1, "r", 3, Raw{"\6"})},
+                                      {21, Of(2, 2, 2, 1, 5, 6, 3, 7, 8, 4, 3, 1, 5, 6, 2, 3, 4, 3, 3, 4)}});
     const struct {
         void (*prepare)();
         const char* cells;  ///< null: nothing was left
@@ -476,17 +500,29 @@ TEST_F(TSS_Records, Selections_Leave_Out_Columns_And_Rows)
     const auto rows = [] { request.Subset_Rows = true, request.Subset_Row_Flags = {0, 1, 1}; };
     ASSERT_NE(Read(items, rows), nullptr);
     EXPECT_EQ(Hex(Current_Sheet->saved_restrictions[0].bits), "03");
+    const Column& x = Col(*Current_Sheet, 2);
+    EXPECT_EQ(Text_Of(x.cell_colours.size(), x.cell_colours[0].row, x.cell_colours[0].text_colour), "1 2 7");
+    EXPECT_EQ(Text_Of(Col(*Current_Sheet, 4).cell_colours.size(), Col(*Current_Sheet, 4).text_colour), "0 3")
+        << "what is left is all alike";
     ASSERT_NE(Read(Of(Maker().Head(1, 2, 3), Maker().Numbers(4, "x", {1.0, 2.0, 3.0}), 21, 3, 1, 0, 1), rows),
               nullptr);
     EXPECT_EQ(Current_Sheet->restricted_rows, 1);
     // A column may be longer than the Sheet then.
     ASSERT_NE(Read(Of(Maker().Head(1, 1, 2), Maker().Numbers(4, "x", {1.0, 2.0, 3.0})), rows), nullptr);
     EXPECT_EQ(Render(Current_Sheet), "x V2");
-    Items symmetric = Of(Maker().Head(3, 3, 3), "S", 1);
+    Items symmetric = Of(Maker().Head(3, 3, 3, 1U << 16 | 1U << 14 | 1U << 21), "S", 1);
     symmetric << Maker().Numbers(7, "a", {1.0, 2.0, 3.0}) << Maker().Numbers(7, "b", {4.0, 5.0})
-              << Maker().Numbers(7, "c", {6.0});
-    ASSERT_NE(Read(symmetric, rows), nullptr);
-    EXPECT_EQ(Render(Current_Sheet), "b S4|5; c S6");
+              << Maker().Numbers(7, "c", {6.0})
+              << Of(0.0, 0, 1, "r", 3, Raw{"\4"}, 1, 1, 2, 1, 5, 6, 3, 7, 8);
+    ASSERT_NE(Read(symmetric,
+                   [] {
+                       request.Subset_Rows = true, request.Subset_Row_Flags = {1, 0, 1};
+                   }),
+              nullptr);
+    EXPECT_EQ(Render(Current_Sheet), "a S1|3; c S6");
+    EXPECT_EQ(Text_Of(Hex(Current_Sheet->saved_restrictions[0].bits),
+                      Col(*Current_Sheet, 1).cell_colours.size(), Col(*Current_Sheet, 1).cell_colours[1].row),
+              "02 2 2");
 }
 
 }  // namespace
