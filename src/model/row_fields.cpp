@@ -28,6 +28,14 @@ std::string Moved_Bits(const std::string& bits, std::span<const std::int32_t> ne
     return moved;
 }
 
+bool Has_Row_Fields(const Sheet& sheet)
+{
+    bool any = !sheet.saved_restrictions.empty();
+    for (const Column* column = sheet.first_column; column != nullptr && !any; column = column->next)
+        any = !column->cell_colours.empty();
+    return any;
+}
+
 void Move_Row_Fields(Sheet& sheet, std::span<const std::int32_t> new_rows)
 {
     for (Saved_Restriction& saved : sheet.saved_restrictions)

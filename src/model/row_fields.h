@@ -20,6 +20,9 @@ void Move_Cell_Colours(std::vector<Cell_Colour>& colours, std::span<const std::i
 [[nodiscard]] std::string Moved_Bits(const std::string& bits, std::span<const std::int32_t> new_rows,
                                      std::int32_t rows);
 
+/// Whether a Sheet has any of them.
+[[nodiscard]] bool Has_Row_Fields(const Sheet& sheet);
+
 /// Both for a Sheet that has its new rows already: the colours of its cells and its saved restrictions.
 void Move_Row_Fields(Sheet& sheet, std::span<const std::int32_t> new_rows);
 

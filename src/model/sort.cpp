@@ -1,6 +1,7 @@
 #include "model/sort.h"
 
 #include "model/level_tables.h"
+#include "model/row_fields.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -264,6 +265,16 @@ template <class Node, class Value> void Reorder(Node* first, Value Node::*member
         node->*member = room[*from++];
 }
 
+/// What is kept by row numbers goes with the rows.
+void Move_Fields(Sheet& sheet, const std::vector<std::uint32_t>& order)
+{
+    std::vector<std::int32_t> new_rows(static_cast<std::size_t>(sheet.row_count));
+    std::iota(new_rows.begin(), new_rows.end(), 0);
+    for (std::size_t place = 0; place < order.size(); ++place)
+        new_rows[order[place]] = static_cast<std::int32_t>(place);
+    Move_Row_Fields(sheet, new_rows);
+}
+
 /// Row numbers run 1, 2, ... whatever stands beside them, so that column stays.
 void Apply_Order(Sheet& sheet, const std::vector<std::uint32_t>& order)
 {
@@ -295,7 +306,10 @@ bool Sort_Sheet(const Sort_Request& wanted)
     std::vector<Sort_Key> keys;
     if (!Make_Sort_Keys(wanted, static_cast<std::size_t>(Movable_Rows(sheet)), keys))
         return false;
-    Apply_Order(sheet, Sorted_Rows(keys, wanted.ascending, wanted.ignore_case));
+    const std::vector<std::uint32_t> order = Sorted_Rows(keys, wanted.ascending, wanted.ignore_case);
+    Apply_Order(sheet, order);
+    if (Has_Row_Fields(sheet))
+        Move_Fields(sheet, order);
     return true;
 }
 

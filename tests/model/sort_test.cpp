@@ -104,6 +104,7 @@ TEST_F(Sort, Agrees_With_A_Plain_Stable_Sort)
             numbers.push_back(std::to_string(row));
         Column* const place = Add_Cells(wanted.sheet, variate_column, "place", numbers);
         Row_At(wanted.sheet, rows - 1)->restricted = 1;
+        place->cell_colours.push_back({rows, 0, 0});
         const std::vector<std::size_t> order = Plain_Order(wanted);
         ASSERT_TRUE(Sort_Sheet(wanted));
         const std::vector<double> sorted = Numbers_Of(*place);
@@ -113,6 +114,7 @@ TEST_F(Sort, Agrees_With_A_Plain_Stable_Sort)
         for (std::int32_t row = 0; row < rows; ++row)
             ASSERT_EQ(Row_At(wanted.sheet, row)->restricted,
                       sorted[static_cast<std::size_t>(row)] == rows - 1);
+        ASSERT_EQ(sorted[static_cast<std::size_t>(place->cell_colours.front().row) - 1], rows - 1);
         ASSERT_EQ(Check_Sheet(*wanted.sheet), "");
     }
 }

@@ -5,6 +5,7 @@
 #include "model/join/merge_keys.h"
 #include "model/join/merge_rows.h"
 #include "model/names.h"
+#include "model/row_fields.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -175,6 +176,16 @@ void Keep_Margin_Row_Last(const Sheet& target, std::vector<Merged_Row>& plan)
         plan.push_back({Merged_Row::Kind::kept, -1});
 }
 
+/// What is kept by row numbers goes with the rows.
+void Move_Fields_Of_Kept_Rows(Sheet& sheet, const std::vector<Merged_Row>& plan)
+{
+    std::vector<std::int32_t> new_rows;
+    for (std::size_t row = 0; row < plan.size(); ++row)
+        if (plan[row].kind == Merged_Row::Kind::kept)
+            new_rows.push_back(static_cast<std::int32_t>(row));
+    Move_Row_Fields(sheet, new_rows);
+}
+
 bool Carry_Out(const Merge_Request& wanted, const Merged_Columns& columns, std::vector<Merged_Row>& plan)
 {
     constexpr std::size_t most_rows = 2147483647;
@@ -189,6 +200,8 @@ bool Carry_Out(const Merge_Request& wanted, const Merged_Columns& columns, std::
     if (new_rows > 0)
         for (Column* column = target.first_column->next; column != nullptr; column = column->next)
             Spread_New_Cells(*column, plan, old_rows);
+    if (new_rows > 0 && Has_Row_Fields(target))
+        Move_Fields_Of_Kept_Rows(target, plan);
     for (const Merged_Column& merged : columns.All())
         if (!merged.is_key || new_rows > 0)
             Write_Source_Rows(wanted, merged, plan);
