@@ -33,6 +33,13 @@ double Missing_Marker(double value)
     return std::isfinite(value) && value < first_level ? value : Missing_Value;
 }
 
+std::string_view Name_Or_Label(const Column& column)
+{
+    const std::int32_t state = column.sheet->label_state;
+    const bool by_text = state == labels_by_text || state == labels_by_text_and_level;
+    return column.type == table_column && by_text ? Label_Text(column) : column.name.view();
+}
+
 std::int32_t Label_State_In_File(const Sheet& sheet)
 {
     return std::clamp<std::int32_t>(sheet.label_state, labels_by_position,

@@ -37,6 +37,9 @@ constexpr double Least_Sure_Number = -1e36;
 /// The marker that a file gives must lie below the numbers and the levels that it is told from.
 [[nodiscard]] double Missing_Marker(double value);
 
+/// What files name a column by: the label, in a Table whose columns are labelled by texts. May be empty.
+[[nodiscard]] std::string_view Name_Or_Label(const Column& column);
+
 /// The state of a Sheet's labels as files hold it: one without a code of its own is that of columns named
 /// by their place.
 [[nodiscard]] std::int32_t Label_State_In_File(const Sheet& sheet);

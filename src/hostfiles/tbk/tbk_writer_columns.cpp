@@ -23,11 +23,8 @@ std::int32_t Type_In_Book(const Column& column)
 std::string Name_In_Book(const Column& column)
 {
     const Sheet& sheet = *column.sheet;
-    const bool by_text = sheet.label_state == labels_by_text || sheet.label_state == labels_by_text_and_level;
-    if (column.type == table_column && by_text && !column.table_label.empty())
-        return std::string(column.table_label.view());
-    if (!column.name.empty())
-        return std::string(column.name.view());
+    if (const std::string_view name = Name_Or_Label(column); !name.empty())
+        return std::string(name);
     return Has_Identifiers(sheet) || sheet.type == table_sheet
                ? Make_Valid_Name({})
                : std::to_string(column.index - sheet.leading_columns + 1);

@@ -15,12 +15,13 @@ struct Block_Messages {
 };
 
 /// Counted texts into a block of `bytes`, a NUL behind each, and how many there were. Empty texts take no
-/// room.
+/// room where they stand; where the block has some left, they come to its end.
 bool Read_Text_Block(TSS_Source& source, std::int32_t bytes, std::string& block, std::int32_t& count,
                      const Block_Messages& messages)
 {
     const auto size = static_cast<std::size_t>(bytes);
     std::int32_t stated;
+    std::size_t empty_texts = 0;
     std::string text;
     if (!source.Read(stated))
         return false;
@@ -36,7 +37,10 @@ bool Read_Text_Block(TSS_Source& source, std::int32_t bytes, std::string& block,
             return false;
         if (length > 0)
             block.append(text).push_back('\0');
+        else
+            ++empty_texts;
     }
+    block.resize(std::max(block.size(), std::min(size, block.size() + empty_texts)));
     return true;
 }
 

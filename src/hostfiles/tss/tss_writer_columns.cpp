@@ -39,10 +39,8 @@ std::int32_t Type_In_File(const Column& column)
 
 std::string_view Name_In_File(Column& column)
 {
-    const Sheet& sheet = *column.sheet;
-    const bool by_text = sheet.label_state == labels_by_text || sheet.label_state == labels_by_text_and_level;
-    return column.type == table_column && by_text && !column.table_label.empty() ? column.table_label.view()
-                                                                                 : Name_For_File(column.name);
+    const std::string_view name = Name_Or_Label(column);
+    return name.empty() ? Name_For_File(column.name) : name;
 }
 
 Display_Record Display_Of(const Column& column)

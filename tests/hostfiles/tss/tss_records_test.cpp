@@ -60,6 +60,8 @@ const Record_Case Record_Cases[] = {
      "616200636400 2 6"},
     {"an empty title line takes no room", 3, Of(5, 3, "", "a", "bc"),
      [](S s) { return Text_Of(Hex(s.title_lines), s.title_line_count); }, "6100626300 3", false},
+    {"an empty title line where there is room", 3, Of(5, 3, "a", "", "b"),
+     [](S s) { return Text_Of(Hex(s.title_lines), s.title_line_count); }, "6100620000 3", false},
     {"a title of less than its size", 3, Of(10000000, 1, "a"),
      [](S s) { return Text_Of(s.title_lines.size(), s.title_line_count, s.title_bytes); }, "2 1 2", false},
     {"a cleared title", 3, Of(0), [](S s) { return Text_Of(s.title_cleared, s.title_bytes); }, "0 0", false},
