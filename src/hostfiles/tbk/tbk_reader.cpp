@@ -210,8 +210,12 @@ void Limit_Rows(Sheet& sheet)
 {
     if (sheet.column_count == 0 && sheet.row_count > Most_Blank_Cells)
         Expect_Rows(&sheet, 0);
-    const std::int32_t square = std::max(sheet.column_count - sheet.leading_columns + 1, 0);
-    if (sheet.type == symmetric_matrix_sheet && sheet.row_count > square)
+    if (sheet.type != symmetric_matrix_sheet)
+        return;
+    std::int32_t square = std::max(sheet.column_count - sheet.leading_columns + 1, 0);
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        square = std::max(square, column->length);  // labels may say more
+    if (sheet.row_count > square)
         Expect_Rows(&sheet, square);
 }
 
