@@ -18,6 +18,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <iterator>
+#include <malloc.h>
 #include <string>
 #include <string_view>
 
@@ -85,49 +86,100 @@ bool Write_As(std::string_view form, const char* name)
                             : Write_Text_File(Current_Sheet, name, false);
 }
 
+/// What is asked for on the command line.
+struct Task {
+    const char* input;
+    const char* output = nullptr;   ///< null: the input is read, no more
+    const char* columns = nullptr;  ///< not null: their numbers, with commas between them
+    std::string_view form = "packed";
+};
+
+bool Fail_On(const char* name, const char* done)
+{
+    Close_Message_File();
+    std::fprintf(stderr, "time_text: %s could not be %s\n", name, done);
+    return false;
+}
+
+bool Time_Reading(const Task& task)
+{
+    Start_Request();
+    if (task.columns != nullptr)
+        Keep_Columns_Of(task.columns);
+    Print_Memory("before");
+    const bool read = Time("read_seconds", [&] { return Read_Input(task.input); });
+    Print_Memory("after_read");
+    if (!read || Current_Sheet == nullptr)
+        return Fail_On(task.input, "read");
+    std::printf("rows %lld\ncolumns %lld\n", static_cast<long long>(Current_Sheet->row_count),
+                static_cast<long long>(Current_Sheet->column_count));
+    return true;
+}
+
+bool Time_Writing(const Task& task)
+{
+    request.CSV_Output = true;
+    request.Packed_Csv_Output = task.form == "packed";
+    request.settings.csv_title = 0;
+    Current_Sheet->settings.csv_title = 0;
+    const bool written = Time("write_seconds", [&] { return Write_As(task.form, task.output); });
+    Print_Memory("after_write");
+    return written || Fail_On(task.output, "written");
+}
+
+bool Time_Copy(const Task& task)
+{
+    const std::string copy = std::string(task.output) + ".copy";
+    const bool copied = Time("copy_seconds", [&] { return Copy_File(task.output, copy); });
+    Delete_File(copy);
+    return copied;
+}
+
+bool Do(const Task& task)
+{
+    if (!Time_Reading(task))
+        return false;
+    if (task.output == nullptr)
+        return true;
+    const bool written = Time_Writing(task);
+    Free_Sheets();
+    return written && ((task.form != "tss" && task.form != "tbk") || Time_Copy(task));
+}
+
+/// What is freed stays with the process: a virtual machine may take its time to find memory.
+void Hold_Memory()
+{
+    mallopt(M_MMAP_MAX, 0);
+    mallopt(M_TRIM_THRESHOLD, -1);
+}
+
 }  // namespace
 
 int main(int count, char** arguments)
 {
-    const std::string_view form = count == 4 ? arguments[3] : "packed";
-    if (count < 2 || count > 4 || std::ranges::find(Forms, form) == std::end(Forms)) {
-        std::fputs("usage: time_text FILE [OUTPUT packed|padded|script|tss|tbk]\n"
-                   "       time_text FILE COLUMN,COLUMN...\n",
+    const bool held = count > 1 && std::string_view(arguments[1]) == "--held";
+    if (held)
+        ++arguments, --count;
+    Task task{count > 1 ? arguments[1] : nullptr};
+    if (count == 3)
+        task.columns = arguments[2];
+    if (count == 4) {
+        task.output = arguments[2];
+        task.form = arguments[3];
+    }
+    if (count < 2 || count > 4 || std::ranges::find(Forms, task.form) == std::end(Forms)) {
+        std::fputs("usage: time_text [--held] FILE [OUTPUT packed|padded|script|tss|tbk]\n"
+                   "       time_text [--held] FILE COLUMN,COLUMN...\n"
+                   "--held does all of it twice, the second time in the memory of the first;\n"
+                   "of lines with the same name the last one counts.\n",
                    stderr);
         return 2;
     }
-    Start_Request();
-    if (count == 3)
-        Keep_Columns_Of(arguments[2]);
-    Print_Memory("before");
-    const bool read = Time("read_seconds", [&] { return Read_Input(arguments[1]); });
-    Print_Memory("after_read");
-    if (!read || Current_Sheet == nullptr) {
-        Close_Message_File();
-        std::fprintf(stderr, "time_text: %s could not be read\n", arguments[1]);
-        return 1;
-    }
-    std::printf("rows %lld\ncolumns %lld\n", static_cast<long long>(Current_Sheet->row_count),
-                static_cast<long long>(Current_Sheet->column_count));
-    if (count == 4) {
-        request.CSV_Output = true;
-        request.Packed_Csv_Output = form == "packed";
-        request.settings.csv_title = 0;
-        Current_Sheet->settings.csv_title = 0;
-        const bool written = Time("write_seconds", [&] { return Write_As(form, arguments[2]); });
-        Print_Memory("after_write");
-        if (!written) {
-            Close_Message_File();
-            std::fprintf(stderr, "time_text: %s could not be written\n", arguments[2]);
+    if (held) {
+        Hold_Memory();
+        if (!Do(task))
             return 1;
-        }
+        Free_Sheets();
     }
-    Free_Sheets();
-    if (form == "tss" || form == "tbk") {
-        const std::string copy = std::string(arguments[2]) + ".copy";
-        const bool copied = Time("copy_seconds", [&] { return Copy_File(arguments[2], copy); });
-        Delete_File(copy);
-        return copied ? 0 : 1;
-    }
-    return 0;
+    return Do(task) ? 0 : 1;
 }
