@@ -4,6 +4,7 @@
 #include "model/calendar.h"
 #include "model/date_format.h"
 #include "model/sheet.h"
+#include "model/time_text.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -136,8 +137,6 @@ struct Cut_Text {
     [[nodiscard]] constexpr bool Is_Three_Numbers() const { return count == 3 && !words && time.empty(); }
 };
 
-constexpr std::int32_t Too_Great = 100'000'000;  // for a part; numbers grow no further
-
 inline void Cut_At_Separators(std::string_view text, Cut_Text& cut)
 {
     constexpr std::ptrdiff_t most_digits = 9;
@@ -152,7 +151,7 @@ inline void Cut_At_Separators(std::string_view text, Cut_Text& cut)
         std::uint32_t digits = 0;  // of more than fit, the rest is of no interest
         for (; at != last && Is_Digit(*at); ++at)
             digits = digits * 10 + static_cast<std::uint32_t>(*at - '0');
-        std::int32_t number = at - first > most_digits ? Too_Great : static_cast<std::int32_t>(digits);
+        std::int32_t number = at - first > most_digits ? Too_Great_Part : static_cast<std::int32_t>(digits);
         if (at == first || (at != last && !Is_Separator(*at)) || cut.count == Most_Pieces) [[unlikely]] {
             for (; at != last && !(Is_Separator(*at) && cut.count < Most_Pieces); ++at)
                 cut.colon = cut.colon || *at == ':';
@@ -180,14 +179,6 @@ inline void Cut(std::string_view text, Cut_Text& cut)
     cut.time = text.substr(blank + 1);
 }
 
-/// A number at the start of `text`, or nothing but digits; below 0 for none.
-std::int32_t Read_Number(std::string_view text, bool strict)
-{
-    if (text.empty() || !(strict ? std::all_of(text.begin(), text.end(), Is_Digit) : Is_Digit(text.front())))
-        return -1;
-    return static_cast<std::int32_t>(std::min<long>(Leading_Integer(text), Too_Great));
-}
-
 struct Date_Parts {
     std::int32_t day = 1;
     std::int32_t month = 1;
@@ -209,11 +200,6 @@ std::int32_t Month_From_Any(std::string_view text, bool strict)
     return month != 0 ? month : Month_From_Short(text, strict);
 }
 
-bool In_Range(std::int32_t value, std::int32_t least, std::int32_t most)
-{
-    return value >= least && value <= most;
-}
-
 constexpr std::int32_t First_Serial_Year = 1900;  // dates in front of it have no serials
 
 bool Is_Year(std::int32_t year)
@@ -224,7 +210,8 @@ bool Is_Year(std::int32_t year)
 /// Takes one part out of what stands for it.
 bool Take_Part(char part, const Piece& piece, bool strict, Date_Parts& date)
 {
-    const std::int32_t number = piece.number >= 0 || strict ? piece.number : Read_Number(piece.Text(), false);
+    const std::int32_t number =
+        piece.number >= 0 || strict ? piece.number : Read_Part_Number(piece.Text(), false);
     const auto fits = [&](std::size_t digits) { return !strict || piece.size <= digits; };
     switch (part) {
     case 'd':
@@ -290,7 +277,7 @@ bool Take_Parts_Together(const Text_Layout& layout, std::string_view text, bool 
         if (text.size() < width || (part == 'y' && width != 4 && (width < 2 || (strict && width != 2))))
             return false;
         const std::string_view own = text.substr(0, width);
-        const Piece piece = {own.data(), width, Read_Number(own, true)};
+        const Piece piece = {own.data(), width, Read_Part_Number(own, true)};
         if (!Take_Part(part, piece, strict, date))
             return false;
         text.remove_prefix(width);
@@ -307,62 +294,6 @@ inline bool Value_Of(const Date_Parts& date, std::int32_t form, double& value)
     value = Date_To_Number(date.day, date.month, date.year, form);
     return value != Missing_Value;
 }
-
-/// Cuts "am", "pm" or their first letter off the end; gives the letter, small, or NUL.
-char Cut_Marker(std::string_view& text)
-{
-    const std::size_t digits = text.find_last_of("0123456789.:");
-    const std::string_view marker = Trim_Copy(text.substr(digits + 1));
-    const char letter = marker.empty() ? '\0' : To_Lower(marker.front());
-    if ((letter != 'a' && letter != 'p')
-        || (marker.size() != 1 && !(marker.size() == 2 && To_Lower(marker.back()) == 'm')))
-        return '\0';
-    text = text.substr(0, digits + 1);
-    return letter;
-}
-
-/// The letter that tells the half of the day in a text with other words; small, or NUL.
-char Find_Marker(std::string_view text)
-{
-    const std::size_t at = text.find_first_of("aApP");
-    return at == std::string_view::npos ? '\0' : To_Lower(text[at]);
-}
-
-/// Reads "h:mm", "h:mm:ss" or "h:mm:ss.cc" as a part of a day, or as more of it.
-bool Read_Time(std::string_view text, bool strict, bool marker_allowed, std::int32_t most_hours,
-               double& value)
-{
-    char marker = '\0';
-    if (!strict)
-        marker = Find_Marker(text);
-    else if (marker_allowed)
-        marker = Cut_Marker(text);
-    if (strict && text.find_first_not_of("0123456789:.") != std::string_view::npos)
-        return false;
-    const std::size_t colon = text.find(':');
-    if (colon == std::string_view::npos)
-        return false;
-    const std::size_t second_colon = std::min(text.find(':', colon + 1), text.size());
-    std::int32_t hours = Read_Number(text.substr(0, colon), true);
-    const std::int32_t minutes = Read_Number(text.substr(colon + 1, second_colon - colon - 1), strict);
-    double seconds = 0.0;
-    if (second_colon < text.size()) {
-        const Parsed_Number parsed = Parse_Number(text.data() + second_colon + 1, text.data() + text.size());
-        if (parsed.status != Number_Status::good || (strict && parsed.end != text.data() + text.size()))
-            return false;
-        seconds = parsed.value;
-    }
-    if (!In_Range(hours, 0, most_hours) || !In_Range(minutes, 0, 60) || !(seconds >= 0.0 && seconds <= 60.0))
-        return false;
-    if (marker == 'p' && hours < 12)
-        hours += 12;
-    else if (marker == 'a' && hours == 12)
-        hours = 0;
-    value = ((seconds / 60.0 + minutes) / 60.0 + hours) / 24.0;
-    return true;
-}
-
-constexpr std::int32_t Hours_A_Day = 24;
 
 bool Take_Parts(const Text_Layout& layout, const Cut_Text& cut, bool strict, Date_Parts& date)
 {
@@ -405,7 +336,7 @@ bool Read_Otherwise(const Text_Layout& layout, const Cut_Text& cut, std::int32_t
     case Reading::time:
         return Read_Time(cut.whole, strict, Is_Marked(layout), Hours_A_Day, value);
     case Reading::hours:
-        return Read_Time(cut.whole, strict, false, Too_Great - 1, value);
+        return Read_Time(cut.whole, strict, false, Too_Great_Part - 1, value);
     case Reading::seconds:
         if (!Whole_Number_Text(cut.whole, value) || value < 0.0)
             return false;
@@ -493,8 +424,9 @@ bool Read_Without_Layout(std::string_view text, std::int32_t form, double& value
         return Is_Day_Number(text, value) && value > 0.0;
     if (end <= day_and_month)
         return false;
-    const Date_Parts date = {Read_Number(text.substr(0, 2), false), Read_Number(text.substr(2, 2), false),
-                             Read_Number(text.substr(day_and_month, end - day_and_month), false)};
+    const Date_Parts date = {Read_Part_Number(text.substr(0, 2), false),
+                             Read_Part_Number(text.substr(2, 2), false),
+                             Read_Part_Number(text.substr(day_and_month, end - day_and_month), false)};
     return Value_Of(date, form, value);
 }
 
