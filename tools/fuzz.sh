@@ -1,35 +1,57 @@
 #!/usr/bin/env bash
-# Feeds a reader with hostile bytes and fails on a finding.
-# Usage: tools/fuzz.sh READER [SECONDS] | --build | --list
+# Feeds a reader with hostile bytes and fails on a finding, or tells what its corpus reaches of some sources.
+# Usage: tools/fuzz.sh READER [SECONDS] | --build | --list | --coverage READER [SOURCE...]
 # FUZZ_BUILT=1 says that the targets are built, so that several readers can run at a time.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
-build_targets() {
+build_targets() {  # PRESET TARGET...
+    local preset=$1
     tools/set_up.sh build fuzz
-    [[ -f build/fuzz/build.ninja ]] || cmake --preset fuzz
-    cmake --build build/fuzz --target "$@"
+    [[ -f build/$preset/build.ninja ]] || cmake --preset "$preset"
+    cmake --build "build/$preset" --target "${@:2}"
+}
+
+check_reader() {
+    if ! tools/fuzz.sh --list | grep -qx -- "$1"; then
+        echo "fuzz: no reader is called '$1'; there are:" $(tools/fuzz.sh --list) >&2
+        exit 2
+    fi
+}
+
+# The inputs kept by earlier runs, and the seeds.
+find_corpus() {
+    folders=("build/fuzz/corpus/$1")
+    mkdir -p "${folders[0]}"
+    [[ ! -d fuzz/seeds/$1 ]] || folders+=("fuzz/seeds/$1")
+}
+
+tell_coverage() {  # READER [SOURCE...]
+    check_reader "$1"
+    find_corpus "$1"
+    tools/set_up.sh coverage
+    build_targets fuzz-coverage "fuzz_$1"
+    local program=build/fuzz-coverage/fuzz/fuzz_$1 profile=build/fuzz-coverage/$1
+    LLVM_PROFILE_FILE=$profile.raw "$program" -runs=0 "${folders[@]}" 2>/dev/null
+    llvm-profdata merge -o "$profile.profile" "$profile.raw"
+    llvm-cov report "$program" -instr-profile="$profile.profile" "${@:2}"
 }
 
 case ${1:-} in
-    --build) build_targets fuzz_readers; exit ;;
+    --build) build_targets fuzz fuzz_readers; exit ;;
+    --coverage) tell_coverage "${2:-}" "${@:3}"; exit ;;
     --list) sed -n 's/^fuzz_[a-z]*(\([a-z0-9_]*\) .*/\1/p' fuzz/CMakeLists.txt; exit ;;
     '' | -*) sed -n '2,4s/^# //p' "$0" >&2; exit 2 ;;
 esac
 
 reader=$1
 seconds=${2:-60}
-if ! tools/fuzz.sh --list | grep -qx -- "$reader"; then
-    echo "fuzz: no reader is called '$reader'; there are:" $(tools/fuzz.sh --list) >&2
-    exit 2
-fi
-[[ -n ${FUZZ_BUILT:-} ]] || build_targets "fuzz_$reader"
+check_reader "$reader"
+[[ -n ${FUZZ_BUILT:-} ]] || build_targets fuzz "fuzz_$reader"
 
-corpus=build/fuzz/corpus/$reader
+find_corpus "$reader"
 findings=build/fuzz/findings/$reader
-mkdir -p "$corpus" "$findings"
-folders=("$corpus")
-[[ -d fuzz/seeds/$reader ]] && folders+=("fuzz/seeds/$reader")
+mkdir -p "$findings"
 
 # A reader's scratch files go with this folder, however the run ends.
 TMPDIR=$(mktemp -d)

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that the given kinds of work need and that are missing.
-# Usage: tools/set_up.sh KIND...    kinds: build test bench fuzz format tidy
+# Usage: tools/set_up.sh KIND...    kinds: build test bench fuzz coverage format tidy
 set -euo pipefail
 
 # "package" is looked up with dpkg, "package:command" is there when the command is.
@@ -10,6 +10,7 @@ needs_of() {
         test) echo pkgconf:pkg-config ;;
         bench) echo python3:python3 ;;
         fuzz) echo clang:clang++ libclang-rt-dev ;;
+        coverage) echo llvm:llvm-cov ;;
         format) echo clang-format:clang-format ;;
         tidy) echo clang-tidy:clang-tidy clang:clang++ ;;
         *) echo "set_up: no kind is called '$1'" >&2; exit 2 ;;

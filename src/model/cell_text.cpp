@@ -30,9 +30,6 @@ double Cell_Number(std::string_view text, double missing)
     return std::min(parsed.value, Greatest_Number);
 }
 
-namespace {
-
-/// The number that `text` is, or the date in a column of dates.
 double Number_Or_Date(const Column& column, std::string_view text)
 {
     const double missing = column.sheet->missing_value;
@@ -42,6 +39,8 @@ double Number_Or_Date(const Column& column, std::string_view text)
     static_cast<void>(Text_To_Date(text, value, column.date_form, column.date_format, missing, false));
     return value;
 }
+
+namespace {
 
 /// The tests by which a text finds a label, tried in this order over all labels.
 constexpr bool (*Label_Tests[])(std::string_view label, std::string_view text) = {

@@ -22,4 +22,7 @@ bool Set_Cell_From_Text(Column* column, std::int32_t row, std::string_view text)
 /// range or anything else is `missing`. At most `Greatest_Number`.
 [[nodiscard]] double Cell_Number(std::string_view text, double missing);
 
+/// The same, or the date in a column of dates; the Sheet's missing value for anything else.
+[[nodiscard]] double Number_Or_Date(const Column& column, std::string_view text);
+
 }  // namespace ingester

@@ -121,6 +121,7 @@ bool Cell_Transfer::Prepare(Column& target, const Column& source, double toleran
 {
     target_ = &target;
     source_ = &source;
+    levels_.Look_In(target);
     const bool to_factor = target.type == factor_column;
     if (to_factor && Is_Text_Like(source.type) && target.label_count > 0) {
         Column* const copy = Copy_Column_Aside(source);
@@ -218,43 +219,6 @@ double Cell_Transfer::Level_Of_Number(double value)
     return met_levels_[number - 1];
 }
 
-/// As `Nearest_Level` of the target, whose level values are sorted for the first number that asks.
-std::int32_t Cell_Transfer::Nearest_Value(double value)
-{
-    if (sorted_values_.empty()) {
-        std::int32_t level = 0;
-        for (const double level_value : Level_Table(*target_))
-            if (++level; std::isfinite(level_value))
-                sorted_values_.emplace_back(level_value, level);
-        std::ranges::sort(sorted_values_);
-    }
-    const auto first_of = [this](double wanted) {
-        return std::ranges::lower_bound(sorted_values_, wanted, {}, &Valued_Level::first);
-    };
-    const auto above = first_of(value);
-    const auto below = above == sorted_values_.begin() ? above : first_of(std::prev(above)->first);
-    const auto away = [&](auto place) {
-        return place == sorted_values_.end() ? HUGE_VAL : std::fabs(place->first - value);
-    };
-    if (!(away(above) < HUGE_VAL) && !(away(below) < HUGE_VAL))
-        return 0;
-    if (away(above) == away(below))
-        return std::min(above->second, below->second);
-    return away(above) < away(below) ? above->second : below->second;
-}
-
-/// The first level of the target with that label, or 0.
-std::int32_t Cell_Transfer::Exact_Label(std::string_view text)
-{
-    if (labels_.empty()) {
-        std::int32_t level = 0;
-        for (const Level_Node* label = target_->labels; label != nullptr; label = label->next)
-            labels_.try_emplace(label->Text(), ++level);
-    }
-    const auto found = text.empty() ? labels_.end() : labels_.find(text);
-    return found == labels_.end() ? 0 : found->second;
-}
-
 double Cell_Transfer::Find_Level(double value)
 {
     constexpr int all_digits = 20;
@@ -263,8 +227,8 @@ double Cell_Transfer::Find_Level(double value)
     if (!Is_Present(*target.sheet, value))
         return missing;
     if (target.level_values_count > 0) {
-        const std::int32_t level = Nearest_Value(value);
-        lost_ = lost_ || !Doubles_Equal(Factor_Level_Value(target, level), value);
+        const std::int32_t level = levels_.Nearest(value);
+        lost_ = lost_ || !Doubles_Equal(levels_.Value_Of(level), value);
         return level;
     }
     if (target.factor_kind == plain_factor) {
@@ -274,17 +238,11 @@ double Cell_Transfer::Find_Level(double value)
         return value;
     }
     char text[Number_Text_Room];
-    Cell_Node cell{};
-    const auto length = static_cast<std::size_t>(Print_General(text, value, all_digits) - text);
-    if (const std::int32_t level = Exact_Label({text, length}); level > 0)
-        return level;
-    Set_Cell_From_Text(target, cell, {text, length});
-    // A label that only begins so is another one.
-    const Level_Node* label = target.labels;
-    for (double level = 1.0; label != nullptr && level < cell.value.number; level += 1.0)
-        label = label->next;
-    lost_ = lost_ || (label != nullptr && label->Text() != std::string_view(text, length));
-    return cell.value.number;
+    const std::string_view label(text,
+                                 static_cast<std::size_t>(Print_General(text, value, all_digits) - text));
+    const std::int32_t level = levels_.Of_Label(label);
+    lost_ = lost_ || levels_.Label_Of(level) != label;  // a label that only begins so is another one
+    return level > 0 ? level : missing;
 }
 
 bool Cell_Transfer::Is_Missing(const Cell_Value& from) const
@@ -299,6 +257,20 @@ void Cell_Transfer::Put_Missing(Cell_Node& to) const
         to.value.text = Text_Arena::Empty();
     else
         to.value.number = target_->sheet->missing_value;
+}
+
+void Cell_Transfer::Read_Text(Cell_Node& to, std::string_view text)
+{
+    const bool to_factor = target_->type == factor_column;
+    if (to_factor && target_->factor_kind == factor_with_levels) {
+        const double value = Number_Or_Date(*target_, text);
+        const std::int32_t level = Is_Present(*target_->sheet, value) ? levels_.Nearest(value) : 0;
+        to.value.number = level > 0 ? level : target_->sheet->missing_value;
+        return;
+    }
+    Set_Cell_From_Text(*target_, to, text);
+    if (to_factor && target_->factor_kind == plain_factor)
+        to.value.number = Level_Of_Number(to.value.number);
 }
 
 void Cell_Transfer::Put(Cell_Node& to, const Cell_Value& from)
@@ -330,9 +302,7 @@ void Cell_Transfer::Put(Cell_Node& to, const Cell_Value& from)
         to.value.number = Level_Of_Number(from.number);
         break;
     case Way::read:
-        Set_Cell_From_Text(*target_, to, Text_Arena::View(from.text));
-        if (target_->type == factor_column && target_->factor_kind == plain_factor)
-            to.value.number = Level_Of_Number(to.value.number);
+        Read_Text(to, Text_Arena::View(from.text));
         break;
     case Way::level_to_text:
         if (const char* const text = Of_Level<const char*>(texts_, from.number, nullptr); text != nullptr)

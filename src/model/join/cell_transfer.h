@@ -1,13 +1,11 @@
 // Cells of one Column as cells of another.
 #pragma once
 
+#include "model/level_finder.h"
 #include "model/sheet.h"
 #include "support/distinct_keys.h"
 
 #include <cstdint>
-#include <string_view>
-#include <unordered_map>
-#include <utility>
 #include <vector>
 
 namespace ingester {
@@ -60,8 +58,7 @@ private:
     [[nodiscard]] double Moved_Date(double value) const;
     [[nodiscard]] double Level_Of_Number(double value);
     [[nodiscard]] double Find_Level(double value);
-    [[nodiscard]] std::int32_t Nearest_Value(double value);
-    [[nodiscard]] std::int32_t Exact_Label(std::string_view text);
+    void Read_Text(Cell_Node& to, std::string_view text);
     void Put_Missing(Cell_Node& to) const;
 
     Column* target_ = nullptr;
@@ -73,9 +70,7 @@ private:
     std::vector<const char*> texts_;          ///< the same
     Distinct_Keys<double, Number_Keys> met_;  ///< numbers that were looked up as levels
     std::vector<double> met_levels_;
-    using Valued_Level = std::pair<double, std::int32_t>;
-    std::vector<Valued_Level> sorted_values_;  ///< level values of the target, when numbers look for them
-    std::unordered_map<std::string_view, std::int32_t> labels_;  ///< those of the target, likewise
+    Level_Finder levels_;  ///< of the target
 };
 
 }  // namespace ingester
