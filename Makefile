@@ -43,7 +43,7 @@ build: $(RELEASE)
 
 install: $(RELEASE)
 	@cmake --preset release -DCMAKE_INSTALL_PREFIX='$(abspath $(PREFIX))'
-	@cmake --build build/release --target ingester ingester_command
+	@cmake --build build/release --target ingester_library ingester_command
 	@cmake --install build/release
 
 format:
