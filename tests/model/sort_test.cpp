@@ -39,43 +39,41 @@ Sheet* Random_Sheet(std::minstd_rand& random, std::int32_t rows)
     return sheet;
 }
 
-/// What a row is compared by, told in plain words; numbers print so that their texts sort as they do.
-std::vector<std::pair<double, std::string>> Plain_Key(const Sort_Request& wanted, std::int32_t index)
+using Plain_Key = std::pair<double, std::string>;
+
+/// What a cell is compared by: a number, or a text beside 0.
+Plain_Key Key_Of(const Sort_Request& wanted, const Column& column, const Cell_Node& cell)
 {
-    const Column& column = *Column_At(wanted.sheet, index);
     const bool listed = column.name == "f";
-    const bool by_label = listed && wanted.factor_mode == Factor_Mode::label;
-    std::vector<std::pair<double, std::string>> key;
-    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        double number = Is_Text_Like(column.type) ? 0 : cell->value.number;
-        std::string text(Is_Text_Like(column.type) ? cell->Text() : "");
-        if (listed && number > 0 && wanted.factor_mode == Factor_Mode::level_value)
-            number = 40 - 10 * number;
-        if (by_label)
-            text = number > 0 ? Texts{"m", "Z", "a"}[static_cast<std::size_t>(number) - 1] : "";
-        if (by_label)
-            number = 0;
-        if (wanted.trim_keys)
-            text = Trim_Copy(text);
-        if (wanted.ignore_case)
-            std::transform(text.begin(), text.end(), text.begin(), To_Lower);
-        key.emplace_back(std::isnan(number) ? Missing_Value : number, text);
+    double number = Is_Text_Like(column.type) ? 0 : cell.value.number;
+    std::string text(Is_Text_Like(column.type) ? cell.Text() : "");
+    if (listed && number > 0 && wanted.factor_mode == Factor_Mode::level_value)
+        number = 40 - 10 * number;
+    if (listed && wanted.factor_mode == Factor_Mode::label) {
+        text = number > 0 ? Texts{"m", "Z", "a"}[static_cast<std::size_t>(number) - 1] : "";
+        number = 0;
     }
-    return key;
+    if (wanted.trim_keys)
+        text = Trim_Copy(text);
+    if (wanted.ignore_case)
+        std::ranges::transform(text, text.begin(), To_Lower);
+    return {std::isnan(number) ? Missing_Value : number, text};
 }
 
 std::vector<std::size_t> Plain_Order(const Sort_Request& wanted)
 {
-    std::vector<std::vector<std::pair<double, std::string>>> keys;
-    for (const std::int32_t index : wanted.key_index)
-        keys.push_back(Plain_Key(wanted, index));
-    std::vector<std::size_t> order(static_cast<std::size_t>(wanted.sheet->row_count));
+    const auto rows = static_cast<std::size_t>(wanted.sheet->row_count);
+    std::vector<std::vector<Plain_Key>> keys(rows);
+    for (const std::int32_t index : wanted.key_index) {
+        const Column& column = *Column_At(wanted.sheet, index);
+        const Cell_Node* cell = column.first_cell;
+        for (std::size_t row = 0; row < rows; ++row, cell = cell->next)
+            keys[row].push_back(Key_Of(wanted, column, *cell));
+    }
+    std::vector<std::size_t> order(rows);
     std::iota(order.begin(), order.end(), 0U);
-    std::stable_sort(order.begin(), order.end(), [&](std::size_t a, std::size_t b) {
-        for (const auto& key : keys)
-            if (key[a] != key[b])
-                return wanted.ascending ? key[a] < key[b] : key[b] < key[a];
-        return false;
+    std::ranges::stable_sort(order, [&](std::size_t a, std::size_t b) {
+        return wanted.ascending ? keys[a] < keys[b] : keys[b] < keys[a];
     });
     return order;
 }
