@@ -211,26 +211,18 @@ TEST_F(Factors, Every_Pair_Of_Types)
 
 TEST_F(Factors, Setup_Of_Level_Data)
 {
-    const auto labels = [](const Factor_Setup& setup) {
-        return Texts(setup.labels.begin(), setup.labels.end());
-    };
-    Factor_Setup setup{.nlevels = 2, .values = {2.5}, .order = {2}, .dirty = true};
-    EXPECT_TRUE(Setup_Factor_Data(setup, true) && !setup.dirty);
-    EXPECT_EQ(setup.values, (std::vector<double>{2.5, 2}));
-    EXPECT_EQ(setup.order, (std::vector<double>{2, 2}));
-    setup.labels[0] = "";
-    setup.nlevels = 3;
-    EXPECT_TRUE(Setup_Factor_Data(setup, false));
-    EXPECT_EQ(labels(setup), (Texts{"1", "2", "3"}));
-    Factor_Setup of_values{.nlevels = 3, .values = {0.1}};
-    Factor_Setup of_levels{.column = Three_Levels({}), .nlevels = 4};
-    Factor_Setup of_labels{.column = Three_Levels(), .nlevels = 4};
-    EXPECT_TRUE(Setup_Factor_Data(of_values, true) && Setup_Factor_Data(of_levels, true));
-    EXPECT_TRUE(Setup_Factor_Data(of_labels, true) && Setup_Factor_Data(of_labels, false));
-    EXPECT_EQ(labels(of_values), (Texts{"0.1", "2", "3"}));
-    EXPECT_EQ(labels(of_levels), (Texts{"10", "20", "30", "4"}));
-    EXPECT_EQ(labels(of_labels), (Texts{"ten", "twenty", "thirty", "4"}));
-    EXPECT_TRUE(of_levels.values.empty() && of_labels.values == (std::vector<double>{10, 20, 30, 4}));
+    const std::tuple<Factor_Setup, Texts, std::vector<double>, std::vector<double>> cases[] = {
+        // What there is, then labels, values and order as they become
+        {{.nlevels = 2, .values = {2.5}, .order = {2}, .dirty = true}, {"2.5", "2"}, {2.5, 2}, {2, 2}},
+        {{.nlevels = 3, .labels = {{}}, .order = {0, 5, 0}}, {"1", "2", "3"}, {1, 2, 3}, {1, 5, 3}},
+        {{.column = Three_Levels({}), .nlevels = 4}, {"10", "20", "30", "4"}, {10, 20, 30, 4}, {}},
+        {{.column = Three_Levels(), .nlevels = 4}, {"ten", "twenty", "thirty", "4"}, {10, 20, 30, 4}, {}}};
+    for (auto [setup, labels, values, order] : cases) {
+        const bool no_values = setup.values.empty();
+        EXPECT_TRUE(Setup_Factor_Data(setup, true) && !setup.dirty && setup.values.empty() == no_values);
+        EXPECT_EQ(Texts(setup.labels.begin(), setup.labels.end()), labels);
+        EXPECT_TRUE(Setup_Factor_Data(setup, false) && setup.values == values && setup.order == order);
+    }
     Factor_Setup none;
     EXPECT_FALSE(Setup_Factor_Data(none, true));
 }
