@@ -65,7 +65,7 @@ TEST_F(Columns, Start_With_Blank_Cells)
     Column* const none = New_Data_Column(sheet, variate_column, "none", -4);
     EXPECT_EQ(number->last_cell->value.number + number->range_low + number->range_high, -15);
     EXPECT_TRUE(bare->type == text_column && bare->last_cell->value.text == nullptr);
-    EXPECT_TRUE(none->length == -4 && Cell_At(none, 0) == nullptr && Insert_Cells(none, 0, 2));
+    EXPECT_TRUE(none->length == -4 && Cell_At(none, 0) == nullptr && Insert_Cells(none, 7, 2));
     EXPECT_EQ(Check_Sheet(*sheet), "");
     request.Max_Columns = 3;
     EXPECT_EQ(New_Column(sheet, variate_column, "fourth"), nullptr);
@@ -100,25 +100,22 @@ TEST_F(Columns, Are_Filled_From_A_Text)
 TEST_F(Columns, Are_Added_By_The_Type_Of_The_Sheet)
 {
     const std::string refusal = "You cannot add a column of that type to this spreadsheet.\n:\n";
-    constexpr std::int32_t no = -99;
     const std::int32_t wanted[] = {-3, 2, 2, 3, 4, 1, 8};  // the first Factor at position 1, all else at 2
-    const std::int32_t types[][7] = {{-3, 2, 2, 3, 4, no, no}, {-3, 5, 5, 5, 5, 5, 5},
-                                     {-3, 7, 7, 7, 7, 7, 7},   {-3, 6, 6, 6, 6, 6, 6},
-                                     {8, 2, 8, 8, 8, 8, 8},    {no, no, no, no, no, 1, no}};
-    for (std::int32_t sheet_type = 1; sheet_type <= 6; ++sheet_type)
+    const char* const made[] = {"-3n 2n 2n 3n 4n no no ", "-3n 51 51 51 51 51 51 ", "-3n 71 71 71 71 71 71 ",
+                                "-3n 6n 6n 6n 6n 6n 6n ", "8n 2n 8n 8n 8n 8n 8n ",  "no no no no no 1n no "};
+    for (std::int32_t sheet_type = 1; sheet_type <= 6; ++sheet_type) {
+        std::string types;  // with names
         for (std::int32_t i = 0; i < 7; ++i) {
-            SCOPED_TRACE(testing::Message() << sheet_type << ' ' << wanted[i]);
-            const std::int32_t type = types[sheet_type - 1][i];
             Sheet* const sheet = New_Sheet_With_Rows(1);
             sheet->type = sheet_type;
             const Column* const column =
                 Add_Column(sheet, {.type = wanted[i], .name = "n", .fill = {}}, i == 1 ? 1 : 2, false);
-            EXPECT_EQ(column == nullptr ? no : column->type, type);
-            EXPECT_TRUE(column == nullptr || column->name == (type == 5 || type == 7 ? "1" : "n"));
-            EXPECT_TRUE(type == symmetric_matrix_column ? sheet->row_count == 2
-                                                        : Check_Sheet(*sheet).empty());
-            EXPECT_EQ(Messages(), type == no ? refusal : "");
+            types += column == nullptr ? "no " : Format_Text("%i%s ", column->type, column->name.c_str());
+            EXPECT_EQ(Messages(), column == nullptr ? refusal : "");
+            EXPECT_TRUE(types.ends_with("71 ") ? sheet->row_count == 2 : Check_Sheet(*sheet).empty());
         }
+        EXPECT_EQ(types, made[sheet_type - 1]);
+    }
 }
 
 TEST_F(Columns, Bring_Their_Levels)
@@ -129,9 +126,8 @@ TEST_F(Columns, Bring_Their_Levels)
     for (const auto& [value, width] : cases) {
         Column source;
         Put_Levels(source, {value, 1}, {"low", "high"});
-        Column_Request asked;
-        asked.type = factor_column;
-        asked.nlevels = asked.level_values_count = asked.label_count = 2;
+        Column_Request asked{.type = factor_column, .name = {}, .nlevels = 2, .fill = {}};
+        asked.level_values_count = asked.label_count = 2;
         asked.level_values = source.level_values;
         const Column* const values = Add_Column(sheet, asked, 9, false);
         EXPECT_EQ(values->width, width) << value;

@@ -3,8 +3,7 @@
 #include "model/convert_column.h"
 #include "model/factor_order.h"
 #include "model/factor_setup.h"
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
+#include "model/told_sheets.h"
 
 #include <cmath>
 #include <map>
@@ -17,54 +16,43 @@ using Factors = Request_Test;
 /// A column in a Sheet of its own, which sorts levels unless told otherwise.
 Column* Of(std::int32_t type, const Texts& cells, bool sorted = true)
 {
-    Column* const column =
-        Add_Cells(New_Sheet_With_Rows(static_cast<std::int32_t>(cells.size())), type, "x", cells);
+    Column* const column = Lone_Column(type, cells);
     column->sheet->settings.auto_factors = sorted ? 1 : 0;
     return column;
 }
 
-/// Cells and levels, as "F2|1|* a,b"; a plain Factor's number of levels as "#2". Faults of the Sheet stand
-/// first.
+/// Cells and levels, as "F2|1|* a,b"; faults of the Sheet stand first.
 std::string Told(const Column* column)
 {
-    std::string text = Check_Sheet(*column->sheet) + Render(column->sheet, false);
-    if (column->type != factor_column)
-        return text;
-    text += column->factor_kind == plain_factor ? " #" + std::to_string(column->nlevels) : "";
-    const bool labelled = column->factor_kind == factor_with_labels;
-    EXPECT_TRUE(labelled || column->labels == nullptr);
-    const Level_Node* const first = labelled ? column->labels : column->level_values;
-    for (const Level_Node* node = first; node != nullptr; node = node->next)
-        text.append(node == first ? " " : ",")
-            .append(labelled ? std::string(node->Text()) : Format_Text("%g", node->value.number));
-    return text;
+    const std::string text = Check_Sheet(*column->sheet) + Render(column->sheet, false);
+    return column->type == factor_column ? text + " " + Levels_Of(*column) : text;
 }
 
 TEST_F(Factors, Of_Texts)
 {
     const std::string long_a = std::string(250, 'a');
-    const std::tuple<Texts, bool, bool, const char*, std::string> cases[] = {
+    const std::tuple<Texts, bool, bool, std::string> cases[] = {
         // cells, sorted, case-free, as they are told
-        {{"b", "a", "", "b"}, true, false, "F2|1|*|2 a,b", ""},
-        {{"b", "a", "", "b"}, false, false, "F1|2|*|1 b,a", ""},
-        {{"b", "_", "B", "\xE9", "a"}, true, false, "F4|2|1|5|3 B,_,a,b,\xE9", ""},
-        {{"b", "_", "B", "\xE9", "A"}, true, true, "F3|1|3|4|2 _,A,b,\xE9", ""},
-        {{"site 10", "site 1", "site", "SITE 1"}, true, true, "F3|2|1|2 site,site 1,site 10", ""},
-        {{"Jan", "Mar", "Feb"}, true, false, "F1|3|2 Jan,Feb,Mar", ""},
-        {{"Jan", "Mar", "Feb"}, false, false, "F1|2|3 Jan,Mar,Feb", ""},
-        {{"july", "May", "Sept", "JUNE"}, true, false, "F3|1|4|2 May,JUNE,july,Sept", ""},
-        {{"July", "Jun", "May"}, true, false, "F3|2|1 May,Jun,July", ""},
-        {{"N", "S", "E", "W", "nnw"}, true, false, "F1|3|2|4|5 N,E,S,W,nnw", ""},
-        {{"Summer", "Winter"}, true, false, "F2|1 Winter,Summer", ""},
-        {{"Wed", "mon", "Monday", "Sunny"}, true, false, "F4|3|2|1 Sunny,Monday,mon,Wed", ""},
-        {{"North", "East"}, true, false, "F2|1 East,North", ""},
-        {{"", " "}, true, false, "F*|* #7", ""},
-        {{long_a + "x", long_a + "y"}, true, false, nullptr, "F1|1 " + long_a},
+        {{"b", "a", "", "b"}, true, false, "F2|1|*|2 a,b"},
+        {{"b", "a", "", "b"}, false, false, "F1|2|*|1 b,a"},
+        {{"b", "_", "B", "\xE9", "a"}, true, false, "F4|2|1|5|3 B,_,a,b,\xE9"},
+        {{"b", "_", "B", "\xE9", "A"}, true, true, "F3|1|3|4|2 _,A,b,\xE9"},
+        {{"site 10", "site 1", "site", "SITE 1"}, true, true, "F3|2|1|2 site,site 1,site 10"},
+        {{"b", "abcdefgh2", "abcdefgh1"}, true, false, "F3|2|1 abcdefgh1,abcdefgh2,b"},
+        {{"Jan", "Mar", "Feb"}, true, false, "F1|3|2 Jan,Feb,Mar"},
+        {{"july", "May", "Sept", "JUNE"}, true, false, "F3|1|4|2 May,JUNE,july,Sept"},
+        {{"July", "Jun", "May"}, true, false, "F3|2|1 May,Jun,July"},
+        {{"N", "S", "E", "W", "nnw"}, true, false, "F1|3|2|4|5 N,E,S,W,nnw"},
+        {{"Summer", "Winter"}, true, false, "F2|1 Winter,Summer"},
+        {{"Wed", "mon", "Monday", "Sunny"}, true, false, "F4|3|2|1 Sunny,Monday,mon,Wed"},
+        {{"North", "East"}, true, false, "F2|1 East,North"},
+        {{"", " "}, true, false, "F*|* #7"},
+        {{long_a + "x", long_a + "y"}, true, false, "F1|1 " + long_a},
     };
-    for (const auto& [cells, sorted, by_case_free, told, long_told] : cases) {
+    for (const auto& [cells, sorted, by_case_free, told] : cases) {
         Column* const column = Of(long_text_column, cells, sorted);
         ASSERT_TRUE(Text_To_Factor(column, by_case_free, true, 7));
-        EXPECT_EQ(Told(column), told != nullptr ? told : long_told);
+        EXPECT_EQ(Told(column), told);
     }
     Column* const plain = Of(text_column, {"", ""});
     EXPECT_TRUE(Text_To_Factor(plain, false, true, 0) && plain->nlevels == 1 && plain->format == 1);
@@ -120,49 +108,38 @@ TEST_F(Factors, Many_Levels_And_Too_Many)
         ASSERT_EQ(cell->value.number, levels[text]) << text;
         cell = cell->next;
     }
-    Texts numbers;
+    Texts fifty;  // of one hundred
     for (int i = 0; i < 100; ++i)
-        numbers.push_back(std::to_string(i / 2));
-    const std::tuple<std::int32_t, std::size_t, bool, const char*> cases[] = {
-        {text_column, 49, true, "Cannot convert this text to a factor: too many distinct labels.\n"},
-        {variate_column, 36, true, "Cannot convert this variate to a factor: too many distinct values.\n"},
-        {variate_column, 49, true, "Cannot convert this variate to a factor: too many distinct values.\n"},
-        {variate_column, 50, true, nullptr},
-    };
-    for (const auto& [type, most, sorted, told] : cases) {
-        Column* const tried = Of(type, numbers, sorted);
+        fifty.push_back(std::to_string(i / 2));
+    Texts late(fifty.begin(), fifty.begin() + 72);  // the first half of these holds 18 values
+    for (std::size_t i = 0; i < 72; ++i)
+        late.push_back(std::to_string(100 + i));
+    const Texts early(late.rbegin(), late.rend());
+    const std::string labels = "Cannot convert this text to a factor: too many distinct labels.\n:\n";
+    const std::string values = "Cannot convert this variate to a factor: too many distinct values.\n:\n";
+    const std::string many = "Cannot convert this Variate to a Factor: too many distinct values.\n:\n";
+    const std::tuple<std::int32_t, Texts, std::size_t, std::string> cases[] = {
+        {text_column, fifty, 49, labels},    {variate_column, fifty, 36, values},
+        {variate_column, fifty, 49, values}, {variate_column, fifty, 50, ""},
+        {variate_column, late, 60, values},  {variate_column, early, 80, many},
+        {variate_column, early, 37, many}};
+    for (const auto& [type, numbers, most, told] : cases) {
+        Column* const tried = Of(type, numbers);
         const std::string before = Told(tried);
         EXPECT_EQ(type == text_column ? Text_To_Factor(tried, false, true, 0, 8 * most)
                                       : Variate_To_Factor(tried, true, 0, 8 * most),
-                  told == nullptr);
-        const std::string messages = Messages();
-        EXPECT_TRUE(told == nullptr || (Told(tried) == before && messages.starts_with(told))) << messages;
+                  told.empty());
+        EXPECT_EQ(Messages(), told);
+        EXPECT_EQ(Told(tried) == before, !told.empty());
     }
-    numbers.resize(72);  // the first half is the first 36 cells, and holds 18 values
-    for (std::size_t i = 0; i < 72; ++i)
-        numbers.push_back(std::to_string(100 + i));
-    EXPECT_FALSE(Variate_To_Factor(Of(variate_column, numbers), true, 0, 8 * std::size_t{60}));
-    std::reverse(numbers.begin(), numbers.end());
-    EXPECT_FALSE(Variate_To_Factor(Of(variate_column, numbers), true, 0, 8 * std::size_t{80}));
-    EXPECT_TRUE(
-        Messages().starts_with("Cannot convert this variate to a factor: too many distinct values.\n"
-                               "Cannot convert this Variate to a Factor: too many distinct values.\n"));
 }
 
 /// A Factor of three levels, with values and labels.
 Column* Three_Levels(const Texts& labels = {"ten", "twenty", "thirty"})
 {
-    Column* const column = Of(factor_column, {"1", "2", "3", "3", "*"});
+    Column* const column = Of(factor_column, {"1", "2", "3", "0", "*"});
     Put_Levels(*column, {10, 20, 30}, labels);
     column->format = labels.empty() ? 1 : 4;
-    if (labels.empty())
-        Free_Cell_Nodes(column, label_nodes);
-    const double cells[] = {1, 2, 3, 0, Missing_Value};
-    Cell_Node* cell = column->first_cell;
-    for (const double number : cells) {
-        cell->value.number = number;
-        cell = cell->next;
-    }
     return column;
 }
 
@@ -176,10 +153,9 @@ TEST_F(Factors, Levels_Move_With_Values_Labels_And_Cells)
     column->protected_column = 1;
     EXPECT_FALSE(Reorder_Factor_Levels(column, turned));
     column->protected_column = 0;
-    EXPECT_EQ(Told(column), "F1|2|3|0|* ten,twenty,thirty");
+    EXPECT_EQ(Told(column), "F1|2|3|0|* ten=10,twenty=20,thirty=30");
     EXPECT_TRUE(Reorder_Factor_Levels(column, turned));
-    EXPECT_EQ(Told(column), "F2|3|1|0|* thirty,ten,twenty");
-    EXPECT_EQ(column->level_values->value.number, 30);
+    EXPECT_EQ(Told(column), "F2|3|1|0|* thirty=30,ten=10,twenty=20");
     EXPECT_FALSE(Has_Natural_Order(column, compass_order) || Apply_Natural_Order(column, 9));
 }
 
@@ -212,8 +188,7 @@ TEST_F(Factors, Every_Pair_Of_Types)
         {labels, units_variate_column, "U1|2|3|*|*; V*|*|*|*|*"},
         {levels, text_column, "T10|20|30||; V*|*|*|*|*"},
         {long_labels, text_column, "L91 characters|y|z||; V*|*|*|*|*"},
-        {long_labels, units_text_column, nullptr},
-    };
+        {long_labels, units_text_column, nullptr}};
     for (const auto& [make, to, told] : cases) {
         Column* const column = make();
         New_Data_Column(column->sheet, variate_column, "y", column->length);
@@ -236,28 +211,18 @@ TEST_F(Factors, Every_Pair_Of_Types)
 
 TEST_F(Factors, Setup_Of_Level_Data)
 {
-    const auto labels = [](const Factor_Setup& setup) {
-        std::string text;
-        for (const auto& label : setup.labels)
-            text.append(label).append(",");
-        return text;
-    };
-    Factor_Setup setup{.nlevels = 2, .values = {2.5}, .order = {2}, .dirty = true};
-    EXPECT_TRUE(Setup_Factor_Data(setup, true) && !setup.dirty);
-    EXPECT_EQ(setup.values, (std::vector<double>{2.5, 2}));
-    EXPECT_EQ(setup.order, (std::vector<double>{2, 2}));
-    setup.labels[0] = "";
-    setup.nlevels = 3;
-    EXPECT_TRUE(Setup_Factor_Data(setup, false));
-    EXPECT_EQ(labels(setup), "1,2,3,");
-    Factor_Setup of_values{.nlevels = 3, .values = {0.1}};
-    Factor_Setup of_levels{.column = Three_Levels({}), .nlevels = 4};
-    Factor_Setup of_labels{.column = Three_Levels(), .nlevels = 4};
-    EXPECT_TRUE(Setup_Factor_Data(of_values, true) && Setup_Factor_Data(of_levels, true));
-    EXPECT_TRUE(Setup_Factor_Data(of_labels, true) && Setup_Factor_Data(of_labels, false));
-    EXPECT_EQ(labels(of_values) + labels(of_levels) + labels(of_labels),
-              "0.1,2,3,10,20,30,4,ten,twenty,thirty,4,");
-    EXPECT_TRUE(of_levels.values.empty() && of_labels.values == (std::vector<double>{10, 20, 30, 4}));
+    const std::tuple<Factor_Setup, Texts, std::vector<double>, std::vector<double>> cases[] = {
+        // What there is, then labels, values and order as they become
+        {{.nlevels = 2, .values = {2.5}, .order = {2}, .dirty = true}, {"2.5", "2"}, {2.5, 2}, {2, 2}},
+        {{.nlevels = 3, .labels = {{}}, .order = {0, 5, 0}}, {"1", "2", "3"}, {1, 2, 3}, {1, 5, 3}},
+        {{.column = Three_Levels({}), .nlevels = 4}, {"10", "20", "30", "4"}, {10, 20, 30, 4}, {}},
+        {{.column = Three_Levels(), .nlevels = 4}, {"ten", "twenty", "thirty", "4"}, {10, 20, 30, 4}, {}}};
+    for (auto [setup, labels, values, order] : cases) {
+        const bool no_values = setup.values.empty();
+        EXPECT_TRUE(Setup_Factor_Data(setup, true) && !setup.dirty && setup.values.empty() == no_values);
+        EXPECT_EQ(Texts(setup.labels.begin(), setup.labels.end()), labels);
+        EXPECT_TRUE(Setup_Factor_Data(setup, false) && setup.values == values && setup.order == order);
+    }
     Factor_Setup none;
     EXPECT_FALSE(Setup_Factor_Data(none, true));
 }

@@ -1,6 +1,8 @@
 #include "model/number_format.h"
 #include "support/cell_lists.h"
 
+#include <cmath>
+
 namespace ingester {
 namespace {
 
@@ -8,32 +10,28 @@ constexpr double gone = Missing_Value;
 
 using Facts = Request_Test;
 
-/// A column in a Sheet of its own.
-Column* Of(std::int32_t type, const Texts& cells)
+TEST_F(Facts, Numbers_Print_As_The_C_Library_Does)
 {
-    return Add_Cells(New_Sheet_With_Rows(static_cast<std::int32_t>(cells.size())), type, "x", cells);
-}
-
-/// Numbers printed by one format, each behind its decimals.
-Texts Printed(std::int32_t format, const std::vector<std::pair<std::int32_t, double>>& numbers)
-{
-    Texts texts;
     char text[Number_Text_Room];
-    for (const auto& [decimals, number] : numbers)
-        texts.emplace_back(text, Format_Number(text, number, format, decimals, gone));
-    return texts;
-}
-
-TEST_F(Facts, Numbers_Print_By_Format)
-{
-    EXPECT_EQ(Printed(1, {{3, 1234.5}, {5, 1234.56}, {4, 1234.56}, {3, 0.0012345}, {2, 0.00123456789}}),
-              (Texts{"1234.5", "1234.6", "1234.56", "0.00123", "0.0012"}));
-    EXPECT_EQ(Printed(1, {{2, 0.000123456789}, {-1, 1234567}, {20, 0.1}, {15, 1e13}, {9, 0}, {2, -1e308}}),
-              (Texts{"0.000123457", "1.23457e+06", "0.10000000000000000555", "1e+13", "0", "*"}));
-    EXPECT_EQ(Printed(2, {{2, 1234.5}, {0, 1234.5}}), (Texts{"1.23e+03", "1.234500e+03"}));
-    EXPECT_EQ(Printed(3, {{0, 2.5}, {-1, 2.5}, {2, 2.346}, {99, 1}, {2, gone}}),
-              (Texts{"2", "2.500000", "2.35", "1." + std::string(40, '0'), "*"}));
-    EXPECT_EQ(Printed(4, {{2, 1234567}, {0, -1e306}}), (Texts{"1.23457e+06", "-1e+306"}));
+    const std::vector<double> numbers = {0.0,  -0.5,   1234.56, 0.0012345, 1e-12,  9.99e-13, 5e-324,
+                                         1e12, 1.1e12, -1e13,   99999.5,   -1e306, gone};
+    for (std::size_t i = 0; i < 50 * numbers.size(); ++i) {
+        const double number = numbers[i / 50];
+        const std::int32_t wanted = static_cast<std::int32_t>(i % 50) - 1;
+        const int decimals = std::min(wanted, 40);
+        const double size = std::fabs(number);
+        const bool counted =
+            size >= 1e-12 && size <= 1e12 && std::fabs(std::trunc(std::log10(size)) + 1) < decimals;
+        const std::string expected[] = {
+            counted ? Format_Text("%.*g", decimals, number) : Format_Text("%g", number),
+            decimals < 1 ? Format_Text("%e", number) : Format_Text("%.*e", decimals, number),
+            decimals < 0 ? Format_Text("%f", number) : Format_Text("%.*f", decimals, number),
+            Format_Text("%g", number)};
+        for (std::int32_t format = 1; format <= 4; ++format)
+            ASSERT_EQ(std::string_view(text, Format_Number(text, number, format, wanted, gone)),
+                      number > gone ? expected[format - 1] : "*")
+                << number << " by " << format << " with " << wanted;
+    }
 }
 
 TEST_F(Facts, Widths)
@@ -43,10 +41,10 @@ TEST_F(Facts, Widths)
         Compute_Column_Width(column);
         return column->width;
     };
-    EXPECT_EQ(width(Of(variate_column, {"1", "*", "-12.5"})), 6);
-    EXPECT_EQ(width(Of(variate_column, {"*"})) + width(Of(text_column, {"", "a"})), 2 + 3);
-    EXPECT_EQ(width(Of(variate_column, {"1"}), "a_name_of_20_letters"), 12);
-    Column* const factor = Of(factor_column, {"1", "2"});
+    EXPECT_EQ(width(Lone_Column(variate_column, {"1", "*", "-12.5"})), 6);
+    EXPECT_EQ(width(Lone_Column(variate_column, {"*"})) + width(Lone_Column(text_column, {"", "a"})), 2 + 3);
+    EXPECT_EQ(width(Lone_Column(variate_column, {"1"}), "a_name_of_20_letters"), 12);
+    Column* const factor = Lone_Column(factor_column, {"1", "2"});
     factor->nlevels = 10000;
     EXPECT_EQ(width(factor), 6);
     Put_Levels(*factor, {1, 2.25});
@@ -65,7 +63,7 @@ TEST_F(Facts, Statistics)
         {{"1", "2", "0", "2", "*"}, {1, 2}, {1, 2, 5.0 / 3, 2}},
         {{"1", "2", "-1", "2", "*"}, {-10, 30}, {-10, 30, 50.0 / 3, 2}}};
     for (const auto& [cells, levels, summary] : cases) {
-        Column* const column = Of(levels.empty() ? variate_column : factor_column, cells);
+        Column* const column = Lone_Column(levels.empty() ? variate_column : factor_column, cells);
         if (!levels.empty())
             Put_Levels(*column, levels);
         Column_Summary got{};
@@ -76,33 +74,29 @@ TEST_F(Facts, Statistics)
 
 TEST_F(Facts, Values_That_Repeat_Suggest_A_Factor)
 {
-    const Texts factors[] = {{"1", "1"},
-                             {"1", "2", "1"},
-                             {"1", "2", "3", "4", "4", "*", "*", "*"},
-                             {"1", "1.0000000000001", "2", "1.999999999999"}};
-    for (const Texts& cells : factors)
-        EXPECT_TRUE(Should_Be_Factor(Of(variate_column, cells))) << cells[1];
-    const Texts others[] = {{"1", "*"},
-                            {"0", "1e-300"},
-                            {"1", "2", "3", "1"},
-                            {"1", "2", "*", "*", "*"},
-                            {"1", "1.00000000001", "2", "1.99999999999"}};
-    for (const Texts& cells : others)
-        EXPECT_FALSE(Should_Be_Factor(Of(variate_column, cells))) << cells[1];
     Texts fifty;
     for (int i = 0; i < 150; ++i)
         fifty.push_back(std::to_string(i % 50));
-    EXPECT_TRUE(Should_Be_Factor(Of(variate_column, fifty)));
-    fifty.emplace_back("50");
-    EXPECT_FALSE(Should_Be_Factor(Of(variate_column, fifty)));
-    EXPECT_TRUE(Should_Be_Factor(Of(text_column, {"a", "b", "", "a", "b", "b"})));
-    EXPECT_FALSE(Should_Be_Factor(Of(text_column, {"a", "A", "a "})));
-    EXPECT_FALSE(Should_Be_Factor(Of(factor_column, {"1", "1", "1"})));
+    Texts more = fifty;
+    more.emplace_back("50");
+    const std::tuple<std::int32_t, std::vector<Texts>, bool> cases[] = {
+        {variate_column, {{"1", "1"}, {"1", "2", "1"}, {"1", "2", "3", "4", "4", "*", "*", "*"}}, true},
+        {variate_column, {{"1", "1.0000000000001", "2", "1.999999999999"}, fifty}, true},
+        {variate_column,
+         {{"1", "*"}, {"0", "1e-300"}, {"1", "2", "3", "1"}, {"1", "2", "*", "*", "*"}},
+         false},
+        {variate_column, {{"1", "1.00000000001", "2", "1.99999999999"}, more}, false},
+        {text_column, {{"a", "b", "", "a", "b", "b"}}, true},
+        {text_column, {{"a", "A", "a "}}, false},
+        {factor_column, {{"1", "1", "1"}}, false}};
+    for (const auto& [type, columns, result] : cases)
+        for (const Texts& cells : columns)
+            EXPECT_EQ(Should_Be_Factor(Lone_Column(type, cells)), result) << cells[1] << " " << cells.size();
 }
 
 TEST_F(Facts, Missing_Values_Change_Wherever_They_Stand)
 {
-    Column* const column = Of(factor_column, {"*", "-1.00000000000001e307", "2", "-9"});
+    Column* const column = Lone_Column(factor_column, {"*", "-1.00000000000001e307", "2", "-9"});
     Put_Levels(*column, {gone, 5});
     column->table_margin_value = gone;
     Change_Missing_Value(column, -9, gone);

@@ -1,52 +1,37 @@
 // Sheets that change their form for an output.
 #include "model/output_forms.h"
 
-#include "support/check_sheet.h"
-#include "support/request_fixture.h"
+#include "model/told_sheets.h"
 
 namespace ingester {
 namespace {
 
-class Output_Forms_Test : public Request_Test {
-protected:
-    /// A Vector of columns of the types, named in order, with cells 1, 2, ... or missing.
-    static Sheet* Make(std::initializer_list<Column_Type> types, std::int32_t rows, const char* prefix = "v")
-    {
-        Sheet* const sheet = rows > 0 ? New_Sheet_With_Rows(rows) : New_Sheet();
-        int number = 0;
-        for (const Column_Type type : types) {
-            Column* const column = New_Data_Column(sheet, type, prefix + std::to_string(++number), rows);
-            double value = 0;
-            for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
-                if (!Is_Text_Like(type))
-                    cell->value.number = ++value;
-        }
-        return sheet;
-    }
+using Output_Forms_Test = Request_Test;
 
-    /// The form of a Sheet: its type, label state, and the types and names of its columns.
-    static std::string Form(const Sheet& sheet)
-    {
-        std::string form = std::to_string(sheet.type) + "/" + std::to_string(sheet.label_state);
-        for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-            form += " " + std::to_string(column->type) + column->name.c_str();
-        EXPECT_EQ(Check_Sheet(sheet), "");
-        return form;
-    }
-};
+/// The form of a Sheet: its type, label state, and the types and names of its columns.
+std::string Form(const Sheet& sheet)
+{
+    std::string form = std::to_string(sheet.type) + "/" + std::to_string(sheet.label_state);
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        form += " " + std::to_string(column->type) + column->name.c_str();
+    EXPECT_EQ(Check_Sheet(sheet), "");
+    return form;
+}
 
 TEST_F(Output_Forms_Test, Numbers_Become_A_Matrix_Or_Scalars_And_All_Else_Stays)
 {
+    Sheet* const no_rows = New_Sheet();
+    New_Column(no_rows, variate_column, "v");
     const std::tuple<Sheet*, std::string, std::string> cases[] = {
-        {Make({variate_column, variate_column}, 2), "2/2 5v1 5v2", "1/0 4v1 4v2"},
-        {Make({variate_column, variate_column}, 2, "C"), "2/0 51 52", "1/0 4C1 4C2"},
-        {Make({variate_column, text_column, variate_column}, 2), "2/2 -3v2 5v1 5v3", "1/0 4v1 3v2 4v3"},
-        {Make({text_column, variate_column}, 1, "C"), "2/0 -3C1 51", "1/0 3C1 4C2"},
-        {Make({text_column, text_column, variate_column}, 1), "1/0 3v1 3v2 4v3", "1/0 3v1 3v2 4v3"},
-        {Make({variate_column, factor_column}, 1), "1/0 4v1 2v2", "1/0 4v1 2v2"},
-        {Make({text_column}, 1), "1/0 3v1", "1/0 3v1"},
-        {Make({variate_column, variate_column}, 1), "2/2 5v1 5v2", "6/0 1v1 1v2"},
-        {Make({variate_column}, 0), "1/0 4v1", "1/0 4v1"},
+        {Sheet_Of("a V1|2; b V3|4"), "2/2 5a 5b", "1/0 4a 4b"},
+        {Sheet_Of("C1 V1|2; C2 V3|4"), "2/0 51 52", "1/0 4C1 4C2"},
+        {Sheet_Of("a V1|2; t T|; b V3|4"), "2/2 -3t 5a 5b", "1/0 4a 3t 4b"},
+        {Sheet_Of("C1 T; C2 V1"), "2/0 -3C1 51", "1/0 3C1 4C2"},
+        {Sheet_Of("t T; u T; a V1"), "1/0 3t 3u 4a", "1/0 3t 3u 4a"},
+        {Sheet_Of("a V1; f F1"), "1/0 4a 2f", "1/0 4a 2f"},
+        {Sheet_Of("t T"), "1/0 3t", "1/0 3t"},
+        {Sheet_Of("a V1; b V2"), "2/2 5a 5b", "6/0 1a 1b"},
+        {no_rows, "1/0 4v", "1/0 4v"},
     };
     for (const auto& [sheet, matrix, scalars] : cases) {
         Vector_To_Scalars(sheet);
@@ -71,7 +56,7 @@ TEST_F(Output_Forms_Test, Decimals_Are_Those_That_Say_Something)
         {-0.125, 1e12, 3},
     };
     for (const auto& [first, last, decimals] : cases) {
-        Sheet* const sheet = Make({variate_column, text_column, variate_column}, 2);
+        Sheet* const sheet = Sheet_Of("a V1|2; t T|; b V1|2");
         Column* const column = sheet->first_column->next;
         column->first_cell->value.number = first;
         column->last_cell->value.number = last;
@@ -81,21 +66,20 @@ TEST_F(Output_Forms_Test, Decimals_Are_Those_That_Say_Something)
         EXPECT_EQ(column->format, fixed_format);
         EXPECT_EQ(sheet->last_column->format, exponent_format) << "a format of its own stays";
     }
-    Sheet* const sheet = Make({factor_column}, 2);
-    Make_Level_Values(*sheet->last_column, 2);
-    sheet->last_column->level_values->value.number = 12.5;
+    Sheet* const sheet = Sheet_Of("f F1|2");
+    Put_Levels(*sheet->last_column, {12.5, 0});
     Find_Decimals(sheet);
     EXPECT_EQ(sheet->last_column->decimals, 1) << "a Factor shows its level values";
 }
 
 TEST_F(Output_Forms_Test, A_Range_Of_Columns_Keeps_The_Sheet_In_Order)
 {
-    Sheet* const vector = Make({variate_column, text_column, variate_column, variate_column}, 2);
+    Sheet* const vector = Sheet_Of("v1 V1; v2 T; v3 V1; v4 V1");
     Keep_Columns(vector, 2, 3);
     EXPECT_EQ(Form(*vector), "1/0 3v2 4v3");
     Keep_Columns(vector, 0, 9);
     EXPECT_EQ(Form(*vector), "1/0 3v2 4v3");
-    Sheet* const matrix = Make({variate_column, variate_column, variate_column}, 2, "C");
+    Sheet* const matrix = Sheet_Of("C1 V1|2; C2 V1|2; C3 V1|2");
     Vector_To_Matrix(matrix, "M");
     Keep_Columns(matrix, 2, 3);
     EXPECT_EQ(Form(*matrix), "2/0 51 52");

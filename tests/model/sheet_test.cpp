@@ -1,6 +1,5 @@
 // Rows, cells and columns come and go: Sheets against plain tables that go through the same.
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
+#include "model/told_sheets.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -167,10 +166,7 @@ TEST_F(Sheet_Lists, A_Symmetric_Matrix_Stays_Square)
 
 TEST_F(Sheet_Lists, Row_Deletion_And_Insertion_Have_Limits)
 {
-    Sheet* const sheet = New_Sheet_With_Rows(2);
-    sheet->type = symmetric_matrix_sheet;
-    New_Data_Column(sheet, symmetric_matrix_column, "1", 2);
-    New_Data_Column(sheet, symmetric_matrix_column, "2", 1);
+    Sheet* const sheet = Sheet_Of("1 Y*|*; 2 Y*", symmetric_matrix_sheet);
     constexpr std::int32_t many = Greatest_Insertion + 1;
     EXPECT_FALSE(Insert_Rows(sheet, 0, many, true) || Insert_Cells(sheet->first_column, 0, many));
     const std::string words = "Too many rows to insert.\nAt most 33 million rows can be added at one time.\n";
@@ -191,22 +187,15 @@ TEST_F(Sheet_Lists, Row_Deletion_And_Insertion_Have_Limits)
 
 TEST_F(Sheet_Lists, What_Is_Empty)
 {
-    Sheet* const sheet = New_Sheet_With_Rows(4);
-    sheet->type = symmetric_matrix_sheet;
-    for (std::int32_t i = 0; i < 4; ++i)
-        New_Data_Column(sheet, symmetric_matrix_column, std::to_string(i + 1), 4 - i);
-    Cell_At(Column_At(sheet, 1), 2)->value.number = -1e306;                                // row 2, column 0
-    Cell_At(Column_At(sheet, 2), 0)->value.number = 7;                                     // on the diagonal
-    EXPECT_TRUE(Find_Empty_Rows(sheet, false) == 2 && Find_Empty_Rows(sheet, true) == 1);  // 0 and 3
+    Sheet* const sheet = Sheet_Of("1 Y*|*|-1e306|*; 2 Y7|*|*; 3 Y*|*; 4 Y*", symmetric_matrix_sheet);
+    EXPECT_TRUE(Find_Empty_Rows(sheet, false) == 2 && Find_Empty_Rows(sheet, true) == 1);        // 0 and 3
     EXPECT_TRUE(Find_Empty_Columns(sheet, false) == 2 && Find_Empty_Columns(sheet, true) == 1);  // 2 and 3
     EXPECT_TRUE(Delete_Empty_Columns(sheet) && sheet->row_count == 3 && sheet->column_count == 3);
     EXPECT_EQ(Check_Sheet(*sheet), "");
 
-    Sheet* const table = New_Sheet_With_Rows(2);
-    Column* const factor = New_Data_Column(table, factor_column, "f", 2);
-    New_Data_Column(table, long_text_column, "t", 2);
-    New_Data_Column(table, variate_column, "kept", 2)->protected_column = 1;
-    factor->last_cell->value.number = 0.5;
+    Sheet* const table = Sheet_Of("f F*|0.5; t L|; kept V*|*");
+    Column* const factor = Column_At(table, 1);
+    table->last_column->protected_column = 1;
     EXPECT_EQ(Find_Empty_Columns(table, true), 3);
     factor->last_cell->value.number = 1.0;
     EXPECT_EQ(Find_Empty_Rows(table, true), 1);

@@ -19,68 +19,61 @@ const std::string Long(200, 'x');
 /// Columns: number, text, Long Text, Factor with labels and values out of order, plain Factor.
 Sheet* Random_Sheet(std::minstd_rand& random, std::int32_t rows)
 {
-    const double numbers[] = {3,  -0.0,          0,   1e300,
-                              -5, Missing_Value, 2.5, std::numeric_limits<double>::quiet_NaN()};
-    const Texts texts = {"", "a", "B", "b", " a", "abcdefgh", "abcdefghi", "\xE9", "ABCDEFGHI"};
-    const Texts longs = {Long, Long + "y", Long + "x", "z", ""};
+    const std::tuple<std::int32_t, const char*, Texts> columns[] = {
+        {variate_column, "n", {"3", "-0", "0", "1e300", "-5", "*", "2.5", "7"}},
+        {text_column, "t", {"", "a", "B", "b", " a", "abcdefgh", "abcdefghi", "\xE9", "ABCDEFGHI"}},
+        {long_text_column, "l", {Long, Long + "y", Long + "x", "z", ""}},
+        {factor_column, "f", {"*", "1", "2", "3"}},
+        {factor_column, "p", {"*", "1", "2", "3"}}};
     Sheet* const sheet = New_Sheet_With_Rows(rows);
-    Texts cells[3];
-    for (std::int32_t i = 0; i < rows; ++i) {
-        cells[0].push_back(texts[random() % texts.size()]);
-        cells[1].push_back(longs[random() % longs.size()]);
-        cells[2].push_back(std::to_string(random() % 4));
-    }
-    Column* const number = New_Data_Column(sheet, variate_column, "n", rows);
-    for (Cell_Node* cell = number->first_cell; cell != nullptr; cell = cell->next)
-        cell->value.number = numbers[random() % std::size(numbers)];
-    Add_Cells(sheet, text_column, "t", cells[0]);
-    Add_Cells(sheet, long_text_column, "l", cells[1]);
-    for (const char* const name : {"f", "p"}) {
-        Column* const factor = Add_Cells(sheet, factor_column, name, cells[2]);
-        factor->nlevels = 3;
-        for (Cell_Node* cell = factor->first_cell; cell != nullptr; cell = cell->next)
-            cell->value.number = cell->value.number < 1 ? Missing_Value : cell->value.number;
+    for (const auto& [type, name, choices] : columns) {
+        Texts cells(static_cast<std::size_t>(rows));
+        for (std::string& cell : cells)
+            cell = choices[random() % choices.size()];
+        Add_Cells(sheet, type, name, cells)->nlevels = 3;
     }
     Put_Levels(*Find_Column(sheet, "f"), {30, 20, 10}, {"m", "Z", "a"});
+    for (Cell_Node* cell = Column_At(sheet, 1)->first_cell; cell != nullptr; cell = cell->next)
+        if (cell->value.number == 7)
+            cell->value.number = std::numeric_limits<double>::quiet_NaN();
     return sheet;
 }
 
-/// What a row is compared by, told in plain words; numbers print so that their texts sort as they do.
-std::vector<std::pair<double, std::string>> Plain_Key(const Sort_Request& wanted, std::int32_t index)
+using Plain_Key = std::pair<double, std::string>;
+
+/// What a cell is compared by: a number, or a text beside 0.
+Plain_Key Key_Of(const Sort_Request& wanted, const Column& column, const Cell_Node& cell)
 {
-    const Column& column = *Column_At(wanted.sheet, index);
-    const bool labelled = column.name == "f";
-    std::vector<std::pair<double, std::string>> key;
-    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        double number = Is_Text_Like(column.type) ? 0 : cell->value.number;
-        std::string text(Is_Text_Like(column.type) ? cell->Text() : "");
-        if (labelled && number > 0 && wanted.factor_mode == Factor_Mode::level_value)
-            number = 40 - 10 * number;
-        if (labelled && wanted.factor_mode == Factor_Mode::label)
-            text = number > 0 ? Texts{"m", "Z", "a"}[static_cast<std::size_t>(number) - 1] : "";
-        if (labelled && wanted.factor_mode == Factor_Mode::label)
-            number = 0;
-        if (wanted.trim_keys)
-            text = Trim_Copy(text);
-        if (wanted.ignore_case)
-            std::transform(text.begin(), text.end(), text.begin(), To_Lower);
-        key.emplace_back(std::isnan(number) ? Missing_Value : number, text);
+    const bool listed = column.name == "f";
+    double number = Is_Text_Like(column.type) ? 0 : cell.value.number;
+    std::string text(Is_Text_Like(column.type) ? cell.Text() : "");
+    if (listed && number > 0 && wanted.factor_mode == Factor_Mode::level_value)
+        number = 40 - 10 * number;
+    if (listed && wanted.factor_mode == Factor_Mode::label) {
+        text = number > 0 ? Texts{"m", "Z", "a"}[static_cast<std::size_t>(number) - 1] : "";
+        number = 0;
     }
-    return key;
+    if (wanted.trim_keys)
+        text = Trim_Copy(text);
+    if (wanted.ignore_case)
+        std::ranges::transform(text, text.begin(), To_Lower);
+    return {std::isnan(number) ? Missing_Value : number, text};
 }
 
 std::vector<std::size_t> Plain_Order(const Sort_Request& wanted)
 {
-    std::vector<std::vector<std::pair<double, std::string>>> keys;
-    for (const std::int32_t index : wanted.key_index)
-        keys.push_back(Plain_Key(wanted, index));
-    std::vector<std::size_t> order(static_cast<std::size_t>(wanted.sheet->row_count));
+    const auto rows = static_cast<std::size_t>(wanted.sheet->row_count);
+    std::vector<std::vector<Plain_Key>> keys(rows);
+    for (const std::int32_t index : wanted.key_index) {
+        const Column& column = *Column_At(wanted.sheet, index);
+        const Cell_Node* cell = column.first_cell;
+        for (std::size_t row = 0; row < rows; ++row, cell = cell->next)
+            keys[row].push_back(Key_Of(wanted, column, *cell));
+    }
+    std::vector<std::size_t> order(rows);
     std::iota(order.begin(), order.end(), 0U);
-    std::stable_sort(order.begin(), order.end(), [&](std::size_t a, std::size_t b) {
-        for (const auto& key : keys)
-            if (key[a] != key[b])
-                return wanted.ascending ? key[a] < key[b] : key[b] < key[a];
-        return false;
+    std::ranges::stable_sort(order, [&](std::size_t a, std::size_t b) {
+        return wanted.ascending ? keys[a] < keys[b] : keys[b] < keys[a];
     });
     return order;
 }

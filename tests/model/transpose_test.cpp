@@ -1,8 +1,7 @@
 #include "model/transpose.h"
 
 #include "model/column_summary.h"
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
+#include "model/told_sheets.h"
 #include "support/text.h"
 
 namespace ingester {
@@ -10,56 +9,30 @@ namespace {
 
 using Transpose = Request_Test;
 
-struct Given {
-    std::int32_t sheet_type;
-    std::int32_t label_state;
-    std::vector<std::tuple<std::int32_t, const char*, Texts>> columns;
-};
-
-Sheet* Make(const Given& given)
-{
-    Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(std::get<2>(given.columns[0]).size()));
-    sheet->type = given.sheet_type;
-    sheet->label_state = given.label_state;
-    for (const auto& [type, name, cells] : given.columns)
-        Add_Cells(sheet, type, name, cells);
-    return sheet;
-}
-
 TEST_F(Transpose, Turns_Rows_Into_Columns)
 {
-    const Given numbers = {vector_sheet, 0, {{4, "a", {"1", "2"}}, {4, "b", {"3", "*"}}}};
-    const Given named = {
-        vector_sheet, 0, {{4, "a", {"1", "2"}}, {3, "id", {"x y", "z"}}, {4, "b", {"3", "*"}}}};
-    const Given mixed = {
-        vector_sheet, 0, {{3, "s", {"p", "q"}}, {3, "t", {"u", ""}}, {4, "b", {"1234567.25", "*"}}}};
-    const Given units = {vector_sheet, 0, {{-3, "u", {"x", "y"}}, {4, "a", {"1", "2"}}}};
-    const Given wide = {vector_sheet, 0, {{3, "n", {"x"}}, {33, "l", {std::string(95, 'w')}}}};
-    const Given scalars = {scalar_sheet, 0, {{1, "a", {"1"}}, {1, "b", {"2"}}, {1, "c", {"3"}}}};
-    const Given plain_matrix = {matrix_sheet, 0, {{5, "1", {"1", "2"}}, {5, "2", {"3", "4"}}}};
-    const Given valued_matrix = {
-        matrix_sheet, 1, {{-4, "r", {"10", "20"}}, {5, "5", {"1", "2"}}, {5, "*", {"3", "4"}}}};
-    const Given named_matrix = {
-        matrix_sheet, 2, {{-3, "r", {"p", "q"}}, {5, "x", {"1", "2"}}, {5, "y", {"3", "4"}}}};
-    const Given third_matrix = {matrix_sheet, 3, {{5, "x", {"1", "2"}}, {5, "y", {"3", "4"}}}};
-    const std::tuple<Given, bool, std::string> cases[] = {
-        {numbers, true, "C1 Ua|b; C2 V1|3; C3 V2|*"},
-        {named, true, "id Ua|b; x_y V1|3; z V2|*"},
-        {named, false, "C1 Ua|id|b; C2 T1|x y|3; C3 T2|z|*"},
-        {mixed, true, "s Ut|b; p Tu|1234567.25; q T|*"},
-        {units, true, "u Ua; x V1; y V2"},
-        {units, false, "u Ua; C1 V1; C2 V2"},
-        {wide, true, "n Ul; x L95 characters"},
-        {scalars, true, "C1 Ua|b|c; C2 V1|2|3"},
-        {plain_matrix, true, "C1 U1|2; 1 M1|3; 2 M2|4"},
-        {valued_matrix, true, "C1 U5|*; 10 M1|3; 20 M2|4"},
-        {named_matrix, true, "r Ux|y; p M1|3; q M2|4"},
-        {third_matrix, true, "1 M1|3; 2 M2|4"},
+    const std::string named = "a V1|2; id Tx y|z; b V3|*";
+    const std::string wide = "n Tx; l L" + std::string(95, 'w');
+    const std::tuple<std::int32_t, std::int32_t, std::string, bool, const char*> cases[] = {
+        // Type of the Sheet, its label state, what it is, whether it gives names, and what it becomes
+        {vector_sheet, 0, "a V1|2; b V3|*", true, "C1 Ua|b; C2 V1|3; C3 V2|*"},
+        {vector_sheet, 0, named, true, "id Ua|b; x_y V1|3; z V2|*"},
+        {vector_sheet, 0, named, false, "C1 Ua|id|b; C2 T1|x y|3; C3 T2|z|*"},
+        {vector_sheet, 0, "s Tp|q; t Tu|; b V1234567.25|*", true, "s Ut|b; p Tu|1234567.25; q T|*"},
+        {vector_sheet, 0, "u Ux|y; a V1|2", true, "u Ua; x V1; y V2"},
+        {vector_sheet, 0, "u Ux|y; a V1|2", false, "u Ua; C1 V1; C2 V2"},
+        {vector_sheet, 0, wide, true, "n Ul; x L95 characters"},
+        {scalar_sheet, 0, "a S1; b S2; c S3", true, "C1 Ua|b|c; C2 V1|2|3"},
+        {matrix_sheet, 0, "1 M1|2; 2 M3|4", true, "C1 U1|2; 1 M1|3; 2 M2|4"},
+        {matrix_sheet, 1, "r N10|20; 5 M1|2; * M3|4", true, "C1 U5|*; 10 M1|3; 20 M2|4"},
+        {matrix_sheet, 2, "r Up|q; x M1|2; y M3|4", true, "r Ux|y; p M1|3; q M2|4"},
+        {matrix_sheet, 3, "x M1|2; y M3|4", true, "1 M1|3; 2 M2|4"},
     };
-    for (const auto& [given, names, expected] : cases) {
+    for (const auto& [type, label_state, given, names, expected] : cases) {
         Start_Request("t");
         request.Transpose_Names = names;
-        Sheet* const sheet = Make(given);
+        Sheet* const sheet = Sheet_Of(given, type);
+        sheet->label_state = label_state;
         Add_Sheet_Comment(sheet, "old title");
         ASSERT_TRUE(Transpose_Sheet(sheet)) << expected;
         EXPECT_EQ(Render(Current_Sheet), expected);
@@ -69,7 +42,7 @@ TEST_F(Transpose, Turns_Rows_Into_Columns)
         EXPECT_EQ(Current_Sheet->title_line_count, 2);
         const std::string once = Render(Current_Sheet, false);
         const bool names_again = Nth_Column_Of_Type(Current_Sheet, text_column, 1) != nullptr;
-        if (names && !names_again && given.label_state != 3) {
+        if (names && !names_again && label_state != 3) {
             ASSERT_TRUE(Transpose_Sheet(Current_Sheet) && Transpose_Sheet(Current_Sheet));
             EXPECT_EQ(Render(Current_Sheet, false), once) << "transposed three times";
         }
@@ -78,12 +51,9 @@ TEST_F(Transpose, Turns_Rows_Into_Columns)
 
 TEST_F(Transpose, A_Table_Changes_Its_Factors)
 {
-    Sheet* const sheet = Make({table_sheet,
-                               3,
-                               {{2, "site", {"1", "2", "3"}},
-                                {8, "A", {"1", "2", "3"}},
-                                {8, "B", {"4", "5", "9"}},
-                                {22, "All", {"5", "7", "12"}}}});
+    Sheet* const sheet = Sheet_Of("site F1|2|3; A B1|2|3; B B4|5|9", table_sheet);
+    Add_Cells(sheet, table_margin_column, "All", {"5", "7", "12"});
+    sheet->label_state = 3;
     sheet->table_ways = 2;
     sheet->has_margins = 1;
     sheet->margin_label = "All";
@@ -95,8 +65,7 @@ TEST_F(Transpose, A_Table_Changes_Its_Factors)
     const Sheet& once = *Current_Sheet;
     EXPECT_EQ(Render(&once), "kind F1|2|3; north T1|4|5; south T2|5|7; All T3|9|12");
     EXPECT_EQ(once.last_column->type, table_margin_column);
-    EXPECT_EQ(once.first_column->next->level_values->next->value.number, 8);
-    EXPECT_EQ(once.first_column->next->labels->Text(), "A");
+    EXPECT_EQ(Levels_Of(*once.first_column->next), "A=7,B=8");
     EXPECT_EQ(once.first_column->next->next->table_margin_value, 10);
     EXPECT_TRUE(once.row_label_name == "site" && once.label_state == 3 && once.has_margins != 0);
     EXPECT_EQ(Check_Sheet(once), "");
@@ -120,7 +89,7 @@ TEST_F(Transpose, Refuses_With_Words)
         New_Data_Column(sheet, variate_column, "a", rows);
         sheet->type = type;
         sheet->table_ways = 3;
-        request.Max_Columns = rows == 2 ? 3 : 2;
+        request.Max_Columns = 2;  // beside the labels
         EXPECT_EQ(Transpose_Sheet(sheet), words.empty());
         EXPECT_EQ(Messages(), words.empty() ? "" : words + ":\n");
     }
@@ -132,25 +101,20 @@ TEST_F(Transpose, Refuses_With_Words)
 
 TEST_F(Transpose, The_Summary_Tells_Each_Column)
 {
-    Sheet* const sheet = New_Sheet_With_Rows(4);
+    Sheet* const sheet =
+        Sheet_Of("yield V2.5|*|4|1; none V*|*|*|*; name Toats||rye|; kind F1|2|*|2; "
+                 "values F1|1|1|1; labels F1|1|1|1; plain F1|1|1|3");  // the last counts nowhere
     Add_Sheet_Comment(sheet, "Trial 7\nof 2021");
-    Column* const number = Add_Cells(sheet, variate_column, "yield", {"2.5", "*", "4", "1"});
+    Column* const number = Column_At(sheet, 1);
     number->extra = "t/ha";
     number->decimals = 2;
     number->protected_column = 1;
     number->attached_text = "a+b";
-    Add_Cells(sheet, variate_column, "none", {"*", "*", "*", "*"});
-    Column* const text = Add_Cells(sheet, text_column, "name", {"oats", "", "rye", ""});
-    text->decimals = -1;
-    Put_Levels(*Add_Cells(sheet, factor_column, "kind", {"1", "2", "*", "2"}), {10, 20.5}, {"a", "b"});
-    for (const char* const name : {"values", "labels", "plain"})
-        Put_Levels(*Add_Cells(sheet, factor_column, name, {"1", "1", "1", "1"}), {7, 8}, {"x", "y"});
-    Free_Cell_Nodes(Find_Column(sheet, "values"), label_nodes);
-    Free_Cell_Nodes(Find_Column(sheet, "labels"), level_value_nodes);
-    Column* const plain = Find_Column(sheet, "plain");
-    Free_Cell_Nodes(plain, label_nodes);
-    Free_Cell_Nodes(plain, level_value_nodes);
-    plain->last_cell->value.number = 3;  // beyond the levels: counted nowhere
+    Column_At(sheet, 3)->decimals = -1;
+    Put_Levels(*Column_At(sheet, 4), {10, 20.5}, {"a", "b"});
+    Put_Levels(*Column_At(sheet, 5), {7, 8});
+    Put_Levels(*Column_At(sheet, 6), {}, {"x", "y"});
+    Column* const plain = Column_At(sheet, 7);
     plain->range_selected = 1;
     testing::internal::CaptureStdout();
     EXPECT_TRUE(Print_Column_Summary(sheet, "o.tab"));
@@ -168,7 +132,7 @@ TEST_F(Transpose, The_Summary_Tells_Each_Column)
               "   7: plain - Factor, 2 Levels, NMV: 0\n         1: (x 3)\n         2: (x 0)\n\n");
     EXPECT_EQ(Count_Columns_Of_Type(sheet, factor_column, false), 4);
     EXPECT_EQ(Count_Columns_Of_Type(sheet, Any_Column_Type, true), 1);
-    EXPECT_EQ(Nth_Column_Of_Type(sheet, factor_column, 2), Find_Column(sheet, "values"));
+    EXPECT_EQ(Nth_Column_Of_Type(sheet, factor_column, 2), Column_At(sheet, 5));
     EXPECT_EQ(Nth_Column_Of_Type(sheet, factor_column, 5), nullptr);
     plain->nlevels = 2000000000;
     EXPECT_LT(Column_Summary_Text(*sheet, "o").size(), 40000000U) << "levels that a damaged file claims";

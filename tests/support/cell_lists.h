@@ -16,18 +16,25 @@ inline Column* Add_Cells(Sheet* sheet, std::int32_t type, const std::string& nam
     return column;
 }
 
-/// Makes `column` a Factor with these level values, and with these labels if there are any.
+/// A column in a Sheet of its own.
+inline Column* Lone_Column(std::int32_t type, const Texts& cells)
+{
+    return Add_Cells(New_Sheet_With_Rows(static_cast<std::int32_t>(cells.size())), type, "x", cells);
+}
+
+/// Makes `column` a Factor with these level values, these labels, or one of each for a level.
 inline void Put_Levels(Column& column, const std::vector<double>& values, const Texts& labels = {})
 {
-    column.nlevels = static_cast<std::int32_t>(values.size());
     column.factor_kind = labels.empty() ? factor_with_levels : factor_with_labels;
-    ASSERT_TRUE(Make_Level_Values(column, column.nlevels) && Make_Labels(column, column.nlevels));
-    Level_Node* label = column.labels;
-    Level_Node* level = column.level_values;
-    for (std::size_t i = 0; i < values.size(); ++i, label = label->next, level = level->next) {
-        level->value.number = values[i];
-        label->value.text = column.texts.Store(labels.empty() ? "" : labels[i]);
-    }
+    column.nlevels = static_cast<std::int32_t>(std::max(values.size(), labels.size()));
+    EXPECT_EQ(Make_Level_Values(column, static_cast<std::int32_t>(values.size())), !values.empty());
+    EXPECT_EQ(Make_Labels(column, static_cast<std::int32_t>(labels.size())), !labels.empty());
+    const double* value = values.data();
+    for (Level_Node* node = column.level_values; node != nullptr; node = node->next)
+        node->value.number = *value++;
+    const std::string* label = labels.data();
+    for (Level_Node* node = column.labels; node != nullptr; node = node->next)
+        node->value.text = column.texts.Store(*label++);
 }
 
 [[nodiscard]] inline std::vector<double> Numbers_Of(const Column& column)

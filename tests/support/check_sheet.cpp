@@ -26,12 +26,7 @@ private:
     void Expect(bool right, std::string_view what, std::int64_t at)
     {
         if (!right && faults_.size() < 1000)  // enough for a reader
-            faults_.append(where_)
-                .append(": ")
-                .append(what)
-                .append(" ")
-                .append(std::to_string(at))
-                .append("\n");
+            faults_ += where_ + ": " + std::string(what) + " " + std::to_string(at) + "\n";
     }
 
     /// Walks a list of `count` nodes and checks its links, its length and its remembered position. The last
@@ -116,16 +111,15 @@ std::string Checker::Check(const Sheet& sheet)
     const Row_Node* const last_row = Check_List(sheet.first_row, sheet.rows_due ? 0 : sheet.row_count,
                                                 sheet.cursor_row, sheet.cursor_row_index);
     Expect(sheet.last_row == last_row, "another last node than", sheet.row_count);
-    std::int64_t index = 0;
-    for (const Column* column = sheet.first_column; column != nullptr && faults_.empty();
-         column = column->next)
-        Check_Column(sheet, *column, index++);
-    where_ = "head";
+    std::int32_t index = 0;
     std::int32_t leading = 0;
     for (const Column* column = sheet.first_column; column != nullptr && faults_.empty();
-         column = column->next)
-        if (column->type <= row_column)
-            Expect(column->index == leading++, "data stands before leading column", column->index);
+         column = column->next) {
+        leading += column->type <= row_column && leading == index ? 1 : 0;
+        Check_Column(sheet, *column, index++);
+        Expect(column->type > row_column || leading == index, "data stands before leading column", index - 1);
+    }
+    where_ = "head";
     Expect(!faults_.empty() || sheet.type != vector_sheet || sheet.leading_columns == leading,
            "leading columns in all:", leading);
     return faults_;

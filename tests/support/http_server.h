@@ -1,7 +1,6 @@
 // A web server on this machine's loopback that answers as badly as some do.
 #pragma once
 
-#include <atomic>
 #include <chrono>
 #include <string>
 #include <thread>
@@ -31,12 +30,9 @@ public:
             port_ = ::ntohs(place.sin_port);
         worker_ = std::thread([this] { Serve(); });
     }
-    Http_Server(const Http_Server&) = delete;
-    Http_Server& operator=(const Http_Server&) = delete;
     ~Http_Server()
     {
-        ending_ = true;
-        ::shutdown(listener_, SHUT_RDWR);
+        ::shutdown(listener_, SHUT_RDWR);  // which ends the wait for a connection
         worker_.join();
         ::close(listener_);
     }
@@ -47,25 +43,17 @@ public:
 private:
     void Serve() const
     {
-        while (!ending_) {
-            const int connection = ::accept4(listener_, nullptr, nullptr, SOCK_CLOEXEC);
-            if (connection < 0)
-                return;
+        for (int connection; (connection = ::accept4(listener_, nullptr, nullptr, SOCK_CLOEXEC)) >= 0;
+             ::close(connection))
             Reply(connection);
-            ::close(connection);
-        }
     }
 
     void Reply(int connection) const
     {
         std::string asked;
-        char part[1000];
-        while (asked.find("\r\n\r\n") == std::string::npos) {
-            const ::ssize_t got = ::recv(connection, part, sizeof part, 0);
-            if (got <= 0)
+        for (char c; !asked.ends_with("\r\n\r\n"); asked += c)
+            if (::recv(connection, &c, 1, 0) != 1)
                 return;
-            asked.append(part, static_cast<std::size_t>(got));
-        }
         const std::size_t start = asked.find(' ') + 1;
         for (const char c : answer_(asked.substr(start, asked.find(' ', start) - start)))
             if (c == '~')
@@ -77,7 +65,6 @@ private:
     Answer answer_;
     int listener_ = ::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
     int port_ = 0;
-    std::atomic<bool> ending_ = false;
     std::thread worker_;
 };
 

@@ -9,34 +9,11 @@
 namespace ingester {
 namespace {
 
-struct Refusing_State {
-    unsigned kinds = 0;  ///< a bit for each that is counted
-    int number = 0;
-    bool onwards = false;
-    bool kills = false;
-    int count = 0;
-    std::optional<Asked> refused;
-};
-
-Refusing_State state;
 std::atomic<long> living_blocks;
 
 unsigned Bit(Asked what)
 {
     return 1U << static_cast<unsigned>(what);
-}
-
-bool Count_And_Refuse(Asked what)
-{
-    if ((state.kinds & Bit(what)) == 0)
-        return true;
-    ++state.count;
-    if (state.number == 0 || (state.onwards ? state.count < state.number : state.count != state.number))
-        return true;
-    if (state.kills)
-        std::raise(SIGKILL);
-    state.refused = state.refused.value_or(what);
-    return false;
 }
 
 void* New_Block(std::size_t bytes)
@@ -50,27 +27,27 @@ void* New_Block(std::size_t bytes)
 
 Refusing::Refusing(const Refusal& refusal)
 {
-    state = {.number = refusal.number, .onwards = refusal.onwards, .kills = refusal.kills, .refused = {}};
+    refusal_ = refusal;
+    kinds_ = refusal.kinds.size() == 0 ? ~0U : 0U;
     for (const Asked kind : refusal.kinds)
-        state.kinds |= Bit(kind);
-    if (refusal.kinds.size() == 0)
-        state.kinds = ~0U;
-    refusal_hook = Count_And_Refuse;
+        kinds_ |= Bit(kind);
+    count_ = 0;
+    refused_.reset();
+    refusal_hook = Is_Allowed;
 }
 
-Refusing::~Refusing()
+bool Refusing::Is_Allowed(Asked what)
 {
-    refusal_hook = nullptr;
-}
-
-int Refusing::Count() const
-{
-    return state.count;
-}
-
-std::optional<Asked> Refusing::Refused() const
-{
-    return state.refused;
+    if ((kinds_ & Bit(what)) == 0)
+        return true;
+    ++count_;
+    const int number = refusal_.number;
+    if (number == 0 || (refusal_.onwards ? count_ < number : count_ != number))
+        return true;
+    if (refusal_.kills)
+        std::raise(SIGKILL);
+    refused_ = refused_.value_or(what);
+    return false;
 }
 
 long Living_Blocks()

@@ -22,12 +22,20 @@ public:
     explicit Refusing(const Refusal& refusal);
     Refusing(const Refusing&) = delete;
     Refusing& operator=(const Refusing&) = delete;
-    ~Refusing();
+    ~Refusing() { refusal_hook = nullptr; }
 
     /// How many things were asked.
-    [[nodiscard]] int Count() const;
+    [[nodiscard]] static int Count() { return count_; }
     /// What was refused first.
-    [[nodiscard]] std::optional<Asked> Refused() const;
+    [[nodiscard]] static std::optional<Asked> Refused() { return refused_; }
+
+private:
+    [[nodiscard]] static bool Is_Allowed(Asked what);
+
+    static inline Refusal refusal_;
+    static inline unsigned kinds_ = 0;  ///< a bit for each that is counted
+    static inline int count_ = 0;
+    static inline std::optional<Asked> refused_;
 };
 
 /// Memory blocks that were taken with `new` and not given back.

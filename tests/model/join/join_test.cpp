@@ -6,8 +6,7 @@
 #include "model/join/merge_keys.h"
 #include "model/number_format.h"
 #include "model/sort.h"
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
+#include "model/told_sheets.h"
 
 #include <algorithm>
 #include <functional>
@@ -29,17 +28,12 @@ void Add_Form(Sheet* sheet, Form form, const std::string& name, const Texts& cel
 {
     Column* const column =
         New_Data_Column(sheet, Type_Of_Form[form], name, static_cast<std::int32_t>(cells.size()));
-    if (form >= labels)
-        Put_Levels(*column, {1, 2, 3}, {"1", "2", "3"});
-    if (form == values || form == plain)
-        Free_Cell_Nodes(column, label_nodes);
-    if (form == labels || form == plain)
-        Free_Cell_Nodes(column, level_value_nodes);
-    column->factor_kind = form == labels   ? factor_with_labels
-                          : form == values ? factor_with_levels
-                                           : plain_factor;
-    if (form >= labels)
+    if (form >= labels) {
+        Put_Levels(*column, form == values ? std::vector<double>{1, 2, 3} : std::vector<double>{},
+                   form == labels ? Texts{"1", "2", "3"} : Texts{});
         column->nlevels = 3;
+        column->factor_kind = form == plain ? plain_factor : column->factor_kind;
+    }
     const std::string* text = cells.data();
     for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
         Set_Cell_From_Text(*column, *cell, *text++);
@@ -52,6 +46,16 @@ Texts Plain_Cells(const Column& column)
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
         cells.emplace_back(Cell_Is_Present(column, *cell) ? Format_Cell(column, *cell, room) : "");
     return cells;
+}
+
+/// A merge by the first column of both.
+Merge_Request By_First_Column(Sheet* target, Sheet* source)
+{
+    return {.target = target,
+            .source = source,
+            .key_count = 1,
+            .target_keys = {Column_At(target, 1)},
+            .source_keys = {Column_At(source, 1)}};
 }
 
 Texts Random_Cells(std::minstd_rand& random, std::size_t rows, unsigned choices)
@@ -112,60 +116,46 @@ constexpr std::pair<Form, Form> Key_Forms[] = {{numbers, numbers}, {texts, texts
                                                {texts, labels},    {values, numbers}, {numbers, values},
                                                {plain, numbers},   {numbers, plain}};
 
-struct Plain_Sheet {
-    Rows keys;      ///< by row
-    Texts updated;  ///< the column that both have
-};
-
-/// Keys, "a" of the target, "u" of both, "b" of the source; by row.
-Rows Merge_Plainly(const Plain_Sheet& target, const Plain_Sheet& source, const Merge_Request& wanted)
+/// Rows of keys, "a" and "u" with what rows of keys, "u" and "b" bring them.
+Rows Merge_Plainly(const Rows& target, const Rows& source, const Merge_Request& wanted)
 {
+    const auto key_of = [](const Texts& row) { return Texts(row.begin(), row.end() - 2); };
     Rows result;
-    const auto add = [&](const Texts& keys, const std::string& a, std::string u, int s) {
-        std::string b;
-        std::string other;
-        if (s >= 0) {
-            const std::string& given = source.updated[static_cast<std::size_t>(s)];
-            const bool leave = (wanted.keep_present && !u.empty()) || (wanted.skip_missing && given.empty());
-            if (wanted.update_columns)
-                u = leave ? u : given;
-            else
-                other = given;
-            b = std::to_string(s + 1);
-        }
-        Texts row = keys;
-        row.insert(row.end(), {a, u});
+    const auto add = [&](Texts row, const Texts* from) {
+        const std::string given = from == nullptr ? "" : from->end()[-2];
+        const bool leave = from == nullptr || (wanted.keep_present && !row.back().empty())
+                           || (wanted.skip_missing && given.empty());
         if (!wanted.update_columns)
-            row.push_back(other);
-        row.push_back(b);
+            row.push_back(given);
+        else if (!leave)
+            row.back() = given;
+        row.push_back(from == nullptr ? "" : from->back());
         result.push_back(row);
     };
-    const auto equal = [](const Rows& rows, const Texts& key) {
-        std::vector<int> found;
-        for (std::size_t i = 0; i < rows.size(); ++i)
-            if (rows[i] == key)
-                found.push_back(static_cast<int>(i));
-        return found;
-    };
-    for (std::size_t t = 0; t < target.keys.size(); ++t) {
-        const Texts& key = target.keys[t];
-        const std::vector<int> like = equal(target.keys, key);
-        const std::vector<int> partners = equal(source.keys, key);
-        const auto place = static_cast<std::size_t>(std::find(like.begin(), like.end(), t) - like.begin());
-        const int partner = partners.empty() ? -1 : partners[std::min(place, partners.size() - 1)];
-        add(key, std::to_string(t + 1), target.updated[t], partner);
-        if (place + 1 == like.size() && wanted.fill_mode >= fill_copies)
-            for (std::size_t i = place + 1; i < partners.size(); ++i)
-                add(key, std::to_string(t + 1), result.back()[key.size() + 1], partners[i]);
+    std::map<Texts, std::vector<const Texts*>> partners;  // in the order of the keys
+    for (const Texts& row : source)
+        partners[key_of(row)].push_back(&row);
+    for (auto row = target.begin(); row != target.end(); ++row) {
+        const Texts key = key_of(*row);
+        const std::vector<const Texts*>& rows = partners[key];
+        const auto same = [&](const Texts& other) { return key_of(other) == key; };
+        const auto place = static_cast<std::size_t>(std::count_if(target.begin(), row, same));
+        add(*row, rows.empty() ? nullptr : rows[std::min(place, rows.size() - 1)]);
+        const bool copies = wanted.fill_mode >= fill_copies && std::none_of(row + 1, target.end(), same);
+        for (std::size_t i = place + 1; copies && i < rows.size(); ++i) {
+            Texts copy = *row;
+            copy.back() = result.back()[key.size() + 1];
+            add(copy, rows[i]);
+        }
     }
-    std::vector<std::pair<Texts, int>> unmatched;
-    for (std::size_t s = 0; s < source.keys.size(); ++s)
-        if (equal(target.keys, source.keys[s]).empty())
-            unmatched.emplace_back(source.keys[s], static_cast<int>(s));
-    std::sort(unmatched.begin(), unmatched.end());
-    if (wanted.fill_mode == fill_all)
-        for (const auto& [key, s] : unmatched)
-            add(key, "", "", s);
+    for (const auto& [key, rows] : partners) {
+        Texts row = key;
+        row.resize(key.size() + 2);
+        const auto same = [&, &wanted_key = key](const Texts& other) { return key_of(other) == wanted_key; };
+        if (wanted.fill_mode == fill_all && std::ranges::none_of(target, same))
+            for (const Texts* const from : rows)
+                add(row, from);
+    }
     return result;
 }
 
@@ -195,29 +185,24 @@ TEST_F(Join, Merges_As_Nested_Loops_Do)
         std::pair<Form, Form> forms[3];
         for (auto& pair : forms)
             pair = Key_Forms[random() % std::size(Key_Forms)];
-        Plain_Sheet plains[2];
         Sheet* sheets[2];
         for (std::size_t side = 0; side < 2; ++side) {
             const std::size_t rows = 1 + random() % 6;
             sheets[side] = New_Sheet_With_Rows(static_cast<std::int32_t>(rows));
-            plains[side].keys.resize(rows);
             for (std::size_t key = 0; key < static_cast<std::size_t>(wanted.key_count); ++key) {
                 Texts cells = Random_Cells(random, rows, 4);
-                const Form form = side == 0 ? forms[key].first : forms[key].second;
                 if (forms[key] == std::pair(plain, numbers))
                     cells[0] = "2";  // numbers without any can't be levels
-                Add_Form(sheets[side], form, "k" + std::to_string(key), cells);
-                for (std::size_t row = 0; row < rows; ++row)
-                    plains[side].keys[row].push_back(cells[row]);
+                Add_Form(sheets[side], side == 0 ? forms[key].first : forms[key].second,
+                         "k" + std::to_string(key), cells);
                 (side == 0 ? wanted.target_keys : wanted.source_keys)[key] = sheets[side]->last_column;
             }
-            plains[side].updated = Random_Cells(random, rows, 4);
             Texts places;
             for (std::size_t row = 1; row <= rows; ++row)
                 places.push_back(std::to_string(row));
             if (side == 0)
                 Add_Form(sheets[side], numbers, "a", places);
-            Add_Form(sheets[side], static_cast<Form>(random() % 5), "u", plains[side].updated);
+            Add_Form(sheets[side], static_cast<Form>(random() % 5), "u", Random_Cells(random, rows, 4));
             if (side == 1)
                 Add_Form(sheets[side], numbers, "b", places);
         }
@@ -227,9 +212,10 @@ TEST_F(Join, Merges_As_Nested_Loops_Do)
                                   != (Find_Column(sheets[1], "u")->type == text_column);
         if (wanted.update_columns && text_and_not && sheets[0]->last_column->type != factor_column)
             continue;  // such a pair becomes two columns, which the case of names below looks at
+        const Rows expected = Merge_Plainly(By_Row(*sheets[0]), By_Row(*sheets[1]), wanted);
         ASSERT_TRUE(Merge_Sheets(wanted)) << "round " << round << Messages();
         ASSERT_EQ(Check_Sheet(*sheets[0]), "") << "round " << round;
-        ASSERT_EQ(By_Row(*sheets[0]), Merge_Plainly(plains[0], plains[1], wanted)) << "round " << round;
+        ASSERT_EQ(By_Row(*sheets[0]), expected) << "round " << round;
     }
 }
 
@@ -243,86 +229,57 @@ TEST_F(Join, Levels_Are_Told_By_Labels_Values_Or_Numbers)
         Texts target_labels, source_labels;
         double tolerance;
         bool ignore_case;
-        std::string map, target, said;
+        std::vector<std::int32_t> map;
+        std::string target, said;
     } cases[] = {
-        {{}, {}, {"b", "a"}, {"a", "c", "b"}, 0, false, "2 3 1 ", "b a c ", ""},
-        {{}, {}, {"b", "A"}, {"a", "B"}, 0, true, "2 1 ", "b A ", ""},
-        {{10, 20}, {20, 30}, {"x", "y"}, {"y", "z"}, 0, false, "2 3 ", "x=10 y=20 z=30 ", ""},
-        {{10, 0}, {0, 10.005, -10}, {}, {}, 0, false, "2 3 4 ", "10 0 10.005 -10 ", ""},
-        {{10, 0}, {0, 10.005, -10}, {}, {}, 1.5, false, "2 1 3 ", "10 0 -10 ", ""},
-        {{}, {5, 6, 7}, {"x", "y"}, {}, 0, false, "", "x y 3 ", warning},
-        {{5, 6}, {}, {}, {"p", "q", "r"}, 0, false, "", "5 6 3 ", warning},
+        {{}, {}, {"b", "a"}, {"a", "c", "b"}, 0, false, {2, 3, 1}, "b,a,c", ""},
+        {{}, {}, {"b", "A"}, {"a", "B"}, 0, true, {2, 1}, "b,A", ""},
+        {{10, 20}, {20, 30}, {"x", "y"}, {"y", "z"}, 0, false, {2, 3}, "x=10,y=20,z=30", ""},
+        {{10, 0}, {0, 10.005, -10}, {}, {}, 0, false, {2, 3, 4}, "10,0,10.005,-10", ""},
+        {{10, 0}, {0, 10.005, 10.05}, {}, {}, 1.5, false, {2, 1, 3}, "10,0,10.05", ""},
+        {{}, {5, 6, 7}, {"x", "y"}, {}, 0, false, {}, "x,y,3", warning},
+        {{5, 6}, {}, {}, {"p", "q", "r"}, 0, false, {}, "5,6,3", warning},
     };
     for (const auto& one : cases) {
         Start_Request("t");
         Sheet* const sheet = New_Sheet_With_Rows(1);
-        Column* const factors[] = {New_Data_Column(sheet, factor_column, "t", 1),
-                                   New_Data_Column(sheet, factor_column, "s", 1)};
-        for (int side = 0; side < 2; ++side) {
-            const auto& values = side == 0 ? one.target_values : one.source_values;
-            const Texts& labels = side == 0 ? one.target_labels : one.source_labels;
-            Put_Levels(*factors[side], std::vector<double>(std::max(values.size(), labels.size()), 0.0),
-                       labels);
-            Level_Node* node = factors[side]->level_values;
-            for (const double value : values) {
-                node->value.number = value;
-                node = node->next;
-            }
-            if (values.empty())
-                Free_Cell_Nodes(factors[side], level_value_nodes);
-            if (labels.empty())
-                Free_Cell_Nodes(factors[side], label_nodes);
-        }
+        Column* const target = New_Data_Column(sheet, factor_column, "t", 1);
+        Column* const source = New_Data_Column(sheet, factor_column, "s", 1);
+        Put_Levels(*target, one.target_values, one.target_labels);
+        Put_Levels(*source, one.source_values, one.source_labels);
         std::vector<std::int32_t> map;
-        EXPECT_TRUE(Merge_Factor_Levels(*factors[0], *factors[1], map, one.tolerance, one.ignore_case));
-        std::string text;
-        for (const std::int32_t level : map)
-            text += std::to_string(level) + " ";
-        EXPECT_EQ(text, one.map) << one.target;
-        text.clear();
-        const Level_Node* value = factors[0]->level_values;
-        const Level_Node* label = factors[0]->labels;
-        for (std::int32_t level = 0; level < factors[0]->nlevels; ++level) {
-            text.append(label == nullptr ? "" : label->Text());
-            text += label != nullptr && value != nullptr ? "=" : "";
-            text += value == nullptr ? "" : Format_Text("%g", value->value.number);
-            text += " ";
-            label = label == nullptr ? nullptr : label->next;
-            value = value == nullptr ? nullptr : value->next;
-        }
-        EXPECT_EQ(text, one.target);
+        EXPECT_TRUE(Merge_Factor_Levels(*target, *source, map, one.tolerance, one.ignore_case));
+        EXPECT_EQ(map, one.map) << one.target;
+        EXPECT_EQ(Levels_Of(*target), one.target);
+        EXPECT_EQ(target->nlevels, 1 + std::ranges::count(one.target, ','));
         EXPECT_EQ(Messages(), one.said);
     }
 }
 
 TEST_F(Join, Refuses_Keys_That_Do_Not_Go_Together)
 {
+    const std::string types = "Columns k and k data types do not match.\n";
+    const std::string no_labels = "Factor k does not have labels to match with text column k.\n";
+    const std::string orders = "Mixed column types for k and k caused a clash of sort orders.\n";
     const std::tuple<Form, Form, std::string> cases[] = {
-        {numbers, texts, "Columns k and k data types do not match.\n"},
-        {texts, numbers, "Columns k and k data types do not match.\n"},
-        {plain, texts, "Factor k does not have labels to match with text column k.\n"},
-        {texts, values, "Factor k does not have labels to match with text column k.\n"},
-        {texts, labels, "Mixed column types for k and k caused a clash of sort orders.\n"},
-        {numbers, values, "Mixed column types for k and k caused a clash of sort orders.\n"},
-    };
+        {numbers, texts, types},    {texts, numbers, types}, {plain, texts, no_labels},
+        {texts, values, no_labels}, {texts, labels, orders}, {numbers, values, orders}};
     for (const auto& [first, second, said] : cases) {
         Start_Request("t");
         Sheet* const target = New_Sheet_With_Rows(1);
         Sheet* const source = New_Sheet_With_Rows(1);
-        Merge_Request wanted{.target = target, .source = source, .key_count = 2};
-        for (Sheet* const sheet : {target, source}) {
-            Add_Form(sheet, sheet == target ? first : second, "k", {"1"});
-            Add_Form(sheet, plain, "l", {"1"});
-            auto& keys = sheet == target ? wanted.target_keys : wanted.source_keys;
-            keys[0] = Column_At(sheet, 1);
-            keys[1] = Column_At(sheet, 2);
-        }
-        if (Column* const mixed = wanted.source_keys[0]; said.starts_with("Mixed")) {
-            if (mixed->labels != nullptr)
-                mixed->labels->value.text = mixed->texts.Store("z");
-            else
-                mixed->level_values->value.number = 9;
-        }
+        Add_Form(target, first, "k", {"1"});
+        Add_Form(source, second, "k", {"1"});
+        Merge_Request wanted = By_First_Column(target, source);
+        if (Column* const mixed = wanted.source_keys[0]; mixed->labels != nullptr)  // and not in order
+            mixed->labels->value.text = mixed->texts.Store("z");
+        else if (mixed->level_values != nullptr)
+            mixed->level_values->value.number = 9;
+        Add_Form(target, plain, "l", {"1"});
+        Add_Form(source, plain, "l", {"1"});
+        wanted.key_count = 2;
+        wanted.target_keys[1] = Column_At(target, 2);
+        wanted.source_keys[1] = Column_At(source, 2);
         EXPECT_FALSE(Merge_Sheets(wanted));
         EXPECT_EQ(Messages(), said + ":\n");
     }
@@ -333,11 +290,7 @@ TEST_F(Join, Refuses_Keys_That_Do_Not_Go_Together)
         Add_Form(source, numbers, "k", refused == 0 ? Texts{} : Texts{"1"});
         sheet->read_only = refused == 1 ? 1 : 0;
         sheet->type = refused == 2 ? symmetric_matrix_sheet : refused == 3 ? scalar_sheet : vector_sheet;
-        EXPECT_FALSE(Merge_Sheets({.target = sheet,
-                                   .source = source,
-                                   .key_count = 1,
-                                   .target_keys = {Column_At(sheet, 1)},
-                                   .source_keys = {Column_At(source, 1)}}));
+        EXPECT_FALSE(Merge_Sheets(By_First_Column(sheet, source)));
         EXPECT_FALSE(Append_Sheet(sheet, {.source = source}));
         EXPECT_EQ(Concatenate_Sheets(sheet, source, false), false) << refused;
     }
@@ -346,21 +299,17 @@ TEST_F(Join, Refuses_Keys_That_Do_Not_Go_Together)
 
 TEST_F(Join, Dates_Texts_And_Tolerances_Match)
 {
-    Sheet* const target = New_Sheet_With_Rows(3);
-    Sheet* const source = New_Sheet_With_Rows(3);
-    Column* const serials = Add_Cells(target, variate_column, "d", {"61", "100", "*"});
-    Column* const days = Add_Cells(source, variate_column, "d", {"109612", "*", "109573.25"});
-    Add_Cells(source, variate_column, "x", {"1", "2", "3"});
+    Sheet* const target = Sheet_Of("d V61|100|*");
+    Sheet* const source = Sheet_Of("d V109612|*|109573.25; x V1|2|3");
+    Column* const serials = Column_At(target, 1);
+    Column* const days = Column_At(source, 1);
     serials->format = days->format = date_format_mark;
     days->date_form = 1;
     Row_At(target, 1)->restricted = 1;
     target->restricted_rows = target->restriction_active = 1;
-    ASSERT_TRUE(Merge_Sheets({.target = target,
-                              .source = source,
-                              .key_count = 1,
-                              .target_keys = {serials},
-                              .source_keys = {days},
-                              .tolerance = 0.5}));
+    Merge_Request merge = By_First_Column(target, source);
+    merge.tolerance = 0.5;
+    ASSERT_TRUE(Merge_Sheets(merge));
     EXPECT_EQ(Render(target), "d V61|100|*; x V3|1|2");
     EXPECT_EQ(target->restricted_rows + target->restriction_active + Row_At(target, 1)->restricted, 0);
     Append_Request wanted{.source = source};
@@ -380,40 +329,33 @@ TEST_F(Join, A_Column_That_Cannot_Take_The_Data_Is_Told)
     };
     for (const auto& [type, label_state, cells, said] : cases) {
         Start_Request("t");
-        Sheet* const target = New_Sheet_With_Rows(1);
-        Sheet* const source = New_Sheet_With_Rows(2);
-        for (Sheet* const sheet : {target, source}) {
-            sheet->type = type;
-            sheet->label_state = label_state;
-        }
-        Add_Cells(target, type == matrix_sheet ? matrix_column : variate_column, "c", {"1"});
-        Add_Cells(source, text_column, "c", {"x", "y"});
+        Sheet* const target = Sheet_Of(type == matrix_sheet ? "c M1" : "c V1", type);
+        Sheet* const source = Sheet_Of("c Tx|y", type);
+        source->label_state = label_state;
         ASSERT_TRUE(Append_Sheet(target, {.source = source}));
         EXPECT_EQ(Render(target, false).substr(1), std::string("1|") + cells);
         EXPECT_EQ(Messages(), said + ":\n");
     }
 }
 
+TEST_F(Join, A_Number_Between_Two_Levels_Is_The_First)
+{
+    Sheet* const target = Sheet_Of("f F1");
+    Put_Levels(*target->last_column, {2, 1});
+    ASSERT_TRUE(Append_Sheet(target, {.source = Sheet_Of("f V1.5|1.4")}));
+    EXPECT_EQ(Render(target), "f F1|1|2");
+}
+
 // A Vector of a file may have columns that end early: what moves rows gives them all of theirs first.
 TEST_F(Join, Short_Columns_Lose_Nothing)
 {
-    const auto table = [](const Texts& keys, const Texts& cells) {
-        Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(keys.size()));
-        Add_Cells(sheet, variate_column, "k", keys);
-        Add_Cells(sheet, text_column, "t", cells);
-        sheet->has_short_columns = cells.size() < keys.size() ? 1 : 0;
-        return sheet;
-    };
     const std::tuple<std::function<bool(Sheet*, Sheet*)>, const char*> cases[] = {
         {[](Sheet* target, Sheet* source) { return Append_Sheet(target, {.source = source}); },
          "k V4|3|2|1|2|9; t Tx|y|||p|q"},
         {[](Sheet* target, Sheet* source) {
-             return Merge_Sheets({.target = target,
-                                  .source = source,
-                                  .key_count = 1,
-                                  .target_keys = {Column_At(target, 1)},
-                                  .source_keys = {Column_At(source, 1)},
-                                  .update_columns = true});
+             Merge_Request wanted = By_First_Column(target, source);
+             wanted.update_columns = true;
+             return Merge_Sheets(wanted);
          },
          "k V4|3|2|1|9; t Tx|y|p||q"},
         {[](Sheet* target, Sheet*) { return Sort_Sheet({.sheet = target, .key_index = {1}}); },
@@ -421,8 +363,9 @@ TEST_F(Join, Short_Columns_Lose_Nothing)
     };
     for (const auto& [join, expected] : cases) {
         Start_Request("t");
-        Sheet* const target = table({"4", "3", "2", "1"}, {"x", "y"});
-        ASSERT_TRUE(join(target, table({"2", "9"}, {"p", "q"})));
+        Sheet* const target = Sheet_Of("k V4|3|2|1; t Tx|y");
+        target->has_short_columns = 1;
+        ASSERT_TRUE(join(target, Sheet_Of("k V2|9; t Tp|q")));
         EXPECT_EQ(Check_Sheet(*target), "");
         EXPECT_EQ(Render(target), expected);
     }
@@ -430,43 +373,27 @@ TEST_F(Join, Short_Columns_Lose_Nothing)
 
 TEST_F(Join, Matrices_Replace_Their_Columns_And_Diagonal_Ones_Take_None)
 {
-    Sheet* const sheets[] = {New_Sheet_With_Rows(2), New_Sheet_With_Rows(2), New_Sheet_With_Rows(2)};
-    for (Sheet* const sheet : sheets)
-        sheet->type = matrix_sheet;
-    Add_Cells(sheets[0], matrix_column, "a", {"1", "2"});
-    Add_Cells(sheets[0], matrix_column, "b", {"3", "4"});
-    Add_Cells(sheets[1], matrix_column, "B", {"5", "6"});
-    EXPECT_TRUE(Concatenate_Sheets(sheets[0], sheets[1], true));
-    EXPECT_EQ(Numbers_Of(*Column_At(sheets[0], 2)), (std::vector<double>{5, 6}));
-    sheets[2]->type = diagonal_matrix_sheet;
-    Add_Cells(sheets[2], diagonal_matrix_column, "d", {"1", "2"});
-    Sheet* const more = New_Sheet_With_Rows(1);
-    Add_Cells(more, variate_column, "e", {"7"});
-    EXPECT_FALSE(Append_Sheet(sheets[2], {.source = more}));
+    Sheet* const target = Sheet_Of("a M1|2; b M3|4", matrix_sheet);
+    EXPECT_TRUE(Concatenate_Sheets(target, Sheet_Of("B M5|6", matrix_sheet), true));
+    EXPECT_EQ(Render(target, false), "M1|2; M5|6");
+    EXPECT_FALSE(Append_Sheet(Sheet_Of("d M1|2", diagonal_matrix_sheet), {.source = Sheet_Of("e V7")}));
 }
 
 TEST_F(Join, Columns_Stand_Beside_Each_Other_Or_Take_The_Place_Of_Others)
 {
-    const Texts names = {"a", "B", "long", "d"};
-    const std::tuple<bool, bool, std::string> cases[] = {
-        {false, true, "A V1|2; b Tx|y; A_1 V7|8; B Tp|q; long Lr|s; d F1|2"},
-        {true, true, "A V7|8; B Tp|q; long Lr|s; d F1|2"},
+    const std::pair<bool, const char*> cases[] = {
+        {false, "A V1|2; b Tx|y; A_1 V7|8; B Tp|q; long Lr|s; d F1|2"},
+        {true, "A V7|8; B Tp|q; long Lr|s; d F1|2"},
     };
-    for (const auto& [unique, result, expected] : cases) {
+    for (const auto& [unique, expected] : cases) {
         Start_Request("t");
-        Sheet* const target = New_Sheet_With_Rows(2);
-        Add_Cells(target, variate_column, "A", {"1", "2"});
-        Add_Cells(target, text_column, "b", {"x", "y"});
-        Sheet* const source = New_Sheet_With_Rows(2);
-        Add_Cells(source, variate_column, "A", {"7", "8"});
-        Add_Cells(source, text_column, "B", {"p", "q"});
-        Add_Cells(source, long_text_column, "long", {"r", "s"});
-        Add_Form(source, labels, "d", {"1", "2"});
-        EXPECT_EQ(Concatenate_Sheets(target, source, unique), result);
+        Sheet* const target = Sheet_Of("A V1|2; b Tx|y");
+        Sheet* const source = Sheet_Of("A V7|8; B Tp|q; long Lr|s; d F1|2");
+        EXPECT_TRUE(Concatenate_Sheets(target, source, unique));
         EXPECT_EQ(Check_Sheet(*target), "");
         EXPECT_EQ(Render(target), expected);
-        EXPECT_EQ(Concatenate_Sheets(target, source, false), false) << "nothing is left to move";
-        EXPECT_EQ(Concatenate_Sheets(target, New_Sheet_With_Rows(3), false), false);
+        EXPECT_FALSE(Concatenate_Sheets(target, source, false)) << "nothing is left to move";
+        EXPECT_FALSE(Concatenate_Sheets(target, New_Sheet_With_Rows(3), false));
     }
 }
 

@@ -61,8 +61,6 @@ TEST_F(Text_Reader, Names_And_Separators)
         {"separators", "a|b:c\td\n1:2|3\n", "a V1; b V2; c_d V3", split("|:")},
         {"a point for one", "a.b\n1.5\n", "a V1; b V5", split(".")},
         {"a letter for one", "ab\n1e5\n", "a V1; C2 V5", split("eb")},
-        {"doubled quotes", "a,b\n\"x\"\"y\",'it''s'\n", "a Tx\"y; b Tit's"},
-        {"an unclosed quote takes the line", "a,b\n\"x,y\nz,1\n", "a T\"x,y|z; b V*|1"},
         {"blanks stay", "a,b\n \" x \" , y\t\n", "a T x ; b Ty\t", [] { Get_Settings().trim_cells = 0; }},
         {"an empty line ends the rows, not one of blanks", "a\n1\n  \n2\n\n3\n", "a V1|*|2", {}, end},
         {"a NUL is a blank", std::string("a,b\n1,x\0y\n2,\0\"x,y\"\0\n", 20), "a V1|2; b Tx y|x,y", {}, nul},
@@ -100,9 +98,14 @@ TEST_F(Text_Reader, Takes_The_Lines_That_Are_Asked_For)
     const auto between = [](std::string_view start, std::string_view end) {
         return [start, end] { request.Start_Text = start, request.End_Text = end; };
     };
-    const auto joined = [] { request.Lines_Per_Record = 2; };
+    const auto pairs = [](std::string_view lines, std::string_view end) {
+        return [lines, end] {
+            request.Lines_Per_Record = 2, request.Cell_Range = lines, request.End_Text = end;
+        };
+    };
     const auto two_columns = [] { request.Max_Columns = 2; };
     const std::string text = "x\na,b\n1,2\n3,4\nend,5\n";
+    const std::string too_long = "Error: Line 2 has more than 262140 characters.\n";
     const std::string half(200000, '1');
     const std::string halves = half + "\n" + half + "\n1\n2\n";
     const Case cases[] = {
@@ -113,23 +116,11 @@ TEST_F(Text_Reader, Takes_The_Lines_That_Are_Asked_For)
         {"start and end", text, "a V1|3; b V2|4", between("a,", "en")},
         {"no start, no end", text, "", between("A", "z"),
          "Warning: Starting cell contents 'A' NOT found.\nWarning: Ending line start text 'z' NOT found.\n"},
-        {"two lines to a record", "a \t\nb,\n1\n2,\n3,\n4\n", "a V1|3; b V2|4; C3 V*|*", joined},
-        {"to the end of the range", "a\nb\n1\n2\n3\n4\n", "a V1|3; b V2|*",
-         [] {
-             request.Lines_Per_Record = 2;
-             request.Cell_Range = ":5";
-         }},
-        {"to the end of the data", "a\nb\n1\nend\n2\n", "a V1; b V*",
-         [] {
-             request.Lines_Per_Record = 2;
-             request.End_Text = "end";
-         }},
-        {"long", halves, "C1 V*|1; C2 V*|2", joined, "Error: Combined CSV line length > 262140.\n"},
-        {"long",
-         "a\n" + std::string(262141, '1') + "\n",
-         "",
-         {},
-         "Error: Line 2 has more than 262140 characters.\n"},
+        {"two lines to a record", "a \t\nb,\n1\n2,\n3,\n4\n", "a V1|3; b V2|4; C3 V*|*", pairs("", "")},
+        {"to the end of the range", "a\nb\n1\n2\n3\n4\n", "a V1|3; b V2|*", pairs(":5", "")},
+        {"to the end of the data", "a\nb\n1\nend\n2\n", "a V1; b V*", pairs("", "end")},
+        {"long", halves, "C1 V*|1; C2 V*|2", pairs("", ""), "Error: Combined CSV line length > 262140.\n"},
+        {"longer", "a\n1" + std::string(262140, '1') + "\n", "", {}, too_long},
         {"too many columns", "a\n1\n1,2,3\n1,2,3,4\n", "a V1|1|1; C2 V*|2|2", two_columns,
          "Maximum number of columns (2) exceeded.\nIgnoring extra columns.\n"},
     };
@@ -160,6 +151,62 @@ TEST_F(Text_Reader, Reads_Files_That_Change_And_That_Do_Not)
     EXPECT_EQ(Messages(), "Error: Could not read all of file " + path.string() + ".\n:\n");
 }
 
+// --- The line services -------------------------------------------------------------------------------
+
+using Text_Lines = Request_Test;
+
+TEST_F(Text_Lines, One_Line_Becomes_A_Column)
+{
+    const std::string long_line(262141, 'x');
+    const std::tuple<std::int32_t, std::string_view, std::string, std::string, std::string> cases[] = {
+        {1, "", "a\tb\n x \t2\t\t*\r\nc\n", "C1 Tx|2||", ""},
+        {2, ",;", "\r\rx,y;z," + std::string(95, 'y'), "C1 Tx|y;z|90 characters", ""},
+        {1, "", long_line + "\n\n", "C1 T", ""},
+        {1, "", "a\n" + long_line, "", "Error: Line 2 has more than 262140 characters.\n:\n"},
+        {1, "", "a\n", "", "Could not read data file x.txt.\n:\n"},
+    };
+    for (const auto& [skipped, separators, text, sheet, message] : cases) {
+        Start_Request("t");
+        request.Fixed_Lines = skipped;
+        request.Custom_Separators = separators;
+        Input_File file(std::as_bytes(std::span(text)), "x.txt");
+        const bool read = Read_Text_Lines(file);
+        EXPECT_EQ(read ? Render(Current_Sheet) + Check_Sheet(*Current_Sheet) : "", sheet);
+        EXPECT_EQ(Messages(), message);
+    }
+    const std::string none = Request_Name("none");
+    EXPECT_FALSE(Read_Text_Lines(none.c_str()));
+    EXPECT_EQ(Messages(), "Data file " + none + " not found.\nCould not read data file " + none + ".\n:\n");
+}
+
+TEST_F(Text_Lines, Lines_Are_Joined_To_Records)
+{
+    const std::string wide(70000, '1');
+    const std::tuple<std::int32_t, std::string, std::string> cases[] = {
+        {4, "1,2,\n3,4\r\n5,6,\n7,8", "1,2,3,4\n5,6,7,8\n"},
+        {3, "1\n2\n3\n4\n5\n", "1,2,3\n4,5\n"},
+        {6, "1,2,3\n\n4,5,6\n", "1,2,3,4,5,6\n"},
+        {2, "1,2,3,4\n5\n6\n", "1,2,3,4\n5,6\n"},
+        {2, wide + "\n" + wide + "\n", wide + "," + wide + "\n"},
+        {3, "", ""},
+    };
+    const std::string input = Request_Name("in.csv");
+    const std::string output = Request_Name("out.csv");
+    const std::string none = Request_Name("none\\x.csv");
+    for (const auto& [fields, from, to] : cases) {
+        Put("in.csv", from);
+        EXPECT_TRUE(Reflow_Lines_By_Fields(input.c_str(), output.c_str(), fields));
+        EXPECT_EQ(Get("out.csv"), to) << from.substr(0, 80);
+    }
+    Put("in.csv", "1,2\n");
+    EXPECT_FALSE(Reflow_Lines_By_Fields(none.c_str(), output.c_str(), 2));
+    for (const std::string& refused : {none, input, std::string("/dev/full")})
+        EXPECT_FALSE(Reflow_Lines_By_Fields(input.c_str(), refused.c_str(), 2));
+    EXPECT_EQ(Get("in.csv"), "1,2\n");
+    EXPECT_EQ(Messages(), "CSV data file " + none + " not found.\nCSV data file " + none
+                              + " could not be opened.\nInput and output files are the same.\n:\n");
+}
+
 // --- The rules of cutting and typing once more, slowly ----------------------------------------------
 
 using Slow_Field = std::pair<std::string, bool>;  ///< its text, and whether it stood between quotes
@@ -186,12 +233,10 @@ Slow_Field Slow_Content(std::string raw)
     const std::size_t last = raw.find_last_not_of(" \t");
     if (raw.empty() || (raw[0] != '"' && raw[0] != '\'') || last == 0 || raw[last] != raw[0])
         return {raw, false};
-    std::string text;
-    for (std::size_t i = 1; i < last; ++i) {
-        text += raw[i];
-        if (raw[i] == raw[0] && i + 1 < last && raw[i + 1] == raw[0])
-            ++i;
-    }
+    std::string text = raw.substr(1, last - 1);
+    const std::string doubled(2, raw[0]);
+    for (std::size_t at = 0; (at = text.find(doubled, at)) != text.npos; ++at)
+        text.erase(at, 1);
     return {text, true};
 }
 
@@ -220,7 +265,7 @@ bool Slow_Names(const std::string& line, char separator, char other)
 {
     bool at_start = true;
     for (const char c : line) {
-        if (at_start && (c == '1' || c == '-' || c == '*'))
+        if (at_start && (c == '1' || c == '-' || c == '+' || c == '*'))
             return false;
         if (c != '.')
             at_start = c == ' ' || c == '\t' || c == separator || c == other;
@@ -279,7 +324,7 @@ std::string Slow_Read(const std::string& text, const std::string& name)
 
 TEST_F(Text_Reader, Reads_Any_Bytes_As_The_Rules_Say)
 {
-    constexpr std::string_view letters = ",\"' \t\n\r*1a.-;";
+    constexpr std::string_view letters = ",\"' \t\n\r*1a.-;+";
     constexpr const char* names[] = {"x.csv", "x.tab", "x.txt"};
     std::mt19937 random(7);
     for (int round = 0; round < 30000; ++round) {

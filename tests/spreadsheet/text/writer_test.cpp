@@ -1,5 +1,5 @@
+#include "model/told_sheets.h"
 #include "spreadsheet/text/text.h"
-#include "support/cell_lists.h"
 #include "support/text.h"
 
 #include <random>
@@ -10,13 +10,11 @@ namespace {
 /// A Sheet with every kind of column.
 Sheet* Mixed_Sheet()
 {
-    Sheet* const sheet = New_Sheet_With_Rows(3);
-    Add_Cells(sheet, variate_column, "number", {"1", "-0.1", "*"});
-    Add_Cells(sheet, text_column, "t", {"say \"hi\"", "", "a,b\tc"});
-    Put_Levels(*Add_Cells(sheet, factor_column, "size", {"2", "*", "1"}), {1, 2}, {"b\"g", "s"});
-    Put_Levels(*Add_Cells(sheet, factor_column, "dose", {"1", "2", "*"}), {0.5, 1234567.25});
-    Add_Cells(sheet, factor_column, "plain", {"2", "1", "*"});
-    Add_Cells(sheet, variate_column, "day", {"3", "4", "5"})->format = date_format_mark;
+    Sheet* const sheet = Sheet_Of("number V1|-0.1|*; t Tsay \"hi\"||a,b\tc; size F2|*|1; dose F1|2|*; "
+                                  "plain F2|1|*; day V3|4|5");
+    Put_Levels(*Column_At(sheet, 3), {1, 2}, {"b\"g", "s"});
+    Put_Levels(*Column_At(sheet, 4), {0.5, 1234567.25});
+    sheet->last_column->format = date_format_mark;
     return sheet;
 }
 
@@ -68,19 +66,17 @@ TEST_F(Text_Writer, Lays_Out_Every_Kind_Of_Column)
         change();
         EXPECT_EQ(Written(Mixed_Sheet(), tab_mode), text) << told;
     }
+    EXPECT_EQ(Written(Sheet_Of("t Ta\nb"), true), "t\r\n\"a\nb\"\r\n");
 }
 
 TEST_F(Text_Writer, Justifies_Fixed_Width_Below_A_Title)
 {
     request.Missing_Text.assign("missing");
     request.Source_Base_Name.assign("trial");
-    Sheet* const sheet = New_Sheet_With_Rows(2);
-    Add_Cells(sheet, variate_column, "n", {"1.5", "-20"})->justify = left_side;
-    Add_Cells(sheet, text_column, "text", {"ab", ""})->justify = right_side;
-    Column* const factor = Add_Cells(sheet, factor_column, "f", {"1", "2"});
-    Put_Levels(*factor, {1, 2}, {"x", "yyy"});
-    factor->justify = left_side;
-    Add_Cells(sheet, factor_column, "g", {"1", "*"});
+    Sheet* const sheet = Sheet_Of("n V1.5|-20; text Tab|; f F1|2; g F1|*");
+    Put_Levels(*Column_At(sheet, 3), {}, {"x", "yyy"});
+    Column_At(sheet, 1)->justify = Column_At(sheet, 3)->justify = left_side;
+    Column_At(sheet, 2)->justify = right_side;
     const std::pair<const char*, std::string> cases[] = {
         {"out.txt", "out.txt"}, {"out.$$$", "out"}, {"Clipboard.$$$", "trial"}, {"$Clip$.txt", "trial"}};
     for (const auto& [file, title] : cases) {
@@ -113,18 +109,13 @@ TEST_F(Text_Writer, Prints_Numbers_By_Formats_When_Asked)
 TEST_F(Text_Writer, Knows_Matrices_And_Margins)
 {
     Packed();
-    Sheet* const matrix = New_Sheet_With_Rows(3);
-    matrix->type = symmetric_matrix_sheet;
-    Add_Cells(matrix, symmetric_matrix_column, "1", {"1", "2", "3"});
-    Add_Cells(matrix, symmetric_matrix_column, "2", {"4", "5"});
-    Add_Cells(matrix, symmetric_matrix_column, "3", {"6"});
+    Sheet* const matrix = Sheet_Of("1 Y1|2|3; 2 Y4|5; 3 Y6", symmetric_matrix_sheet);
     EXPECT_EQ(Written(matrix), "1,2,3\r\n1,,\r\n2,4,\r\n3,5,6\r\n");
     request.CSV_Output = false;
     Get_Settings().csv_title = 0;
-    Sheet* const table = New_Sheet_With_Rows(2);
-    table->type = table_sheet;
+    Sheet* const table = Sheet_Of("f F1|2", table_sheet);
     table->has_margins = 1;
-    Put_Levels(*Add_Cells(table, factor_column, "f", {"1", "2"}), {1}, {"x"});
+    Put_Levels(*table->last_column, {}, {"x"});
     EXPECT_EQ(Written(table), "     f!\r\n      x\r\n Margin\r\n");
 }
 
