@@ -303,7 +303,10 @@ TEST_F(Command_Test, A_Signal_Takes_The_Temporary_Folder_Along)
         for (int i = 0; i < 1000 && !is_waiting(); ++i)
             std::this_thread::sleep_for(std::chrono::milliseconds(10));
         EXPECT_TRUE(is_waiting());
-        ::kill(std::stoi(Get("pid")), signal_number);
+        const ::pid_t process = std::stoi(Get("pid"));
+        ::siginfo_t end;
+        ::kill(process, signal_number);
+        ::waitid(P_PID, static_cast<::id_t>(process), &end, WEXITED | WNOWAIT);  // before its input ends
         const int how = ::pclose(input);
         EXPECT_EQ(WIFSIGNALED(how) ? WTERMSIG(how) : 0, signal_number);
         std::filesystem::remove(Path("pid"));
