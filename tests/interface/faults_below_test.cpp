@@ -192,6 +192,9 @@ protected:
         }
         request = Request_Globals{};
         Start_Request("t");
+        // A libcurl that is refused memory may close the standard input.
+        if (::fcntl(STDIN_FILENO, F_GETFD) < 0)
+            static_cast<void>(::open("/dev/null", O_RDONLY | O_CLOEXEC));
         if (Living_Blocks() != blocks)
             outcome.faults += " memory is lost,";
         if (Descriptors() != descriptors)

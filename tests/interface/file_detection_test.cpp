@@ -102,6 +102,7 @@ TEST_F(File_Detection_Test, Compressed_Files_Are_Read_Whole_Or_Refused)
     const std::tuple<const char*, std::string, std::string> cases[] = {
         {"good.gz", packed, ""},
         {"two.gz", Gzipped("plot,yield\n1,2.5\n") + Gzipped("2,3.5\n"), ""},
+        {"padded.gz", packed + Zeros(300), ""},
         {"cut.gz", packed.substr(0, packed.size() - 9), "Compressed file is damaged or not complete.\n:\n"},
         {"spoilt.gz", spoilt, "Compressed file is damaged or not complete.\n:\n"},
         {"head.gz", packed.substr(0, 12), "Compressed file is damaged or not complete.\n:\n"},
