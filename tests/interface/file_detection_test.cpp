@@ -16,7 +16,6 @@ std::string Zeros(std::size_t count)
     return std::string(count, '\0');
 }
 
-const std::string Calvin = "\x3B\x01\0\0\0\x01"s + Zeros(4);
 const std::string Fortran = "Dune meadow\n(I4,2X,5(I4,F5.1))\n5\n" + std::string(100, ' ');
 
 class File_Detection_Test : public Request_Test {
@@ -37,19 +36,16 @@ TEST_F(File_Detection_Test, Signatures_Come_Before_Names_And_Both_Before_The_Loo
         {18, "x.DHT", "\xDA\xDA"s},
         {0, "x.dh", "\xDA\xDA"s},
         {18, "x", "\xDD\xDD"s + Zeros(6) + "\x86\0"s},
-        {20, "x.sav", Zeros(10)},
         {76, "x.mat", "MATLAB 5"},
         {25, "x.txt", "MATLAB 5\n"},
         {5, "x.xls", "\x09\0\x04\0"s},
         {0, "x.csv", "\x09\0\x04\0"s},
         {5, "x", "\x09\4\6\0\0\0\x10\0"s},
         {0, "x.xls", "\x09\4\6\0\1\0\x10\0"s},
-        {5, "x.txt", "\xD0\xCF\x11\xE0\xA1\xB1"s},
         {23, "x", "\x70\1\2"s},
         {23, "x", "\x72\2\1"s},
         {8, "x", "\0\0\2\0\2\x10"s},
         {2, "x", "\0\0\2\0\3\x10"s},
-        {35, "x", "css 12\xFF\xFF"s},
         {37, "x", "SAS\1" + Zeros(60) + "sparc"},
         {10, "x", "SAS\1"},
         {37, "x", Zeros(84) + "SAS" + Zeros(34) + "\1"},
@@ -64,8 +60,6 @@ TEST_F(File_Detection_Test, Signatures_Come_Before_Names_And_Both_Before_The_Loo
         {0, "x", "\x41\0\0\0\5\0\0\0"s},
         {53, "x.CEL", "[cel]\n"},
         {25, "x.txt", "[CEL]\n"},
-        {69, "x", Calvin + "\0\0\0\x1B"s + "affymetrix-calvin-intensity"},
-        {0, "x", Calvin + "\0\0\0\x23"s + "affymetrix-quantification-analysis"},
         {82, "x", "<?xml version='1.0'?>\n<!--doctype SSS"},
         {80, "x", "<?xml version='1.0'?>\n<!DOCTYPE gretldata"},
         {3, "x", "\x83\x50\x0C\x1F"s},

@@ -121,7 +121,6 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
     // The record, the count, lists in records behind it; then what it leaves, the mode, and the numbers of
     // names and flags that were read, below 0 for no subset.
     const std::tuple<std::string, double, Texts, std::string, Add_Modes, int, int> cases[] = {
-        {"", 5, {}, "", none, -1, -1},
         {"d.csv/a", 5, {}, "d.csv", append, -1, -1},
         {"/m/c/a d.csv", 5, {}, " d.csv", merge, -1, -1},
         {"columns/s", 5, {}, "columns", none, 2, -1},
@@ -132,7 +131,6 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
         {"d.csv/c/s", 5, {}, "d.csv", concatenate, -1, -1},
         {"d.csv/a/r", 5, {"rows"}, "d.csv", append, -1, 3},
         {"d.csv/a/r/s", 6, {"columns", "rows"}, "d.csv", append, 2, 3},
-        {"absent/s", 5, {}, "absent", none, -1, -1},
     };
     for (const auto& [secondary, count, lists, rest, mode, names, flags] : cases) {
         SCOPED_TRACE(secondary);

@@ -147,13 +147,6 @@ TEST_F(Pipeline_Test, Refuses_With_Words_And_A_Status_And_Changes_Nothing)
     ::unsetenv("DISPLAY");
 }
 
-TEST_F(Pipeline_Test, A_List_Of_The_Columns_Is_Written_Beside_The_Output)
-{
-    Put("c.csv", Crops);
-    EXPECT_EQ(Convert("c.csv", "o.tab/p").first, 0);
-    EXPECT_EQ(Get("o.$V$"), "3\nplot\nkind\nyield\n");
-}
-
 TEST_F(Pipeline_Test, An_Old_Output_Is_Replaced_Whole)
 {
     Put("c.csv", Crops);
