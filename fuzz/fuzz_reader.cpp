@@ -31,9 +31,25 @@ std::size_t Choice(std::byte character, std::size_t count)
     return {};
 }
 
+/// What lists ask of a text, a bit each: columns by name or by number, their types by name or by place, and
+/// room for a few columns only.
+[[maybe_unused]] void Prepare_Selection(std::size_t choice)
+{
+    request.Subset_Columns = (choice & 1U) != 0;
+    request.Subset_By_Number = (choice & 2U) != 0;
+    request.Subset_Names = request.Subset_By_Number ? std::vector<std::string>{"1", "3"}
+                                                    : std::vector<std::string>{"b", "x", "t"};
+    if ((choice & 4U) != 0)
+        request.Column_Wanted_Types = {text_column, 0, factor_column, variate_column};
+    if ((choice & 6U) == 4U)
+        request.Column_Wanted_Names = {"x", "a", "b", "t"};
+    if ((choice & 8U) != 0)
+        request.Max_Columns = 2;
+}
+
 /// Options of delimited text, cut off the bytes: eight characters, digits and a line end in the seeds. In
 /// order: the file's name, names or none, lines a record, separators, missing text, lines of the file,
-/// texts where reading begins and ends (with lines to skip), and one for the eye. Gives the name.
+/// texts where reading begins and ends (with lines to skip), and what lists ask for. Gives the name.
 [[maybe_unused]] std::string_view Prepare_Text(std::span<const std::byte>& bytes)
 {
     constexpr std::string_view names[] = {"fuzz.csv", "fuzz.tab", "fuzz"};
@@ -59,6 +75,7 @@ std::size_t Choice(std::byte character, std::size_t count)
     request.End_Text = marks[mark % std::size(marks)];
     request.Fixed_Lines = static_cast<std::int32_t>(mark);
     request.settings.trim_cells = Choice(head[6], 16) < 2 * std::size(marks) ? 1 : 0;
+    Prepare_Selection(Choice(head[7], 16) ^ Choice(std::byte{'\n'}, 16));  // a line end asks for nothing
     return names[Choice(head[0], std::size(names))];
 }
 

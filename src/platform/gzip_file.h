@@ -1,20 +1,18 @@
 // Files in gzip form (RFC 1952): read as what they hold, and made.
 #pragma once
 
+#include "platform/files.h"
+
 #include <cstddef>
+#include <memory>
 #include <string_view>
 
-struct gzFile_s;
+struct z_stream_s;
 
 namespace ingester {
 
 class Gzip_File {
 public:
-    Gzip_File() = default;
-    Gzip_File(const Gzip_File&) = delete;
-    Gzip_File& operator=(const Gzip_File&) = delete;
-    ~Gzip_File();
-
     /// False when the file can't be opened or isn't in gzip form.
     [[nodiscard]] bool Open(std::string_view name);
 
@@ -25,7 +23,17 @@ public:
     [[nodiscard]] bool Close();
 
 private:
-    gzFile_s* stream_ = nullptr;
+    struct End_Stream {
+        void operator()(z_stream_s* stream) const;
+    };
+
+    [[nodiscard]] bool Fill();
+    [[nodiscard]] bool Stands_At_Member();
+
+    Input_File file_;
+    std::unique_ptr<unsigned char[]> packed_;
+    std::unique_ptr<z_stream_s, End_Stream> stream_;  ///< null when no file is open
+    bool ended_ = false;                              ///< behind the last member
     bool failed_ = false;
 };
 

@@ -2,7 +2,6 @@
 #include "interface/pass_file.h"
 
 #include "host_fixture.h"
-#include "interface/subset_lists.h"
 
 #include <cmath>
 #include <limits>
@@ -91,19 +90,15 @@ TEST_F(Pass_File_Test, A_Carrier_Names_The_Files_By_Its_Id)
     std::string name = Request_Name("sub\\carrier.bin");
     for (std::size_t at = 0; (at = name.find('\\', at)) != std::string::npos; at += 2)
         name.insert(at, 1, '\\');  // as a host writes it
-    for (const std::string stem : {"IG1A2B", "TxtToNum"}) {
-        const bool by_id = stem == "IG1A2B";
-        Put("sub/carrier.bin", by_id ? Carrier_Bytes(skipped, 0, 6699.9) : "");
-        const std::string pass = by_id ? stem + ".tmp" : "ingester.inp";
-        const auto answer = [&] {
-            INGESTER(name.data(), nullptr, static_cast<std::int32_t>(name.size()), 5);
-            return Take_Answer(stem, by_id ? stem + ".out" : "ingester.out");
-        };
-        EXPECT_EQ(answer(), (Host_Answer{1, "Pass file " + Request_Name(pass) + " not found./n:\n"}));
-        Put(pass, Pass_Bytes(2, {"", "o.tab"}));
-        EXPECT_EQ(answer(), (Host_Answer{3, "Input file name is NULL or empty.\nFiles type unknown.\n:\n"}));
-        EXPECT_EQ(Files(), "carrier.bin sub sub/carrier.bin");
-    }
+    Put("sub/carrier.bin", Carrier_Bytes(skipped, 0, 6699.9));
+    const auto answer = [&] {
+        INGESTER(name.data(), nullptr, static_cast<std::int32_t>(name.size()), 5);
+        return Take_Answer("IG1A2B", "IG1A2B.out");
+    };
+    EXPECT_EQ(answer(), (Host_Answer{1, "Pass file " + Request_Name("IG1A2B.tmp") + " not found./n:\n"}));
+    Put("IG1A2B.tmp", Pass_Bytes(2, {"", "o.tab"}));
+    EXPECT_EQ(answer(), (Host_Answer{3, "Input file name is NULL or empty.\nFiles type unknown.\n:\n"}));
+    EXPECT_EQ(Files(), "carrier.bin sub sub/carrier.bin");
 }
 
 TEST_F(Pass_File_Test, The_Result_Goes_Where_It_Is_Asked_For)
@@ -126,7 +121,6 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
     // The record, the count, lists in records behind it; then what it leaves, the mode, and the numbers of
     // names and flags that were read, below 0 for no subset.
     const std::tuple<std::string, double, Texts, std::string, Add_Modes, int, int> cases[] = {
-        {"", 5, {}, "", none, -1, -1},
         {"d.csv/a", 5, {}, "d.csv", append, -1, -1},
         {"/m/c/a d.csv", 5, {}, " d.csv", merge, -1, -1},
         {"columns/s", 5, {}, "columns", none, 2, -1},
@@ -137,7 +131,6 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
         {"d.csv/c/s", 5, {}, "d.csv", concatenate, -1, -1},
         {"d.csv/a/r", 5, {"rows"}, "d.csv", append, -1, 3},
         {"d.csv/a/r/s", 6, {"columns", "rows"}, "d.csv", append, 2, 3},
-        {"absent/s", 5, {}, "absent", none, -1, -1},
     };
     for (const auto& [secondary, count, lists, rest, mode, names, flags] : cases) {
         SCOPED_TRACE(secondary);
@@ -156,40 +149,6 @@ TEST_F(Pass_File_Test, Markers_And_Lists_Of_The_Secondary_File)
         EXPECT_EQ(request.Add_Mode, mode);
         EXPECT_EQ(request.Subset_Columns ? request.Subset_Name_Count : -1, names);
         EXPECT_EQ(request.Subset_Rows ? request.Subset_Row_Count : -1, flags);
-        EXPECT_EQ(Files(), names < 0 && flags < 0 ? "columns rows"
-                           : names < 0            ? "columns"
-                           : flags < 0            ? "rows"
-                                                  : "");
-    }
-}
-
-TEST_F(Pass_File_Test, Lists_Are_As_Long_As_Their_Lines)
-{
-    const std::string thousand(1000, 'x');
-    const std::string nuls("\0\1\xFF\0\n\n\0\n\0", 9);
-    const std::tuple<std::string, Texts, bool, std::vector<std::int32_t>> cases[] = {
-        {"", {}, true, {}},
-        {"2", {}, true, {}},
-        {"1\r\nv\r\nyield\r\nmore\r\n", {"yield"}, false, {0}},
-        {"2147483648\nnumbers\n 3 \n5", {"3", "5"}, true, {0, 1, 1}},
-        {"99999999999999999999\nV\na\n", {"a"}, false, {0, 0}},
-        {"-1\nV\na\n", {}, false, {}},
-        {"text\nV\na\n", {}, false, {}},
-        {nuls, {}, true, {}},
-        {"2\n\n" + thousand + "y\n", {thousand, "y"}, true, {0, 0}},
-        {std::string(100, ' ') + "2\nV\na\nb\n", {}, true, {}},  // the count's line is cut at 100
-    };
-    for (const auto& [text, names, by_number, flags] : cases) {
-        Put("list", text);
-        EXPECT_TRUE(Read_Column_Subset(Request_Name("list")) && Files().empty());
-        EXPECT_EQ(request.Subset_Names, names);
-        EXPECT_EQ(request.Subset_By_Number, by_number) << text;
-        Put("list", text);
-        EXPECT_TRUE(Read_Row_Subset(Request_Name("list")) && Files().empty());
-        EXPECT_EQ(request.Subset_Row_Flags, flags) << text;
-        EXPECT_FALSE(Read_Column_Subset(Request_Name("list")) || Read_Row_Subset(""));
-        EXPECT_TRUE(Messages().starts_with("Error: Could not read all of file "));
-        std::filesystem::remove(Path("t.ERR"));
     }
 }
 

@@ -12,10 +12,10 @@
 #include <filesystem>
 #include <fstream>
 #include <iterator>
-#include <map>
 #include <random>
+#include <set>
+#include <sstream>
 #include <string>
-#include <string_view>
 #include <vector>
 
 #include <dlfcn.h>
@@ -48,56 +48,22 @@ struct Request {
 
 const std::vector<Request> Plain_Requests = {
     {"in\\crops.csv|out\\o.tab", "crops.csv"},
-    {"in\\crops.csv/c=2:3/x='NA'|out\\o.csv/h/-/mv=NA"},
-    {"in\\crops.csv/n/lt=1|out\\o.txt/d/p"},
-    {"in\\crops.csv/tr|out\\o.tab/e"},
-    {"in\\crops.csv/tr=N/u/k/b|out\\o.gen/b/q"},
-    {"in\\crops.csv/p=all|out\\o.gen"},
     {"in\\crops.csv/v|out\\o.tss"},
-    {"in\\large.csv|out\\o.tab"},
-    {"in\\large.csv|out\\o.tss"},
     {"in\\large.csv|out\\o.tab/rewrite=7"},
-    {"in\\wide.csv/tr|out\\o.tbk"},
-    {"in\\wide.csv|out\\o.gen/m=M"},
-    {"in\\made.tss|out\\o.csv/h"},
-    {"in\\made.tss|out\\o.gen/d"},
     {"in\\made.tss|%TMP%\\T181D1.TSS"},
     {"in\\made.tbk/w|out\\o.tab"},
-    {"in\\made.tbk|out\\o.tbk|B"},
     {"in\\made.tbk|out\\o.tab|S:no such sheet"},
     {"in\\crops.csv|out\\o.tbk/a=B", "made.tbk"},
     {"in\\more.csv|out\\o.tbk/r=B", "made.tbk"},
-    {"in\\more.csv|out\\o.tbk/r", "made.tbk"},
-    {"in\\more.csv|out\\o.tbk/a=C", "crops.csv"},
     {"in\\more.csv|out\\o.tbk.gz/a=C", "made.tbk.gz"},
-    {"in\\made.tbk.gz|out\\o.tab|A"},
-    {"in\\crops.csv.gz|out\\o.tss"},
-    {"file:\\\\FOLDER\\in\\made.tbk|out\\o.tab"},
-    {"file:\\\\FOLDER\\in\\none.csv|out\\o.tab"},
     {"http:\\\\localhost:9\\none.csv|out\\o.tab"},
     {"in\\crops.csv|out\\o.tab|||temp\\list/s", "", "2\nV\nyield\nplot\n"},
     {"in\\made.tss|out\\o.tss|||temp\\list/s", "", "3\n#\n1\n3\n99\n"},
-    {"in\\made.tbk|out\\o.tbk|||temp\\list/s", "", "1\nV\nnone\n"},
     {"in\\crops.csv|out\\o.tab|||temp\\list/r", "", "4\n0\n1\n0\n1\n"},
-    {"in\\made.tss|out\\o.csv|||temp\\list/r", "", "3\n0\n0\n0\n"},
-    {"in\\crops.csv|out\\o.csv/@,when", "crops.csv"},
     {"in\\crops.csv|out\\o.csv/@", "none.csv"},
-    {"in\\more.csv|out\\o.tss/@", "made.tss"},
-    {"in\\more.csv|out\\o.csv/&", "crops.csv"},
-    {"in\\more.csv|out\\o.tss/&U", "made.tss"},
-    {"in\\more.csv|out\\o.tss/%=1UM", "made.tss"},
-    {"in\\more.csv|out\\o.tbk/%=1N/!=A", "made.tbk"},
-    {"in\\crops.csv|out\\o.csv/%=1", "more.csv"},
-    {"in\\none.csv|out\\o.tab", "crops.csv"},
-    {"in\\empty.csv|out\\o.tab"},
-    {"in\\void.csv|out\\o.tab"},
-    {"in|out\\o.tab"},
     {"in\\crops.csv|in\\crops.csv"},
     {"in\\crops.csv|out\\o.dbf"},
-    {"in\\crops.csv/c=3:2|out\\o.tab", "crops.csv"},
-    {"in\\crops.csv/map|out\\o.tab"},
     {"in\\crops.csv|out\\no\\o.tab"},
-    {"in\\crops.csv|\\proc\\o.tab"},
     {"in\\crops.csv|\\proc\\version"},
     {"in\\large.csv|out\\full.tab"},
     {"Clipboard.csv|out\\o.tab"},
@@ -135,21 +101,19 @@ template <class T> void Add(std::string& bytes, T value)
         std::reverse(bytes.end() - sizeof value, bytes.end());
 }
 
-std::string Pass_Bytes(std::string_view records)
+std::string Pass_Bytes(const std::string& records)
 {
     std::string bytes;
     Add(bytes, 1.0 + static_cast<double>(std::ranges::count(records, '|')));
-    for (std::size_t begin = 0; begin <= records.size();) {
-        const std::size_t end = std::min(records.find('|', begin), records.size());
+    std::istringstream stream(records);
+    for (std::string record; std::getline(stream, record, '|'); bytes += record) {
         Add(bytes, 0);
-        Add(bytes, static_cast<std::int32_t>(end - begin));
-        bytes += records.substr(begin, end - begin);
-        begin = end + 1;
+        Add(bytes, static_cast<std::int32_t>(record.size()));
     }
     return bytes;
 }
 
-/// By a carrier, since its names don't hold the number of the process.
+/// By the names of a host without a carrier, since they don't hold the number of the process.
 void Run(Ingester ingester, const Request& request)
 {
     const std::string out = request.records.substr(request.records.find('|') + 1);
@@ -158,31 +122,29 @@ void Run(Ingester ingester, const Request& request)
     if (!request.list.empty())
         Put("temp/list", request.list);
     if (request.muted)
-        fs::create_directory("temp/IG1A2B.ERR");
+        fs::create_directory("temp/TxtToNum.ERR");
     if (!request.records.empty())
-        Put("temp/IG1A2B.tmp", Pass_Bytes(request.records));
-    if (ingester("carrier", "", 7, 0) != 0)
+        Put("temp/ingester.inp", Pass_Bytes(request.records));
+    if (ingester("", "", 0, 0) != 0)
         Give_Up("the export returned a fault", request);
 }
 
 /// The files that a request left, with their names; they are removed.
 std::string Take_Answer(const Request& request)
 {
-    std::map<std::string, std::string> files;
+    std::set<fs::path> paths;
     for (const char* const folder : {"temp", "out"})
-        for (const fs::path& path : fs::directory_iterator(folder)) {
-            const std::string name = path;
-            if (fs::is_symlink(path))
-                continue;
-            if (!name.starts_with("temp/IG1A2B.") && name != "temp/T181D1.TSS"
-                && (!name.starts_with("out/o.") || (path.extension() == ".$$$")))
-                Give_Up("a scratch file stays behind: " + name, request);
-            files[name] = fs::is_directory(path) ? "" : Get(path);
-        }
+        paths.insert(fs::directory_iterator(folder), fs::directory_iterator());
     std::string answer;
-    for (const auto& [name, bytes] : files) {
-        answer.append(name).append(1, '\n').append(bytes).append(1, '\n');
-        fs::remove(name);
+    for (const fs::path& path : paths) {
+        const std::string name = path;
+        if (fs::is_symlink(path))
+            continue;
+        if (name != "temp/TxtToNum.ERR" && !name.starts_with("temp/ingester.") && name != "temp/T181D1.TSS"
+            && (!name.starts_with("out/o.") || path.extension() == ".$$$"))
+            Give_Up("a scratch file stays behind: " + name, request);
+        answer += name + '\n' + (fs::is_directory(path) ? "" : Get(path)) + '\n';
+        fs::remove(path);
     }
     return answer;
 }
@@ -227,26 +189,16 @@ std::string Enter_Folder()
 
 void Make_Inputs(const std::string& library)
 {
-    std::string carrier;
-    for (const std::int32_t word : {1, 9, 9, 9, 9, 9, 1, 2, 3, 0, 1, 2, 9, 9})
-        Add(carrier, word);
-    Add(carrier, 6699.0);
-    Put("carrier", carrier);
     std::string large = "plot,kind!,yield,words\n";
-    std::string wide = "c,d,e,f";
     for (int row = 1; row <= 100000; ++row)
         large += std::to_string(row) + (row % 3 == 0 ? ",oats," : ",rye,") + std::to_string(row * 0.37) + ",w"
                  + std::to_string(row % 1000) + '\n';
-    for (int cell = 4; cell < 4000; ++cell)
-        wide += (cell % 400 == 0 ? "\n" : cell < 400 ? ",c" : ",") + std::to_string(cell);
     Put("in/large.csv", large);
-    Put("in/wide.csv", wide + '\n');
     Put("in/crops.csv", "plot,kind!,sown:D,yield,notes$\n1,oats,12/03/2024,2.5,NA\n2,rye,13/03/2024,*,lodged "
                         "early\n3,rye,14/03/2024,1e9,x\n4,oats,*,0.1,tall\n");
     Put("in/crops.VAR", "5\nPlot#\n\n*\nYield!\nwords:E\n");
     Put("in/more.csv", "plot,height,yield\n2,71.5,3\n9,70,4\n1,69,5\n4,68,6\n");
     Put("in/more.mrg", "1\nplot\n");
-    Put("in/empty.csv", "");
     Put("in/void.csv", "a,b\n,\n,\n");
     for (const auto& [records, name] : {std::pair("in\\crops.csv|out\\o.tss", "made.tss"),
                                         {"in\\crops.csv|out\\o.tbk/x=A", "made.tbk"},
@@ -288,6 +240,9 @@ void Add_Random_Requests(std::vector<Request>& requests)
     const std::vector<std::string> endings = {".tab", ".csv", ".txt", ".gen", ".tss"};
     std::minstd_rand random;
     const auto one_of = [&](const auto& texts) { return texts[random() % texts.size()]; };
+    for (const std::string join : {"/@", "/@,when", "/&", "/&U", "/%=1", "/%=1UM"})
+        for (const std::string old : {"crops.csv", "made.tss", "made.tbk"})
+            requests.push_back({"in\\more.csv|out\\o" + old.substr(old.find('.')) + join, old});
     for (int i = 0; i < 200; ++i) {
         std::string records = "in\\" + one_of(inputs) + one_of(ins) + one_of(ins);
         records += "|out\\o" + one_of(endings) + one_of(outs) + one_of(outs);
@@ -300,9 +255,8 @@ std::vector<Request> Make_Requests()
     std::vector<Request> requests = Plain_Requests;
     std::string folder = fs::current_path();
     std::ranges::replace(folder, '/', '\\');  // a slash begins an option
-    for (Request& request : requests)
-        if (const std::size_t at = request.records.find("FOLDER"); at != std::string::npos)
-            request.records.replace(at, 6, folder);
+    for (const std::string name : {"made.tbk", "none.csv"})
+        requests.push_back({"file:\\\\" + folder + "\\in\\" + name + "|out\\o.tab"});
     Add_Hostile_Requests(requests);
     Add_Random_Requests(requests);
     return requests;
@@ -312,9 +266,7 @@ std::vector<Request> Make_Requests()
 void Be_A_Peculiar_Host()
 {
     static char handler_stack[1 << 16];
-    stack_t stack = {};
-    stack.ss_sp = handler_stack;
-    stack.ss_size = sizeof handler_stack;
+    const stack_t stack = {.ss_sp = handler_stack, .ss_flags = 0, .ss_size = sizeof handler_stack};
     ::sigaltstack(&stack, nullptr);
     struct sigaction action = {};
     action.sa_handler = [](int) { ::_exit(99); };
@@ -371,16 +323,11 @@ Memory Used_Memory()
     return {pages * ::sysconf(_SC_PAGESIZE), static_cast<long>(heap.uordblks + heap.hblkhd)};
 }
 
-bool Grew(const Memory& before, const Memory& now)
-{
 #ifdef __SANITIZE_ADDRESS__
-    return false && now.resident > before.resident;  // what is freed stays for a while
+constexpr Memory Most_Growth = {1L << 40, 1L << 40};  // what is freed stays for a while
 #else
-    constexpr long most_resident = 2 << 20;
-    constexpr long most_in_use = 64 << 10;
-    return now.resident - before.resident > most_resident || now.in_use - before.in_use > most_in_use;
+constexpr Memory Most_Growth = {2 << 20, 64 << 10};
 #endif
-}
 
 }  // namespace
 
@@ -396,15 +343,13 @@ int main(int count, char** arguments)
     const std::vector<Request> requests = Make_Requests();
     std::vector<std::string> answers;
     std::vector<std::size_t> order;
+    int good = 0;
     for (const Request& request : requests) {
         answers.push_back(Fresh_Answer(library, request));
         order.push_back(order.size());
+        good += answers.back().find(std::string("ingester.out\n\0", 14)) != std::string::npos ? 1 : 0;
     }
-    if (std::ranges::count_if(answers,
-                              [](const std::string& answer) {
-                                  return answer.find(std::string("IG1A2B.out\n\0", 12)) != std::string::npos;
-                              })
-        < 50)
+    if (good < 50)
         Give_Up("too few requests succeed");
 
     Be_A_Peculiar_Host();
@@ -426,7 +371,9 @@ int main(int count, char** arguments)
         const Memory now = Used_Memory();
         if (round < 3 || done <= total / 10)
             before = now;
-        if (done >= total && Grew(before, now))
+        if (done >= total
+            && (now.resident - before.resident > Most_Growth.resident
+                || now.in_use - before.in_use > Most_Growth.in_use))
             Give_Up("memory grows");
         std::fprintf(stderr, "%ld requests, %ld KiB resident, %ld bytes in use\n", done, now.resident >> 10,
                      now.in_use);

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -15,6 +16,14 @@
 namespace ingester {
 
 using Texts = std::vector<std::string>;
+
+/// With "|" for its line ends.
+inline std::string On_One_Line(std::string text)
+{
+    std::erase(text, '\r');
+    std::ranges::replace(text, '\n', '|');
+    return text;
+}
 
 class Folder_Test : public testing::Test {
 protected:

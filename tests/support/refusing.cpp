@@ -3,8 +3,11 @@
 #include <atomic>
 #include <csignal>
 #include <cstdlib>
+#include <cstring>
 #include <ctime>
 #include <new>
+
+#include <curl/curl.h>
 
 namespace ingester {
 namespace {
@@ -23,10 +26,29 @@ void* New_Block(std::size_t bytes)
     return block;
 }
 
+/// Whoever sets libcurl up first decides where it takes its memory.
+void Be_Asked_By_Curl()
+{
+    const auto copy = [](const char* text) {
+        const std::size_t bytes = std::strlen(text) + 1;
+        void* const block = Take_Memory(nullptr, bytes);
+        return static_cast<char*>(block == nullptr ? nullptr : std::memcpy(block, text, bytes));
+    };
+    const auto zeros = [](std::size_t count, std::size_t size) {
+        void* const block = Take_Memory(nullptr, count * size);
+        return block == nullptr ? nullptr : std::memset(block, 0, count * size);
+    };
+    static const CURLcode done = curl_global_init_mem(
+        CURL_GLOBAL_DEFAULT, [](std::size_t bytes) { return Take_Memory(nullptr, bytes); }, std::free,
+        Take_Memory, copy, zeros);
+    static_cast<void>(done);
+}
+
 }  // namespace
 
 Refusing::Refusing(const Refusal& refusal)
 {
+    Be_Asked_By_Curl();
     refusal_ = refusal;
     kinds_ = refusal.kinds.size() == 0 ? ~0U : 0U;
     for (const Asked kind : refusal.kinds)
