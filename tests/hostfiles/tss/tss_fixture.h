@@ -42,12 +42,25 @@ protected:
     }
 };
 
+inline const Column& Col(std::int32_t index)
+{
+    return *Column_At(Current_Sheet, index);
+}
+
 /// Values with a blank between.
 template <class... Values> std::string Text_Of(const Values&... values)
 {
     std::ostringstream text;
     ((text << (text.tellp() > 0 ? " " : "") << values), ...);
     return text.str();
+}
+
+inline std::string Hex(const std::string& bytes)
+{
+    std::string text;
+    for (const char c : bytes)
+        text += "0123456789ABCDEF"[(c >> 4) & 15], text += "0123456789ABCDEF"[c & 15];
+    return text;
 }
 
 }  // namespace ingester
