@@ -12,7 +12,7 @@ public:
 
     std::string Listen()
     {
-        for (; at_ < text_.size() && heard_.find("FAULT") == std::string::npos; ++at_) {
+        for (; at_ < text_.size() && !stumbled_; ++at_) {
             const char c = text_[at_];
             if (c == '\'')
                 Hear_Text();
@@ -35,6 +35,7 @@ private:
     {
         if (!good)
             heard_.append("FAULT ").append(why);
+        stumbled_ = stumbled_ || !good;
     }
     [[nodiscard]] bool Stands(std::size_t at, char c) const { return at < text_.size() && text_[at] == c; }
 
@@ -83,6 +84,7 @@ private:
     int texts_ = 0;         ///< in the line
     std::size_t first_text_ = 0;
     bool data_ = false;
+    bool stumbled_ = false;
     std::string heard_;
 };
 

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <numeric>
 #include <random>
 
 namespace ingester {
@@ -52,14 +53,6 @@ Column* Describe(Column* column, std::int32_t decimals, const char* extra, std::
     column->format = date_format > 0 ? date_format_mark : column->format;
     column->date_format = date_format;
     return column;
-}
-
-std::vector<double> Count_To(int count)
-{
-    std::vector<double> values;
-    for (int value = 1; value <= count; ++value)
-        values.push_back(value);
-    return values;
 }
 
 TEST_F(Script, Numbers_Are_Those_The_Host_Reads)
@@ -160,22 +153,19 @@ RETURN [CLOSE=yes]
 
 TEST_F(Script, The_Request_Chooses_Endings_And_Quiet_Reading)
 {
-    const auto quiet = [] { request.Quiet_Read = request.No_Return = true; };
-    const auto marked = [] { request.Return_Delete_Marker = "out", request.No_Return = true; };
-    const std::tuple<void (*)(), const char*, const char*> cases[] = {
-        {quiet, "READ [print=*] v\n* :\nRESTRICT v\n", "\n"},
-        {marked, "READ v\n* :\nRESTRICT v\n", "RETURN [CLOSE=yes;DELETE=yes]\n\n"},
-        {[] { request.Return_Delete_Marker = "other"; }, "READ v\n* :\nRESTRICT v\n",
-         "RETURN [CLOSE=yes]\n\n"},
-        {[] { request.End_With_Break = true; }, "READ v\n* :\nRESTRICT v\n", "ENDBREAK\n\n"},
+    const std::pair<void (*)(), const char*> cases[] = {
+        {[] { request.Quiet_Read = request.No_Return = true; }, "\nREAD [print=*] v\n* :\nRESTRICT v\n\n"},
+        {[] { request.No_Return = true, request.Return_Delete_Marker = "out"; },
+         "\nREAD v\n* :\nRESTRICT v\nRETURN [CLOSE=yes;DELETE=yes]\n\n"},
+        {[] { request.Return_Delete_Marker = "other"; }, "\nRESTRICT v\nRETURN [CLOSE=yes]\n\n"},
+        {[] { request.End_With_Break = true; }, "\nRESTRICT v\nENDBREAK\n\n"},
     };
-    for (const auto& [ask, reading, ending] : cases) {
+    for (const auto& [ask, ending] : cases) {
         Start_Request("t");
         ask();
         Sheet* const sheet = Sheet_Of(vector_sheet, 1);
         Add_Cells(sheet, variate_column, "v", {"*"});
-        EXPECT_EQ(Written(sheet),
-                  std::string("DELETE [redefine=yes] v\nVARIATE [nvalues=1] v\n") + reading + ending);
+        EXPECT_TRUE(Written(sheet).ends_with(ending)) << ending;
     }
 }
 
@@ -320,7 +310,9 @@ TEST_F(Script, Factors_Of_Many_Levels_Are_Declared_In_The_Long_Form)
     const auto factor_of = [](int levels, bool values, bool labels) {
         Sheet* const sheet = Sheet_Of(vector_sheet, 1);
         Column* const factor = Add_Cells(sheet, factor_column, "f", {"7"});
-        Put_Levels(*factor, Count_To(levels), Texts(static_cast<std::size_t>(levels)));
+        std::vector<double> values_of(static_cast<std::size_t>(levels));
+        std::iota(values_of.begin(), values_of.end(), 1);
+        Put_Levels(*factor, values_of, Texts(values_of.size()));
         if (!values)
             Free_Cell_Nodes(factor, level_value_nodes);
         if (!labels)
@@ -400,7 +392,7 @@ TEST_F(Script, Hostile_Texts_Come_Back_Whole)
         Texts labels(43 + random() % 60);
         for (std::string& label : labels)
             label = hostile(250);
-        Put_Levels(*factor, Count_To(static_cast<int>(labels.size())), labels);
+        Put_Levels(*factor, std::vector<double>(labels.size()), labels);
         Free_Cell_Nodes(factor, level_value_nodes);
         expected.emplace_back("_labels_|");
         for (const std::string& label : labels)

@@ -244,12 +244,6 @@ TEST_F(TSS_Columns, May_Mark_Rows)
 
 TEST_F(TSS_Columns, And_Rows_Are_Left_Out)
 {
-    const auto names = [] { request.Subset_Columns = true, request.Subset_Names = {"y", "t"}; };
-    const auto numbers = [] {
-        request.Subset_Columns = request.Subset_By_Number = true, request.Subset_Names = {"2", "1"};
-    };
-    const auto rows = [] { request.Subset_Rows = true, request.Subset_Row_Flags = {0, 1, 1}; };
-    const auto ends = [] { request.Subset_Rows = true, request.Subset_Row_Flags = {1, 0, 1}; };
     const Items vector = With_Records({{16, Of(1, "r", 3, Raw{"\6"})},
                                        {21, Of(2, 2, 2, 1, 5, 6, 3, 7, 8, 4, 3, 1, 5, 6, 2, 3, 4, 3, 3, 4)}});
     const Items x = Make.Numbers(4, "x", {1.0, 2.0, 3.0});
@@ -259,35 +253,36 @@ TEST_F(TSS_Columns, And_Rows_Are_Left_Out)
            2, 1, 5, 6, 3, 7, 8);
     const struct {
         Items items;
-        void (*prepare)();
-        const char* cells;      ///< empty: nothing was left
+        Texts names;  ///< or numbers of columns
+        std::vector<std::int32_t> rows;
+        std::string cells;      ///< empty: nothing was left
         const char* also = "";  ///< restricted rows, those of the saved restriction, and coloured cells
     } cases[] = {
-        {vector, names, "t Tone||three; y V7|8|9"},
-        {vector, numbers, "f F1|*|3; x V1.5|*|-2"},
-        {vector, [] { request.Subset_Columns = true, request.Subset_Names = {"z"}; }, ""},
-        {vector, rows, "f F*|3; x V*|-2; t T|three; y V8|9", "0 03 2:7 | 0 3"},
-        {vector, [] { request.Subset_Rows = true, request.Subset_Row_Flags = {1}; },
-         "f F1; x V1.5; t Tone; y V7"},
-        {vector,
-         [] {
-             request.Subset_Rows = true, request.Subset_Row_Flags = {0, 0, 0, 1};
-         },
-         ""},
-        {Of(Make.Head(1, 2, 3), x, 21, 3, 1, 0, 1), rows, "x V2|3", "1"},
-        {Of(Make.Head(1, 1, 2), x), rows, "x V2"},  // a column may be longer than the Sheet then
-        {symmetric, ends, "a S1|3; c S6", "0 02 1:5 2:7 | 0 0"},
+        {vector, {"y", "t"}, {}, "t Tone||three; y V7|8|9"},
+        {vector, {"2", "1"}, {}, "f F1|*|3; x V1.5|*|-2"},
+        {vector, {"z"}, {}, ""},
+        {vector, {}, {0, 1, 1}, "f F*|3; x V*|-2; t T|three; y V8|9", "0 03 2:7 | 0 3"},
+        {vector, {}, {1}, "f F1; x V1.5; t Tone; y V7"},
+        {vector, {}, {0, 0, 0, 1}, ""},
+        {Of(Make.Head(1, 2, 3), x, 21, 3, 1, 0, 1), {}, {0, 1, 1}, "x V2|3", "1"},
+        {Of(Make.Head(1, 1, 2), x), {}, {0, 1, 1}, "x V2"},  // a column may be longer than the Sheet then
+        {symmetric, {}, {1, 0, 1}, "a S1|3; c S6", "0 02 1:5 2:7 | 0 0"},
     };
-    for (const auto& [items, prepare, cells, also] : cases) {
-        const Sheet* const sheet = Read(items, prepare);
+    for (const auto& [items, names, rows, cells, also] : cases) {
+        const Sheet* const sheet = Read(items, [&] {
+            request.Subset_Columns = !names.empty();
+            request.Subset_By_Number = names == Texts{"2", "1"};
+            request.Subset_Names = names;
+            request.Subset_Rows = !rows.empty();
+            request.Subset_Row_Flags = rows;
+        });
         EXPECT_EQ(sheet == nullptr ? "" : Render(sheet), cells);
         if (*also == '\0')
             continue;
         std::string found = std::to_string(sheet->restricted_rows);
         for (const Saved_Restriction& saved : sheet->saved_restrictions) {
-            const Column& coloured = Col(std::min(2, sheet->column_count - (sheet->type == 3 ? 1 : 0)));
             found += " " + Hex(saved.bits);
-            for (const Cell_Colour& colour : coloured.cell_colours)
+            for (const Cell_Colour& colour : Col(sheet->type == vector_sheet ? 2 : 1).cell_colours)
                 found += Format_Text(" %i:%i", colour.row, colour.text_colour);
             found +=
                 " | " + Text_Of(sheet->last_column->cell_colours.size(), sheet->last_column->text_colour);

@@ -7,6 +7,7 @@
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
 
+#include <functional>
 #include <span>
 #include <sstream>
 
@@ -17,7 +18,7 @@ protected:
     /// Reads bytes under the options that `prepare` sets; null when they were refused. Any Sheet has to be
     /// sound.
     static Sheet* Read(
-        const std::string& bytes, void (*prepare)() = [] {})
+        const std::string& bytes, const std::function<void()>& prepare = [] {})
     {
         Start_Request("t");
         prepare();
@@ -28,7 +29,7 @@ protected:
         return Current_Sheet;
     }
     static Sheet* Read(
-        const Items& items, void (*prepare)() = [] {})
+        const Items& items, const std::function<void()>& prepare = [] {})
     {
         return Read(Encode(items), prepare);
     }
