@@ -60,7 +60,6 @@ TEST_F(Script, Numbers_Are_Those_The_Host_Reads)
     const double greatest = std::nextafter(9.99999e307, HUGE_VAL);
     const std::tuple<double, double, bool, const char*> cases[] = {
         {1e9, Missing_Value, false, "1000000000"},
-        {1e10, Missing_Value, false, "1.000000000000e+10"},
         {-1000000000.5, Missing_Value, false, "-1.000000000500e+09"},
         {0.1 + 0.2, Missing_Value, false, "0.3"},
         {-1e-300, Missing_Value, false, "-1e-300"},
@@ -69,7 +68,6 @@ TEST_F(Script, Numbers_Are_Those_The_Host_Reads)
         {HUGE_VAL, Missing_Value, true, "9.99999E+307"},
         {-HUGE_VAL, Missing_Value, false, "*"},
         {std::nan(""), Missing_Value, true, "*"},
-        {Missing_Value, Missing_Value, true, "*"},
         {-1e306, Missing_Value, false, "-1.000000000000e+306"},
         {59, Missing_Value, true, "109572"},
         {60.5, Missing_Value, true, "109572.5"},
@@ -349,8 +347,8 @@ TEST_F(Script, Lines_Break_Where_The_Host_Reads_On)
     EXPECT_TRUE(script.starts_with("DELETE [redefine=yes] \\\n" + sixty + "a\\\n," + sixty + "b\\\n," + sixty
                                    + "c\nVARIATE [nvalues=\\\n12] " + sixty + "a\nREAD " + sixty + "a\n"));
     const std::string eight = "123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 123456.5 ";
-    EXPECT_NE(script.find("\n" + eight + "\n123456.5 123456.5 123456.5 123456.5 :\n"), script.npos) << script;
-    EXPECT_EQ(Heard(sheet).find("FAULT"), std::string::npos) << Heard(sheet);
+    EXPECT_NE(script.find("\n" + eight + "\n123456.5 123456.5 123456.5 123456.5 :\n"), script.npos);
+    EXPECT_EQ(Heard(sheet).find("FAULT"), script.npos);
 }
 
 TEST_F(Script, Hostile_Texts_Come_Back_Whole)
@@ -407,9 +405,8 @@ TEST_F(Script, Hostile_Texts_Come_Back_Whole)
 TEST_F(Script, Fails_Where_Nothing_Can_Be_Declared_Or_Written)
 {
     const std::string name = Request_Name("x.gen");
-    EXPECT_FALSE(Write_Host_Script(nullptr, name.c_str()));
-    EXPECT_FALSE(Write_Host_Script(Sheet_Of(0, 1), name.c_str())
-                 || Write_Host_Script(Sheet_Of(7, 1), name.c_str()));
+    for (Sheet* const sheet : {static_cast<Sheet*>(nullptr), Sheet_Of(0, 1), Sheet_Of(7, 1)})
+        EXPECT_FALSE(Write_Host_Script(sheet, name.c_str()));
     EXPECT_EQ(Files(), "");
     for (const std::int32_t type : {vector_sheet, diagonal_matrix_sheet, table_sheet, scalar_sheet})
         EXPECT_FALSE(Write_Host_Script(Sheet_Of(type, 1), name.c_str())) << type;

@@ -249,19 +249,17 @@ TEST_F(Book_Reader, Chooses_The_Sheet_That_Was_Asked_For)
     const struct {
         const char *asked, *found;
         bool exact = true;
-    } cases[] = {
-        {"", "3"},
-        {"2", "Sheet2"},
-        {"3", "data"},
-        {"DATA", "data"},
-        {"data 2", "Data 2"},
-        {"sheet", "Sheet1", false},
-        {"6", ""},
-        {"Sheet22", "Sheet2", false},
-        {"3x", "3", false},
-        {"0", ""},
-        {"other", ""},
-    };
+    } cases[] = {{"", "3"},
+                 {"2", "Sheet2"},
+                 {"3", "data"},
+                 {"DATA", "data"},
+                 {"data 2", "Data 2"},
+                 {"sheet", "Sheet1", false},
+                 {"6", ""},
+                 {"Sheet22", "Sheet2", false},
+                 {"3x", "3", false},
+                 {"0", ""},
+                 {"other", ""}};
     for (const auto& [asked, found, exact] : cases) {
         request.Worksheet_Name = asked;
         request.Used_Sheet_Name.clear();

@@ -147,38 +147,25 @@ TEST_F(TSS_Columns, End_With_The_First_That_Does_Not_Fit)
         return Of(Make.Head(5, 2, 2), ways, 0, 0, "t", 0, "g", f, last);
     };
     const Items body = Make.Numbers(8, "1", two);
-    const std::vector<Items> fit = {vector(x),
-                                    numbers(22),
-                                    vector(Make.Numbers(4, "s", {})),
-                                    vector(Make.Texts(33, "s", {"a", ""}, 1)),
-                                    matrix(Make.Numbers(5, "2", two)),
-                                    table(2, body),
-                                    table(3, f)};
-    const std::vector<Items> end = {numbers(1),
-                                    numbers(5),
-                                    numbers(9),
-                                    vector(Make.Numbers(4, "s", {1.0, 2.0, 3.0})),
-                                    vector(Make.Numbers(4, "", two)),
-                                    vector(Make.Texts(3, "s", {"a", ""}, -1)),
-                                    factor(1, {1.0}, two),
-                                    factor(3, {}, two),
-                                    factor(0, {}, {1.0, 2.5}),
-                                    factor(0, {}, {1.0, 3.0}),
-                                    factor(0, {}, {M, 0.0}),
-                                    vector(Of(21, 2, 0, 0)),
-                                    matrix(Make.Numbers(-4, "2", two)),
-                                    matrix(Make.Numbers(5, "2", {1.0})),
-                                    matrix(Of(21, 2, 1, 0)),
-                                    table(2, f),
-                                    table(3, body),
-                                    table(4, body),
-                                    table(2, Make.Numbers(22, "1", two))};
-    for (const std::vector<Items>* const files : {&fit, &end})
-        for (const Items& items : *files) {
+    const auto text = [&](std::int32_t type, std::int32_t width) {
+        return vector(Make.Texts(type, "s", {"a", ""}, width));
+    };
+    const auto check = [](std::int32_t columns, const std::vector<Items>& files) {
+        for (const Items& items : files) {
             ASSERT_NE(Read(items), nullptr);
-            EXPECT_EQ(Current_Sheet->column_count, files == &fit ? 2 : 1) << &items - files->data();
+            EXPECT_EQ(Current_Sheet->column_count, columns) << &items - files.data();
             EXPECT_EQ(Current_Sheet->restriction_active, 0);
         }
+    };
+    check(2, {vector(x), numbers(22), vector(Make.Numbers(4, "s", {})), text(33, 1)});
+    check(2, {matrix(Make.Numbers(5, "2", two)), table(2, body), table(3, f)});
+    check(1, {numbers(1), numbers(5), numbers(9), text(3, -1), vector(Of(21, 2, 0, 0))});
+    check(1, {vector(Make.Numbers(4, "s", {1.0, 2.0, 3.0})), vector(Make.Numbers(4, "", two))});
+    check(1, {factor(1, {1.0}, two), factor(3, {}, two), factor(0, {}, {1.0, 2.5})});
+    check(1, {factor(0, {}, {1.0, 3.0}), factor(0, {}, {M, 0.0})});
+    check(1, {matrix(Make.Numbers(-4, "2", two)), matrix(Make.Numbers(5, "2", {1.0}))});
+    check(1, {matrix(Of(21, 2, 1, 0)), table(2, Make.Numbers(22, "1", two))});
+    check(1, {table(2, f), table(3, body), table(4, body)});
 }
 
 TEST_F(TSS_Columns, Have_Levels_And_Numbers_As_The_File_Tells)

@@ -187,8 +187,7 @@ TEST(DDE_Items, Are_Rewritten)
         {"", ""},
         {"abc1", "ABC1"},
         {":b2", "R0C0:R2C2"},
-        {"a99999999999999999999:b1", "R9223372036854775807C1:R1C2"},
-    };
+        {"a99999999999999999999:b1", "R9223372036854775807C1:R1C2"}};
     for (const auto& [item, rewritten] : cases)
         EXPECT_EQ(R1C1_Item(item), rewritten);
 }
