@@ -166,9 +166,9 @@ TEST_F(Book_Updater, Refuses_What_Is_No_Sound_Book)
     const std::string hidden = b.Book({sheet, b.Record(300, sheet)});
     const std::pair<std::string, std::string> cases[] = {
         {"no book", unlisted},
-        {with(good, 32, 33), unlisted},  // an offset into a record
-        {with(good, 36, 40), ""},        // a sheet that no entry points at
-        {b.Book({sheet, sheet.substr(0, 26)}).substr(0, 40 + sheet.size() + 27), unlisted},
+        {with(good, 32, 33), unlisted},                      // an offset into a record
+        {with(good, 36, 40), ""},                            // a sheet that no entry points at
+        {good.substr(0, 40 + sheet.size() + 28), unlisted},  // in front of a name
         {b.Head() + b.Record(1, b.Words({0, 40})) + b.Record(2), unlisted},
         {with(good, 40 + 29 + 2, -1), corrupt + "45\nat Record Number 4, Type 64, Length -1.\n" + unsaved},
         {b.Book({sheet}, "", b.Record(1, b.Words({0, 0}))),
