@@ -1,13 +1,12 @@
-// Reads a script as the host would, from its text alone, so that tests see what a Sheet has become.
+// Reads a script as the host would, from its text alone, so that tests see what it is told.
 #pragma once
 
 #include <string>
 
 namespace ingester {
 
-/// What the script leaves in the host, one line each: structures as "KIND name option=... attribute=...:
-/// values", with "|" between the values, and what else it does. Structures that only feed another one
-/// show there. The last line begins with "FAULT" when the host would stumble.
-[[nodiscard]] std::string Run_Script(const std::string& script);
+/// The script without comments and without the breaks that only its lines need; texts stand in their quotes
+/// as the host takes them. Behind "FAULT", why the host would stumble.
+[[nodiscard]] std::string Heard_Of(const std::string& script);
 
 }  // namespace ingester

@@ -1,205 +1,173 @@
-#include "hostfiles/tbk/book_sheets.h"
+#include "hostfiles/tbk/book_fixture.h"
 #include "support/text.h"
 
-#include <functional>
 #include <random>
 
 namespace ingester {
 namespace {
 
-const Book_Bytes Little;
+const Book_Bytes b;
 
-class Book_Reader : public Book_Test {
-protected:
-    /// What was read of a book, without the column of rows; or "-" and what was told.
-    [[nodiscard]] std::string Outcome(const std::string& bytes) const
-    {
-        const Sheet* const sheet = Read(bytes);
-        return (sheet == nullptr ? "-" : Render(sheet)) + Messages();
-    }
-};
+class Book_Reader : public Book_Test {};
 
-/// Offset, end and type of each record behind the head.
-struct Found_Record {
-    std::size_t at, end;
-    int type;
-};
-std::vector<Found_Record> Records_Of(const std::string& bytes)
+/// A book of one sheet with one column of one row, with these records.
+std::string One_Cell(int sheet, int column, const std::string& records, const std::string& in_front = {})
 {
-    std::vector<Found_Record> records;
-    for (std::size_t at = 12; at < bytes.size(); at = records.back().end)
-        records.push_back({at, at + 6 + Number_At<std::uint32_t>(bytes.data() + at + 2),
-                           Number_At<std::uint16_t>(bytes.data() + at)});
-    return records;
+    return b.Book({b.Sheet("S", sheet, 1, 1, in_front + b.Column(column, 1, "c", records))});
 }
 
-std::string Labels(const Book_Bytes& b, int levels, const std::string& label)
+/// A Factor's record of one cell and one level, and what stands behind it.
+std::string One_Level(const std::string& records)
 {
-    std::string body = b.Word(levels) + b.Byte(9);
-    for (int i = 0; i < levels; ++i)
-        body += b.Short(label);
-    return b.Record(98, body);
+    return One_Cell(1, 2, b.Record(96, b.Words({1, 1}) + "\0\1"s) + records);
 }
 
 TEST_F(Book_Reader, Tells_Why_A_Record_Is_Bad)
 {
-    const Book_Bytes& b = Little;
-    const auto factor = [&](const std::string& records) {
-        return b.Vector(
-            1, 2, b.Column(2, 2, "f", b.Record(96, b.Words({2, 2}) + std::string("\0\1", 2)) + records));
+    const std::string table = b.Record(20, "\2\0\0"s);
+    const std::string no_units = "Illegal column type found in Matrix sheet";
+    const std::string matrix = b.Column(5, 1, "a", "");
+    const auto two_rows = [](int type, int record, const std::string& payload) {
+        return b.Vector(1, 2, b.Column(type, 2, "c", b.Record(record, payload)));
     };
-    const auto typed = [&](int sheet, int column) {
-        return b.Book({b.Sheet("S", sheet, 1, 1,
-                               (sheet == 5 ? b.Record(20, std::string("\2\0\0", 3)) : "")
-                                   + b.Column(column, 1, "c", ""))});
-    };
-    const std::string none;
-    const struct {
-        std::string bytes;
-        const char* fault;
-    } cases[] = {
-        {b.Book({b.Sheet("S", 7, 0, 1, none)}), "Invalid sheet type in reading Tabulon book"},
-        {typed(1, 0), "Invalid Column Type in Reading Tabulon Book"},
-        {typed(1, -2), "Invalid Column Type in Reading Tabulon Book"},
-        {typed(1, 9), "Invalid Column Type in Reading Tabulon Book"},
-        {typed(1, 21), "Invalid Column Type in Reading Tabulon Book"},
-        {typed(1, 5), "Illegal column type found in Vector sheet"},
-        {typed(2, 4), "Illegal column type found in Matrix sheet"},
-        {b.Book(
-             {b.Sheet("S", 2, 3, 1,
-                      b.Column(5, 1, "a", none) + b.Column(5, 1, "b", none) + b.Column(-4, 1, "c", none))}),
-         "Illegal column type found in Matrix sheet"},
-        {typed(3, 5), "Illegal column type found in Symmetric Matrix sheet"},
-        {typed(4, 7), "Illegal column type found in Diagonal Matrix sheet"},
-        {typed(5, 4), "Illegal column type found in Table sheet"},
-        {typed(6, 4), "Non-Scalar column found in Scalar sheet"},
+    const std::pair<std::string, std::string> cases[] = {
+        {b.Book({b.Sheet("S", 7, 0, 1, "")}), "Invalid sheet type in reading Tabulon book"},
+        {One_Cell(1, 0, ""), "Invalid Column Type in Reading Tabulon Book"},
+        {One_Cell(1, -2, ""), "Invalid Column Type in Reading Tabulon Book"},
+        {One_Cell(1, 9, ""), "Invalid Column Type in Reading Tabulon Book"},
+        {One_Cell(1, 21, ""), "Invalid Column Type in Reading Tabulon Book"},
+        {One_Cell(1, 5, ""), "Illegal column type found in Vector sheet"},
+        {One_Cell(2, 4, ""), no_units},
+        {b.Book({b.Sheet("S", 2, 3, 1, matrix + matrix + b.Column(-4, 1, "c", ""))}), no_units},
+        {One_Cell(3, 5, ""), "Illegal column type found in Symmetric Matrix sheet"},
+        {One_Cell(4, 7, ""), "Illegal column type found in Diagonal Matrix sheet"},
+        {One_Cell(5, 4, "", table), "Illegal column type found in Table sheet"},
+        {One_Cell(6, 4, ""), "Non-Scalar column found in Scalar sheet"},
         {b.Vector(1, 2, b.Variate(3, "x")), "Invalid number of rows in column"},
-        {b.Vector(1, 2, b.Record(34, b.Short("r") + b.Word(3) + "\1")),
-         "Restriction does not match sheet length"},
-        {b.Vector(1, 2, b.Column(3, 2, "t", b.Record(82, b.Word(1) + "\1\1a"))),
-         "Text items do not match specified number of rows"},
-        {b.Vector(1, 2, b.Column(33, 2, "t", b.Record(83, b.Words({1, 1}) + b.Long("a")))),
-         "Text items do not match specified number of rows"},
-        {b.Vector(1, 1, b.Column(33, 1, "t", b.Record(83, b.Words({1, 1, -1})))), "Text length is negative"},
-        {b.Vector(1, 2, b.Column(2, 2, "f", b.Record(96, b.Words({1, 2}) + std::string("\0\1", 2)))),
-         "Factor length does not match specified column length"},
-        {b.Vector(1, 2, b.Column(2, 2, "f", b.Record(96, b.Words({2, 0}) + std::string("\0\1", 2)))),
-         "Number of Factor levels are not positive"},
-        {factor(b.Record(97, b.Word(1) + "\1" + b.Reals({1}))),
+        {b.Vector(1, 2, b.Record(34, "\1r" + b.Word(3) + "\1")), "Restriction does not match sheet length"},
+        {two_rows(3, 82, b.Word(1) + "\1\1a"), "Text items do not match specified number of rows"},
+        {two_rows(33, 83, b.Words({1, 1}) + b.Long("a")), "Text items do not match specified number of rows"},
+        {One_Cell(1, 33, b.Record(83, b.Words({1, 1, -1}))), "Text length is negative"},
+        {two_rows(2, 96, b.Words({1, 2}) + "\0\1"s), "Factor length does not match specified column length"},
+        {two_rows(2, 96, b.Words({2, 0}) + "\0\1"s), "Number of Factor levels are not positive"},
+        {One_Level(b.Record(97, b.Word(2) + "\1" + b.Reals({1, 2}))),
          "Factor levels do not match specified number of ordinals"},
-        {factor(Labels(b, 3, "a")), "Factor labels do not match specified number of ordinals"},
-        {factor(b.Record(120, b.Words({0}))), "Invalid number of coloured cells in column"},
-        {factor(b.Record(120, b.Words({3, 1, 0, 0, 2, 0, 0, 3, 0, 0}))),
+        {One_Level(b.Record(98, b.Word(2) + "\1\1a\1b")),
+         "Factor labels do not match specified number of ordinals"},
+        {One_Level(b.Record(120, b.Words({0}))), "Invalid number of coloured cells in column"},
+        {One_Level(b.Record(120, b.Words({2, 1, 0, 0, 2, 0, 0}))),
          "Invalid number of coloured cells in column"},
     };
     for (const auto& [bytes, fault] : cases) {
-        EXPECT_EQ(Read(bytes), nullptr) << fault;
-        EXPECT_TRUE(Messages().ends_with(std::string("\nFault: ") + fault + ".\n:\n")) << fault;
+        const std::string told = Outcome(bytes);
+        EXPECT_TRUE(told.starts_with("-") && told.ends_with("\nFault: " + fault + ".\n:\n")) << fault << told;
     }
+    const std::string sheet = b.Sheet("S", 1, 1, 1, b.Variate(1, "x"));
+    const std::string start = b.Record(1, b.Words({1, 0}));
+    const std::string out_of_place[] = {
+        b.Head() + b.Record(2),
+        b.Head() + b.Record(3),
+        b.Head() + sheet,
+        b.Head() + start + start,
+        b.Head() + start + b.Record(129),
+        b.Head() + start + b.Record(128) + b.Record(128),
+        b.Head() + start + b.Record(8, std::string(20, '\0')),
+        b.Vector(1, 1, b.Record(64, "\4" + b.Word(1) + "\1x" + std::string(7, '\1'))),
+        One_Cell(1, 4, b.Numbers({1}) + b.Numbers({1})),
+        One_Cell(1, 4, b.Record(99, b.Word(1))),
+        One_Cell(1, 3, b.Record(66, "\1")),
+        One_Cell(1, 3, b.Record(112, "\1" + b.Long("a"))),
+        b.Vector(1, 1, b.Record(22, "\1a") + b.Variate(1, "x")),
+        b.Vector(1, 1, sheet),
+        b.Vector(1, 1, b.Record(2)),
+        // What is out of its range.
+        b.Vector(1, 1, b.Record(37, "\3")),
+        b.Vector(1, 1, b.Record(26, "\10\1a")),
+        b.Vector(1, 1, b.Record(19, "\1a\3")),
+        One_Cell(1, 4, b.Record(66, "\23")),
+        One_Cell(1, 4, b.Record(121, "\3")),
+        One_Cell(1, 4, b.Record(112, "\3" + b.Long("a"))),
+        One_Cell(1, 2, b.Record(96, b.Words({1, 1}) + "\3\1")),
+    };
+    for (const std::string& bytes : out_of_place)
+        EXPECT_TRUE(Outcome(bytes).starts_with("-Corrupt record found")) << &bytes - out_of_place;
 }
 
 TEST_F(Book_Reader, Tells_What_Is_Wrong_In_Full)
 {
-    const Book_Bytes& b = Little;
     const std::string book = b.Vector(1, 2, b.Variate(2, "x"));
-    const std::string other_mark = std::string(book).replace(8, 2, "\2\0", 2);
     const std::string corrupt = "-Corrupt record found in Tabulon Book:\nb.tbk at Offset ";
     const std::string incomplete = "-End of File found too soon in b.tbk\nTabulon Book file is incomplete\n"
                                    "Last read record at Offset ";
     const std::string not_loaded = "-Tabulon Book b.tbk couldn't be completely loaded:\n";
-    const struct {
-        const char* what;
-        std::string bytes, told;
-    } cases[] = {
-        {"no book", "TBK", "-b.tbk is not a valid Tabulon Book.\n:\n"},
-        {"order mark", other_mark, "-b.tbk is not a valid Tabulon Book.\n:\n"},
-        {"type 0", b.Head() + b.Record(0), corrupt + "C\nat Record Number 1, Type 0, Length 0\n:\n"},
-        {"a negative type", b.Head() + b.Record(0x8001),
-         corrupt + "C\nat Record Number 1, Type -32767, Length 0\n:\n"},
-        {"a negative length", b.Head() + b.Record_Head(4, -8),
-         corrupt + "C\nat Record Number 1, Type 4, Length -8\n:\n"},
-        {"with a fault", b.Book({b.Sheet("", 7, 0, 0, "")}),
+    const auto soft = [](const char* fault) {
+        return Format_Text("Text limits were exceeded in b.tbk:\nFault: %s.\n:\n", fault);
+    };
+    const auto text = [](const std::string& cell, int widest) {
+        return b.Column(3, 1, "t", b.Record(82, b.Word(1) + b.Byte(widest) + b.Short(cell)));
+    };
+    const auto long_text = [](const std::string& cell, int widest) {
+        return One_Cell(1, 33, b.Record(83, b.Words({1, widest}) + b.Long(cell)));
+    };
+    const std::pair<std::string, std::string> cases[] = {
+        {"TBK", "-b.tbk is not a valid Tabulon Book.\n:\n"},
+        {std::string(book).replace(8, 2, "\2\0"s), "-b.tbk is not a valid Tabulon Book.\n:\n"},
+        {b.Head() + b.Record(0), corrupt + "C\nat Record Number 1, Type 0, Length 0\n:\n"},
+        {b.Head() + b.Record(0x8001), corrupt + "C\nat Record Number 1, Type -32767, Length 0\n:\n"},
+        {b.Head() + b.Record_Head(4, -8), corrupt + "C\nat Record Number 1, Type 4, Length -8\n:\n"},
+        {b.Book({b.Sheet("", 7, 0, 0, "")}),
          corrupt
              + "24\nat Record Number 3, Type 16, Length 22\nFault: Invalid sheet type in reading Tabulon "
                "book.\n:\n"},
-        {"nothing", b.Head(), incomplete + "0, Record Number 0, Type 0, Length 0.\n:\n"},
-        {"half of a record", book.substr(0, book.size() - 7),
-         incomplete + "6F, Record Number 6, Type 65, Length 0.\n:\n"},
-        {"rows for nothing", b.Vector(1, 2000000000, b.Column(4, 2000000000, "x", "")),
+        {b.Head(), incomplete + "0, Record Number 0, Type 0, Length 0.\n:\n"},
+        {book.substr(0, book.size() - 7), incomplete + "6F, Record Number 6, Type 65, Length 0.\n:\n"},
+        {b.Vector(1, 2000000000, b.Column(4, 2000000000, "x", "")),
          not_loaded + "Could not create column in Reading Tabulon Book\n:\n"},
-        {"unknown records", b.Vector(1, 2, b.Record(124, "\1a") + b.Variate(2, "x") + b.Record(200)),
+        {b.Vector(1, 2, b.Record(124, "\1a") + b.Variate(2, "x") + b.Record(200)),
          "x V1|2Unknown Record type 124 ignored in Tabulon Book:\n b.tbk.\n(record number 4, length 2, at "
-         "offset 65)\n"
-         "This is probably due to reading a TBK file\nproduced by a newer version of Tabulon.\n:\n"},
-        {"a book without sheets", b.Book({}), "-"},
+         "offset 65)\nThis is probably due to reading a TBK file\nproduced by a newer version of Tabulon.\n"
+         ":\n"},
+        {b.Vector(1, 1, text(std::string(91, 'x'), 91)), "t T90 characters" + soft("Text column truncated")},
+        {b.Vector(2, 1, text("xx", 1) + text(std::string(91, 'x'), 91)),
+         "t Txx; t_1 T90 characters" + soft("Text column length exceeds specified maximum")},
+        {long_text(std::string(10001, 'x'), 10001),
+         "c L10000 characters" + soft("Text column truncated at 10000 characters")},
+        {long_text("xx", 1), "c Lxx" + soft("Text column length exceeds specified maximum for column")},
+        {One_Level(b.Record(98, b.Word(1) + "\1" + b.Short(std::string(251, 'y')))),
+         "c F1" + soft("Factor labels truncated")},
+        {One_Cell(1, 4, b.Record(113, b.Short(std::string(81, 'e')))),
+         "c V*" + soft("Column extra truncated")},
+        {One_Cell(1, 4, "", b.Record(36, "\1\1\1")),
+         "c V*" + soft("Hidden column array does not match number of columns in sheet")},
     };
-    for (const auto& [what, bytes, told] : cases) {
-        if (bytes == b.Book({})) {
-            Input_File file(std::as_bytes(std::span(bytes)));
-            EXPECT_TRUE(Read_TBK(file) && Current_Sheet == nullptr) << what;
-            continue;
-        }
-        EXPECT_EQ(Outcome(bytes), told) << what;
-    }
+    for (const auto& [bytes, told] : cases)
+        EXPECT_EQ(Outcome(bytes), told);
+    const std::string empty = b.Book({});
+    Input_File file(std::as_bytes(std::span(empty)));
+    EXPECT_TRUE(Read_TBK(file) && Current_Sheet == nullptr) << "a book without sheets";
     request.Max_Columns = 1;
-    EXPECT_EQ(
-        Outcome(b.Vector(2, 1, b.Variate(1, "x") + b.Variate(1, "y"))),
-        not_loaded
-            + "Maximum number of columns (1) exceeded.\nIncrease the column limit in Tools | Spreadsheet "
-              "Options\n:\n");
+    EXPECT_EQ(Outcome(b.Vector(2, 1, b.Variate(1, "x") + b.Variate(1, "y"))),
+              not_loaded
+                  + "Maximum number of columns (1) exceeded.\nIncrease the column limit in Tools | "
+                    "Spreadsheet Options\n:\n");
     EXPECT_FALSE(Read_TBK_File("none.tbk"));
     EXPECT_EQ(Messages(), "Tabulon Book file none.tbk not found.\n:\n");
 }
 
-TEST_F(Book_Reader, Reports_Soft_Faults_Once_And_Keeps_What_Fits)
-{
-    const Book_Bytes& b = Little;
-    const auto text = [&](int length, int widest) {
-        return b.Column(3, 1, "t",
-                        b.Record(82, b.Word(1) + b.Byte(widest) + b.Short(std::string(length, 'x'))));
-    };
-    const auto long_text = [&](int length, int widest) {
-        return b.Column(33, 1, "t", b.Record(83, b.Words({1, widest}) + b.Long(std::string(length, 'x'))));
-    };
-    const struct {
-        std::string body, kept;
-        const char* fault;
-    } cases[] = {
-        {text(91, 91), "t T90 characters", "Text column truncated"},
-        {text(5, 4), "t Txxxxx", "Text column length exceeds specified maximum"},
-        {long_text(10001, 10001), "t L10000 characters", "Text column truncated at 10000 characters"},
-        {long_text(3, 2), "t Lxxx", "Text column length exceeds specified maximum for column"},
-        {text(5, 4) + text(91, 91), "t Txxxxx; t_1 T90 characters",
-         "Text column length exceeds specified maximum"},
-        {b.Column(2, 1, "f",
-                  b.Record(96, b.Words({1, 1}) + std::string("\2\1", 2))
-                      + Labels(b, 1, std::string(251, 'y'))),
-         "f F1", "Factor labels truncated"},
-        {b.Column(4, 1, "x", b.Record(113, b.Short(std::string(81, 'e')))), "x V*", "Column extra truncated"},
-        {b.Record(36, "\1\1\1") + b.Variate(1, "x"), "x V1",
-         "Hidden column array does not match number of columns in sheet"},
-    };
-    for (const auto& [body, kept, fault] : cases)
-        EXPECT_EQ(Outcome(b.Vector(1, 1, body)),
-                  kept + "Text limits were exceeded in b.tbk:\nFault: " + fault + ".\n:\n");
-}
-
 TEST_F(Book_Reader, Reads_Records_That_Are_No_Longer_Written)
 {
-    const Book_Bytes& b = Little;
     const std::string old = b.Record(4, std::string(8, 'x')) + b.Record(5, std::string(8, 'x'))
                             + b.Record(6, std::string(4, 'x')) + b.Record(7) + b.Record(10) + b.Record(11)
                             + b.Record(12, "\3");
-    const std::string factor =
-        b.Record(8, b.Short("old") + std::string("\0\2", 2) + b.Short("kind of") + b.Short("told") + "xx"
-                        + b.Words({2, 2, 2}) + "\1\3" + b.Reals({1, 2}) + "\5" + b.Short("a") + b.Short("b"));
+    const std::string factor = b.Record(8, "\3old\0\2\7kind of\4toldxx"s + b.Words({2, 2, 2}) + "\1\3"
+                                               + b.Reals({1, 2}) + "\5\1a\1b");
     const std::string sheet =
         b.Record(9) + b.Record(38)
-        + b.Record(28, b.Long("t") + b.Long("s") + b.Long("i") + b.Long("e") + std::string("\1\2\3\4\5"))
-        + b.Column(4, 3, "x", b.Record(81, b.Word(3) + b.Reals({2, 3, 1.5})) + factor)
+        + b.Record(28, b.Long("t") + b.Long("s") + b.Long("i") + b.Long("e") + "\1\2\3\4\5")
+        + b.Column(4, 3, "x", b.Numbers({2, 3, 1.5}) + factor)
         + b.Column(3, 3, "t", b.Record(82, b.Word(3) + "\1\1a\1b\1c"));
-    const auto comment = [&](int row, int column, const std::string& text) {
-        return b.Record(130, b.Words({0, row, column}) + std::string(8, 'x') + b.Words({1}) + b.Long(text));
+    const auto comment = [](int row, int column, const std::string& text) {
+        return b.Record(130, b.Words({0, row, column, 0, 0, 1}) + b.Long(text));
     };
     const std::string comments = b.Record(128) + b.Record(130, std::string(24, '\0'))
                                  + comment(2, 2, "*Missing") + comment(1, 1, "*M") + comment(3, 2, "no")
@@ -220,88 +188,94 @@ TEST_F(Book_Reader, Reads_Records_That_Are_No_Longer_Written)
 
 TEST_F(Book_Reader, Settles_What_A_Record_Leaves_Open)
 {
-    const Book_Bytes& b = Little;
-    const auto facts = [&](std::string display) {  // format, width, justify, date, form, protection, flag
-        display.resize(7);
-        return b.Vector(1, 1,
-                        b.Record(64, b.Byte(4) + b.Word(1) + b.Short("x") + display)
-                            + b.Record(81, b.Word(1) + b.Reals({1})) + b.Record(65));
-    };
     const struct {
-        const char* display;
+        std::string display;  ///< format, width, justify, date, form, protection, flag
         std::int32_t format, width, justify, date;
-    } cases[] = {{"\3\120\2\50", 3, 80, 2, 40},
-                 {"\6\121\4\51", 1, 80, 0, 9},
-                 {"\5\1\3\1", 5, 2, 3, 1},
-                 {"\2", 2, 13, 0, 0}};
-    for (const auto& [display, format, width, justify, date] : cases) {
-        const Sheet* const sheet = Read(facts(display));
-        ASSERT_NE(sheet, nullptr);
-        const Column& column = *sheet->first_column->next;
+    } displays[] = {{"\3\120\2\50\0\0\0"s, 3, 80, 2, 40},
+                    {"\6\121\4\51\0\0\0"s, 1, 80, 0, 9},
+                    {"\5\1\3\1\0\0\0"s, 5, 2, 3, 1},
+                    {"\2\0\0\0\0\0\0"s, 2, 13, 0, 0}};
+    for (const auto& [display, format, width, justify, date] : displays) {
+        ASSERT_NE(Read(b.Vector(1, 1, b.Column(4, 1, "x", b.Numbers({1}), display))), nullptr);
+        const Column& column = *Current_Sheet->last_column;
         EXPECT_EQ((std::array{column.format, column.width, column.justify, column.date_format}),
                   (std::array{format, width, justify, date}));
     }
-    // A smaller packing than the levels need is no more than they allow; a larger one is read.
-    const auto factor = [&](int levels, const std::string& codes) {
-        return b.Vector(
-            1, 3, b.Column(2, 3, "f", b.Record(96, b.Words({3, levels}) + std::string("\0", 1) + codes)));
+    const auto factor = [](int levels, const std::string& codes) {
+        return b.Vector(1, 3, b.Column(2, 3, "f", b.Record(96, b.Words({3, levels}) + "\0"s + codes)));
     };
-    EXPECT_EQ(Outcome(factor(3, std::string("\x39", 1))), "f F1|2|3");
-    EXPECT_EQ(Outcome(factor(3, std::string("\x21\3", 2))), "f F1|2|3");
-    EXPECT_EQ(Outcome(factor(3, std::string("\1\0\4", 3))), "f F1|*|*");
-    EXPECT_EQ(Outcome(factor(200, std::string("\1\0\xC8", 3))), "f F1|*|200");
-    EXPECT_TRUE(Outcome(factor(200, std::string("\1\0", 2))).starts_with("-Corrupt"));
-    // Levels by name; a full Symmetric Matrix; numbers that stay as they stand.
-    const std::string shape = b.Record(20, std::string("\2\0\0", 3)) + b.Record(19, b.Short("t") + "\1");
-    const auto body = [&](const std::string& name) {
-        return b.Column(8, 1, name, b.Record(81, b.Word(1) + b.Reals({-1e306})));
+    const auto table = [](const char* name) {
+        return b.Book({b.Sheet("S", 5, 1, 1,
+                               b.Record(20, "\2\0\0"s) + b.Record(19, "\1t\1")
+                                   + b.Column(8, 1, name, b.Numbers({-1e306})))});
     };
-    ASSERT_EQ(Outcome(b.Book({b.Sheet("S", 5, 3, 1, shape + body("7.5") + body("x"))})),
-              "7.5 T-1e+306; x T-1e+306");
-    EXPECT_EQ(Column_At(Current_Sheet, 1)->table_margin_value, 7.5);
-    EXPECT_EQ(Column_At(Current_Sheet, 2)->table_margin_value, 2);
-    const auto full = [&](const char* name, double x, double y) {
-        return b.Column(7, 2, name, b.Record(81, b.Word(2) + b.Reals({x, y})));
+    const auto full = [](const char* name, double x, double y) {
+        return b.Column(7, 2, name, b.Numbers({x, y}));
     };
-    EXPECT_EQ(Outcome(b.Book({b.Sheet("S", 3, 2, 2, full("", 1, 2) + full("", 3, 4))})), "1 S1|2; 2 S4");
+    const std::pair<std::string, std::string> cases[] = {
+        // A smaller packing than the levels need is no more than they allow; a larger one is read.
+        {factor(3, "\x39"), "f F1|2|3"},
+        {factor(3, "\x21\3"), "f F1|2|3"},
+        {factor(3, "\1\0\4"s), "f F1|*|*"},
+        {factor(200, "\1\0\xC8"s), "f F1|*|200"},
+        // Levels by name; a full Symmetric Matrix; numbers that stay as they stand.
+        {table("7.5"), "7.5 T-1e+306"},
+        {table("x"), "x T-1e+306"},
+        {b.Book({b.Sheet("S", 3, 2, 2, full("", 1, 2) + full("", 3, 4))}), "1 S1|2; 2 S4"},
+    };
+    for (const auto& [bytes, cells] : cases) {
+        EXPECT_EQ(Outcome(bytes), cells);
+        EXPECT_TRUE(cells[0] != '7' || Current_Sheet->last_column->table_margin_value == 7.5);
+        EXPECT_TRUE(cells[0] != 'x' || Current_Sheet->last_column->table_margin_value == 1);
+    }
+    EXPECT_TRUE(Outcome(factor(200, "\1\0"s)).starts_with("-Corrupt"));
+    const Book_Bytes big{std::endian::big};
+    EXPECT_EQ(Outcome(big.Vector(
+                  1, 2, big.Column(2, 2, "f", big.Record(96, big.Words({2, 300}) + "\0\1\54\1\55"s)))),
+              "f F300|*");
+    EXPECT_EQ(
+        Outcome(big.Vector(
+            1, 2,
+            big.Column(2, 2, "f", big.Record(96, big.Words({2, 70000}) + "\0"s + big.Words({70000, -1}))))),
+        "f F70000|*");
 }
 
 TEST_F(Book_Reader, Chooses_The_Sheet_That_Was_Asked_For)
 {
-    const Book_Bytes& b = Little;
-    std::vector<std::string> sheets;
+    Texts sheets;
     for (const char* const name : {"Sheet1", "Sheet2", "data", "Data 2", "3"})
         sheets.push_back(b.Sheet(name, 1, 1, 1, b.Variate(1, name)));
     const std::string book = b.Book(sheets);
-    const std::string warning = "Warning: inexact match on sheet name: '";
     const struct {
-        const char* asked;
-        const char* found;
-        std::string told;
-    } cases[] = {
-        {"", "3", ""},
-        {"2", "Sheet2", ""},
-        {"3", "data", ""},
-        {"DATA", "data", ""},
-        {"data 2", "Data 2", ""},
-        {"sheet", "Sheet1", warning + "Sheet1' selected for 'sheet'.\n:\n"},
-        {"Sheet22", "Sheet2", warning + "Sheet2' selected for 'Sheet22'.\n:\n"},
-        {"3x", "3", warning + "3' selected for '3x'.\n:\n"},
-        {"6", "", "Specifed sheet name 6 not found in Tabulon TBK file.\n:\n"},
-        {"0", "", "Specifed sheet name 0 not found in Tabulon TBK file.\n:\n"},
-        {"other", "", "Specifed sheet name other not found in Tabulon TBK file.\n:\n"},
-    };
-    for (const auto& [asked, found, told] : cases) {
+        const char *asked, *found;
+        bool exact = true;
+    } cases[] = {{"", "3"},
+                 {"2", "Sheet2"},
+                 {"3", "data"},
+                 {"DATA", "data"},
+                 {"data 2", "Data 2"},
+                 {"sheet", "Sheet1", false},
+                 {"6", ""},
+                 {"Sheet22", "Sheet2", false},
+                 {"3x", "3", false},
+                 {"0", ""},
+                 {"other", ""}};
+    for (const auto& [asked, found, exact] : cases) {
         request.Worksheet_Name = asked;
         request.Used_Sheet_Name.clear();
         const Sheet* const sheet = Read(book);
         EXPECT_EQ(sheet == nullptr ? "" : sheet->sheet_name.view(), found) << asked;
         EXPECT_EQ(request.Used_Sheet_Name, found) << asked;
-        EXPECT_EQ(Messages(), told) << asked;
+        EXPECT_EQ(Messages(),
+                  !exact ? Format_Text("Warning: inexact match on sheet name: '%s' selected for '%s'.\n:\n",
+                                       found, asked)
+                  : *found == '\0'
+                      ? Format_Text("Specifed sheet name %s not found in Tabulon TBK file.\n:\n", asked)
+                      : "");
     }
     request.Worksheet_Name = "1";
-    EXPECT_EQ(Read(b.Head() + b.Record(1, b.Words({0, 0})) + b.Record(2)), nullptr);
-    EXPECT_EQ(Messages(), "Specifed sheet name 1 not found in Tabulon TBK file.\n:\n");
+    EXPECT_EQ(Outcome(b.Head() + b.Record(1, b.Words({0, 0})) + b.Record(2)),
+              "-Specifed sheet name 1 not found in Tabulon TBK file.\n:\n");
     request.List_Sheets_Only = true;
     EXPECT_EQ(Outcome(book), "Worksheets TSheet1|Sheet2|data|Data 2|3");
     EXPECT_EQ(Outcome("no book"), "-Unable to get Pagenames from Tabulon Book file b.tbk.\n:\n");
@@ -309,42 +283,40 @@ TEST_F(Book_Reader, Chooses_The_Sheet_That_Was_Asked_For)
 
 TEST_F(Book_Reader, Leaves_Out_Columns_And_Rows)
 {
-    const std::string bytes = Written(Full_Vector());
+    const std::string bytes = Full_Vector(b).bytes;
     request.Subset_Columns = true;
     request.Subset_Names = {"T", "v", "t"};
     request.Subset_Rows = true;
-    request.Subset_Row_Flags = {1, 0, 1, 1, 0, 0, 0, 0, 1};
+    request.Subset_Row_Flags = {1, 0, 1, 1, 0, 0, 0, 0, 0, 1};
     EXPECT_EQ(Outcome(bytes), "v V1|*|1e+300; t Ta|c|90 characters");
-    EXPECT_EQ(Current_Sheet->saved_restrictions[0].bits, std::string("\3"));
-    const std::vector<Cell_Colour>& colours = Column_At(Current_Sheet, 1)->cell_colours;
-    ASSERT_EQ(colours.size(), 2U);
-    EXPECT_EQ(colours[0].row, 1);
-    EXPECT_EQ(colours[1].row, 2);
-    EXPECT_EQ(colours[1].back_colour, 0xFFFFFF);
-    EXPECT_EQ(Column_At(Current_Sheet, 1)->colour_source, nullptr) << "the Factor is gone";
+    EXPECT_EQ(Current_Sheet->saved_restrictions[0].bits, "\3");
+    const Column& variate = *Column_At(Current_Sheet, 1);
+    ASSERT_EQ(variate.cell_colours.size(), 2U);
+    EXPECT_EQ(variate.cell_colours[0].row, 1);
+    EXPECT_EQ(variate.cell_colours[1].row, 2);
+    EXPECT_EQ(variate.cell_colours[1].back_colour, 0xFFFFFF);
+    EXPECT_EQ(variate.colour_source, nullptr) << "the Factor is gone";
     request.Subset_Names = {"none"};
     EXPECT_EQ(Outcome(bytes), "-") << "the pipeline tells";
     request.Subset_Columns = false;
     request.Subset_Row_Flags = {0, 0};
     EXPECT_EQ(Outcome(bytes), "-");
     request.Subset_Row_Flags = {1, 0, 1};
-    EXPECT_EQ(Outcome(Written(Full_Matrix(3))), "u Up|r; m S1|3; c S4");
+    EXPECT_EQ(Outcome(Full_Matrix(b, 3).bytes), "u Up|r; a S1|3; c S6");
 }
 
 TEST_F(Book_Reader, Reads_One_Sheet_Of_Many_And_No_More)
 {
-    const Book_Bytes& b = Little;
     constexpr int rows = 2000;
-    std::vector<std::string> sheets;
+    Texts sheets;
     for (int i = 0; i < 500; ++i)
         sheets.push_back(b.Sheet("page " + std::to_string(i), 1, 1, rows, b.Variate(rows, "x")));
     Put("many.tbk", b.Book(sheets));
     const auto bytes_read = [&] {
-        const std::string counts = [] {
-            std::ifstream file("/proc/self/io");
-            return std::string(std::istreambuf_iterator<char>(file), {});
-        }();
-        return std::stol(counts.substr(counts.find("rchar: ") + 7));
+        std::ifstream file("/proc/self/io");
+        long count = 0;
+        file.ignore(7) >> count;  // "rchar: "
+        return count;
     };
     for (const auto& [asked, most] : {std::pair("page 250", 500L * 300), std::pair("251", 2000L)}) {
         request.Worksheet_Name = asked;
@@ -357,78 +329,39 @@ TEST_F(Book_Reader, Reads_One_Sheet_Of_Many_And_No_More)
     }
 }
 
-// --- Hostile books -----------------------------------------------------------------------------------
-
-TEST_F(Book_Reader, Refuses_Every_Record_Of_A_Wrong_Length)
+TEST_F(Book_Reader, Refuses_Every_Record_Of_A_Wrong_Length_Or_Place)
 {
-    const std::string loose = " 13 17 65 ";  // not read
-    for (Sheet* const sheet : {Full_Vector(), Full_Table(3)}) {
-        sheet->source_file = "in.csv";
-        const std::string bytes = Written(sheet);
-        for (const Found_Record& record : Records_Of(bytes)) {
-            const auto length = static_cast<std::int32_t>(record.end - record.at - 6);
-            if (loose.find(Format_Text(" %i ", record.type)) != std::string::npos)
-                continue;
-            std::string longer = bytes;
-            longer.insert(record.end, "\1");
-            Put_Number<std::int32_t>(longer.data() + record.at + 2, length + 1);
-            const bool may_have_one_more = record.type == 23 || record.type == 36 /* a soft fault */
-                                           || (record.type == 96 && sheet->type == table_sheet);
-            EXPECT_EQ(Read(longer) != nullptr, may_have_one_more) << record.type;
+    for (const Whole_Book& whole : {Full_Vector(b), Full_Table(b, 3)}) {
+        for (std::size_t at = 12, end; at < whole.bytes.size(); at = end) {
+            const int type = Number_At<std::uint16_t>(whole.bytes.data() + at);
+            const auto length = Number_At<std::int32_t>(whole.bytes.data() + at + 2);
+            end = at + 6 + static_cast<std::size_t>(length);
+            if (type >= 17) {
+                const std::string record = whole.bytes.substr(at, end - at);
+                EXPECT_EQ(Read(b.Head() + b.Record(1, b.Words({1, 0})) + record), nullptr) << type;
+                EXPECT_TRUE(type < 66 || Read(b.Vector(1, 1, record)) == nullptr) << type;
+            }
+            if (type == 17 || type == 65)
+                continue;  // what they hold is not read
+            std::string other = whole.bytes;
+            other.insert(end, "\1");
+            Put_Number<std::int32_t>(other.data() + at + 2, length + 1);
+            const bool may_have_one_more = type == 23 || type == 36 /* a soft fault */
+                                           || (type == 96 && Full_Table(b, 3).bytes == whole.bytes);
+            EXPECT_EQ(Read(other) != nullptr, may_have_one_more) << type;
             if (length == 0)
                 continue;
-            std::string shorter = bytes;
-            shorter.erase(record.end - 1, 1);
-            Put_Number<std::int32_t>(shorter.data() + record.at + 2, length - 1);
-            const bool may_lack_one = record.type == 36 || record.type == 21;
-            EXPECT_EQ(Read(shorter) != nullptr, may_lack_one) << record.type;
+            other.erase(end - 1, 2);
+            Put_Number<std::int32_t>(other.data() + at + 2, length - 1);
+            EXPECT_EQ(Read(other) != nullptr, type == 36 || type == 21) << type;
         }
     }
 }
 
-TEST_F(Book_Reader, Refuses_Records_Out_Of_Their_Place)
-{
-    const Book_Bytes& b = Little;
-    const std::string sheet = b.Sheet("S", 1, 1, 1, b.Variate(1, "x"));
-    const std::string cells = b.Record(81, b.Word(1) + b.Reals({1}));
-    const std::string start = b.Record(1, b.Words({1, 0}));
-    const std::string bodies[] = {
-        b.Record(2),
-        b.Record(3),
-        sheet,
-        start + start,
-        start + b.Record(17),
-        start + b.Record(65),
-        start + cells,
-        start + b.Record(25, b.Words({1, 1})),
-        start + b.Record(129),
-        start + b.Record(128) + b.Record(128),
-        start + b.Record(8, std::string(20, '\0')),
-        b.Vector(1, 1, b.Record(64, b.Byte(4) + b.Word(1) + b.Short("x") + std::string(7, '\1'))).substr(12),
-        b.Vector(1, 1, b.Column(4, 1, "x", cells + cells)).substr(12),
-        b.Vector(1, 1, b.Column(4, 1, "x", b.Record(99, b.Word(1)))).substr(12),
-        b.Vector(1, 1, b.Column(3, 1, "x", b.Record(66, "\1"))).substr(12),
-        b.Vector(1, 1, b.Column(3, 1, "x", b.Record(112, b.Byte(1) + b.Long("a")))).substr(12),
-        b.Vector(1, 1, b.Record(22, "\1a") + b.Variate(1, "x")).substr(12),
-        b.Vector(1, 1, sheet).substr(12),
-        b.Vector(1, 1, b.Record(2)).substr(12),
-        b.Vector(1, 1, b.Record(37, "\3")).substr(12),
-        b.Vector(1, 1, b.Record(26, "\10\1a")).substr(12),
-        b.Vector(1, 1, b.Record(19, "\1a\3")).substr(12),
-        b.Vector(1, 1, b.Column(4, 1, "x", b.Record(66, "\23"))).substr(12),
-        b.Vector(1, 1, b.Column(4, 1, "x", b.Record(121, "\3"))).substr(12),
-        b.Vector(1, 1, b.Column(4, 1, "x", b.Record(112, "\3" + b.Long("a")))).substr(12),
-        b.Vector(1, 1, b.Column(2, 1, "f", b.Record(96, b.Words({1, 1}) + "\3\1"))).substr(12),
-    };
-    for (const std::string& body : bodies)
-        EXPECT_TRUE(Outcome(b.Head() + body).starts_with("-Corrupt record found"))
-            << Records_Of(b.Head() + body).size();
-}
-
 TEST_F(Book_Reader, Survives_Books_That_End_Anywhere_Or_Lie)
 {
-    Sheet* const both[] = {Plain_Sheet("A"), Full_Table(3)};
-    std::string bytes = Written(both);
+    Sheet* const both[] = {Plain_Sheet("A"), Read(Full_Table(b, 3).bytes)};
+    const std::string bytes = Written(both);
     for (std::size_t size = 0; size < bytes.size(); ++size)
         EXPECT_EQ(Read(bytes.substr(0, size)), nullptr) << size;
     EXPECT_NE(Messages(), "");
@@ -441,33 +374,8 @@ TEST_F(Book_Reader, Survives_Books_That_End_Anywhere_Or_Lie)
                 if (lie == 1)
                     other[random() % other.size()] = static_cast<char>(random());
                 request.Worksheet_Name = asked;
-                static_cast<void>(Read(other));  // which checks what it makes
+                Read(other);  // which checks what it makes
             }
-}
-
-TEST_F(Book_Reader, Reads_The_Other_Byte_Order)
-{
-    const auto book = [](const Book_Bytes& b) {
-        const std::string wide(300, 'w');
-        return b.Vector(
-            4, 3,
-            b.Variate(3, "x")
-                + b.Column(33, 3, "l",
-                           b.Record(83, b.Words({3, 300}) + b.Long("a") + b.Long(wide) + b.Long("")))
-                + b.Column(2, 3, "f",
-                           b.Record(96, b.Words({3, 300}) + std::string("\0", 1)
-                                            + b.Number(std::uint16_t{300}) + b.Number(std::uint16_t{0})
-                                            + b.Number(std::uint16_t{301})))
-                + b.Column(
-                    2, 3, "g",
-                    b.Record(96, b.Words({3, 70000}) + std::string("\0", 1) + b.Words({70000, 1, -1}))));
-    };
-    const std::string expected = "x V1|2|3; l La|300 characters|; f F300|*|*; g F70000|1|*";
-    for (const std::endian order : {std::endian::little, std::endian::big}) {
-        const std::string bytes = book(Book_Bytes{order});
-        EXPECT_EQ(Walk_Book(bytes).faults, "");
-        EXPECT_EQ(Outcome(bytes), expected);
-    }
 }
 
 }  // namespace

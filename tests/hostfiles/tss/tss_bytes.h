@@ -1,10 +1,9 @@
 // Spreadsheet files put together number by number, in either order of bytes and in every version.
 #pragma once
 
+#include "hostfiles/shared/bytes_of.h"
 #include "model/sheet.h"
-#include "support/byte_fields.h"
 
-#include <bit>
 #include <cstdint>
 #include <map>
 #include <string>
@@ -21,59 +20,46 @@ struct Raw {
 /// A piece of a file: integers, doubles and bytes. A counted text is two of them.
 class Items : public std::vector<std::variant<std::int32_t, double, Raw>> {
 public:
-    Items& operator<<(std::int32_t value)
+    void Add(std::int32_t value) { emplace_back(value); }
+    void Add(double value) { emplace_back(value); }
+    void Add(const Raw& raw) { emplace_back(raw); }
+    void Add(const std::string& text)
     {
-        emplace_back(value);
-        return *this;
+        Add(static_cast<std::int32_t>(text.size()));
+        Add(Raw{text});
     }
-    Items& operator<<(double value)
+    void Add(const char* text) { Add(std::string(text)); }
+    void Add(const Items& more) { insert(end(), more.begin(), more.end()); }
+    template <class T> void Add(const std::vector<T>& values)
     {
-        emplace_back(value);
-        return *this;
-    }
-    Items& operator<<(const Raw& raw)
-    {
-        emplace_back(raw);
-        return *this;
-    }
-    Items& operator<<(const std::string& text)
-    {
-        return *this << static_cast<std::int32_t>(text.size()) << Raw{text};
-    }
-    Items& operator<<(const char* text) { return *this << std::string(text); }
-    Items& operator<<(const Items& more)
-    {
-        insert(end(), more.begin(), more.end());
-        return *this;
+        for (const T& value : values)
+            Add(value);
     }
 };
 
 template <class... Values> Items Of(const Values&... values)
 {
     Items items;
-    static_cast<void>((items << ... << values));
+    (items.Add(values), ...);
     return items;
 }
 
 inline std::string Encode(const Items& items, std::endian order = std::endian::little)
 {
     std::string bytes;
-    const auto put = [&](auto value) {
-        char number[sizeof value];
-        if (order == std::endian::little)
-            Put_Number<decltype(value), std::endian::little>(number, value);
-        else
-            Put_Number<decltype(value), std::endian::big>(number, value);
-        bytes.append(number, sizeof number);
-    };
     for (const auto& item : items)
         if (const auto* raw = std::get_if<Raw>(&item))
             bytes += raw->bytes;
         else if (const auto* integer = std::get_if<std::int32_t>(&item))
-            put(*integer);
+            bytes += Bytes_Of(*integer, order);
         else
-            put(std::get<double>(item));
+            bytes += Bytes_Of(std::get<double>(item), order);
     return bytes;
+}
+
+template <class T> std::int32_t Count(const std::vector<T>& values)
+{
+    return static_cast<std::int32_t>(values.size());
 }
 
 /// What stands behind a column's name.
@@ -91,101 +77,72 @@ struct Shown {
 struct Maker {
     std::int32_t version = 3;
 
+    /// `items` from version `since`.
+    [[nodiscard]] Items From(std::int32_t since, const Items& items) const
+    {
+        return version >= since ? items : Items();
+    }
     [[nodiscard]] Items Head(std::int32_t type, std::int32_t columns, std::int32_t rows,
                              std::uint32_t flags = 0, double missing = Missing_Value) const
     {
         constexpr std::int32_t magics[] = {0, 53315331, 53325332, 54415441};
-        Items items;
-        if (version > 0)
-            items << magics[version];
-        items << type << columns << rows << missing;
-        if (version >= 2)
-            items << 0;
-        if (version >= 3)
-            items << 0 << static_cast<std::int32_t>(flags) << 0 << 0;
-        return items;
+        return Of(From(1, Of(magics[version])), type, columns, rows, missing, From(2, Of(0)),
+                  From(3, Of(0, static_cast<std::int32_t>(flags), 0, 0)));
     }
     [[nodiscard]] Items Column(std::int32_t type, std::int32_t length, const std::string& name,
                                const Shown& shown = {}) const
     {
-        Items items = Of(type, length, name);
-        if (version >= 3)
-            items << shown.description;
-        if (version >= 1)
-            items << shown.format << shown.width;
-        if (version >= 2)
-            items << shown.justify;
-        if (version >= 3)
-            items << shown.date_word << shown.flags << shown.attached;
-        return items;
+        return Of(type, length, name, From(3, Of(shown.description)), From(1, Of(shown.format, shown.width)),
+                  From(2, Of(shown.justify)), From(3, Of(shown.date_word, shown.flags, shown.attached)));
     }
     [[nodiscard]] Items Numbers(std::int32_t type, const std::string& name, const std::vector<double>& cells,
                                 const Shown& shown = {}) const
     {
-        Items items = Column(type, static_cast<std::int32_t>(cells.size()), name, shown);
-        items << 2;
-        for (const double cell : cells)
-            items << cell;
-        return items;
+        return Of(Column(type, Count(cells), name, shown), 2, cells);
     }
     [[nodiscard]] Items Texts(std::int32_t type, const std::string& name,
                               const std::vector<std::string>& cells, std::int32_t width,
                               Shown shown = {}) const
     {
         shown.format = 4;
-        Items items = Column(type, static_cast<std::int32_t>(cells.size()), name, shown);
-        items << width;
-        for (const std::string& cell : cells)
-            items << cell;
-        return items;
+        return Of(Column(type, Count(cells), name, shown), width, cells);
     }
     /// Lists may be empty; `kind` is told from version 2.
     [[nodiscard]] Items Factor(const std::string& name, std::int32_t levels,
                                const std::vector<double>& values, const std::vector<std::string>& labels,
                                std::int32_t kind, const std::vector<double>& cells, Shown shown = {}) const
     {
-        if (kind == 2)
-            shown.format = 4;
-        Items items = Column(2, static_cast<std::int32_t>(cells.size()), name, shown);
-        items << levels << static_cast<std::int32_t>(values.size())
-              << static_cast<std::int32_t>(labels.size());
-        if (version >= 2)
-            items << kind;
-        if (!values.empty())
-            items << 1;
         std::size_t widest = 1;
         for (const std::string& label : labels)
             widest = std::max(widest, label.size());
-        if (!labels.empty())
-            items << static_cast<std::int32_t>(widest);
-        for (const double value : values)
-            items << value;
-        for (const std::string& label : labels)
-            items << label;
-        for (const double cell : cells)
-            items << cell;
-        return items;
+        if (kind == 2)
+            shown.format = 4;
+        return Of(Column(2, Count(cells), name, shown), levels, Count(values), Count(labels),
+                  From(2, Of(kind)), values.empty() ? Items() : Of(1),
+                  labels.empty() ? Items() : Of(static_cast<std::int32_t>(widest)), values, labels, cells);
     }
 };
 
+using Records = std::map<int, Items>;
+
 /// A Vector of four columns and three rows with records behind it, by the bit of the head; the current
 /// cell and the creation dates are always there.
-inline Items With_Records(std::map<int, Items> records)
+inline Items With_Records(Records records, std::int32_t date_word = 1)
 {
     constexpr double m = Missing_Value;
     const Maker make;
+    const Shown shown{.date_word = date_word};
     records.try_emplace(4, Of(1, 1));
     records.try_emplace(14, Of(0.0, 4, 0.0, 0.0, 0.0, 0.0));
     std::uint32_t flags = 0;
-    for (const auto& [bit, record] : records)
+    Items behind;
+    for (const auto& [bit, record] : records) {
         flags |= 1U << bit;
-    Items items = make.Head(1, 4, 3, flags);
-    items << make.Factor("f", 3, {}, {"a", "bb", "c"}, 2, {1.0, m, 3.0})
-          << make.Numbers(4, "x", {1.5, m, -2.0}) << make.Texts(3, "t", {"one", "", "three"}, 5)
-          << make.Numbers(4, "y", {7.0, 8.0, 9.0});
-    for (const auto& [bit, record] : records)
-        items << record;
-    return items;
+        behind.Add(record);
+    }
+    return Of(make.Head(1, 4, 3, flags), make.Factor("f", 3, {}, {"a", "bb", "c"}, 2, {1.0, m, 3.0}, shown),
+              make.Numbers(4, "x", {1.5, m, -2.0}, shown), make.Texts(3, "t", {"one", "", "three"}, 5, shown),
+              make.Numbers(4, "y", {7.0, 8.0, 9.0}, shown), behind);
 }
 
 /// A small file, and what it reads as.
@@ -196,17 +153,6 @@ struct Small_File {
     bool comes_back = true;  ///< written again it has the same bytes
 };
 
-/// The records that the writer always sets.
-constexpr std::uint32_t Always_Written = 1U << 4 | 1U << 14;
-
-inline Items Always_Behind(std::int32_t columns)
-{
-    Items items = Of(1, 1, 0.0, columns);
-    for (std::int32_t i = 0; i < columns; ++i)
-        items << 0.0;
-    return items;
-}
-
 /// One of each kind of Sheet that `version` has.
 inline std::vector<Small_File> Small_Files(std::int32_t version)
 {
@@ -216,12 +162,13 @@ inline std::vector<Small_File> Small_Files(std::int32_t version)
     std::vector<Small_File> files;
     const auto add = [&](const char* what, std::int32_t type, std::int32_t columns, std::int32_t rows,
                          const Items& body, const char* cells, bool comes_back = true,
-                         std::int32_t marks = 0) {
-        Items items = make.Head(type, columns + marks, rows, newest ? Always_Written : 0);
-        items << body;
-        if (newest)
-            items << Always_Behind(columns);
-        files.push_back({what, items, cells, comes_back && newest});
+                         const Items& factor_across = {}, std::int32_t marks = 0) {
+        const std::uint32_t flags = 1U << 4 | 1U << 14 | (factor_across.empty() ? 0 : 1U << 19);
+        const std::vector<double> dates(static_cast<std::size_t>(columns));
+        files.push_back({what,
+                         Of(make.Head(type, columns + marks, rows, flags), body,
+                            make.From(3, Of(1, 1, 0.0, columns, dates, factor_across))),
+                         cells, comes_back && newest});
     };
     const Items x = make.Numbers(4, "x", {1.5, m, -2.0});
     add("numbers", 1, 1, 3, x, "x V1.5|*|-2");
@@ -232,7 +179,7 @@ inline std::vector<Small_File> Small_Files(std::int32_t version)
            make.Texts(3, "g", {std::string(91, 'g'), ""}, 91)),
         "u Ur1|r2; p F2|1; v F1|*; l F2|*; t T|x y; g L91 characters|");
     add("a short column", 1, 2, 3, Of(x, make.Numbers(-4, "s", {4.0})), "s U4; x V1.5|*|-2", false);
-    add("row marks", 1, 1, 3, Of(x, 21, 3, 1, 0, 1), "x V1.5|*|-2", true, 1);
+    add("row marks", 1, 1, 3, Of(x, 21, 3, 1, 0, 1), "x V1.5|*|-2", true, {}, 1);
     add("a Matrix", 2, 3, 2,
         Of("M", 1, make.Texts(-3, "rows", {"a", "b"}, 1), make.Numbers(5, "c1", {1.0, 2.0}),
            make.Numbers(5, "c 2", {3.0, m})),
@@ -244,26 +191,18 @@ inline std::vector<Small_File> Small_Files(std::int32_t version)
         false);
     add("a Diagonal Matrix", 4, 1, 2, make.Numbers(6, "D", {1.0, 2.0}), "D D1|2");
     add("a Scalar", 6, 2, 1, Of(make.Numbers(1, "a", {1.0}), make.Numbers(1, "b", {m})), "a S1; b S*");
-    const Items one_way = newest ? Of(1, 0) : Of(1);
-    add("a Table of one way", 5, 2, 2,
-        Of(one_way, make.Factor("f", 2, {}, {"a", "b"}, 2, {1.0, 2.0}), make.Numbers(8, "T", {5.0, 6.0})),
+    const Items down = make.Factor("f", 2, {}, {"a", "b"}, 2, {1.0, 2.0});
+    add("a Table of one way", 5, 2, 2, Of(1, make.From(3, Of(0)), down, make.Numbers(8, "T", {5.0, 6.0})),
         "f F1|2; T T5|6");
-    const Items two_ways = newest ? Of(2, 0, 0) : Of(2);
-    Items level_3 = make.Column(8, 2, "third");
-    level_3 << 3.5 << 2 << 5.0 << 6.0;
-    const Items behind = newest ? Of("across", 1, 65, 3) : Items();
-    files.push_back({"a Table of two ways",
-                     Of(make.Head(5, 2, 2, newest ? Always_Written | 1U << 19 : 0), two_ways, "T", 3, "g",
-                        make.Factor("f", 2, {}, {"a", "b"}, 2, {1.0, 2.0}), level_3,
-                        newest ? Always_Behind(2) : Items(), behind),
-                     "f F1|2; third T5|6", newest});
+    add("a Table of two ways", 5, 2, 2,
+        Of(2, make.From(3, Of(0, 0)), "T", 3, "g", down, make.Column(8, 2, "third"), 3.5, 2, 5.0, 6.0),
+        "f F1|2; third T5|6", true, Of("across", 1, 65, 3));
     if (newest)
-        files.push_back({"a Table with margins",
-                         Of(make.Head(5, 3, 3, Always_Written | 1U << 19), 2, 1, 1, "T", 2, "g",
-                            make.Factor("f", 3, {}, {"a", "b", "All"}, 2, {1.0, 2.0, 3.0}),
-                            make.Numbers(8, "g1", {1.0, 2.0, 3.0}), make.Numbers(22, "All", {1.0, 2.0, 3.0}),
-                            Always_Behind(3), "", 1, 0, -1),
-                         "f F1|2|3; g1 T1|2|3; All T1|2|3"});
+        add("a Table with margins", 5, 3, 3,
+            Of(2, 1, 1, "T", 2, "g",
+               make.Factor("f", 3, {0.5, 1.5, 3.0}, {"a", "b", "All"}, 2, {1.0, 2.0, 3.0}),
+               make.Numbers(8, "g1", {1.0, 2.0, 3.0}), make.Numbers(22, "All", {1.0, 2.0, 3.0})),
+            "f F1|2|3; g1 T1|2|3; All T1|2|3", true, Of("", 1, 0, -1));
     return files;
 }
 

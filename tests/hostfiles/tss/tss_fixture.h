@@ -7,6 +7,7 @@
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
 
+#include <functional>
 #include <span>
 #include <sstream>
 
@@ -17,7 +18,7 @@ protected:
     /// Reads bytes under the options that `prepare` sets; null when they were refused. Any Sheet has to be
     /// sound.
     static Sheet* Read(
-        const std::string& bytes, void (*prepare)() = [] {})
+        const std::string& bytes, const std::function<void()>& prepare = [] {})
     {
         Start_Request("t");
         prepare();
@@ -28,7 +29,7 @@ protected:
         return Current_Sheet;
     }
     static Sheet* Read(
-        const Items& items, void (*prepare)() = [] {})
+        const Items& items, const std::function<void()>& prepare = [] {})
     {
         return Read(Encode(items), prepare);
     }
@@ -42,12 +43,25 @@ protected:
     }
 };
 
+inline const Column& Col(std::int32_t index)
+{
+    return *Column_At(Current_Sheet, index);
+}
+
 /// Values with a blank between.
 template <class... Values> std::string Text_Of(const Values&... values)
 {
     std::ostringstream text;
     ((text << (text.tellp() > 0 ? " " : "") << values), ...);
     return text.str();
+}
+
+inline std::string Hex(const std::string& bytes)
+{
+    std::string text;
+    for (const char c : bytes)
+        text += "0123456789ABCDEF"[(c >> 4) & 15], text += "0123456789ABCDEF"[c & 15];
+    return text;
 }
 
 }  // namespace ingester
