@@ -19,7 +19,7 @@ std::string Random_Label(std::minstd_rand& random)
     return label;
 }
 
-TEST_F(Level_Finder_Test, FindsWhatASearchThroughAllLevelsFinds)
+TEST_F(Level_Finder_Test, Finds_What_A_Search_Through_All_Levels_Finds)
 {
     constexpr std::size_t most_levels = 6;
     std::minstd_rand random(5);
