@@ -19,10 +19,11 @@ check_reader() {
     fi
 }
 
-# The inputs kept by earlier runs, and the seeds.
+# The inputs kept by earlier runs, and the seeds; and the place for those that fail.
 find_corpus() {
     folders=("build/fuzz/corpus/$1")
-    mkdir -p "${folders[0]}"
+    findings=build/fuzz/findings/$1
+    mkdir -p "${folders[0]}" "$findings"
     [[ ! -d fuzz/seeds/$1 ]] || folders+=("fuzz/seeds/$1")
 }
 
@@ -32,10 +33,19 @@ tell_coverage() {  # READER [SOURCE...]
     tools/set_up.sh coverage
     build_targets fuzz-coverage "fuzz_$1"
     local program=build/fuzz-coverage/fuzz/fuzz_$1 profile=build/fuzz-coverage/$1
-    LLVM_PROFILE_FILE=$profile.raw "$program" -runs=0 "${folders[@]}" 2>/dev/null
+    if ! LLVM_PROFILE_FILE=$profile.raw "$program" -runs=0 -artifact_prefix="$findings/" "${folders[@]}" \
+        2>"$profile.log"; then
+        tail -n 40 "$profile.log" >&2
+        exit 1
+    fi
     llvm-profdata merge -o "$profile.profile" "$profile.raw"
     llvm-cov report "$program" -instr-profile="$profile.profile" "${@:2}"
 }
+
+# A reader's scratch files go with this folder, however the run ends.
+TMPDIR=$(mktemp -d)
+export TMPDIR
+trap 'rm -rf "$TMPDIR"' EXIT
 
 case ${1:-} in
     --build) build_targets fuzz fuzz_readers; exit ;;
@@ -50,13 +60,6 @@ check_reader "$reader"
 [[ -n ${FUZZ_BUILT:-} ]] || build_targets fuzz "fuzz_$reader"
 
 find_corpus "$reader"
-findings=build/fuzz/findings/$reader
-mkdir -p "$findings"
-
-# A reader's scratch files go with this folder, however the run ends.
-TMPDIR=$(mktemp -d)
-export TMPDIR
-trap 'rm -rf "$TMPDIR"' EXIT
 
 status=0
 build/fuzz/fuzz/fuzz_"$reader" -max_total_time="$seconds" -rss_limit_mb=2048 -timeout=10 -max_len=65536 \

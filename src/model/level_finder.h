@@ -16,7 +16,8 @@ class Level_Finder {
 public:
     void Look_In(const Column& factor) { factor_ = &factor; }
 
-    /// The level whose value is nearest, or 0.
+    /// The level whose value is nearest, or 0. Where distances are equal only by rounding, the nearer value
+    /// may be a later one than `Nearest_Level` takes.
     [[nodiscard]] std::int32_t Nearest(double value);
 
     /// The value, or the label, of a level that was found; not a number, or no text, for 0.

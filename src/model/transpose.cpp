@@ -10,6 +10,7 @@
 #include "support/text.h"
 
 #include <algorithm>
+#include <optional>
 #include <span>
 #include <vector>
 
@@ -20,9 +21,9 @@ namespace {
 /// One old data column, which becomes a row.
 struct Old_Column {
     const Column* column;
-    const Cell_Node* cell;       ///< the next to be taken
-    std::vector<double> levels;  ///< of a Factor
-    Cell_Printer printer;
+    const Cell_Node* cell;                     ///< the next to be taken
+    std::vector<double> levels;                ///< of a Factor
+    std::optional<Cell_Printer> printer = {};  ///< where the new cells are texts
 };
 
 /// What is transposed into what.
@@ -89,9 +90,9 @@ void Gather_Data(Transposition& work)
 {
     for (const Column* column = work.first_data; column != nullptr; column = column->next)
         if (column != work.name_column)
-            work.data.push_back({column, column->first_cell,
-                                 column->type == factor_column ? Level_Table(*column) : std::vector<double>{},
-                                 Cell_Printer(*column)});
+            work.data.push_back(
+                {column, column->first_cell,
+                 column->type == factor_column ? Level_Table(*column) : std::vector<double>{}});
 }
 
 bool Make_New_Sheet(Transposition& work)
@@ -249,12 +250,13 @@ void Describe_Matrix_Columns(const Transposition& work)
 
 /// What the labels of the rows make of themselves as names. Numbers that label a Matrix or a Table stay
 /// numbers.
-std::string Name_Of_Row(const Transposition& work, const Cell_Printer& names, const Cell_Node* cell)
+std::string Name_Of_Row(const Transposition& work, const std::optional<Cell_Printer>& names,
+                        const Cell_Node* cell)
 {
     char text[Number_Text_Room];
     if (cell == nullptr)
         return {};
-    const std::string_view label = names.Print(*cell, text);
+    const std::string_view label = names->Print(*cell, text);
     const bool number = work.to->type != vector_sheet && !Is_Text_Like(work.name_column->type)
                         && work.name_column->factor_kind != factor_with_labels;
     return number ? std::string(label) : Make_Valid_Name(label);
@@ -290,9 +292,10 @@ bool Add_New_Columns(Transposition& work)
     const std::vector<double> values = classified ? Level_Table(*work.name_column) : std::vector<double>{};
     const std::vector<const char*> labels =
         classified ? Label_Table(*work.name_column) : std::vector<const char*>{};
-    const Column& name_column = work.name_column == nullptr ? *work.first_data : *work.name_column;
-    const Cell_Printer names(name_column);
-    const Cell_Node* name = work.name_column == nullptr ? nullptr : name_column.first_cell;
+    std::optional<Cell_Printer> names;
+    if (work.name_column != nullptr)
+        names.emplace(*work.name_column);
+    const Cell_Node* name = work.name_column == nullptr ? nullptr : work.name_column->first_cell;
     for (std::int32_t row = 0; row < rows; ++row) {
         const bool margin = work.has_margin && row == rows - 1;
         Column* const column =
@@ -329,7 +332,7 @@ Cell_Value Take_Cell(Old_Column& old, Column& column, double missing, std::span<
         return value;
     }
     if (text) {
-        const std::string_view printed = old.printer.Print(*old.cell, room.data());
+        const std::string_view printed = old.printer->Print(*old.cell, room.data());
         value.text = column.texts.Store(printed);
         column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(printed.size()));
     } else {
@@ -348,6 +351,9 @@ void Move_Cells(Transposition& work)
     if (rows == 0)
         return;
     Column* const first = Column_At(work.to, work.to->leading_columns);
+    if (Is_Text_Like(work.cell_type))
+        for (Old_Column& old : work.data)
+            old.printer.emplace(*old.column);
     std::vector<Cell_Appender> appenders = Make_Appenders(*work.to, first, rows);
     for (std::size_t begin = 0; begin < work.data.size(); begin += columns_at_a_time) {
         const auto part =

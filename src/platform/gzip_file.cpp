@@ -87,8 +87,10 @@ std::size_t Gzip_File::Read(void* target, std::size_t count)
         done += part - stream_->avail_out;
         failed_ = answer != Z_OK && answer != Z_STREAM_END;
         // Members follow each other; what else stands behind the last one is padding.
-        if (answer == Z_STREAM_END)
-            ended_ = !Stands_At_Member() || inflateReset(stream_.get()) != Z_OK;
+        if (answer == Z_STREAM_END) {
+            ended_ = !Stands_At_Member();
+            failed_ = inflateReset(stream_.get()) != Z_OK;
+        }
     }
     return done;
 }
@@ -106,7 +108,7 @@ bool Deflate(Input_File& source, z_stream& stream, Output_File& target)
 {
     const auto plain = std::make_unique_for_overwrite<unsigned char[]>(Block_Size);
     const auto packed = std::make_unique_for_overwrite<unsigned char[]>(Block_Size);
-    for (int flush = Z_NO_FLUSH; flush != Z_FINISH;) {
+    for (int flush = Z_NO_FLUSH; flush != Z_FINISH && !target.Failed();) {
         const std::size_t got = source.Read(plain.get(), Block_Size);
         flush = got < Block_Size ? Z_FINISH : Z_NO_FLUSH;
         stream.next_in = plain.get();
