@@ -2,10 +2,10 @@
 // as yyyy-mm-dd ("iso") or dd/mm/yyyy ("dmy"). Prints "name value" lines.
 
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
 #include "model/date_format.h"
 #include "model/sheet.h"
 #include "model/text_columns.h"
+#include "request/messages.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

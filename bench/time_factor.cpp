@@ -3,9 +3,9 @@
 // that another program's levels can be held against ours.
 
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/factors.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 
 #include <chrono>

@@ -7,13 +7,13 @@
 // time_joins append COLUMNS     one row onto another by name
 
 #include "interface/process_request.h"
-#include "interface/request/request.h"
 #include "model/cell_appender.h"
 #include "model/join/append.h"
 #include "model/join/factor_levels.h"
 #include "model/join/merge.h"
 #include "model/sort.h"
 #include "model/transpose.h"
+#include "request/request.h"
 
 #include <chrono>
 #include <cstdint>

@@ -7,10 +7,10 @@
 #include "hostfiles/tbk/tbk.h"
 #include "hostfiles/tss/tss.h"
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/sheet.h"
 #include "platform/files.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 
 #include <algorithm>

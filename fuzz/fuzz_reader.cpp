@@ -3,10 +3,10 @@
 
 #include "hostfiles/tss/tss.h"
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/sheet.h"
 #include "platform/files.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/check_sheet.h"
 
 #include <cstdio>

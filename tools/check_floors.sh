@@ -10,7 +10,7 @@ function floor_of(path)
 {
     if (path ~ /^support\//) return 1
     if (path ~ /^platform\//) return 2
-    if (path ~ /^interface\/request\//) return 3
+    if (path ~ /^request\//) return 3
     if (path ~ /^model\//) return 4
     if (path ~ /^(spreadsheet|hostfiles|statfiles|science)\//) return 5
     if (path ~ /^interface\//) return 6

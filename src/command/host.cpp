@@ -6,10 +6,10 @@
 #include "ingester/ingester.h"
 #include "interface/clipboard.h"
 #include "interface/paths.h"
-#include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/host_process.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <cstddef>

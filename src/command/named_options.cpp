@@ -1,8 +1,8 @@
 #include "command/named_options.h"
 
 #include "interface/paths.h"
-#include "interface/request/request.h"
 #include "platform/folders.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <CLI/CLI.hpp>

@@ -1,9 +1,9 @@
 #include "command/request_text.h"
 
 #include "interface/paths.h"
-#include "interface/request/request.h"
 #include "interface/slash_options.h"
 #include "platform/folders.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

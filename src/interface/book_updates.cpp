@@ -3,10 +3,10 @@
 #include "hostfiles/tbk/tbk.h"
 #include "interface/compressed_files.h"
 #include "interface/file_detection.h"
-#include "interface/request/messages.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/gzip_file.h"
+#include "request/messages.h"
 #include "support/text.h"
 
 #include <string>

@@ -1,9 +1,9 @@
 #include "interface/clipboard.h"
 
-#include "interface/request/messages.h"
 #include "platform/clipboard.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/messages.h"
 #include "support/text.h"
 
 #include <algorithm>

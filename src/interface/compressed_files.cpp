@@ -2,11 +2,11 @@
 
 #include "interface/file_detection.h"
 #include "interface/format_drivers.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/gzip_file.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

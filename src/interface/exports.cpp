@@ -4,10 +4,10 @@
 #include "interface/float_faults.h"
 #include "interface/pass_file.h"
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/sheet.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -1,9 +1,9 @@
 #include "interface/file_detection.h"
 
 #include "interface/detection_tests.h"
-#include "interface/request/messages.h"
 #include "platform/files.h"
 #include "platform/gzip_file.h"
+#include "request/messages.h"
 
 namespace ingester {
 

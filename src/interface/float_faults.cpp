@@ -1,6 +1,6 @@
 #include "interface/float_faults.h"
 
-#include "interface/request/messages.h"
+#include "request/messages.h"
 
 namespace ingester {
 

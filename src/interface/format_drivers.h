@@ -2,8 +2,8 @@
 // format by name.
 #pragma once
 
-#include "interface/request/request.h"
 #include "model/sheet.h"
+#include "request/request.h"
 
 #include <cstdint>
 #include <optional>

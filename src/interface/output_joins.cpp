@@ -2,12 +2,12 @@
 
 #include "interface/file_detection.h"
 #include "interface/format_drivers.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/join/append.h"
 #include "model/join/concatenate.h"
 #include "model/join/merge.h"
 #include "platform/files.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 
 #include <algorithm>

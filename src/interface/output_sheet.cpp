@@ -1,9 +1,9 @@
 #include "interface/output_sheet.h"
 
 #include "interface/format_drivers.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

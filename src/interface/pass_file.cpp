@@ -1,10 +1,10 @@
 #include "interface/pass_file.h"
 
 #include "interface/paths.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "interface/subset_lists.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 #include <cmath>
 

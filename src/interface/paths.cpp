@@ -1,9 +1,9 @@
 #include "interface/paths.h"
 
-#include "interface/request/request.h"
 #include "platform/download.h"
 #include "platform/folders.h"
 #include "platform/host_settings.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -2,8 +2,8 @@
 
 #include "interface/paths.h"
 #include "interface/pipeline/stages.h"
-#include "interface/request/request.h"
 #include "model/sheet.h"
+#include "request/request.h"
 
 namespace ingester {
 

@@ -1,9 +1,9 @@
 #include "interface/selection.h"
 
 #include "interface/format_drivers.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/subset.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 namespace ingester {
 

@@ -1,8 +1,8 @@
 #include "interface/slash_options.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,9 +1,9 @@
 #include "interface/subset_lists.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -1,7 +1,5 @@
 #include "interface/var_file.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/date_format.h"
 #include "model/factors.h"
 #include "model/names.h"
@@ -9,6 +7,8 @@
 #include "model/text_columns.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

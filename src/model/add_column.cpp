@@ -1,7 +1,7 @@
 // Columns as they are asked for: of a type that suits the Sheet, with levels, labels and a first value.
-#include "interface/request/messages.h"
 #include "model/column_rules.h"
 #include "model/sheet.h"
+#include "request/messages.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

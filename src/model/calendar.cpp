@@ -1,8 +1,8 @@
 #include "model/calendar.h"
 
-#include "interface/request/request.h"
 #include "model/sheet.h"
 #include "platform/folders.h"
+#include "request/request.h"
 
 #include <array>
 

@@ -1,7 +1,7 @@
 #include "model/cell_appender.h"
 
-#include "interface/request/messages.h"
 #include "platform/refusals.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <new>

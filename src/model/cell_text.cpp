@@ -1,7 +1,7 @@
 #include "model/cell_text.h"
 
-#include "interface/request/request.h"
 #include "model/date_text.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,9 +1,9 @@
 #include "model/cells.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/sheet.h"
 #include "platform/refusals.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 #include <algorithm>
 

@@ -1,9 +1,9 @@
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/column_rules.h"
 #include "model/list.h"
 #include "model/names.h"
 #include "model/sheet.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

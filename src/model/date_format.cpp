@@ -1,8 +1,8 @@
 #include "model/date_format.h"
 
-#include "interface/request/settings.h"
 #include "model/calendar.h"
 #include "model/sheet.h"
+#include "request/settings.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

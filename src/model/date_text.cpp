@@ -1,10 +1,10 @@
 #include "model/date_text.h"
 
-#include "interface/request/settings.h"
 #include "model/calendar.h"
 #include "model/date_format.h"
 #include "model/sheet.h"
 #include "model/time_text.h"
+#include "request/settings.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,7 +1,7 @@
 #include "model/factor_setup.h"
 
-#include "interface/request/messages.h"
 #include "model/number_format.h"
+#include "request/messages.h"
 #include "support/number_text.h"
 
 #include <algorithm>

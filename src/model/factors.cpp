@@ -1,9 +1,9 @@
 #include "model/factors.h"
 
-#include "interface/request/messages.h"
 #include "model/factor_order.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
+#include "request/messages.h"
 #include "support/distinct_keys.h"
 #include "support/number_text.h"
 #include "support/text.h"

@@ -1,6 +1,6 @@
 #include "model/names.h"
 
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "support/text.h"
 #include "support/windows_1252.h"
 

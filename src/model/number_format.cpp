@@ -1,8 +1,8 @@
 #include "model/number_format.h"
 
-#include "interface/request/request.h"
 #include "model/date_format.h"
 #include "model/level_tables.h"
+#include "request/request.h"
 #include "support/number_text.h"
 
 #include <algorithm>

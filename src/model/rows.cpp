@@ -1,7 +1,7 @@
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/list.h"
 #include "model/sheet.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -1,9 +1,9 @@
 #include "model/sheet.h"
 
-#include "interface/request/request.h"
 #include "model/list.h"
 #include "model/names.h"
 #include "platform/folders.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -4,9 +4,9 @@
 // them. Every operation takes null handles and then returns its failure value.
 #pragma once
 
-#include "interface/request/settings.h"
 #include "model/cells.h"
 #include "model/host_fields.h"
+#include "request/settings.h"
 #include "support/fixed_text.h"
 
 #include <cstdint>

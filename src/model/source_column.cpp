@@ -1,6 +1,6 @@
 #include "model/source_column.h"
 
-#include "interface/request/request.h"
+#include "request/request.h"
 
 namespace ingester {
 

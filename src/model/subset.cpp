@@ -1,8 +1,8 @@
 #include "model/subset.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <unordered_map>

@@ -1,12 +1,12 @@
 #include "model/text_columns.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/calendar.h"
 #include "model/cell_text.h"
 #include "model/date_format.h"
 #include "model/date_text.h"
 #include "model/text_number.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 #include <algorithm>
 #include <array>

@@ -1,7 +1,7 @@
 #include "model/text_number.h"
 
-#include "interface/request/request.h"
 #include "model/sheet.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,11 +1,11 @@
 #include "model/transpose.h"
 
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/cell_appender.h"
 #include "model/level_tables.h"
 #include "model/names.h"
 #include "model/number_format.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

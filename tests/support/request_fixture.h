@@ -2,8 +2,8 @@
 #pragma once
 
 #include "interface/process_request.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/folder_fixture.h"
 
 namespace ingester {

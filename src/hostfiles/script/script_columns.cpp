@@ -1,6 +1,6 @@
 // Vectors and Scalars: a structure for each column.
 #include "hostfiles/script/script_parts.h"
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"

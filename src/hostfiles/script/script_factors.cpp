@@ -1,6 +1,6 @@
 // The declaration of a Factor: its levels stand in it, or in front of it where there are many.
 #include "hostfiles/script/script_parts.h"
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "support/text.h"
 
 namespace ingester {

@@ -1,6 +1,6 @@
 #include "hostfiles/script/script_parts.h"
 
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "support/text.h"
 
 namespace ingester {

@@ -1,9 +1,9 @@
 #include "hostfiles/script/script.h"
 
 #include "hostfiles/script/script_parts.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -1,5 +1,5 @@
 #include "hostfiles/shared/host_sheet.h"
-#include "interface/request/messages.h"
+#include "request/messages.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -1,8 +1,8 @@
 #include "hostfiles/shared/selection.h"
 
-#include "interface/request/request.h"
 #include "model/names.h"
 #include "model/row_fields.h"
+#include "request/request.h"
 
 #include <algorithm>
 #include <vector>

@@ -1,6 +1,6 @@
 #include "hostfiles/tbk/book_source.h"
 
-#include "interface/request/messages.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <cstring>

@@ -1,7 +1,7 @@
 #include "hostfiles/tbk/page_names.h"
 
 #include "hostfiles/tbk/tbk.h"
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

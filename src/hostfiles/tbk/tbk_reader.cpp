@@ -4,10 +4,10 @@
 #include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tbk/page_names.h"
 #include "hostfiles/tbk/tbk.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/names.h"
 #include "model/row_fields.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

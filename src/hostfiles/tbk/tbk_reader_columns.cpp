@@ -1,7 +1,7 @@
 // The records of a column beside its cells.
 #include "hostfiles/tbk/tbk_reader.h"
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,7 +1,7 @@
 // The records of a sheet beside those of its columns.
 #include "hostfiles/tbk/tbk_reader.h"
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

@@ -2,8 +2,8 @@
 // moved, and takes the book's name when it is complete.
 #include "hostfiles/tbk/tbk.h"
 #include "hostfiles/tbk/tbk_writer.h"
-#include "interface/request/messages.h"
 #include "platform/folders.h"
+#include "request/messages.h"
 #include "support/progress.h"
 #include "support/text.h"
 

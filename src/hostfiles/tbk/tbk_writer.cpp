@@ -3,8 +3,8 @@
 
 #include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tbk/tbk.h"
-#include "interface/request/messages.h"
 #include "model/names.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <vector>

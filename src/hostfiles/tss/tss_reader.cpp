@@ -3,9 +3,9 @@
 
 #include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 #include <algorithm>
 #include <cmath>

@@ -1,8 +1,8 @@
 // The records of Factors and of colours.
 #include "hostfiles/tss/tss_reader_extras.h"
-#include "interface/request/messages.h"
 #include "model/date_format.h"
 #include "model/row_fields.h"
+#include "request/messages.h"
 #include "support/number_text.h"
 
 #include <algorithm>

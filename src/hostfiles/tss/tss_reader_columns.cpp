@@ -1,9 +1,9 @@
 // The records of columns.
 #include "hostfiles/tss/tss_reader.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/cell_appender.h"
 #include "model/names.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "support/number_text.h"
 
 #include <algorithm>

@@ -1,8 +1,8 @@
 // The records behind the columns: what the host's window keeps beside the data.
 #include "hostfiles/tss/tss_reader_extras.h"
-#include "interface/request/messages.h"
 #include "model/calendar.h"
 #include "model/row_fields.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <string>

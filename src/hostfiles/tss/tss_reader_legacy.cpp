@@ -1,7 +1,7 @@
 // Records that only old files have: most are passed over.
 #include "hostfiles/tss/dde_item.h"
 #include "hostfiles/tss/tss_reader_extras.h"
-#include "interface/request/messages.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <initializer_list>

@@ -1,6 +1,6 @@
 // The records of texts: commands, titles, names.
 #include "hostfiles/tss/tss_reader_extras.h"
-#include "interface/request/messages.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <string>

@@ -2,8 +2,8 @@
 #include "hostfiles/tss/tss_writer.h"
 
 #include "hostfiles/tss/tss.h"
-#include "interface/request/messages.h"
 #include "model/names.h"
+#include "request/messages.h"
 
 #include <algorithm>
 

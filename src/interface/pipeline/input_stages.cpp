@@ -3,12 +3,12 @@
 #include "interface/file_detection.h"
 #include "interface/paths.h"
 #include "interface/pipeline/stages.h"
-#include "interface/request/request.h"
 #include "interface/slash_options.h"
 #include "interface/var_file.h"
 #include "model/join/merge.h"
 #include "model/sheet.h"
 #include "platform/files.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "support/text.h"
 

@@ -3,10 +3,10 @@
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/pipeline/stages.h"
-#include "interface/request/request.h"
 #include "interface/var_file.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "request/request.h"
 
 namespace ingester {
 

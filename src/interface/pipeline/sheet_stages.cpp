@@ -3,7 +3,6 @@
 #include "interface/output_joins.h"
 #include "interface/output_sheet.h"
 #include "interface/pipeline/stages.h"
-#include "interface/request/request.h"
 #include "interface/selection.h"
 #include "interface/var_file.h"
 #include "model/column_summary.h"
@@ -12,6 +11,7 @@
 #include "model/sheet.h"
 #include "model/source_column.h"
 #include "model/transpose.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>

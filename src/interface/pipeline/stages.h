@@ -3,10 +3,10 @@
 #pragma once
 
 #include "interface/format_drivers.h"
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "interface/status.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 
 #include <cstdint>
 #include <string>

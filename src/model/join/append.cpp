@@ -1,12 +1,12 @@
 #include "model/join/append.h"
 
-#include "interface/request/messages.h"
 #include "model/factors.h"
 #include "model/join/cell_transfer.h"
 #include "model/join/column_index.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
 #include "model/sort.h"
+#include "request/messages.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

@@ -1,7 +1,7 @@
 #include "model/join/concatenate.h"
 
-#include "interface/request/request.h"
 #include "model/names.h"
+#include "request/request.h"
 #include "support/text.h"
 
 #include <string>

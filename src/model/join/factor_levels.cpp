@@ -1,8 +1,8 @@
 #include "model/join/factor_levels.h"
 
-#include "interface/request/messages.h"
 #include "model/factors.h"
 #include "model/level_tables.h"
+#include "request/messages.h"
 #include "support/distinct_keys.h"
 #include "support/number_text.h"
 

@@ -1,11 +1,11 @@
 #include "model/join/merge.h"
 
-#include "interface/request/messages.h"
 #include "model/join/column_index.h"
 #include "model/join/merge_keys.h"
 #include "model/join/merge_rows.h"
 #include "model/names.h"
 #include "model/row_fields.h"
+#include "request/messages.h"
 #include "support/text.h"
 
 #include <algorithm>

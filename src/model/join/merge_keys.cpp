@@ -1,9 +1,9 @@
 #include "model/join/merge_keys.h"
 
-#include "interface/request/messages.h"
 #include "model/calendar.h"
 #include "model/factors.h"
 #include "model/level_tables.h"
+#include "request/messages.h"
 #include "support/text.h"
 
 #include <algorithm>

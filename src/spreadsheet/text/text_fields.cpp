@@ -1,5 +1,5 @@
 // How a line is cut into fields, and what a field says.
-#include "interface/request/request.h"
+#include "request/request.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/number_text.h"
 #include "support/text.h"

@@ -1,6 +1,6 @@
 // The memory image of a text: the lines that the request keeps, one LF behind each.
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
 

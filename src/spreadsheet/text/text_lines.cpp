@@ -1,9 +1,9 @@
 // The two line services: one line read as a column, and lines joined by their number of fields.
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/cell_text.h"
 #include "model/names.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"

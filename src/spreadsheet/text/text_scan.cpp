@@ -1,6 +1,6 @@
 // The shape of a text: how many rows and columns, whether names come first, what the columns are.
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/text.h"
 

@@ -1,6 +1,6 @@
 // The types that a list beside the input asks for.
-#include "interface/request/request.h"
 #include "model/subset.h"
+#include "request/request.h"
 #include "spreadsheet/text/text_format.h"
 
 #include <algorithm>

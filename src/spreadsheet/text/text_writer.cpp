@@ -1,9 +1,9 @@
 // A Sheet as text: tabs, commas, or columns of fixed width.
-#include "interface/request/messages.h"
-#include "interface/request/request.h"
 #include "model/number_format.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/messages.h"
+#include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/number_text.h"

@@ -1,7 +1,7 @@
 // The globals of one request: what the call asked for, as every floor may read it.
 #pragma once
 
-#include "interface/request/settings.h"
+#include "request/settings.h"
 #include "support/fixed_text.h"
 
 #include <array>

@@ -1,4 +1,4 @@
-#include "interface/request/request.h"
+#include "request/request.h"
 
 namespace ingester {
 

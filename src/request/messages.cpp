@@ -1,9 +1,9 @@
-#include "interface/request/messages.h"
+#include "request/messages.h"
 
-#include "interface/request/request.h"
 #include "platform/faults.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/request.h"
 
 #include <array>
 #include <memory>
