@@ -393,7 +393,7 @@ Name_Marks Read_Name_Marks(std::string_view name)
 
 std::string Name_In_Lists(std::string_view name)
 {
-    const std::string bare = Strip_Name_Mark(name);
+    std::string bare = Strip_Name_Mark(name);
     if (bare.empty() || bare.find(Quoted_Open) != std::string::npos)
         return bare;
     const Name_State state = name_state;
