@@ -231,14 +231,19 @@ TEST_F(Book_Updater, Takes_Compressed_Books_And_Nothing_Else)
         << "packed as closely as can be";
     ASSERT_TRUE(Add_Sheet(Plain_Sheet("D"), Request_Name("plain").c_str()));
     EXPECT_EQ(Pages("plain"), (Texts{"A", "D"}));
+    std::string damaged = Get("b.tbk");
+    damaged[damaged.size() - 6] ^= 1;  // in the check value
+    Put("b.tbk", damaged);
+    EXPECT_FALSE(Add_Sheet(Plain_Sheet("N"), name.c_str()));
+    EXPECT_EQ(Get("b.tbk"), damaged);
     Put("no.tbk", "a,b\n1,2\n");
     const std::string other = Request_Name("no.tbk");
     EXPECT_FALSE(Add_Sheet(Plain_Sheet("N"), other.c_str())
                  || Replace_Sheet(Plain_Sheet("N"), other.c_str(), "N"));
     const std::string shown = other.substr(0, 80) + ", you chose to ";
-    EXPECT_EQ(Messages(), "The file, " + shown + "add sheets to is not in Tabulon Workbook (TBK) format.\n"
-                              + "The file, " + shown
-                              + "replace sheets in is not in Tabulon Workbook (TBK) format.\n:\n");
+    EXPECT_EQ(Messages(), "Compressed file is damaged or not complete.\nThe file, " + shown
+                              + "add sheets to is not in Tabulon Workbook (TBK) format.\n" + "The file, "
+                              + shown + "replace sheets in is not in Tabulon Workbook (TBK) format.\n:\n");
     EXPECT_EQ(Files(), "b.tbk no.tbk plain w.tbk");
 }
 
