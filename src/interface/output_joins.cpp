@@ -25,6 +25,7 @@ public:
         Request_Globals own;
         static_cast<Lasting_Globals&>(own) = asked_;
         own.settings = asked_.settings;
+        own.people = asked_.people;
         own.Scratch_Stem = asked_.Scratch_Stem;
         own.Max_Columns = asked_.Max_Columns;
         own.Worksheet_Name = asked_.Update_Sheet_Name;
@@ -41,6 +42,7 @@ public:
     {
         const Settings settings = request.settings;  // counters go on
         asked_.Out_Of_Memory = asked_.Out_Of_Memory || request.Out_Of_Memory;
+        asked_.losses.Add(request.losses);
         request = std::move(asked_);
         request.settings = settings;
     }
@@ -77,10 +79,12 @@ Request_Status Read_Output(const std::string& path, Request_Status refused)
     }
     if (!Read_Data_File(path, type, path) || Current_Sheet == nullptr)
         return Request_Status::no_data;
-    if (request.Left_Unread == nullptr && Cells_Have_Shifted(path))
-        request.Left_Unread = "texts with blanks, or empty ones, have put its cells out of their columns";
-    if (request.Left_Unread != nullptr) {
-        Report_Message_Text("Error: The output was left as it is, since %s.\n", request.Left_Unread);
+    if (request.losses.Barred().empty() && Cells_Have_Shifted(path))
+        request.losses.Bar_Replacing(
+            "texts with blanks, or empty ones, have put its cells out of their columns");
+    if (!request.losses.Barred().empty()) {
+        Report_Message_Text("Error: The output was left as it is, since %s.\n",
+                            request.losses.Barred().c_str());
         return refused;
     }
     return Request_Status::success;

@@ -1,10 +1,13 @@
 // The globals of one request: what the call asked for, as every floor may read it.
 #pragma once
 
+#include "request/losses.h"
+#include "request/people_rules.h"
 #include "request/settings.h"
 #include "support/fixed_text.h"
 
 #include <array>
+#include <bitset>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -36,7 +39,8 @@ struct Lasting_Globals {
 
 /// Everything else a request sets. A fresh value is assigned at the start of each, so nothing lingers.
 struct Request_Globals : Lasting_Globals {
-    bool Out_Of_Memory = false;  ///< some cells were not made, which has been told
+    bool Out_Of_Memory = false;             ///< some cells were not made, which has been told
+    std::bitset<People_Rule_Count> people;  ///< the rules for people that were asked for
 
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
@@ -60,7 +64,7 @@ struct Request_Globals : Lasting_Globals {
     bool Sheet_Name_Was_Exact = false;
     bool Columns_Were_Selected = false;  ///< by the reader: the Sheet holds those of the subset only
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
-    const char* Left_Unread = nullptr;   ///< what of a text isn't in its Sheet, so that it can't be replaced
+    Loss_Ledger losses;                  ///< what could not be kept
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int64_t Column_Wanted_Count = 0;           ///< of the list's lines, as it says; 0 where it doesn't
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place

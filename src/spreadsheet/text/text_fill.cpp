@@ -338,7 +338,7 @@ void Sheet_Filler::Refuse_Extra_Columns()
         Report_Message_Long("Maximum number of columns (%li) exceeded.\nIgnoring extra columns.\n",
                             request.Max_Columns);
     columns_full_ = true;
-    request.Left_Unread = "columns beyond the greatest number would be lost";
+    request.losses.Note_Unread("columns beyond the greatest number");
 }
 
 /// A line with more fields than any before it. Columns have as many cells as there are rows.
@@ -450,10 +450,10 @@ void Sheet_Filler::Report_Oddities() const
         Report_Message_Long(
             "Warning: An empty line stands behind row %li, and what follows it was not read.\n",
             sheet_.row_count);
-        request.Left_Unread = "lines behind an empty line of it would be lost";
+        request.losses.Note_Unread("lines behind an empty line of it");
     }
     if (uneven_lines_ > 0 && cells_may_shift_)
-        request.Left_Unread = "its lines differ in their number of fields";
+        request.losses.Bar_Replacing("its lines differ in their number of fields");
 }
 
 void Sheet_Filler::Report_Cut_Texts() const
@@ -461,7 +461,7 @@ void Sheet_Filler::Report_Cut_Texts() const
     if (cut_texts_ == 0)
         return;
     Report_Message_Long("Warning: %li texts of more than 10000 characters were cut.\n", cut_texts_);
-    request.Left_Unread = "texts of it would be cut";
+    request.losses.Bar_Replacing("texts of it would be cut");
 }
 
 /// One line once more, for the columns whose texts are still wanted.

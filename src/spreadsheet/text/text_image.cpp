@@ -243,7 +243,7 @@ void Cut_Head(const File_Image& image, std::string_view blanks, bool strip_title
         strip_titles = strip_titles && Is_Title_Line(line);
         const bool own_title = lines.Number() == 1 && line.find(Title_Words) != std::string_view::npos;
         if (strip_titles && !own_title)
-            request.Left_Unread = "lines in quotes at its head would be lost";
+            request.losses.Note_Unread("lines in quotes at its head");
         if (!strip_titles && line.find_first_not_of(blanks) != std::string_view::npos) {
             buffer.first += line.data() - buffer.first;
             buffer.lines_before = lines.Number() - 1;

@@ -1,0 +1,101 @@
+#include "request/losses.h"
+
+#include "request/request.h"
+
+#include <array>
+#include <utility>
+
+namespace ingester {
+
+namespace {
+
+struct Kind_Words {
+    Loss_Kind kind;
+    std::string_view key;
+    std::string_view words;
+};
+
+constexpr std::array<Kind_Words, Loss_Kind_Count> Kinds = {{
+    {Loss_Kind::text_cut, "text_cut", "texts cut"},
+    {Loss_Kind::letter_replaced, "letter_replaced", "letters replaced by \"?\""},
+    {Loss_Kind::name_changed, "name_changed", "names changed"},
+    {Loss_Kind::number_clipped, "number_clipped", "numbers cut down to the greatest"},
+    {Loss_Kind::number_not_held, "number_not_held", "numbers that can't be held"},
+    {Loss_Kind::text_not_number, "text_not_number", "texts among numbers, missing now"},
+    {Loss_Kind::date_out_of_range, "date_out_of_range", "dates out of range"},
+    {Loss_Kind::label_dropped, "label_dropped", "labels dropped or merged"},
+    {Loss_Kind::missing_codes_merged, "missing_codes_merged", "missing codes merged"},
+    {Loss_Kind::beyond_limit, "beyond_limit", "columns or rows beyond a limit"},
+    {Loss_Kind::metadata_dropped, "metadata_dropped", "descriptions that can't be held"},
+    {Loss_Kind::input_unread, "input_unread", "parts of the input not read"},
+}};
+
+constexpr bool Kinds_Are_In_Order()
+{
+    for (std::size_t i = 0; i < Kinds.size(); ++i)
+        if (static_cast<std::size_t>(Kinds[i].kind) != i)
+            return false;
+    return true;
+}
+
+static_assert(Kinds_Are_In_Order());
+
+}  // namespace
+
+Loss& Loss_Ledger::Entry_Of(Loss_Kind kind, std::string_view column)
+{
+    if (entries_.size() >= most_entries)
+        column = {};
+    std::string key(1, static_cast<char>(kind));
+    key += column;
+    if (const auto found = places_.find(key); found != places_.end())
+        return entries_[found->second];
+    places_.emplace(std::move(key), entries_.size());
+    Loss& loss = entries_.emplace_back();
+    loss.kind = kind;
+    loss.column = column;
+    return loss;
+}
+
+void Loss_Ledger::Note(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,
+                       std::int64_t count)
+{
+    Loss& loss = Entry_Of(kind, column);
+    if (loss.count == 0) {
+        loss.first_row = row;
+        loss.example = example.substr(0, longest_example);
+    }
+    loss.count += count;
+}
+
+void Loss_Ledger::Add(const Loss_Ledger& other)
+{
+    for (const Loss& loss : other.entries_)
+        Note(loss.kind, loss.column, loss.first_row, loss.example, loss.count);
+    if (!other.barred_.empty())
+        barred_ = other.barred_;
+}
+
+void Loss_Ledger::Note_Unread(std::string_view part, std::int64_t count)
+{
+    Note(Loss_Kind::input_unread, {}, 0, part, count);
+    barred_ = std::string(part).append(" would be lost");
+}
+
+void Note_Loss(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,
+               std::int64_t count)
+{
+    request.losses.Note(kind, column, row, example, count);
+}
+
+std::string_view Words_Of(Loss_Kind kind)
+{
+    return Kinds[static_cast<std::size_t>(kind)].words;
+}
+
+std::string_view Key_Of(Loss_Kind kind)
+{
+    return Kinds[static_cast<std::size_t>(kind)].key;
+}
+
+}  // namespace ingester

@@ -1,0 +1,23 @@
+// What stands beside the host's rules, for people: each rule is off unless an option of its own asks for it.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace ingester {
+
+/// A rule that serves people better than what hosts count on.
+enum class People_Rule : std::uint8_t {
+    utf8_text,        ///< all text of the request is UTF-8 instead of Windows-1252
+    free_names,       ///< names stand as they are until a target's own rule changes them
+    told_losses,      ///< what could not be kept is told at the end of the messages
+    told_options,     ///< an option that means nothing to the input's format is told
+    further_endings,  ///< outputs are known by endings that hosts don't use
+    further_types,    ///< inputs are recognised that hosts take for text, or for nothing
+};
+constexpr std::size_t People_Rule_Count = 6;
+
+/// Whether the request that runs asks for a rule.
+[[nodiscard]] bool For_People(People_Rule rule);
+
+}  // namespace ingester
