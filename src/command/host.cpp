@@ -6,6 +6,7 @@
 #include "ingester/ingester.h"
 #include "interface/clipboard.h"
 #include "interface/paths.h"
+#include "interface/people_options.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/host_process.h"
@@ -120,12 +121,18 @@ bool Name_Is_Carried(const std::string& given)
     return fault.empty();
 }
 
+std::string Rules_Of(const Command_Options& options)
+{
+    return Spell_People_Rules(~options.host_rules);
+}
+
 bool Request_Can_Carry(const Conversion& conversion)
 {
     const Command_Options& options = conversion.options;
     return Name_Is_Carried(options.input) && Name_Is_Carried(options.output)
            && Length_Is_Carried(conversion.input.native,
-                                conversion.input.request.size() + options.input_options.size(),
+                                conversion.input.request.size() + Rules_Of(options).size()
+                                    + options.input_options.size(),
                                 Long_Name_Width)
            && Length_Is_Carried(conversion.output.native,
                                 conversion.output.request.size() + options.output_options.size(),
@@ -153,6 +160,15 @@ bool Output_Makes_Sense(const Conversion& conversion)
     if (refusal != nullptr)
         Say(conversion.output.native, refusal);
     return refusal == nullptr;
+}
+
+bool Report_May_Be_Written(const Command_Options& options)
+{
+    const std::string report = Report_Of_Options(options.input_options);
+    if (report.empty() || options.force || !File_Exists(report))
+        return true;
+    Say(Native_Path(report), "the file exists already and was left as it is; give --force to replace it");
+    return false;
 }
 
 bool Output_May_Be_Written(const Conversion& conversion)
@@ -229,9 +245,9 @@ std::vector<std::string> Request_Records(const Conversion& conversion)
     const std::string& output = conversion.output.request;
     const Choice_Lists& lists = conversion.lists;
     const bool chosen = !lists.columns.empty() || !lists.rows.empty();
-    const std::string change = lists.changes.empty() ? "" : "/v";
+    const std::string asked = Rules_Of(options) + (lists.changes.empty() ? "" : "/v");
     // In front of the options that were written as they stand: a value without an end takes all that follows.
-    std::vector<std::string> records = {conversion.input.request + change + options.input_options,
+    std::vector<std::string> records = {conversion.input.request + asked + options.input_options,
                                         output + Packed_Option(options, output) + options.output_options};
     if (chosen || !options.sheet.empty() || !options.range.empty())
         records.push_back(options.sheet);
@@ -434,7 +450,7 @@ int Run_Command(const Command_Options& options)
         Print_Request(conversion);
         return INGESTER_SUCCESS;
     }
-    if (!Output_May_Be_Written(conversion))
+    if (!Output_May_Be_Written(conversion) || !Report_May_Be_Written(options))
         return INGESTER_OUTPUT_FAILED;
     if (conversion.From_Standard_Input() && !Copy_Standard_Input(conversion.input.request)) {
         Say(conversion.input.native, "could not be read to its end and kept in the temporary folder");

@@ -1,6 +1,7 @@
 #include "command/options.h"
 
 #include "interface/paths.h"
+#include "interface/people_options.h"
 
 #include <CLI/CLI.hpp>
 #include <array>
@@ -132,6 +133,21 @@ bool Add_Merge_Option(Command_Options& options, const Merge_Choice& merge)
     return true;
 }
 
+/// The command asks for all rules for people; a flag each does without one.
+void Offer_Host_Rules(CLI::App& app, std::bitset<People_Rule_Count>& host_rules)
+{
+    const char* const group = "Rules of hosts in the place of those for people";
+    app.add_flag_callback(
+           "--host-rules", [&host_rules] { host_rules.set(); }, "All of these: convert as for a host")
+        ->group(group);
+    for (const People_Rule_Option& option : People_Rule_Options())
+        app.add_flag_callback(
+               "--" + std::string(option.host_flag),
+               [&host_rules, &option] { host_rules.set(static_cast<std::size_t>(option.rule)); },
+               std::string(option.host_help))
+            ->group(group);
+}
+
 }  // namespace
 
 std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
@@ -175,7 +191,8 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
     app.add_flag("-q,--quiet", options.quiet, "Show no progress");
     app.add_flag("--dry-run", options.dry_run, "Print the request that would be sent, and stop");
     Offer_Choices(app, options.chosen);
-    const std::array input_tables = {Genotype_Options(), Input_Options()};
+    Offer_Host_Rules(app, options.host_rules);
+    const std::array input_tables = {People_Options(), Genotype_Options(), Input_Options()};
     const std::array output_tables = {Output_Options()};
     Offer_Named_Options(app, "Options of the input", input_tables, options.named_input_options);
     Offer_Named_Options(app, "Options of the output", output_tables, options.named_output_options);

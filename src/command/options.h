@@ -3,7 +3,9 @@
 
 #include "command/named_options.h"
 #include "command/selection_lists.h"
+#include "request/people_rules.h"
 
+#include <bitset>
 #include <optional>
 #include <string>
 #include <vector>
@@ -26,10 +28,11 @@ struct Command_Options {
     Given_Options named_input_options;  ///< added to `input_options` when the line is parsed
     Given_Options named_output_options;
     Chosen_Data chosen;
-    std::vector<std::string> merge_keys;  ///< "key", or "key=key" of output and input
-    bool summary = false;                 ///< only describe the columns
-    bool dry_run = false;                 ///< show the request, don't send it
-    bool padded = false;                  ///< comma text keeps its columns under each other
+    std::vector<std::string> merge_keys;        ///< "key", or "key=key" of output and input
+    std::bitset<People_Rule_Count> host_rules;  ///< the rules for people that are not asked for
+    bool summary = false;                       ///< only describe the columns
+    bool dry_run = false;                       ///< show the request, don't send it
+    bool padded = false;                        ///< comma text keeps its columns under each other
     bool force = false;
     bool quiet = false;
     bool lines = false;  ///< standard output gets lines as the system ends them

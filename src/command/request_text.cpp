@@ -1,6 +1,7 @@
 #include "command/request_text.h"
 
 #include "interface/paths.h"
+#include "interface/people_options.h"
 #include "interface/slash_options.h"
 #include "platform/folders.h"
 #include "request/request.h"
@@ -95,13 +96,15 @@ std::string Fault_Of_Name(std::string_view native)
 
 namespace {
 
-/// Whether input options, once they are taken, make `asked` true.
-template <class Asked> bool Input_Options_Ask_For(std::string_view options, Asked asked)
+/// What `asked` says once input options are taken.
+template <class Asked> auto Input_Options_Ask_For(std::string_view options, Asked asked)
 {
     std::string rest(options);
-    Cut_Options(Genotype_Options(), rest);
-    Cut_Options(Input_Options(), rest);
-    const bool result = asked();
+    std::string none;
+    Take_People_Options(rest, none);
+    static_cast<void>(Cut_Options(Genotype_Options(), rest));
+    static_cast<void>(Cut_Options(Input_Options(), rest));
+    const auto result = asked();
     request = Request_Globals{};
     return result;
 }
@@ -111,7 +114,9 @@ template <class Asked> bool Options_Ask_For(std::string_view options, Asked aske
 {
     std::string rest(options);
     const Reflow_Order reflow = Take_Reflow_Order(rest);
-    Cut_Options(Output_Options(), rest);
+    std::string none;
+    Take_People_Options(rest, none);
+    static_cast<void>(Cut_Options(Output_Options(), rest));
     const bool result = !reflow.asked && asked();
     request = Request_Globals{};
     return result;
@@ -145,6 +150,11 @@ bool Options_Keep_Columns(std::string_view options)
 bool Options_Print_Summary(std::string_view options)
 {
     return Input_Options_Ask_For(options, [] { return request.Print_Summary && !request.List_Sheets_Only; });
+}
+
+std::string Report_Of_Options(std::string_view options)
+{
+    return Input_Options_Ask_For(options, [] { return std::string(request.Loss_Report_Name.view()); });
 }
 
 std::string With_Native_Names(std::string_view message, const Sent_Name& input, const Sent_Name& output)

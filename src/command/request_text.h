@@ -31,6 +31,9 @@ struct Sent_Name {
 /// The input options ask for a summary on standard output.
 [[nodiscard]] bool Options_Print_Summary(std::string_view options);
 
+/// The file into which the input options have losses written; empty for none.
+[[nodiscard]] std::string Report_Of_Options(std::string_view options);
+
 /// `message` with the request form of both names turned into the native one: in full, cut short as
 /// messages cut long names, without extension, or the folder alone. All else stays.
 [[nodiscard]] std::string With_Native_Names(std::string_view message, const Sent_Name& input,

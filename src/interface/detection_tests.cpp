@@ -1,10 +1,13 @@
 #include "interface/detection_tests.h"
 
 #include "interface/file_detection.h"
+#include "request/people_rules.h"
 #include "support/byte_fields.h"
 #include "support/text.h"
 
 #include <algorithm>
+#include <span>
+#include <utility>
 
 namespace ingester {
 
@@ -129,6 +132,16 @@ bool Looks_Like_Text(const Detection_Head& head)
             return false;
     }
     return true;
+}
+
+/// Text in whatever code: only line ends, tabs and form feeds among the controls.
+bool Holds_No_Controls(const Detection_Head& head)
+{
+    const std::string_view text = head.Text().substr(0, head.length);
+    return std::ranges::all_of(text, [](char c) {
+        const auto byte = static_cast<std::uint8_t>(c);
+        return byte >= 32 || (byte >= '\t' && byte <= '\r');
+    });
 }
 
 /// Numbers in magics are little-endian. Tests of text take either case unless the format is strict.
@@ -259,8 +272,22 @@ constexpr Detection_Test Detection_Tests[] = {
     {66, {}, ".ico .pax .pcd .pcx .pbm .pgm .ppm .tga .tla .wbmp"},
     {qtl_locus_file, {}, ".loc"},
     {74, {}, ".qua .qda"},
+};
 
+/// Types that hosts take for text or for nothing.
+constexpr Detection_Test Further_Tests[] = {
+    {plain_text_file, {Bytes(0, "\xEF\xBB\xBF"sv)}},  // marks that texts in Unicode begin with
+    {plain_text_file, {Bytes(0, "\xFF\xFE"sv)}},
+    {plain_text_file, {Bytes(0, "\xFE\xFF"sv)}},
+};
+
+constexpr Detection_Test Text_Tests[] = {
     {plain_text_file, {}, "", Looks_Like_Text},
+};
+
+/// Behind the text that hosts know.
+constexpr Detection_Test Further_Text_Tests[] = {
+    {plain_text_file, {}, "", Holds_No_Controls},
 };
 
 /// A magic must lie within the head.
@@ -273,15 +300,26 @@ consteval bool Magics_Fit(std::span<const Detection_Test> tests)
     });
 }
 
-static_assert(Magics_Fit(Detection_Tests));
+static_assert(Magics_Fit(Detection_Tests) && Magics_Fit(Further_Tests));
+
+std::int32_t Code_Of_First_Match(std::span<const Detection_Test> tests, const Detection_Head& head)
+{
+    const auto found =
+        std::ranges::find_if(tests, [&head](const Detection_Test& test) { return test.Matches(head); });
+    return found == tests.end() ? unknown_file : found->code;
+}
 
 }  // namespace
 
 std::int32_t Code_Of_Head(const Detection_Head& head)
 {
-    for (const Detection_Test& test : Detection_Tests)
-        if (test.Matches(head))
-            return test.code;
+    const bool further = For_People(People_Rule::further_types);
+    const std::pair<bool, std::span<const Detection_Test>> in_order[] = {
+        {true, Detection_Tests}, {further, Further_Tests}, {true, Text_Tests}, {further, Further_Text_Tests}};
+    for (const auto& [asked, tests] : in_order)
+        if (const std::int32_t code = asked ? Code_Of_First_Match(tests, head) : unknown_file;
+            code != unknown_file)
+            return code;
     return unknown_file;
 }
 

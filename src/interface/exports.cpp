@@ -1,38 +1,21 @@
-// The exported functions: a request's files are found, read, answered and cleared away.
+// The exported functions.
 #include "ingester/ingester.h"
 
-#include "interface/float_faults.h"
+#include "interface/export_frame.h"
 #include "interface/pass_file.h"
 #include "interface/process_request.h"
-#include "model/sheet.h"
 #include "platform/folders.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/text.h"
 
 #include <algorithm>
-#include <exception>
+#include <optional>
 #include <string>
 
 namespace ingester {
 
 namespace {
-
-/// The files of one call.
-struct Call_Files {
-    std::string pass;
-    std::string result;
-    std::string stem;
-};
-
-/// A name as a host hands it over: an array of characters without a terminator.
-std::string_view Argument_Name(const char* name, std::int32_t length)
-{
-    if (name == nullptr || length <= 0)
-        return {};
-    const std::string_view text(name, static_cast<std::size_t>(length));
-    return text.substr(0, text.find('\0'));
-}
 
 /// A host doubles the backslashes of its carrier file's name.
 std::string Carrier_Name(std::string_view text)
@@ -49,7 +32,7 @@ std::string Carrier_Name(std::string_view text)
 }
 
 /// Names by the process, or by the request id in the host's carrier file.
-Call_Files Find_Call_Files(const std::string& carrier)
+Call_Files Find_Call_Files(std::string_view first)
 {
     const std::string temp = Get_Temp_Folder();
     const long pid = Process_Id();
@@ -57,7 +40,7 @@ Call_Files Find_Call_Files(const std::string& carrier)
                              Format_Text("IG%li", pid)};
     if (File_Exists(by_process.pass))
         return by_process;
-    if (const auto id = static_cast<unsigned long>(Read_Carrier_Id(carrier)); id > 0)
+    if (const auto id = static_cast<unsigned long>(Read_Carrier_Id(Carrier_Name(first))); id > 0)
         return {temp + Format_Text("IG%lX.tmp", id), temp + Format_Text("IG%lX.out", id),
                 Format_Text("IG%lX", id)};
     return {temp + "ingester.inp", temp + "ingester.out", "TxtToNum"};
@@ -138,34 +121,16 @@ private:
     Request_Status status_ = Request_Status::no_request;
 };
 
-/// Runs the request. Lack of memory is a fault like any other. False when no answer may be given.
-bool Run_Request(const Call_Files& files, Request_Status& status)
+std::optional<std::int32_t> Convert_As_Asked(const Call_Files& files)
 {
-    bool answer = true;
-    try {
-        Start_Request(files.stem);
-        Ingester_Call call(files);
-        answer = call.Run();
-        status = Check_Sheet_Name(call.Status());
-    } catch (const std::exception&) {  // no room, or a length beyond what any room could hold
-        Free_Sheets();                 // room for the answer
-        Report_In_Fault("Error: Not enough memory to read data.\n", true);
-        status = Request_Status::no_data;
-    }
-    Close_Message_File();
-    Free_Sheets();  // the next request may be hours away
-    return answer;
+    Ingester_Call call(files);
+    if (!call.Run())
+        return std::nullopt;
+    return static_cast<std::int32_t>(Check_Sheet_Name(call.Status()));
 }
 
-void Run_Call(std::string_view carrier, std::string_view result_name)
-{
-    Call_Files files = Find_Call_Files(Carrier_Name(carrier));
-    if (!result_name.empty())
-        files.result = result_name;
-    Request_Status status = Request_Status::no_request;
-    if (Run_Request(files, status))
-        Write_Result_File(files.result, status);
-}
+constexpr Export Conversion = {Find_Call_Files, Convert_As_Asked,
+                               static_cast<std::int32_t>(Request_Status::no_data)};
 
 }  // namespace
 
@@ -175,11 +140,7 @@ std::int32_t INGESTER(const char* pass_name, const char* result_name, std::int32
                       std::int32_t result_name_length)
 {
     using namespace ingester;
-    const Fault_Guard guard(Report_Float_Fault);
-    try {
-        Run_Call(Argument_Name(pass_name, pass_name_length), Argument_Name(result_name, result_name_length));
-    } catch (const std::exception&) {
-        // silent by design: a host without a result file knows; nothing may be thrown into it
-    }
+    Run_Export(Conversion, Argument_Name(pass_name, pass_name_length),
+               Argument_Name(result_name, result_name_length));
     return 0;
 }

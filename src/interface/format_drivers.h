@@ -1,9 +1,8 @@
 // Which reader a file-type code has, and which writer an extension. The one table that knows every
-// format by name.
+// format by name, put together from one of each family.
 #pragma once
 
-#include "model/sheet.h"
-#include "request/request.h"
+#include "interface/formats/format_driver.h"
 
 #include <cstdint>
 #include <optional>
@@ -14,32 +13,17 @@
 
 namespace ingester {
 
-/// Readers leave their Sheet in `Current_Sheet`; false after a message.
-using Reader = bool (*)(const char* file_name);
-using Writer = bool (*)(Sheet* sheet, const char* file_name);
-/// The names of a file's sheets, in order; nothing for a file that can't be understood.
-using Sheet_Lister = std::optional<std::vector<std::string>> (*)(const char* file_name);
-
-/// One format. Detection gives inputs their code, the extension gives it to outputs. A format that this
-/// build knows by name only has neither `read` nor `write`.
-struct Format_Driver {
-    std::int32_t code;
-    std::string_view name;
-    Reader read = nullptr;
-    std::string_view extensions = {};  ///< of outputs, with blanks between them
-    Writer write = nullptr;
-    std::int32_t max_columns = Default_Max_Columns;  ///< of outputs
-    Sheet_Lister sheet_names = nullptr;              ///< of formats that hold several sheets
-};
-
 /// All formats, by code.
 [[nodiscard]] std::span<const Format_Driver> All_Formats();
 
 /// The format of an output, by the name's extension; fixed-width text for an unknown one.
 [[nodiscard]] const Format_Driver& Output_Driver_Of(std::string_view file_name);
 
-/// The format of an output code.
-[[nodiscard]] const Format_Driver& Output_Driver_Of(std::int32_t code);
+/// The format of a code, of an input or an output; null when there is none.
+[[nodiscard]] const Format_Driver* Driver_Of_Code(std::int32_t code);
+
+/// Whether an output is the text of fixed width that all unknown extensions give.
+[[nodiscard]] bool Is_Fixed_Width_Text(const Format_Driver& driver);
 
 /// The names of the sheets in a file of several, 4096 at most; none for any other file. Nothing when the
 /// file can't be read.

@@ -55,9 +55,7 @@ private:
 bool Cells_Have_Shifted(const std::string& path)
 {
     Input_File file;
-    const Format_Driver& driver = Output_Driver_Of(path);
-    return driver.code == text_file && driver.extensions.empty() && file.Open(path)
-           && !Fields_Stand_In_Columns(file);
+    return Is_Fixed_Width_Text(Output_Driver_Of(path)) && file.Open(path) && !Fields_Stand_In_Columns(file);
 }
 
 /// The Sheet in an existing output becomes the `Current_Sheet`. `refused` when it lacks a part of the file,

@@ -1,6 +1,7 @@
 #include "interface/pass_file.h"
 
 #include "interface/paths.h"
+#include "interface/people_options.h"
 #include "interface/subset_lists.h"
 #include "platform/folders.h"
 #include "request/messages.h"
@@ -41,16 +42,22 @@ constexpr Words Subset_Rows_Words = {
     "Subset rows file length missing.\n", "Subset rows file length invalid.\n",
     "Subset rows file missing.\n",        Long_Name_Width};
 
+/// Silent by design where there are no words.
+bool Fault(const char* words)
+{
+    return words != nullptr && Fail(words);
+}
+
 }  // namespace
 
-bool Pass_File::Read_Count()
+bool Pass_File::Read_Count(const Count_Words& words)
 {
     double count;
     if (!file_.Read_Little(count))
-        return Fail("Number of arguments missing.\n");
+        return Fault(words.missing);
     const double whole = std::trunc(count);
     if (!(whole >= Fewest_Arguments && whole <= Most_Arguments))
-        return Fail("Incorrect number of arguments.\n");
+        return Fault(words.wrong);
     count_ = static_cast<std::int32_t>(whole);
     return true;
 }
@@ -60,16 +67,16 @@ bool Pass_File::Read_Text(const Record_Words& words, std::string& text)
     std::int32_t type;
     std::uint32_t length;
     if (!file_.Read_Little(type))
-        return Fail(words.type_missing);
+        return Fault(words.type_missing);
     if (type != 0)
-        return Fail(words.type_not_text);
+        return Fault(words.type_not_text);
     if (!file_.Read_Little(length))
-        return Fail(words.length_missing);
+        return Fault(words.length_missing);
     if (length > words.greatest_length)
-        return Fail(words.length_invalid);
+        return Fault(words.length_invalid);
     text.resize(length);
     if (!file_.Read_Exactly(text.data(), length))
-        return Fail(words.missing);
+        return Fault(words.missing);
     text.resize(text.find('\0') == std::string::npos ? length : text.find('\0'));
     return true;
 }
@@ -168,9 +175,11 @@ bool Read_Pass_File(Input_File& file, Pass_Request& asked)
 {
     Pass_File pass(file);
     std::string secondary;
-    if (!pass.Read_Count() || !pass.Read_Text(Infile_Words, asked.infile)
-        || !pass.Read_Text(Outfile_Words, asked.outfile)
-        || !Take_Text(pass, 3, Worksheet_Words, request.Worksheet_Name)
+    if (!pass.Read_Count({}) || !pass.Read_Text(Infile_Words, asked.infile)
+        || !pass.Read_Text(Outfile_Words, asked.outfile))
+        return false;
+    Take_People_Options(asked.infile, asked.outfile);  // the lists that follow are read by them
+    if (!Take_Text(pass, 3, Worksheet_Words, request.Worksheet_Name)
         || !Take_Text(pass, 4, Cell_Range_Words, request.Cell_Range)
         || !Take_Text(pass, 5, Secondary_Words, secondary) || !Take_Secondary_File(secondary, asked))
         return false;
@@ -212,12 +221,12 @@ std::int64_t Read_Carrier_Id(std::string_view name)
     return id > 0.0 && id <= 2147483647.0 ? static_cast<std::int64_t>(id) : 0;
 }
 
-void Write_Result_File(std::string_view name, Request_Status status)
+void Write_Result_File(std::string_view name, std::int32_t status)
 {
     Output_File file(Output_File::small_buffer);
     if (!file.Open(name))
         return;  // silent by design: the host sees that there is no result
-    file.Write_Little(static_cast<std::int32_t>(status));
+    file.Write_Little(status);
     file.Write_Little(std::int32_t{0});
     if (!file.Close())
         Delete_File(name);  // half an answer is none

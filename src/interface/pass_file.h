@@ -13,7 +13,7 @@ namespace ingester {
 /// A pass file is read record by record; each call takes the next one.
 class Pass_File {
 public:
-    /// The words for the faults of one record.
+    /// The words for the faults of one record; of hosts that are told nothing they are null.
     struct Record_Words {
         const char* type_missing;
         const char* type_not_text;
@@ -22,11 +22,15 @@ public:
         const char* missing;
         std::size_t greatest_length;
     };
+    struct Count_Words {
+        const char* missing = "Number of arguments missing.\n";
+        const char* wrong = "Incorrect number of arguments.\n";
+    };
 
     explicit Pass_File(Input_File& file) : file_(file) {}
 
     /// The number of arguments, 2 to 6. False after a message.
-    [[nodiscard]] bool Read_Count();
+    [[nodiscard]] bool Read_Count(const Count_Words& words);
     [[nodiscard]] std::int32_t Count() const { return count_; }
 
     /// The next text record. False after the message that `words` has for the fault.
@@ -51,7 +55,7 @@ struct Pass_Request {
 /// The request id in the head of a host's carrier file; 0 when there is none.
 [[nodiscard]] std::int64_t Read_Carrier_Id(std::string_view name);
 
-/// Writes a status and a 0. Nothing happens when the file can't be made.
-void Write_Result_File(std::string_view name, Request_Status status);
+/// Writes a status, of any export, and a 0. Nothing happens when the file can't be made.
+void Write_Result_File(std::string_view name, std::int32_t status);
 
 }  // namespace ingester

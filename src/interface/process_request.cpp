@@ -1,5 +1,6 @@
 #include "interface/process_request.h"
 
+#include "interface/loss_report.h"
 #include "interface/paths.h"
 #include "interface/pipeline/stages.h"
 #include "model/sheet.h"
@@ -11,7 +12,9 @@ namespace {
 
 /// Every stage, in the order in which they act; the first that doesn't succeed ends the request.
 constexpr Stage Stages[] = {
+    Take_Rules_For_People,
     Expand_Tokens,
+    Fetch_Named_Secondary,
     Cut_Genotype_Options,
     Fetch_Map,
     Reflow_Lines,
@@ -35,6 +38,7 @@ constexpr Stage Stages[] = {
     Refuse_Missing_Operations,
 
     Read_Input,
+    Tell_Vain_Options,
     Name_Output_Sheet,
     List_Sheets,
     Find_Sheet_Of_Output,
@@ -45,8 +49,10 @@ constexpr Stage Stages[] = {
     Name_Temporary_Output,
     Change_By_List,
     Mark_Source,
+    Fit_Names_To_Output,
     Join_With_Output,
     Keep_Range_Of_Columns,
+    Fit_Names_To_Output,
     Make_Names_Unique,
     Drop_Empty_Rows,
     Mark_Source,
@@ -55,7 +61,9 @@ constexpr Stage Stages[] = {
 
     Make_Output_Form,
     Refuse_Losses,
+    Forbid_Losses,
     Write_Output,
+    Forbid_Losses,
     Write_Column_List,
     Fill_Clipboard,
     Replace_Old_Output,
@@ -89,6 +97,9 @@ Request_Status Process_Request(std::string infile, std::string outfile, std::int
     run.infile = std::move(infile);
     run.outfile = std::move(outfile);
     const Request_Status status = Run_Stages(run);
+    Tell_Losses();
+    if (!request.Loss_Report_Name.empty() && !Write_Loss_Report(request.Loss_Report_Name))
+        return status == Done ? Request_Status::output_failed : status;
     rows = Current_Sheet == nullptr ? 0 : Current_Sheet->row_count;
     return status;
 }

@@ -1,5 +1,6 @@
 #include "interface/slash_options.h"
 
+#include "interface/option_values.h"
 #include "platform/folders.h"
 #include "request/messages.h"
 #include "request/request.h"
@@ -12,85 +13,6 @@
 namespace ingester {
 
 namespace {
-
-using Taken = std::size_t;  // the end of an option in its string
-
-/// A value and where it ends.
-struct Option_Value {
-    std::string_view text;
-    Taken end;
-};
-
-Option_Value Up_To(std::string_view text, std::size_t at, std::string_view ends)
-{
-    const std::size_t end = std::min(text.find_first_of(ends, at), text.size());
-    return {text.substr(at, end - at), end};
-}
-
-bool Stands_At(std::string_view text, std::size_t at, std::string_view characters)
-{
-    return at < text.size() && characters.find(text[at]) != std::string_view::npos;
-}
-
-/// From a quote to the same quote, or to the end; else bare, up to one of `ends`.
-Option_Value Quoted_Or_Bare(std::string_view text, std::size_t at, std::string_view quotes,
-                            std::string_view ends)
-{
-    if (!Stands_At(text, at, quotes))
-        return Up_To(text, at, ends);
-    const std::size_t close = text.find(text[at], at + 1);
-    if (close == std::string_view::npos)
-        return {text.substr(at + 1), text.size()};
-    return {text.substr(at + 1, close - at - 1), close + 1};
-}
-
-std::size_t Behind_Equals(std::string_view text, std::size_t at)
-{
-    return Stands_At(text, at, "=") ? at + 1 : at;
-}
-
-constexpr std::string_view Quotes = "\"'";
-constexpr std::string_view Quotes_And_Backquote = "\"'`";
-constexpr std::string_view Option_Start = "/";
-constexpr std::string_view Name_End = "/ ";
-
-template <auto Member, auto Value> Taken Set(std::string_view, std::size_t at)
-{
-    request.*Member = Value;
-    return at;
-}
-
-template <auto Member, auto Value> Taken Set_Setting(std::string_view, std::size_t at)
-{
-    Get_Settings().*Member = Value;
-    return at;
-}
-
-/// A quoted or bare value into a text; `optional_equals` takes the "=" that the key lacks.
-template <auto Member, bool optional_equals = false> Taken Take_Text(std::string_view text, std::size_t at)
-{
-    const auto quotes = optional_equals ? Quotes_And_Backquote : Quotes;
-    const Option_Value value =
-        Quoted_Or_Bare(text, optional_equals ? Behind_Equals(text, at) : at, quotes, Option_Start);
-    request.*Member = value.text;
-    return value.end;
-}
-
-/// A quoted value, or a bare name.
-template <auto Member> Taken Take_Name(std::string_view text, std::size_t at)
-{
-    const Option_Value value = Quoted_Or_Bare(text, at, Quotes, Name_End);
-    request.*Member = value.text;
-    return value.end;
-}
-
-template <auto Member> Taken Take_Number(std::string_view text, std::size_t at)
-{
-    const Option_Value value = Up_To(text, at, Option_Start);
-    request.*Member =
-        static_cast<std::int32_t>(std::clamp(Leading_Integer(value.text), -2147483648L, 2147483647L));
-    return value.end;
-}
 
 /// Digits at `at`, as a number; `at` moves behind them. Nothing for none.
 bool Take_Digits(std::string_view text, std::size_t& at, std::int32_t& number)
@@ -249,34 +171,7 @@ Taken Take_Rest_As_Pointer(std::string_view text, std::size_t at)
     return text.size();
 }
 
-using R = Request_Globals;
-
-// How the command line offers an option.
-
-constexpr Named_Option Flag(std::string_view name)
-{
-    return {name};
-}
-
-constexpr Named_Option Bare(std::string_view name, std::string_view value, std::string_view join = "=")
-{
-    return {name, Value_Form::bare, value, join};
-}
-
-constexpr Named_Option Range(std::string_view name, std::string_view value)
-{
-    return {name, Value_Form::range, value};
-}
-
-constexpr Named_Option Quoted(std::string_view name, std::string_view value)
-{
-    return {name, Value_Form::quoted, value};
-}
-
-constexpr Named_Option Optional(std::string_view name, std::string_view value, std::string_view join = "=")
-{
-    return {name, Value_Form::optional, value, join};
-}
+constexpr bool Of_Some_Readers = true;
 
 constexpr Slash_Option Genotype_Table[] = {
     {"/rqtl", Set<&R::Qtl_Request, true>, "genotype files may be read", Flag("qtl")},
@@ -284,42 +179,50 @@ constexpr Slash_Option Genotype_Table[] = {
 };
 
 constexpr Slash_Option Input_Table[] = {
-    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT")},
+    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT"),
+     Of_Some_Readers},
     {"/g=", Take_Delete_Marker, "version number in the host's scratch names"},
     {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column",
-     Bare("skip-lines", "N")},
+     Bare("skip-lines", "N"), Of_Some_Readers},
     {"/a", Set<&R::Keep_Probe_Statistics, false>, "leave out statistics of microarray probes",
-     Flag("no-probe-statistics")},
+     Flag("no-probe-statistics"), Of_Some_Readers},
     {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks", Flag("keep-blanks")},
-    {"/csv", Take_Lines_Per_Record, "lines that make one record of a text", Bare("lines-per-record", "N")},
+    {"/csv", Take_Lines_Per_Record, "lines that make one record of a text", Bare("lines-per-record", "N"),
+     Of_Some_Readers},
     {"/c", Take_Column_Range, "columns to keep, first:last", Range("columns", "FIRST:LAST")},
     {"/db", Set<&R::Print_Summary, true>, "print a summary of the columns", Flag("print-summary")},
-    {"/m", Take_Missing_Codes, "up to three numbers that mean missing", Bare("missing-codes", "A,B,C")},
-    {"/d", Take_Title_Row, "row of column descriptions in a grid", Optional("description-row", "[$]N")},
-    {"/f", Set<&R::Keep_Long_Labels, true>, "keep long factor labels", Flag("keep-long-labels")},
+    {"/m", Take_Missing_Codes, "up to three numbers that mean missing", Bare("missing-codes", "A,B,C"),
+     Of_Some_Readers},
+    {"/d", Take_Title_Row, "row of column descriptions in a grid", Optional("description-row", "[$]N"),
+     Of_Some_Readers},
+    {"/f", Set<&R::Keep_Long_Labels, true>, "keep long factor labels", Flag("keep-long-labels"),
+     Of_Some_Readers},
     {"/h", Take_Prefix<&Settings::header_prefix>, "prefix of a name made from a number",
      Bare("header-prefix", "TEXT")},
     {"/o", Take_Column_Prefix, "prefix of automatic column names", Bare("column-prefix", "TEXT")},
     {"/k", Set<&R::Keep_Empty_Columns, true>, "keep empty columns", Flag("keep-empty-columns")},
     {"/l", Take_Flag_And_Number<&R::Log_Book, &R::Log_Book_Range>, "the grid is a log book",
-     Optional("log-book", "N")},
-    {"/n", Set<&R::No_Names, true>, "there is no row of names", Flag("no-names")},
+     Optional("log-book", "N"), Of_Some_Readers},
+    {"/n", Set<&R::No_Names, true>, "there is no row of names", Flag("no-names"), Of_Some_Readers},
     {"/#", Set_Setting<&Settings::bracket_names, 0>, "keep quoted suffixes of names as text",
      Flag("text-suffixes")},
     {"/y", Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>, "there is a row of names",
-     Optional("names", "ROW")},
+     Optional("names", "ROW"), Of_Some_Readers},
     {"/tr", Take_Transpose, "transpose; N: without names", Optional("transpose", "N")},
     {"/t", Take_Text_Number_Mode, "how texts become numbers, 0 to 4", Bare("text-numbers", "MODE")},
     {"/i", Set_Setting<&Settings::ignore_value_case, 1>, "labels differ in more than case",
-     Flag("ignore-label-case")},
-    {"/r", Set<&R::Reverse_Labels, true>, "swap values and labels", Flag("reverse-labels")},
+     Flag("ignore-label-case"), Of_Some_Readers},
+    {"/r", Set<&R::Reverse_Labels, true>, "swap values and labels", Flag("reverse-labels"), Of_Some_Readers},
     {"/u", Set_Setting<&Settings::auto_factors, 0>, "factor levels stay in the order of the data",
      Flag("levels-as-found")},
     {"/v", Set<&R::Use_Var_File, true>, "rename and retype columns by a list file", Flag("column-list")},
     {"/w", Set<&R::List_Sheets_Only, true>, "only list the sheets", Flag("list-sheets")},
-    {"/s", Take_Text<&R::Start_Text, true>, "data begin at the line that starts so", Quoted("start", "TEXT")},
-    {"/e", Take_Text<&R::End_Text, true>, "data end before the line that starts so", Quoted("end", "TEXT")},
-    {"/z=", Take_Text<&R::Custom_Separators>, "separators of fields", Quoted("separators", "TEXT")},
+    {"/s", Take_Text<&R::Start_Text, true>, "data begin at the line that starts so", Quoted("start", "TEXT"),
+     Of_Some_Readers},
+    {"/e", Take_Text<&R::End_Text, true>, "data end before the line that starts so", Quoted("end", "TEXT"),
+     Of_Some_Readers},
+    {"/z=", Take_Text<&R::Custom_Separators>, "separators of fields", Quoted("separators", "TEXT"),
+     Of_Some_Readers},
     {"/p=", Take_Rest_As_Pointer, "name of a pointer to the columns", Bare("pointer", "NAME")},
 };
 
@@ -509,16 +412,6 @@ constexpr Slash_Option Output_Table[] = {
     {"/%", Take_Merge, "merge with the existing output: number of keys, U, N or M"},
 };
 
-/// A key that another begins with must be searched behind it, or it would cut the other short.
-template <std::size_t Count> constexpr bool No_Key_Hides_A_Later_One(const Slash_Option (&options)[Count])
-{
-    for (std::size_t early = 0; early < Count; ++early)
-        for (std::size_t late = early + 1; late < Count; ++late)
-            if (options[late].key.starts_with(options[early].key))
-                return false;
-    return true;
-}
-
 static_assert(No_Key_Hides_A_Later_One(Genotype_Table));
 static_assert(No_Key_Hides_A_Later_One(Input_Table));
 static_assert(No_Key_Hides_A_Later_One(Output_Table));
@@ -540,16 +433,19 @@ std::span<const Slash_Option> Output_Options()
     return Output_Table;
 }
 
-void Cut_Options(std::span<const Slash_Option> options, std::string& text)
+std::vector<std::string_view> Cut_Options(std::span<const Slash_Option> options, std::string& text)
 {
+    std::vector<std::string_view> found;
     for (const Slash_Option& option : options) {
         const std::size_t start = text.find(option.key);
         if (start == std::string::npos)
             continue;
         const std::size_t end = option.take(text, start + option.key.size());
+        found.push_back(option.key);
         text.erase(start, end - start);
     }
     text = std::string(Trim_Copy(text));
+    return found;
 }
 
 Reflow_Order Take_Reflow_Order(std::string& outfile)

@@ -6,6 +6,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace ingester {
 
@@ -33,6 +34,7 @@ struct Slash_Option {
     std::size_t (*take)(std::string_view text, std::size_t at);
     std::string_view help;
     Named_Option named = {};
+    bool of_some_readers = false;  ///< means nothing to formats that don't list it
 };
 
 /// The options of both strings, in the order in which they are searched; of the Infile those of
@@ -41,8 +43,9 @@ struct Slash_Option {
 [[nodiscard]] std::span<const Slash_Option> Input_Options();
 [[nodiscard]] std::span<const Slash_Option> Output_Options();
 
-/// Finds each option of the table in `text`, acts on it and cuts it out; what stays is the name.
-void Cut_Options(std::span<const Slash_Option> options, std::string& text);
+/// Finds each option of the table in `text`, acts on it and cuts it out; what stays is the name. The keys
+/// that were found, of the table.
+std::vector<std::string_view> Cut_Options(std::span<const Slash_Option> options, std::string& text);
 
 /// "/rewrite=n" in the Outfile: lines are to be joined until they hold `fields` fields.
 struct Reflow_Order {

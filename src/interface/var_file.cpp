@@ -169,8 +169,8 @@ void Change_Column(Column* column, const std::string& line)
         Delete_Column(column, true);
         return;
     }
-    if (request.Names_Kept_As_They_Stand) {
-        column->name = line;
+    if (request.Names_Kept_As_They_Stand && !For_People(People_Rule::free_names)) {
+        column->name = line;  // and with its marks
         return;
     }
     if (column->sheet->type == vector_sheet)

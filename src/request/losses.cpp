@@ -1,5 +1,6 @@
 #include "request/losses.h"
 
+#include "request/messages.h"
 #include "request/request.h"
 
 #include <array>
@@ -86,6 +87,12 @@ void Note_Loss(Loss_Kind kind, std::string_view column, std::int64_t row, std::s
                std::int64_t count)
 {
     request.losses.Note(kind, column, row, example, count);
+}
+
+bool Losses_Are_Allowed()
+{
+    return !request.Strict || request.losses.Entries().empty()
+           || Fail("Error: The output was left as it was, since it can't hold all data as they are.\n");
 }
 
 std::string_view Words_Of(Loss_Kind kind)

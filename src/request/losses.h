@@ -72,6 +72,9 @@ private:
 void Note_Loss(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,
                std::int64_t count = 1);
 
+/// Whether what was lost so far may be; false after a message where the request is to be strict.
+[[nodiscard]] bool Losses_Are_Allowed();
+
 /// A kind in words, as "texts cut", and as one word for programs, as "text_cut".
 [[nodiscard]] std::string_view Words_Of(Loss_Kind kind);
 [[nodiscard]] std::string_view Key_Of(Loss_Kind kind);

@@ -41,6 +41,10 @@ struct Lasting_Globals {
 struct Request_Globals : Lasting_Globals {
     bool Out_Of_Memory = false;             ///< some cells were not made, which has been told
     std::bitset<People_Rule_Count> people;  ///< the rules for people that were asked for
+    bool Strict = false;                    ///< a loss makes the request fail
+    Fixed_Text<Long_Name_Width> Loss_Report_Name;
+    Fixed_Text<Long_Name_Width> Named_Secondary_File;  ///< by an option, beside lists of the pass file
+    Fixed_Text<60> Input_Encoding;  ///< the code of the input's letters, as it was declared
 
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
@@ -78,6 +82,7 @@ struct Request_Globals : Lasting_Globals {
     std::int32_t Current_Date_Format = 1;  ///< their display code
 
     // Input options.
+    std::vector<std::string_view> Input_Keys_Given;  ///< keys of the options that were taken; they live on
     bool Qtl_Request = false;
     bool Qtl_Map_Given = false;
     Fixed_Text<Short_Name_Width> Qtl_Map_File;

@@ -21,7 +21,8 @@ TEST(Format_Drivers, Outputs_Are_Chosen_By_Their_Extension)
         EXPECT_EQ(Output_Driver_Of(name).code, code) << name;
         EXPECT_EQ(Output_Driver_Of(name).max_columns, columns) << name;
     }
-    EXPECT_EQ(Output_Driver_Of(43).code, 43);
+    ASSERT_NE(Driver_Of_Code(43), nullptr);
+    EXPECT_EQ(Driver_Of_Code(43)->code, 43);
     EXPECT_FALSE(Read_Data_File("a", 3, "a") || Read_Data_File("a", 99, "a")) << "there are no such readers";
 }
 

@@ -3,6 +3,7 @@
 #include "hostfiles/tbk/tbk.h"
 #include "hostfiles/tbk/tbk_writer.h"
 #include "platform/folders.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -315,7 +316,7 @@ bool Write_Copy(Input_File& book, const std::string& shown, const std::string& s
 bool Update_Book(Input_File& book, const char* file_name, const std::string& shown, const Book_Change& change)
 {
     Scratch_File scratch(Scratch_Name(file_name));
-    if (!Write_Copy(book, shown, scratch.Name(), change))
+    if (!Write_Copy(book, shown, scratch.Name(), change) || !Losses_Are_Allowed())
         return false;
     if (Replace_File(scratch.Name(), file_name))
         return true;

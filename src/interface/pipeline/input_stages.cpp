@@ -2,6 +2,7 @@
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/paths.h"
+#include "interface/people_options.h"
 #include "interface/pipeline/stages.h"
 #include "interface/slash_options.h"
 #include "interface/var_file.h"
@@ -23,10 +24,32 @@ Request_Run::~Request_Run()
 {
     if (downloaded || clipboard_input || kept_stream)
         Delete_File(infile);
+    if (secondary_downloaded)
+        Delete_File(request.Secondary_File);
     if (map_downloaded)
         Delete_File(request.Qtl_Map_File);
     if (writing && (temp_output != outfile || !output_was_there))
         Delete_File(temp_output);
+}
+
+/// A pass file's strings have gone through here already, those of other callers haven't.
+Request_Status Take_Rules_For_People(Request_Run& run)
+{
+    Take_People_Options(run.infile, run.outfile);
+    return Done;
+}
+
+Request_Status Fetch_Named_Secondary(Request_Run& run)
+{
+    std::string name(request.Named_Secondary_File.view());
+    if (name.empty())
+        return Done;
+    std::string source_url;
+    if (!Fetch_Url(name, "SEC", source_url, Get_Temp_Folder(), run.secondary_downloaded))
+        return Stop(Request_Status::download_failed, "Could not download secondary file URL:\n%.500s\n",
+                    name.c_str());
+    request.Secondary_File = name;
+    return Done;
 }
 
 Request_Status Expand_Tokens(Request_Run& run)
@@ -73,7 +96,7 @@ Request_Status Reflow_Lines(Request_Run& run)
 
 Request_Status Cut_Input_Options(Request_Run& run)
 {
-    Cut_Options(Input_Options(), run.infile);
+    request.Input_Keys_Given = Cut_Options(Input_Options(), run.infile);
     return Done;
 }
 
@@ -225,20 +248,6 @@ Request_Status Read_Merge_Keys(Request_Run& run)
 
 namespace {
 
-/// Programs that take a clipboard's text understand these.
-Request_Status Take_Clipboard_Output(Request_Run& run)
-{
-    if (!Ends_With_One_Of(run.outfile, ".csv .tab .txt .gen .rda"))
-        return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
-    run.clipboard_output = true;
-    request.R_Text_Output = true;
-    return Done;
-}
-
-}  // namespace
-
-namespace {
-
 bool Adds_To_Compressed(std::string_view outfile)
 {
     const bool adds = request.Add_To_Output || request.Add_Mode != Add_Modes::none;
@@ -255,16 +264,27 @@ std::string_view Name_Of_Format(std::string_view outfile)
 
 }  // namespace
 
+namespace {
+
+/// R data go out in their text form where that is asked for, and to the clipboard, which takes texts.
+const Format_Driver& Chosen_Driver(const Request_Run& run)
+{
+    const Format_Driver& by_name = Output_Driver_Of(Name_Of_Format(run.outfile));
+    const bool as_text = by_name.code == r_data_file && (request.R_Text_Output || run.clipboard_output);
+    return as_text ? *Driver_Of_Code(r_text_file) : by_name;
+}
+
+}  // namespace
+
 Request_Status Choose_Output(Request_Run& run)
 {
-    if (Is_Clipboard_Output(run.outfile))
-        if (const Request_Status status = Take_Clipboard_Output(run); status != Done)
-            return status;
-    run.output = &Output_Driver_Of(Name_Of_Format(run.outfile));
-    if (run.output->code == r_data_file && request.R_Text_Output)
-        run.output = &Output_Driver_Of(r_text_file);
+    run.clipboard_output = Is_Clipboard_Output(run.outfile);
+    request.R_Text_Output = request.R_Text_Output || run.clipboard_output;
+    run.output = &Chosen_Driver(run);
+    if (run.clipboard_output && !Ends_With_One_Of(run.outfile, run.output->clipboard_extensions))
+        return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
     run.output_code = run.output->code;
-    request.CSV_Output = run.output_code == text_file && !run.output->extensions.empty();
+    request.CSV_Output = run.output_code == text_file && !Is_Fixed_Width_Text(*run.output);
     request.Max_Columns = static_cast<std::int32_t>(
         std::min<std::int64_t>(std::int64_t{run.output->max_columns} + std::max(request.First_Column - 1, 0),
                                std::numeric_limits<std::int32_t>::max()));
@@ -283,14 +303,13 @@ Request_Status Refuse_Same_File(Request_Run& run)
     return Done;
 }
 
-/// Formats that hold any text as the name of a column take the names as they are.
+/// Formats that hold any text as the name of a column take the names as they are. For people all names stand
+/// until an output is found that can't hold them.
 Request_Status Keep_Names_As_They_Stand(Request_Run& run)
 {
-    constexpr std::int32_t free_names[] = {
-        2, workbook_file, 8, 30, 31, xml_workbook_file, open_document_file};
+    const bool asked = request.No_Name_Marks || request.Use_Var_File;
     request.Names_Kept_As_They_Stand =
-        (request.No_Name_Marks || request.Use_Var_File)
-        && std::ranges::find(free_names, run.output_code) != std::end(free_names);
+        For_People(People_Rule::free_names) || (asked && run.output->names == Held_Names::free);
     return Done;
 }
 
@@ -365,7 +384,9 @@ constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
     {[](const Request_Run& run) { return Adds_To_Compressed(run.outfile) && run.output_code != book_file; },
      "Adding to a compressed output"},
-    {[](const Request_Run& run) { return request.Add_To_Output && run.output_code != book_file; },
+    {[](const Request_Run& run) {
+         return request.Add_To_Output && run.output->add == nullptr && File_Exists(run.outfile);
+     },
      "Adding to an existing output"},
 };
 

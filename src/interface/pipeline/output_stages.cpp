@@ -1,11 +1,11 @@
 // Stages that write the Sheet and put the new file in the place of an old one.
-#include "interface/book_updates.h"
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
 #include "interface/pipeline/stages.h"
 #include "interface/var_file.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "request/losses.h"
 #include "request/request.h"
 
 namespace ingester {
@@ -21,7 +21,7 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     // A device or a pipe takes the text itself; a rename would put a file in its place.
     request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there && !Is_Special_File(run.outfile);
     run.temp_output = run.outfile;
-    if (!request.Write_Via_Temp || request.Add_To_Output)
+    if (!request.Write_Via_Temp || run.Updates_Output())
         return Done;
     run.temp_output = With_Extension(run.outfile, ".$$$");
     if (run.temp_output == run.outfile)
@@ -52,17 +52,22 @@ void Begin_Writing(Request_Run& run)
 
 namespace {
 
-/// A Sheet goes into the book that is there, or into a new file.
+/// A Sheet goes into the file that is there, or into a new one.
 bool Write_Or_Add(const Request_Run& run)
 {
-    if (run.output_code != book_file || !request.Add_To_Output || !run.output_was_there)
+    if (!run.Updates_Output())
         return run.output->write(Current_Sheet, run.temp_output.c_str());
     return request.Replace_Sheet_Asked || request.Sheet_Already_There
-               ? Replace_Sheet(Current_Sheet, run.outfile.c_str(), request.Output_Sheet_Name)
-               : Add_Sheet(Current_Sheet, run.outfile.c_str());
+               ? run.output->replace(Current_Sheet, run.outfile.c_str(), request.Output_Sheet_Name)
+               : run.output->add(Current_Sheet, run.outfile.c_str());
 }
 
 }  // namespace
+
+Request_Status Forbid_Losses(Request_Run&)
+{
+    return Losses_Are_Allowed() ? Done : Request_Status::output_failed;
+}
 
 Request_Status Write_Output(Request_Run& run)
 {

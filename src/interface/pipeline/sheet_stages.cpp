@@ -4,7 +4,9 @@
 #include "interface/output_sheet.h"
 #include "interface/pipeline/stages.h"
 #include "interface/selection.h"
+#include "interface/slash_options.h"
 #include "interface/var_file.h"
+#include "model/column_names.h"
 #include "model/column_summary.h"
 #include "model/names.h"
 #include "model/output_forms.h"
@@ -50,6 +52,45 @@ Request_Status Read_Input(Request_Run& run)
     return Done;
 }
 
+namespace {
+
+/// What a user knows an option by.
+std::string Shown_Option(const Slash_Option& option)
+{
+    return option.named.name.empty() ? std::string(option.key) : std::string("--").append(option.named.name);
+}
+
+void Tell_Vain(const std::string& option, const Format_Driver& input)
+{
+    Fail("Warning: %s means nothing to this input, %s, and had no effect.\n", option.c_str(),
+         std::string(input.name).c_str());
+}
+
+/// Whether the list of what a format's reader acts on holds `key`.
+bool Acts_On(const Format_Driver& input, std::string_view key)
+{
+    const std::string listed = std::string(" ").append(input.options).append(" ");
+    return listed.find(std::string(" ").append(key).append(" ")) != std::string::npos;
+}
+
+}  // namespace
+
+Request_Status Tell_Vain_Options(Request_Run&)
+{
+    const Format_Driver* const input = Driver_Of_Code(request.Content_Code);
+    if (!For_People(People_Rule::told_options) || input == nullptr)
+        return Done;
+    for (const Slash_Option& option : Input_Options())
+        if (option.of_some_readers && !Acts_On(*input, option.key)
+            && std::ranges::find(request.Input_Keys_Given, option.key) != request.Input_Keys_Given.end())
+            Tell_Vain(Shown_Option(option), *input);
+    if (!request.Worksheet_Name.empty() && input->sheet_names == nullptr && !input->lists_sheets)
+        Tell_Vain("--sheet", *input);
+    if (!request.Cell_Range.empty() && !Acts_On(*input, "range"))
+        Tell_Vain("--range", *input);
+    return Done;
+}
+
 /// A name that was asked for goes to the Sheet; else the Sheet's own goes to the output.
 Request_Status Name_Output_Sheet(Request_Run& run)
 {
@@ -64,22 +105,11 @@ Request_Status Name_Output_Sheet(Request_Run& run)
     return Done;
 }
 
-namespace {
-
-/// Inputs whose readers list their sheets themselves.
-bool Has_Sheet_List(std::int32_t code)
-{
-    constexpr std::int32_t listed[] = {book_file, workbook_file,   xml_workbook_file, open_document_file,
-                                       8,         /* Quattro */ 40 /* Tablet */};
-    return std::ranges::find(listed, code) != std::end(listed);
-}
-
-}  // namespace
-
 /// A file of one sheet gives a list of one.
 Request_Status List_Sheets(Request_Run&)
 {
-    if (!request.List_Sheets_Only || Has_Sheet_List(request.Content_Code))
+    const Format_Driver* const input = Driver_Of_Code(request.Content_Code);
+    if (!request.List_Sheets_Only || (input != nullptr && input->lists_sheets))
         return Done;
     const std::string name(Current_Sheet->sheet_name.empty() ? "Sheet1" : Current_Sheet->sheet_name.view());
     Sheet* const list = New_Sheet_With_Rows(1);
@@ -99,7 +129,7 @@ Request_Status Find_Sheet_Of_Output(Request_Run& run)
     if (!Find_Output_Sheet(run.outfile))
         return Stop(Request_Status::input_unreadable, "Sheets of %.500s could not be listed.\n",
                     run.outfile.c_str());
-    if (run.output_code == book_file || run.output_code == xml_workbook_file)
+    if (run.output->add != nullptr)
         request.Add_To_Output = File_Exists(run.outfile);
     if (!request.Merge_Sheet_Name.empty())
         Current_Sheet->sheet_name = request.Merge_Sheet_Name;
@@ -206,10 +236,21 @@ Request_Status Keep_Range_Of_Columns(Request_Run&)
     return Done;
 }
 
+/// Names that stood as they were become valid where the output needs it.
+Request_Status Fit_Names_To_Output(Request_Run& run)
+{
+    if (!For_People(People_Rule::free_names) || run.output->names != Held_Names::valid)
+        return Done;
+    request.Names_Kept_As_They_Stand = false;
+    for (Column* column = Current_Sheet->first_column; column != nullptr; column = column->next)
+        if (column->type != row_column)
+            Make_Name_Valid(*column);
+    return Done;
+}
+
 Request_Status Make_Names_Unique(Request_Run& run)
 {
-    constexpr std::int32_t told_by_name[] = {spreadsheet_file, script_file, book_file, r_text_file};
-    if (std::ranges::find(told_by_name, run.output_code) != std::end(told_by_name))
+    if (run.output->unique_names)
         Make_Column_Names_Unique(Current_Sheet);
     return Done;
 }

@@ -24,6 +24,7 @@ struct Request_Run {
     std::string source_name;   ///< the pipe's own name
     bool clipboard_output = false;
     bool map_downloaded = false;
+    bool secondary_downloaded = false;
     bool genotype = false;      ///< the input goes the road of genotype files
     bool host_scratch = false;  ///< the output is a scratch file of the host's own
     bool output_was_there = false;
@@ -39,6 +40,12 @@ struct Request_Run {
         if (downloaded)
             return request.Source_Url;
         return kept_stream ? source_name : infile;
+    }
+
+    /// Whether the Sheet goes into the output that is there, by its format's own way of adding.
+    [[nodiscard]] bool Updates_Output() const
+    {
+        return request.Add_To_Output && output_was_there && output->add != nullptr;
     }
 
     Request_Run() = default;
@@ -63,7 +70,9 @@ Request_Status Stop(Request_Status status, const char* words, Arguments... argum
 
 // --- From the two strings to the files they name -------------------------------------------------
 
+Request_Status Take_Rules_For_People(Request_Run& run);
 Request_Status Expand_Tokens(Request_Run& run);
+Request_Status Fetch_Named_Secondary(Request_Run& run);
 Request_Status Cut_Genotype_Options(Request_Run& run);
 Request_Status Fetch_Map(Request_Run& run);
 /// "/rewrite=n" in the Outfile: no table, but lines joined until they hold n fields.
@@ -90,6 +99,7 @@ Request_Status Refuse_Missing_Operations(Request_Run& run);
 // --- The Sheet -----------------------------------------------------------------------------------
 
 Request_Status Read_Input(Request_Run& run);
+Request_Status Tell_Vain_Options(Request_Run& run);
 Request_Status Name_Output_Sheet(Request_Run& run);
 Request_Status List_Sheets(Request_Run& run);
 Request_Status Find_Sheet_Of_Output(Request_Run& run);
@@ -101,6 +111,8 @@ Request_Status Name_Temporary_Output(Request_Run& run);
 Request_Status Change_By_List(Request_Run& run);
 /// Acts twice: on what was read, and on what it was joined with.
 Request_Status Mark_Source(Request_Run& run);
+/// Acts in front of joins, which go by names, and on the result.
+Request_Status Fit_Names_To_Output(Request_Run& run);
 Request_Status Join_With_Output(Request_Run& run);
 Request_Status Keep_Range_Of_Columns(Request_Run& run);
 Request_Status Make_Names_Unique(Request_Run& run);
@@ -112,6 +124,8 @@ Request_Status Tell_Summary(Request_Run& run);
 // --- The output ----------------------------------------------------------------------------------
 
 Request_Status Make_Output_Form(Request_Run& run);
+/// Acts before and after writing: what the reader lost needs no writer.
+Request_Status Forbid_Losses(Request_Run& run);
 Request_Status Write_Output(Request_Run& run);
 /// From here on the file that the writer writes is ours, and goes when the request fails.
 void Begin_Writing(Request_Run& run);
