@@ -26,7 +26,6 @@ run: $(RELEASE)
 	@tools/run_example.sh build/release/ingester
 
 test: $(RELEASE)
-	@tools/set_up.sh test
 	@cmake --build build/release
 	@ctest --test-dir build/release --output-on-failure -j "$$(nproc)"
 

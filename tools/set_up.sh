@@ -1,13 +1,16 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that the given kinds of work need and that are missing.
-# Usage: tools/set_up.sh KIND...    kinds: build test bench fuzz coverage format tidy
+# Usage: tools/set_up.sh KIND...    kinds: build bench fuzz coverage format tidy
 set -euo pipefail
+dependencies=$(dirname "$0")/../cmake/dependencies.txt
 
 # "package" is looked up with dpkg, "package:command" is there when the command is.
 needs_of() {
     case $1 in
-        build) echo g++:g++ cmake:cmake ninja-build:ninja libcli11-dev libgtest-dev zlib1g-dev libcurl4-openssl-dev ;;
-        test) echo pkgconf:pkg-config ;;
+        build)
+            echo g++:g++ cmake:cmake ninja-build:ninja pkgconf:pkg-config
+            sed -n 's/^\([a-z0-9][^ ]*\) .*/\1/p' "$dependencies"
+            ;;
         bench) echo python3:python3 ;;
         fuzz) echo clang:clang++ libclang-rt-dev ;;
         coverage) echo llvm:llvm-cov ;;
