@@ -5,6 +5,7 @@
 #include "model/date_format.h"
 #include "model/date_text.h"
 #include "model/text_number.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 
@@ -41,6 +42,7 @@ void Begin_Warnings(bool& begun, std::string_view title)
 
 void Warn_Of_Number(const Column& column, long row, std::string_view text, double number)
 {
+    Note_Loss(Loss_Kind::text_not_number, column.name, row, text);
     Begin_Warnings(request.Number_Warnings_Begun, "Text to Number Conversion Warnings\n \n");
     const std::string words(text);
     if (Is_Present(*column.sheet, number))
@@ -226,6 +228,7 @@ bool Read_Date_Cell(std::string_view text, std::int32_t format, double missing, 
 
 void Warn_Of_Date(const Column& column, long row, std::string_view text)
 {
+    Note_Loss(Loss_Kind::text_not_number, column.name, row, text);
     Begin_Warnings(request.Date_Warnings_Begun, "Text to Date Conversion Warnings\n \n");
     Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, std::string(text).c_str());
 }
