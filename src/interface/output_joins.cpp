@@ -160,7 +160,7 @@ Request_Status Merge_With_Output(Sheet* sheet, const std::string& path)
     Merge_Request wanted;
     wanted.target = Current_Sheet;
     wanted.source = sheet;
-    wanted.key_count = std::clamp(request.Merge_Key_Count, 1, static_cast<std::int32_t>(Most_Merge_Keys));
+    wanted.key_count = std::clamp(request.Merge_Key_Count, 1, Most_Asked_Keys);
     wanted.update_columns = request.Unique_Rows;
     wanted.fill_mode = request.Merge_Fill;
     Sheet* const joined = Current_Sheet;

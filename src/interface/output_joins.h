@@ -4,9 +4,13 @@
 #include "interface/status.h"
 #include "model/sheet.h"
 
+#include <cstdint>
 #include <string>
 
 namespace ingester {
+
+/// The keys on which a request merges.
+constexpr std::int32_t Most_Asked_Keys = 4;
 
 /// Read the file at `path` and join `sheet` with it: columns beside its columns, rows beneath its rows, or
 /// rows on keys. The result becomes the `Current_Sheet`. A status after a message tells why it can't be;

@@ -7,7 +7,6 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <initializer_list>
 #include <iterator>
 
 namespace ingester {
@@ -165,21 +164,6 @@ bool Is_Host_Scratch_File(std::string_view name)
     const bool in_temp = folder.empty() ? temp == ".\\" : Equal_Ignoring_Case(folder, temp);
     return in_temp && Starts_Ignoring_Case(File_Part_Of(name), request.Return_Delete_Marker)
            && Ends_With_One_Of(name, ".TSS .TBK");
-}
-
-std::string Find_Companion(const std::string& name)
-{
-    const std::size_t start = Extension_Start(name);
-    std::string small = name;
-    std::string capital = name;
-    std::transform(name.begin() + static_cast<std::ptrdiff_t>(start), name.end(),
-                   small.begin() + static_cast<std::ptrdiff_t>(start), To_Lower);
-    std::transform(name.begin() + static_cast<std::ptrdiff_t>(start), name.end(),
-                   capital.begin() + static_cast<std::ptrdiff_t>(start), To_Upper);
-    for (const std::string* const form : std::initializer_list<const std::string*>{&name, &small, &capital})
-        if (File_Exists(*form))
-            return *form;
-    return name;
 }
 
 namespace {

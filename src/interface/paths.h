@@ -33,10 +33,6 @@ void Expand_Path_Tokens(std::string& name, std::string_view temp_folder);
 /// request's `Return_Delete_Marker`, a ".TSS" or ".TBK".
 [[nodiscard]] bool Is_Host_Scratch_File(std::string_view name);
 
-/// The name under which a file that goes with another is there: as it stands, or with its extension in
-/// small or capital letters; as it stands when there is none.
-[[nodiscard]] std::string Find_Companion(const std::string& name);
-
 /// Makes a local copy of a URL, under a scratch name in `temp_folder` that begins with `label`, and puts that
 /// into `name`. True without doing anything for other names. False when the copy could not be made, and
 /// `name` is as it was.

@@ -35,7 +35,10 @@ Subset_Result Apply_Subset(Sheet* sheet, std::int32_t type)
     if (request.Subset_Columns && sheet->column_count < 1)
         return Subset_Result::no_columns;
     Tell_Missing_Columns(*sheet);
-    if (request.Subset_Rows && !host_file && !Keep_Rows(sheet, request.Subset_Row_Flags))
+    if (request.Subset_Rows && !host_file && !request.Rows_Were_Selected
+        && !Keep_Rows(sheet, request.Subset_Row_Flags))
+        return Subset_Result::no_rows;
+    if (request.Rows_Were_Selected && request.Subset_Rows && sheet->row_count < 1)
         return Subset_Result::no_rows;
     return Subset_Result::kept;
 }

@@ -1,5 +1,6 @@
 // Columns as they are asked for: of a type that suits the Sheet, with levels, labels and a first value.
 #include "model/column_rules.h"
+#include "model/factor_lists.h"
 #include "model/sheet.h"
 #include "request/messages.h"
 #include "support/number_text.h"
@@ -7,6 +8,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
 namespace ingester {
 
@@ -118,32 +120,40 @@ std::int32_t Level_Value_Width(double value)
     return static_cast<std::int32_t>(std::max(std::trunc(std::log10(size)), 0.0)) + 1;
 }
 
+/// The next node of a list, null behind its end.
+const Level_Node* Step_Over(const Level_Node*& node)
+{
+    return node == nullptr ? nullptr : std::exchange(node, node->next);
+}
+
+bool Copy_Level_Values(Column& column, const Column_Request& wanted)
+{
+    const Level_Node* from = wanted.level_values;
+    return Put_Level_Values(column, from == nullptr ? 0 : wanted.level_values_count, [&] {
+        const Level_Node* const node = Step_Over(from);
+        if (node == nullptr)
+            return Missing_Value;
+        column.width = std::max(column.width, Level_Value_Width(node->value.number));
+        return node->value.number;
+    });
+}
+
+bool Copy_Labels(Column& column, const Column_Request& wanted)
+{
+    const Level_Node* from = wanted.labels;
+    return Put_Labels(column, from == nullptr ? 0 : wanted.label_count, [&] {
+        const Level_Node* const node = Step_Over(from);
+        return node == nullptr ? Text_Arena::Empty() : column.texts.Store(node->Text());
+    });
+}
+
 bool Copy_Levels(Column& column, const Column_Request& wanted)
 {
     column.nlevels = wanted.nlevels;
-    if (wanted.level_values_count > 0 && wanted.level_values != nullptr) {
-        if (!Make_Level_Values(column, wanted.level_values_count))
-            return false;
-        const Level_Node* from = wanted.level_values;
-        for (Level_Node* to = column.level_values; to != nullptr && from != nullptr;
-             to = to->next, from = from->next) {
-            to->value = from->value;
-            column.width = std::max(column.width, Level_Value_Width(to->value.number));
-        }
-        column.factor_kind = factor_with_levels;
-    }
-    if (wanted.label_count > 0 && wanted.labels != nullptr) {
-        if (!Make_Labels(column, wanted.label_count))
-            return false;
-        const Level_Node* from = wanted.labels;
-        for (Level_Node* to = column.labels; to != nullptr && from != nullptr;
-             to = to->next, from = from->next) {
-            to->value.text = column.texts.Store(from->Text());
-            column.label_width = std::max(column.label_width, static_cast<std::int32_t>(to->Text().size()));
-        }
-        column.width = std::max(column.width, column.label_width);
-        column.factor_kind = factor_with_labels;
-    }
+    if (!Copy_Level_Values(column, wanted) || !Copy_Labels(column, wanted))
+        return false;
+    column.width = std::max(column.width, column.label_width);
+    column.factor_kind = Factor_Kind_Of(column);
     return true;
 }
 

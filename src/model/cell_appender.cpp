@@ -87,6 +87,17 @@ std::vector<Cell_Appender> Make_Appenders(Sheet& sheet, Column* first, std::int6
     return appenders;
 }
 
+void Cell_Appender::Append_Missing(std::int64_t count)
+{
+    Cell_Value blank;
+    if (Is_Text_Like(column_->type))
+        blank.text = Text_Arena::Empty();
+    else
+        blank.number = column_->sheet->missing_value;
+    for (std::int64_t i = 0; i < count; ++i)
+        Append(blank);
+}
+
 void Cell_Appender::Finish(std::int32_t length)
 {
     if (length < 1 || last_ == nullptr) {

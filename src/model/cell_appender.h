@@ -36,6 +36,10 @@ public:
         return *cell;
     }
 
+    /// Puts `count` cells without data behind each other: empty texts, or the Sheet's missing value. Throws
+    /// as `Append` does.
+    void Append_Missing(std::int64_t count = 1);
+
     /// The cell appended last.
     [[nodiscard]] Cell_Node& Last() { return *last_; }
 

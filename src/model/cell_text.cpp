@@ -1,6 +1,7 @@
 #include "model/cell_text.h"
 
 #include "model/date_text.h"
+#include "request/losses.h"
 #include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
@@ -112,6 +113,14 @@ void Set_Cell_From_Text(Column& column, Cell_Node& cell, std::string_view text)
         cell.value.number = missing;
     else
         cell.value.number = Number_Or_Date(column, text);
+}
+
+void Set_Wide_Text(Column& column, Cell_Node& cell, std::string_view text, std::int64_t row)
+{
+    Make_Room_For(column, text);
+    Set_Text(column, cell, text);
+    if (cell.Text().size() < text.size())
+        Note_Loss(Loss_Kind::text_cut, column.name, row, text);
 }
 
 bool Set_Cell_From_Text(Column* column, std::int32_t row, std::string_view text)

@@ -1,5 +1,6 @@
 #include "model/factors.h"
 
+#include "model/column_printer.h"
 #include "model/factor_order.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
@@ -125,7 +126,7 @@ void Finish_Variate_Factor(Column& column, std::int32_t nlevels)
     Free_Cell_Nodes(&column, label_nodes);
     column.label_width = 0;
     column.nlevels = nlevels;
-    column.factor_kind = column.level_values != nullptr ? factor_with_levels : plain_factor;
+    column.factor_kind = Factor_Kind_Of(column);
     if (column.format != date_format_mark)
         column.format = significant_digits_format;
 }
@@ -208,18 +209,9 @@ bool Are_Positions(const std::vector<double>& keys, const std::vector<std::uint3
 bool Keep_Level_Values(Column& column, const std::vector<double>& keys,
                        const std::vector<std::uint32_t>& order)
 {
-    if (Are_Positions(keys, order)) {
-        Free_Cell_Nodes(&column, level_value_nodes);
-        return true;
-    }
-    if (!Make_Level_Values(column, static_cast<std::int32_t>(order.size())))
-        return false;
-    Level_Node* node = column.level_values;
-    for (const std::uint32_t key : order) {
-        node->value.number = keys[key];
-        node = node->next;
-    }
-    return true;
+    const std::size_t count = Are_Positions(keys, order) ? 0 : order.size();
+    return Put_Level_Values(column, static_cast<std::int32_t>(count),
+                            [&, key = order.begin()]() mutable { return keys[*key++]; });
 }
 
 }  // namespace
@@ -359,17 +351,8 @@ bool Keep_Labels(Column& column, const std::vector<std::string_view>& keys,
     stored.reserve(order.size());
     for (const std::uint32_t key : order)
         stored.push_back(texts.Store(keys[key]));
-    if (!stored.empty() && !Make_Labels(column, static_cast<std::int32_t>(stored.size())))
-        return false;
-    Level_Node* node = column.labels;
-    std::size_t widest = 0;
-    for (const char* label : stored) {
-        node->value.text = label;
-        node = node->next;
-        widest = std::max(widest, Text_Arena::View(label).size());
-    }
-    column.label_width = static_cast<std::int32_t>(widest);
-    return true;
+    column.label_width = 0;
+    return Put_Labels(column, stored);
 }
 
 void Finish_Text_Factor(Column& column, std::int32_t wanted_levels)
@@ -471,19 +454,6 @@ template <class Text_Of> bool Turn_Into_Text(Column& column, bool text_only, Tex
     return true;
 }
 
-/// What each level of a Factor's list prints as, kept in the column.
-std::vector<const char*> Stored_Levels(Column& column)
-{
-    char text[Number_Text_Room];
-    if (column.factor_kind == factor_with_labels)
-        return Label_Table(column);
-    std::vector<const char*> stored;
-    if (column.factor_kind == factor_with_levels)
-        for (const Level_Node* node = column.level_values; node != nullptr; node = node->next)
-            stored.push_back(column.texts.Store({text, Format_Cell_Fully(text, column, node->value.number)}));
-    return stored;
-}
-
 }  // namespace
 
 bool Factor_To_Text(Column* column, bool text_only)
@@ -491,7 +461,8 @@ bool Factor_To_Text(Column* column, bool text_only)
     constexpr int level_digits = 15;
     if (column == nullptr || column->type != factor_column)
         return false;
-    const std::vector<const char*> stored = Stored_Levels(*column);
+    const std::vector<const char*> stored =
+        Printed_Levels(*column, Number_Print::as_said, level_digits, column->texts);
     return Turn_Into_Text(*column, text_only, [&](double level) {
         if (const char* const text = Of_Level<const char*>(stored, level, nullptr); text != nullptr)
             return text;

@@ -3,15 +3,13 @@
 // A conversion that fails leaves the Column as it was.
 #pragma once
 
+#include "model/factor_lists.h"
 #include "model/sheet.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace ingester {
-
-/// Characters of a text by which labels are told apart, and of the longest label.
-constexpr std::size_t Long_Label_Width = 250;
 
 /// The most bytes of a table of distinct values, or of places of distinct labels.
 constexpr std::size_t Greatest_Level_Table = 160000000;

@@ -1,7 +1,6 @@
 #include "model/number_format.h"
 
 #include "model/date_format.h"
-#include "model/level_tables.h"
 #include "request/request.h"
 #include "support/number_text.h"
 
@@ -87,29 +86,6 @@ std::string_view Format_Cell(const Column& column, const Cell_Node& cell, char* 
         return Factor_Label_Or_Level(column, static_cast<std::int32_t>(value), target);
     *target = '*';
     return {target, column.factor_kind == factor_with_labels ? 0U : 1U};
-}
-
-Cell_Printer::Cell_Printer(const Column& column) : column_(&column)
-{
-    if (column.type == factor_column && column.factor_kind == factor_with_labels)
-        labels_ = Label_Table(column);
-    else if (column.type == factor_column && column.factor_kind == factor_with_levels)
-        values_ = Level_Table(column);
-}
-
-std::string_view Cell_Printer::Print(const Cell_Node& cell, char* target) const
-{
-    if (labels_.empty() && values_.empty())
-        return Format_Cell(*column_, cell, target);
-    const double level = cell.value.number;
-    if (level < 1.0 || level > column_->nlevels || !Cell_Is_Present(*column_, cell))
-        return Format_Cell(*column_, cell, target);
-    if (const char* const label = Of_Level<const char*>(labels_, level, nullptr); label != nullptr)
-        return Text_Arena::View(label);
-    const bool listed = level < static_cast<double>(values_.size()) + 1.0;
-    char* const end = listed ? Format_Cell_Number(target, *column_, Of_Level(values_, level, level))
-                             : Print_Integer(target, static_cast<std::int32_t>(level));
-    return {target, static_cast<std::size_t>(end - target)};
 }
 
 }  // namespace ingester

@@ -5,7 +5,6 @@
 
 #include <cstdint>
 #include <string_view>
-#include <vector>
 
 namespace ingester {
 
@@ -28,18 +27,5 @@ char* Format_Cell_Fully(char* target, const Column& column, double value);
 /// What cell `level` of a Factor prints as: its label, level value or number. Valid until `target`
 /// (of `Number_Text_Room`) changes. `level` is from 1.
 [[nodiscard]] std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target);
-
-/// Prints cells of one Column as `Format_Cell` does. The labels or level values of a Factor are gathered
-/// once, so they must stay as they are.
-class Cell_Printer {
-public:
-    explicit Cell_Printer(const Column& column);
-    [[nodiscard]] std::string_view Print(const Cell_Node& cell, char* target) const;
-
-private:
-    const Column* column_;
-    std::vector<const char*> labels_;
-    std::vector<double> values_;
-};
 
 }  // namespace ingester

@@ -5,6 +5,7 @@
 #include "request/request.h"
 #include "support/text.h"
 
+#include <algorithm>
 #include <unordered_map>
 #include <vector>
 
@@ -67,6 +68,87 @@ void Missing_Names::Tell(const std::string& name)
     constexpr int most = 10;
     if (++told_ <= most)
         Report_Message_Text(warning_, name.c_str());
+}
+
+void Name_From_Input(Column& column, std::string_view spelled, std::string_view name)
+{
+    column.name = Make_Valid_Name(name);
+    Use_Bracket_Text(column);
+    column.input_name = Trim_Copy(spelled);
+}
+
+namespace {
+
+/// The names of the list stand for one column each.
+std::unordered_set<const Column*> Columns_Of_List(const Sheet& sheet)
+{
+    std::unordered_set<const Column*> listed;
+    if (!request.Subset_By_Number)
+        for (const Column* const column : Find_Listed(sheet, request.Subset_Names))
+            listed.insert(column);
+    return listed;
+}
+
+}  // namespace
+
+std::vector<bool> Wanted_Columns(Sheet& sheet)
+{
+    std::vector<bool> wanted(static_cast<std::size_t>(sheet.column_count), true);
+    if (!request.Subset_Columns)
+        return wanted;
+    const Column_Subset numbers;
+    const std::unordered_set<const Column*> listed = Columns_Of_List(sheet);
+    std::size_t place = 0;
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        column->input_place = column->index;
+        wanted[place++] =
+            request.Subset_By_Number ? numbers.Keeps(column->index, {}) : listed.contains(column);
+    }
+    return wanted;
+}
+
+void Keep_Wanted_Columns(Sheet& sheet, const std::vector<bool>& wanted)
+{
+    if (std::ranges::find(wanted, false) != wanted.end())
+        Keep_Columns(&sheet, wanted);
+    request.Columns_Were_Selected = true;
+}
+
+std::vector<Column*> Narrow_Columns(Sheet& sheet)
+{
+    const std::vector<bool> wanted = Wanted_Columns(sheet);
+    std::vector<Column*> columns;
+    columns.reserve(wanted.size());
+    for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
+        columns.push_back(wanted[columns.size()] ? column : nullptr);
+    Keep_Wanted_Columns(sheet, wanted);
+    return columns;
+}
+
+std::int32_t Row_Selection::Count(std::int32_t rows) const
+{
+    if (!active)
+        return rows;
+    const auto listed = std::min(static_cast<std::size_t>(rows), flags.size());
+    return static_cast<std::int32_t>(listed
+                                     - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
+}
+
+std::vector<std::int32_t> Row_Selection::New_Rows(std::int32_t rows) const
+{
+    const auto listed = flags.first(std::min(static_cast<std::size_t>(rows), flags.size()));
+    std::vector<std::int32_t> places;
+    places.reserve(listed.size());
+    std::int32_t next = 0;
+    for (const std::int32_t flag : listed)
+        places.push_back(flag != 0 ? next++ : -1);
+    return places;
+}
+
+Row_Selection Narrow_Rows()
+{
+    request.Rows_Were_Selected = true;
+    return {request.Subset_Rows, request.Subset_Row_Flags};
 }
 
 bool Keep_Column_Subset(Sheet* sheet)

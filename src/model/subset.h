@@ -54,6 +54,40 @@ private:
     int told_ = 0;
 };
 
+/// Names a Column as a file `spells` it, less the marks that `name` doesn't have: cleaned, with the text of a
+/// bracketed suffix in `extra`. Lists find it by either spelling.
+void Name_From_Input(Column& column, std::string_view spelled, std::string_view name);
+
+/// For each data Column of a Sheet, by its place, whether the request's list has it; with a list, each notes
+/// its `input_place`. Names must be as they are to stay.
+[[nodiscard]] std::vector<bool> Wanted_Columns(Sheet& sheet);
+
+/// Takes the others out. The stages behind the reader leave the columns as they are then.
+void Keep_Wanted_Columns(Sheet& sheet, const std::vector<bool>& wanted);
+
+/// Both, before there are cells: the Columns by their place in the input, null for those that were left out.
+/// A range of columns stays with the stages, which count it in what the request has made of the Sheet.
+[[nodiscard]] std::vector<Column*> Narrow_Columns(Sheet& sheet);
+
+/// The rows that a request keeps.
+struct Row_Selection {
+    bool active = false;
+    std::span<const std::int32_t> flags;  ///< rows beyond are left out
+
+    [[nodiscard]] bool Keeps(std::int64_t row) const
+    {
+        return !active || (row < std::ssize(flags) && flags[static_cast<std::size_t>(row)] != 0);
+    }
+    /// How many of the first `rows`.
+    [[nodiscard]] std::int32_t Count(std::int32_t rows) const;
+    /// The places (from 0) that an active selection gives the first `rows`, -1 for one that is left out.
+    [[nodiscard]] std::vector<std::int32_t> New_Rows(std::int32_t rows) const;
+};
+
+/// The request's rows, for a reader that makes no others: the stages behind it leave the rows as they are
+/// then.
+[[nodiscard]] Row_Selection Narrow_Rows();
+
 /// Leaves the request's columns in a Sheet. The leading Factors of a Table stay, since its cells belong to
 /// them. False when no data column is left.
 bool Keep_Column_Subset(Sheet* sheet);

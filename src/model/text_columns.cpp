@@ -151,7 +151,7 @@ Date_Counts Count_Readings(const Column& column, bool sample, Remembered_Dates* 
 bool Is_Passed_Over(std::int32_t format, const Date_Format_Search& search)
 {
     if (search.sample)
-        return format == year_format || format == year_format + 1;
+        return format == short_year_format || format == year_format;
     return search.time_mode && format < time_format;
 }
 

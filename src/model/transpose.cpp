@@ -1,9 +1,10 @@
 #include "model/transpose.h"
 
 #include "model/cell_appender.h"
+#include "model/column_printer.h"
+#include "model/factor_lists.h"
 #include "model/level_tables.h"
 #include "model/names.h"
-#include "model/number_format.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/number_text.h"
@@ -21,9 +22,9 @@ namespace {
 /// One old data column, which becomes a row.
 struct Old_Column {
     const Column* column;
-    const Cell_Node* cell;                     ///< the next to be taken
-    std::vector<double> levels;                ///< of a Factor
-    std::optional<Cell_Printer> printer = {};  ///< where the new cells are texts
+    const Cell_Node* cell;                       ///< the next to be taken
+    std::vector<double> levels;                  ///< of a Factor
+    std::optional<Column_Printer> printer = {};  ///< where the new cells are texts
 };
 
 /// What is transposed into what.
@@ -164,23 +165,14 @@ bool Label_Levels(const Transposition& work, Column& factor)
     const std::int32_t state = work.from->label_state;
     const bool valued = state == labels_by_level || state == labels_by_text_and_level;
     const bool labelled = state == labels_by_text || state == labels_by_text_and_level;
-    if ((valued && !Make_Level_Values(factor, factor.nlevels))
-        || (labelled && !Make_Labels(factor, factor.nlevels)))
+    const Old_Column* valued_by = work.data.data();
+    const Old_Column* labelled_by = work.data.data();
+    if (!Put_Level_Values(factor, valued ? factor.nlevels : 0,
+                          [&] { return (valued_by++)->column->table_margin_value; })
+        || !Put_Labels(factor, labelled ? factor.nlevels : 0,
+                       [&] { return factor.texts.Store(Label_Text(*(labelled_by++)->column)); }))
         return false;
-    Level_Node* value = factor.level_values;
-    Level_Node* label = factor.labels;
-    for (const Old_Column& old : std::span(work.data).first(static_cast<std::size_t>(factor.nlevels))) {
-        const Column& column = *old.column;
-        if (value != nullptr) {
-            value->value.number = column.table_margin_value;
-            value = value->next;
-        }
-        if (label != nullptr) {
-            label->value.text = factor.texts.Store(Label_Text(column));
-            label = label->next;
-        }
-    }
-    factor.factor_kind = labelled ? factor_with_labels : valued ? factor_with_levels : plain_factor;
+    factor.factor_kind = Factor_Kind_Of(factor);
     return true;
 }
 
@@ -250,7 +242,7 @@ void Describe_Matrix_Columns(const Transposition& work)
 
 /// What the labels of the rows make of themselves as names. Numbers that label a Matrix or a Table stay
 /// numbers.
-std::string Name_Of_Row(const Transposition& work, const std::optional<Cell_Printer>& names,
+std::string Name_Of_Row(const Transposition& work, const std::optional<Column_Printer>& names,
                         const Cell_Node* cell)
 {
     char text[Number_Text_Room];
@@ -292,7 +284,7 @@ bool Add_New_Columns(Transposition& work)
     const std::vector<double> values = classified ? Level_Table(*work.name_column) : std::vector<double>{};
     const std::vector<const char*> labels =
         classified ? Label_Table(*work.name_column) : std::vector<const char*>{};
-    std::optional<Cell_Printer> names;
+    std::optional<Column_Printer> names;
     if (work.name_column != nullptr)
         names.emplace(*work.name_column);
     const Cell_Node* name = work.name_column == nullptr ? nullptr : work.name_column->first_cell;

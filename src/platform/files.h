@@ -59,6 +59,9 @@ public:
     /// False at the end of the file.
     [[nodiscard]] bool Read_Line(std::string& line, std::size_t limit);
 
+    /// The same, but the rest of a line beyond `limit` is dropped with it.
+    [[nodiscard]] bool Read_Cut_Line(std::string& line, std::size_t limit);
+
     /// The system refused a read.
     [[nodiscard]] bool Failed() const { return failed_; }
 
@@ -69,6 +72,9 @@ private:
     [[nodiscard]] std::size_t Read_Directly(void* target, std::size_t count);
     [[nodiscard]] bool Fill_Buffer();
     [[nodiscard]] int Peek();
+    [[nodiscard]] int Step();
+    void Pass_Line_End(int c);
+    [[nodiscard]] bool Take_Line(std::string& line, std::size_t limit, bool cut);
 
     std::string name_;
     int descriptor_ = -1;

@@ -60,6 +60,10 @@ bool Delete_File(std::string_view name) noexcept;
 /// `name` with its extension replaced, or added.
 [[nodiscard]] std::string With_Extension(std::string_view name, std::string_view extension);
 
+/// The name under which a file that goes with another is there: as it stands, or with its extension in
+/// small or capital letters; as it stands when there is none.
+[[nodiscard]] std::string Find_Companion(const std::string& name);
+
 /// The hour, minute, second, month (1 to 12), day and year of a moment, in local time.
 struct Local_Time {
     int hour, minute, second, month, day, year;

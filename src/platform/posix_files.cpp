@@ -163,27 +163,44 @@ int Input_File::Peek()
     return std::to_integer<int>(buffer_[buffer_next_]);
 }
 
-bool Input_File::Read_Line(std::string& line, std::size_t limit)
+int Input_File::Step()
+{
+    ++position_;
+    if (descriptor_ >= 0)
+        ++buffer_next_;
+    return Peek();
+}
+
+void Input_File::Pass_Line_End(int c)
+{
+    if (c == '\r' && Step() != '\n')
+        return;
+    if (c == '\r' || c == '\n')
+        static_cast<void>(Step());
+}
+
+bool Input_File::Take_Line(std::string& line, std::size_t limit, bool cut)
 {
     line.clear();
     int c = Peek();
     if (c < 0)
         return false;
-    const auto step = [this] {
-        ++position_;
-        if (descriptor_ >= 0)
-            ++buffer_next_;
-        return Peek();
-    };
-    while (c >= 0 && c != '\n' && c != '\r' && line.size() < limit) {
+    for (; c >= 0 && c != '\n' && c != '\r' && line.size() < limit; c = Step())
         line.push_back(static_cast<char>(c));
-        c = step();
-    }
-    if (c == '\r' && step() != '\n')
-        return true;
-    if (c == '\r' || c == '\n')
-        static_cast<void>(step());
+    while (cut && c >= 0 && c != '\n' && c != '\r')
+        c = Step();
+    Pass_Line_End(c);
     return true;
+}
+
+bool Input_File::Read_Line(std::string& line, std::size_t limit)
+{
+    return Take_Line(line, limit, false);
+}
+
+bool Input_File::Read_Cut_Line(std::string& line, std::size_t limit)
+{
+    return Take_Line(line, limit, true);
 }
 
 bool Input_File::Close()

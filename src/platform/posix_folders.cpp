@@ -1,12 +1,14 @@
 #include "platform/folders.h"
 
 #include "platform/refusals.h"
+#include "support/text.h"
 
 #include <algorithm>
 #include <array>
 #include <climits>
 #include <cstdlib>
 #include <ctime>
+#include <initializer_list>
 
 #include <sys/stat.h>
 #include <sys/statvfs.h>
@@ -166,6 +168,21 @@ std::size_t Extension_Start(std::string_view name)
 std::string With_Extension(std::string_view name, std::string_view extension)
 {
     return std::string(name.substr(0, Extension_Start(name))).append(extension);
+}
+
+std::string Find_Companion(const std::string& name)
+{
+    const std::size_t start = Extension_Start(name);
+    std::string small = name;
+    std::string capital = name;
+    std::transform(name.begin() + static_cast<std::ptrdiff_t>(start), name.end(),
+                   small.begin() + static_cast<std::ptrdiff_t>(start), To_Lower);
+    std::transform(name.begin() + static_cast<std::ptrdiff_t>(start), name.end(),
+                   capital.begin() + static_cast<std::ptrdiff_t>(start), To_Upper);
+    for (const std::string* const form : std::initializer_list<const std::string*>{&name, &small, &capital})
+        if (File_Exists(*form))
+            return *form;
+    return name;
 }
 
 Local_Time Local_Time_Now()

@@ -67,6 +67,7 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<Short_Name_Width> Used_Sheet_Name;   ///< the sheet really read
     bool Sheet_Name_Was_Exact = false;
     bool Columns_Were_Selected = false;  ///< by the reader: the Sheet holds those of the subset only
+    bool Rows_Were_Selected = false;     ///< the same of the rows
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     Loss_Ledger losses;                  ///< what could not be kept
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any

@@ -47,6 +47,22 @@ TEST_F(Files_Test, Lines_End_With_Feed_Return_Or_Both)
     }
 }
 
+TEST_F(Files_Test, Lines_Are_Cut_And_Their_Rest_Is_Dropped)
+{
+    const std::string text = "abcd\r\nab\r" + std::string(70000, 'x') + "\nabc";
+    Put("lines", text);
+    Input_File memory(std::as_bytes(std::span(text)));
+    Input_File opened;
+    ASSERT_TRUE(opened.Open(Request_Name("lines")));
+    for (Input_File* const file : {&memory, &opened}) {
+        Texts lines;
+        for (std::string line; file->Read_Cut_Line(line, 3);)
+            lines.push_back(line);
+        EXPECT_EQ(lines, (Texts{"abc", "ab", "xxx", "abc"}));
+        EXPECT_EQ(file->Position(), std::ssize(text));
+    }
+}
+
 TEST_F(Files_Test, Output_Is_Whole_Or_Says_So)
 {
     const std::string block(3000, 'b');

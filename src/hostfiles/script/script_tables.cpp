@@ -1,10 +1,12 @@
 // Tables of one, two and more ways, with the factors that classify them.
 #include "hostfiles/script/script_parts.h"
+#include "model/factor_lists.h"
 #include "model/names.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
 #include <algorithm>
+#include <iterator>
 #include <string>
 #include <vector>
 
@@ -100,24 +102,16 @@ bool Take_Levels(Column& factor, const Table_Shape& shape)
     const std::int32_t state = sheet.label_state;
     const bool valued = state != labels_by_text && Tell_Levels_Apart(sheet, shape);
     const bool labelled = state >= labels_by_text || (state == labels_by_level && !valued);
-    if ((valued && !Make_Level_Values(factor, factor.nlevels))
-        || (labelled && !Make_Labels(factor, factor.nlevels)))
-        return false;
-    Level_Node* value = factor.level_values;
-    Level_Node* label = factor.labels;
-    for (const Column* column : shape.columns) {
-        if (column->type != table_column)
-            continue;
-        if (value != nullptr) {
-            value->value.number = column->table_margin_value;
-            value = value->next;
-        }
-        if (label != nullptr) {
-            label->value.text = factor.texts.Store(Label_Text(*column));
-            label = label->next;
-        }
-    }
-    return true;
+    std::vector<const Column*> columns;
+    std::ranges::copy_if(shape.columns, std::back_inserter(columns),
+                         [](const Column* column) { return column->type == table_column; });
+    return !columns.empty()
+           && Put_Level_Values(
+               factor, valued ? factor.nlevels : 0,
+               [column = columns.begin()]() mutable { return (*column++)->table_margin_value; })
+           && Put_Labels(factor, labelled ? factor.nlevels : 0, [&, column = columns.begin()]() mutable {
+                  return factor.texts.Store(Label_Text(**column++));
+              });
 }
 
 /// The factor across the columns. There is a real one where the Sheet names or labels it, or where

@@ -1,4 +1,5 @@
 #include "hostfiles/shared/host_sheet.h"
+#include "model/factor_lists.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -66,16 +67,12 @@ bool Recode(Column& column, std::span<const std::string_view> labels)
             std::min(static_cast<double>(Code_Of(label->Text()) + 1), double{Greatest_Genotype_Level}));
     const auto nlevels = static_cast<std::int32_t>(labels.size());
     Free_Cell_Nodes(&column, level_value_nodes);
-    if (!Make_Labels(column, nlevels))
+    column.label_width = 0;
+    if (!Put_Labels(column, nlevels,
+                    [&, label = labels.begin()]() mutable { return column.texts.Store(*label++); }))
         return false;
     column.nlevels = nlevels;
     column.factor_kind = factor_with_labels;
-    column.label_width = 1;
-    Level_Node* node = column.labels;
-    for (const std::string_view label : labels) {
-        node->value.text = column.texts.Store(label);
-        node = node->next;
-    }
     for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
         const double level = cell->value.number;
         if (level >= 1.0 && level <= nlevels && level <= static_cast<double>(new_levels.size()))

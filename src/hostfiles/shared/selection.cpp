@@ -9,26 +9,6 @@
 
 namespace ingester {
 
-std::int32_t Row_Selection::Count(std::int32_t rows) const
-{
-    if (!active)
-        return rows;
-    const auto listed = std::min(static_cast<std::size_t>(rows), flags.size());
-    return static_cast<std::int32_t>(listed
-                                     - static_cast<std::size_t>(std::ranges::count(flags.first(listed), 0)));
-}
-
-std::vector<std::int32_t> Row_Selection::New_Rows(std::int32_t rows) const
-{
-    const auto listed = flags.first(std::min(static_cast<std::size_t>(rows), flags.size()));
-    std::vector<std::int32_t> places;
-    places.reserve(listed.size());
-    std::int32_t next = 0;
-    for (const std::int32_t flag : listed)
-        places.push_back(flag != 0 ? next++ : -1);
-    return places;
-}
-
 std::string Valid_Name_Of_No_Column(std::string_view name)
 {
     std::string valid = Make_Valid_Name(name);

@@ -2,61 +2,27 @@
 #pragma once
 
 #include "hostfiles/tbk/tbk_format.h"
-#include "platform/files.h"
-#include "support/byte_fields.h"
+#include "platform/field_sink.h"
 
 #include <algorithm>
-#include <bit>
 #include <cstdint>
 #include <string_view>
 
 namespace ingester {
 
-class Book_Sink {
+class Book_Sink : public Field_Sink {
 public:
-    Book_Sink(Output_File& file, std::endian order) : file_(&file), order_(order) {}
-
-    [[nodiscard]] std::endian Order() const { return order_; }
-    [[nodiscard]] std::int64_t Position() const { return file_->Position(); }
+    using Field_Sink::Field_Sink;
 
     /// A write was refused, or something is too large for the words that tell of it.
-    [[nodiscard]] bool Failed() const { return too_large_ || file_->Failed(); }
+    [[nodiscard]] bool Failed() const { return too_large_ || Field_Sink::Failed(); }
 
-    template <class T> void Put(T value)
-    {
-        std::byte bytes[sizeof(T)];
-        Put_In_Order(bytes, value);
-        file_->Write(bytes, sizeof bytes);
-    }
-    template <class First, class Second, class... Rest> void Put(First first, Second second, Rest... rest)
-    {
-        Put(first);
-        Put(second, rest...);
-    }
     void Put_Byte(std::int32_t value) { Put(static_cast<std::uint8_t>(value)); }
-    void Put_Bytes(std::string_view bytes) { file_->Write(bytes); }
-    void Put_Bytes(const std::byte* bytes, std::size_t count) { file_->Write(bytes, count); }
-    /// The file itself, for bytes that are copied to it.
-    [[nodiscard]] Output_File& File() { return *file_; }
-    void Put_Short_Text(std::string_view text)
-    {
-        text = text.substr(0, Short_Text_Width);
-        Put(static_cast<std::uint8_t>(text.size()));
-        Put_Bytes(text);
-    }
+    void Put_Short_Text(std::string_view text) { Put_Text<std::uint8_t>(text.substr(0, Short_Text_Width)); }
     void Put_Long_Text(std::string_view text)
     {
         Put(In_A_Word(static_cast<std::int64_t>(text.size())));
         Put_Bytes(text);
-    }
-
-    /// Puts a number into bytes that go out later.
-    template <class T> void Put_In_Order(std::byte* bytes, T value) const
-    {
-        if (order_ == std::endian::little)
-            Put_Number<T, std::endian::little>(bytes, value);
-        else
-            Put_Number<T, std::endian::big>(bytes, value);
     }
 
     /// The head of a record of known length; of one whose length is told by `End_Record`.
@@ -78,12 +44,7 @@ public:
     void Put_Mark(Record_Type type) { Put_Record_Head(type, 0); }
 
     /// Puts a word in the place of one that was written as a stand-in.
-    void Put_Word_At(std::int64_t position, std::int64_t value)
-    {
-        std::byte bytes[sizeof(std::int32_t)];
-        Put_In_Order(bytes, In_A_Word(value));
-        file_->Write_At(position, bytes, sizeof bytes);
-    }
+    void Put_Word_At(std::int64_t position, std::int64_t value) { Put_At(position, In_A_Word(value)); }
 
     /// Lengths and offsets are signed words.
     [[nodiscard]] std::int32_t In_A_Word(std::int64_t value)
@@ -93,8 +54,6 @@ public:
     }
 
 private:
-    Output_File* file_;
-    std::endian order_;
     bool too_large_ = false;
     std::int64_t record_at_ = 0;
 };

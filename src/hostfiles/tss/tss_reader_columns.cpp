@@ -1,6 +1,7 @@
 // The records of columns.
 #include "hostfiles/tss/tss_reader.h"
 #include "model/cell_appender.h"
+#include "model/factor_lists.h"
 #include "model/names.h"
 #include "request/messages.h"
 #include "request/request.h"
@@ -204,14 +205,7 @@ bool Read_Level_Values(TSS_Source& source, Column& column, std::int32_t count)
             return false;
         values.push_back(Clean_Number(value, column.sheet->missing_value));
     }
-    if (count == 0)
-        return true;
-    if (!Make_Level_Values(column, count))
-        return false;
-    const double* next = values.data();
-    for (Level_Node* node = column.level_values; node != nullptr; node = node->next)
-        node->value.number = *next++;
-    return true;
+    return Put_Level_Values(column, values);
 }
 
 bool Read_Labels(TSS_Source& source, Column& column, std::int32_t count)
@@ -226,14 +220,7 @@ bool Read_Labels(TSS_Source& source, Column& column, std::int32_t count)
         labels.push_back(column.texts.Store(label));
         column.label_width = std::max(column.label_width, length);
     }
-    if (count == 0)
-        return true;
-    if (!Make_Labels(column, count))
-        return false;
-    const char* const* next = labels.data();
-    for (Level_Node* node = column.labels; node != nullptr; node = node->next)
-        node->value.text = *next++;
-    return true;
+    return Put_Labels(column, labels);
 }
 
 bool Read_Levels(TSS_Source& source, Column& column, const Column_Record& record)

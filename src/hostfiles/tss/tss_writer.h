@@ -3,36 +3,25 @@
 
 #include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss_format.h"
-#include "platform/files.h"
+#include "platform/field_sink.h"
 
 #include <cstdint>
 #include <string_view>
+#include <tuple>
 
 namespace ingester {
 
 /// The stream that the file is written to.
-class TSS_Sink {
+class TSS_Sink : public Field_Sink {
 public:
-    explicit TSS_Sink(Output_File& file) : file_(&file) {}
+    using Field_Sink::Field_Sink;
+    using Field_Sink::Put;
 
-    [[nodiscard]] bool Failed() const { return file_->Failed(); }
-
-    void Put(std::int32_t value) { file_->Write_Little(value); }
-    void Put(double value) { file_->Write_Little(value); }
-    void Put_Bytes(std::string_view bytes) { file_->Write(bytes); }
-    void Put_Text(std::string_view text)
-    {
-        Put(static_cast<std::int32_t>(text.size()));
-        Put_Bytes(text);
-    }
     template <class Record, class... Fields>
     void Put(const Record& record, const std::tuple<Fields...>& layout)
     {
         std::apply([&](const auto&... field) { (Put(record.*field.member), ...); }, layout);
     }
-
-private:
-    Output_File* file_;
 };
 
 /// A name, made up when it is empty: the reader refuses an empty one.

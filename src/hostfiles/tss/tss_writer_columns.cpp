@@ -97,10 +97,8 @@ void Write_Numbers(const Cell_Node* node, std::int64_t count, TSS_Sink& sink, In
                 number = in_file(node->value.number);
                 node = node->next;
             }
-            if constexpr (std::endian::native != std::endian::little)
-                Put_Number(&number, number);
         }
-        sink.Put_Bytes({reinterpret_cast<const char*>(block.data()), size * sizeof(double)});
+        sink.Put_Numbers(std::span(block.data(), size));
         count -= static_cast<std::int64_t>(size);
     }
 }

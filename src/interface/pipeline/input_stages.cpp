@@ -1,12 +1,12 @@
 // Stages that take the two strings apart and find out what they name.
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
+#include "interface/output_joins.h"
 #include "interface/paths.h"
 #include "interface/people_options.h"
 #include "interface/pipeline/stages.h"
 #include "interface/slash_options.h"
 #include "interface/var_file.h"
-#include "model/join/merge.h"
 #include "model/sheet.h"
 #include "platform/files.h"
 #include "request/request.h"
@@ -240,7 +240,7 @@ Request_Status Read_Merge_Keys(Request_Run& run)
         Delete_File(name);
     if (!whole)
         return Stop(Request_Status::merge_failed, "Merge columns not found in files.\n");
-    if (std::cmp_greater(request.Merge_Key_Count, Most_Merge_Keys))
+    if (request.Merge_Key_Count > Most_Asked_Keys)
         Report_Message_Long("Warning: A merge has four keys at the most; the first four of %li were used.\n",
                             request.Merge_Key_Count);
     return Done;

@@ -1,5 +1,6 @@
 #include "model/join/append.h"
 
+#include "model/factor_lists.h"
 #include "model/factors.h"
 #include "model/join/cell_transfer.h"
 #include "model/join/column_index.h"
@@ -43,26 +44,15 @@ bool Add_Label(Column& factor, std::string_view label)
         labels.push_back(factor.texts.Store(
             Factor_Label_Or_Level(factor, static_cast<std::int32_t>(labels.size()) + 1, text)));
     labels.push_back(factor.texts.Store(label));
-    if (!Make_Labels(factor, factor.nlevels))
-        return false;
-    const char* const* next = labels.data();
-    for (Level_Node* node = factor.labels; node != nullptr; node = node->next)
-        node->value.text = *next++;
     factor.factor_kind = factor_with_labels;
-    factor.label_width = std::max(factor.label_width, static_cast<std::int32_t>(label.size()));
-    return true;
+    return Put_Labels(factor, labels);
 }
 
 bool Add_Level_Value(Column& factor)
 {
     std::vector<double> values = Level_Table(factor);
     values.resize(static_cast<std::size_t>(factor.nlevels), factor.nlevels);
-    if (!Make_Level_Values(factor, factor.nlevels))
-        return false;
-    const double* next = values.data();
-    for (Level_Node* node = factor.level_values; node != nullptr; node = node->next)
-        node->value.number = *next++;
-    return true;
+    return Put_Level_Values(factor, values);
 }
 
 /// A Factor that is there gets one more level for the new rows.

@@ -2,6 +2,7 @@
 
 #include "model/calendar.h"
 #include "model/cell_text.h"
+#include "model/column_printer.h"
 #include "model/factors.h"
 #include "model/join/factor_levels.h"
 #include "model/level_tables.h"
@@ -15,6 +16,8 @@
 namespace ingester {
 
 namespace {
+
+constexpr int Level_Digits = 15;
 
 std::int32_t Plain_Type(std::int32_t type)
 {
@@ -150,13 +153,7 @@ bool Cell_Transfer::Prepare_Levels(double tolerance, bool ignore_case)
     }
     if (Is_Text_Like(target.type)) {
         way_ = Way::level_to_text;
-        char room[Number_Text_Room];
-        if (source.factor_kind == factor_with_labels)
-            for (const char* const label : Label_Table(source))
-                texts_.push_back(target.texts.Store(Text_Arena::View(label)));
-        else if (source.factor_kind == factor_with_levels)
-            for (const double value : Level_Table(source))
-                texts_.push_back(target.texts.Store({room, Format_Cell_Fully(room, source, value)}));
+        texts_ = Printed_Levels(source, Number_Print::as_said, Level_Digits, target.texts);
         return true;
     }
     way_ = Way::level_to_number;
@@ -308,7 +305,7 @@ void Cell_Transfer::Put(Cell_Node& to, const Cell_Value& from)
         if (const char* const text = Of_Level<const char*>(texts_, from.number, nullptr); text != nullptr)
             Set_Text(*target_, to, Text_Arena::View(text));
         else
-            Set_Text(*target_, to, {room, Print_General(room, from.number, 15)});
+            Set_Text(*target_, to, {room, Print_General(room, from.number, Level_Digits)});
         return;
     case Way::print:
         Set_Text(*target_, to, {room, Format_Cell_Fully(room, *source_, from.number)});

@@ -1,5 +1,6 @@
 #include "model/join/factor_levels.h"
 
+#include "model/factor_lists.h"
 #include "model/factors.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
@@ -147,14 +148,9 @@ bool Add_Labels(Column& target, const Column& source, const std::vector<std::int
         char* const end = Print_Integer(text, static_cast<std::int64_t>(level));
         return target.texts.Store({text, static_cast<std::size_t>(end - text)});
     });
-    if (!Make_Labels(target, static_cast<std::int32_t>(labels.size())))
-        return false;
-    const char* const* label = labels.data();
-    for (Level_Node* node = target.labels; node != nullptr; node = node->next) {
-        node->value.text = target.texts.Store(Text_Arena::View(*label++));
-        target.label_width = std::max(target.label_width, static_cast<std::int32_t>(node->Text().size()));
-    }
-    return true;
+    return Put_Labels(
+        target, static_cast<std::int32_t>(labels.size()),
+        [&, label = labels.begin()]() mutable { return target.texts.Store(Text_Arena::View(*label++)); });
 }
 
 bool Add_Values(Column& target, const Column& source, const std::vector<std::int32_t>& added)
@@ -164,12 +160,7 @@ bool Add_Values(Column& target, const Column& source, const std::vector<std::int
     std::vector<double> values = Level_Table(target);
     Lengthen(values, target.nlevels, Level_Table(source), added,
              [](std::size_t level) { return static_cast<double>(level); });
-    if (!Make_Level_Values(target, static_cast<std::int32_t>(values.size())))
-        return false;
-    const double* value = values.data();
-    for (Level_Node* node = target.level_values; node != nullptr; node = node->next)
-        node->value.number = *value++;
-    return true;
+    return Put_Level_Values(target, values);
 }
 
 bool Is_Bare(const Column& factor)

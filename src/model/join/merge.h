@@ -9,7 +9,8 @@
 
 namespace ingester {
 
-constexpr std::size_t Most_Merge_Keys = 4;
+/// A request has fewer.
+constexpr std::size_t Most_Merge_Keys = 16;
 
 /// Which rows of the source that have no row of the target to themselves make new rows.
 enum Merge_Fill_Mode : std::int32_t {

@@ -1,6 +1,7 @@
 #include "model/join/merge_keys.h"
 
 #include "model/calendar.h"
+#include "model/factor_lists.h"
 #include "model/factors.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
@@ -166,12 +167,9 @@ const Column* Numbers_As_Levels(const Column& target, const Column& source)
         return nullptr;
     if (!valued || copy->level_values_count > 0)
         return copy;
-    if (!Make_Level_Values(*copy, copy->nlevels))
+    if (!Put_Level_Values(*copy, copy->nlevels, [level = 0.0]() mutable { return ++level; }))
         return nullptr;
-    double level = 0;
-    for (Level_Node* node = copy->level_values; node != nullptr; node = node->next)
-        node->value.number = ++level;
-    copy->factor_kind = factor_with_levels;
+    copy->factor_kind = Factor_Kind_Of(*copy);
     return copy;
 }
 

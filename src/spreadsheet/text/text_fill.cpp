@@ -1,6 +1,7 @@
 // The fields of a text into the cells of its Sheet.
 #include "model/cell_appender.h"
 #include "model/cell_text.h"
+#include "model/claims.h"
 #include "model/date_format.h"
 #include "model/names.h"
 #include "model/subset.h"
@@ -49,10 +50,6 @@ constexpr std::int32_t New_Column_Width = 6;
 constexpr std::int64_t Spare_Rows = 8;
 constexpr std::size_t Columns_Ahead = 12;
 
-/// A text of fewer cells than this is never refused; above, most of its cells must be there.
-constexpr std::int64_t Always_Allowed_Cells = 40'000'000;
-constexpr std::int64_t Cells_Per_Byte = 2;
-
 class Sheet_Filler {
 public:
     Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
@@ -85,7 +82,7 @@ private:
     void Fill_Names();
     void Name_Column(std::size_t index, std::string_view text);
     void Settle_Names();
-    void Leave_Out(Column_Filling& state, std::size_t index);
+    void Leave_Out(std::size_t index);
     void Leave_Out_Unlisted();
     void Take_Wanted_Types();
     bool Fill_Rows();
@@ -144,10 +141,7 @@ std::int64_t Sheet_Filler::Expected_Rows() const
 /// A few hostile bytes could ask for any number of cells: a long first line, then short ones.
 void Sheet_Filler::Limit_Rows()
 {
-    const auto bytes = static_cast<std::int64_t>(buffer_.Text().size());
-    const std::int64_t cells = std::max(Always_Allowed_Cells, Cells_Per_Byte * bytes);
-    row_limit_ = std::min<std::int64_t>(cells / static_cast<std::int64_t>(columns_.size()),
-                                        std::numeric_limits<std::int32_t>::max());
+    row_limit_ = Most_Rows(std::ssize(columns_), std::ssize(buffer_.Text()));
 }
 
 void Sheet_Filler::Start_Column(Column& column, const Cell_Appender& cells)
@@ -166,9 +160,7 @@ void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
     const Name_Marks marks = Read_Name_Marks(text);
     scan.make_date = marks.date;
     scan.make_time = marks.time;
-    column.name = Make_Valid_Name(Strip_Name_Mark(text));
-    Use_Bracket_Text(column);
-    column.input_name = Trim_Copy(text);
+    Name_From_Input(column, text, Strip_Name_Mark(text));
 }
 
 /// An empty field leaves a column the name it has.
@@ -198,29 +190,18 @@ void Sheet_Filler::Settle_Names()
 }
 
 /// A column that nobody wants is not filled: its fields are only passed over.
-void Sheet_Filler::Leave_Out(Column_Filling& state, std::size_t index)
+void Sheet_Filler::Leave_Out(std::size_t index)
 {
-    state.filling = Filling::left_out;
+    columns_[index].filling = Filling::left_out;
     shape_.types[index] = Column_Scan{};
 }
 
 void Sheet_Filler::Leave_Out_Unlisted()
 {
-    if (!request.Subset_Columns)
-        return;
-    std::vector<const Column*> listed;
-    if (!request.Subset_By_Number)
-        for (const Column* column : Find_Listed(sheet_, request.Subset_Names))
-            listed.push_back(column);
-    std::ranges::sort(listed);
-    for (std::size_t index = 0; index < columns_.size(); ++index) {
-        Column& column = *columns_[index].column;
-        column.input_place = column.index;
-        const bool wanted = request.Subset_By_Number ? subset_.Keeps(column.index, {})
-                                                     : std::ranges::binary_search(listed, &column);
-        if (!wanted)
-            Leave_Out(columns_[index], index);
-    }
+    const std::vector<bool> wanted = Wanted_Columns(sheet_);
+    for (std::size_t index = 0; index < columns_.size(); ++index)
+        if (!wanted[index])
+            Leave_Out(index);
 }
 
 /// Before there is a cell. Columns that are to hold numbers decide by their fields, so that texts are there
@@ -280,8 +261,7 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
 {
     const Field_Content content = walker_.Content(field);
     const std::string_view text = Text_Of(content);
-    if (text.size() > Text_Cell_Width && column.type == text_column)
-        column.type = long_text_column;
+    Make_Room_For(column, text);
     if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);
 }
@@ -329,7 +309,7 @@ inline void Sheet_Filler::Append_Blank(Column_Filling& state)
 {
     if (state.filling == Filling::left_out)
         return;
-    state.cells.Append(state.filling == Filling::texts ? empty_ : missing_);
+    state.cells.Append_Missing();
 }
 
 void Sheet_Filler::Refuse_Extra_Columns()
@@ -357,11 +337,10 @@ bool Sheet_Filler::Add_Late_Column()
     Start_Column(*column, Cell_Appender(*column, row_ + Spare_Rows));
     column->input_place = request.Subset_Columns ? column->index : 0;
     if (!subset_.Keeps(column->index, column->name)) {
-        Leave_Out(columns_.back(), columns_.size() - 1);
+        Leave_Out(columns_.size() - 1);
         return true;
     }
-    for (std::int64_t row = 0; row < row_; ++row)
-        columns_.back().cells.Append(missing_);
+    columns_.back().cells.Append_Missing(row_);
     Limit_Rows();
     return row_ < row_limit_;
 }
@@ -521,9 +500,9 @@ void Sheet_Filler::Drop_Left_Out()
         if (wanted.back())
             types.push_back(shape_.types[index]);
     }
+    Keep_Wanted_Columns(sheet_, wanted);
     if (types.size() == columns_.size())
         return;
-    Keep_Columns(&sheet_, wanted);
     shape_.types = std::move(types);
     shape_.columns = sheet_.column_count;
 }
@@ -572,7 +551,6 @@ bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& o
     if (!filler.Fill())
         return false;
     filler.Drop_Left_Out();
-    request.Columns_Were_Selected = true;
     return true;
 }
 

@@ -1,5 +1,5 @@
 // A Sheet as text: tabs, commas, or columns of fixed width.
-#include "model/number_format.h"
+#include "model/column_printer.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "request/messages.h"
@@ -19,7 +19,6 @@ namespace ingester {
 
 namespace {
 
-constexpr int General_Digits = 15;  // a double holds so many decimal digits
 constexpr std::size_t Greatest_Written_Line = 65535;
 constexpr std::string_view Line_End = "\r\n";
 
@@ -41,17 +40,15 @@ Text_Layout Layout_Of_Request(bool tab_mode)
     return {Layout::fixed, true, false, ' '};
 }
 
-enum class Cell_Kind : std::uint8_t { number, formatted_number, text, factor };
+using Cell_Kind = Column_Printer::Kind;
 
 /// A column on its way out.
 struct Column_Writing {
-    const Column* column;
-    Cell_Kind kind;
+    Column_Printer printer;
     bool left;               ///< which side of its width a field stands at
     std::int32_t first_row;  ///< no cells above (Symmetric Matrix)
     std::int32_t width = 0;
-    const Cell_Node* cell = nullptr;       ///< of the row being written
-    std::vector<std::string> levels = {};  ///< those that a Factor lists, as they print
+    const Cell_Node* cell = nullptr;  ///< of the row being written
 };
 
 /// A line under way; fields are printed straight into it.
@@ -99,49 +96,10 @@ private:
     std::size_t used_ = 0;
 };
 
-bool Prints_By_Format(const Column& column)
+Printing_Rules Rules_Of_Request()
 {
-    return request.Use_Formats || column.format == date_format_mark;
-}
-
-char* Print_Number(char* target, const Column& column, double value)
-{
-    return Prints_By_Format(column) ? Format_Cell_Number(target, column, value)
-                                    : Print_General(target, value, General_Digits);
-}
-
-Cell_Kind Kind_Of(const Column& column)
-{
-    if (Is_Text_Like(column.type))
-        return Cell_Kind::text;
-    if (column.type == factor_column)
-        return Cell_Kind::factor;
-    return Prints_By_Format(column) ? Cell_Kind::formatted_number : Cell_Kind::number;
-}
-
-/// Levels without a label or a value print as their number, however many there are said to be.
-std::vector<std::string> Listed_Levels(const Column& column)
-{
-    std::vector<std::string> levels;
-    char text[Number_Text_Room];
-    const Level_Node* label = column.factor_kind == factor_with_labels ? column.labels : nullptr;
-    const Level_Node* value = column.factor_kind == factor_with_levels ? column.level_values : nullptr;
-    for (; label != nullptr && std::ssize(levels) < column.nlevels; label = label->next)
-        levels.emplace_back(label->Text());
-    for (; value != nullptr && std::ssize(levels) < column.nlevels; value = value->next)
-        levels.emplace_back(text, Print_Number(text, column, value->value.number));
-    return levels;
-}
-
-/// The margin of a Table is one more level of its Factors.
-bool Has_Margin(const Column& column)
-{
-    return column.sheet->type == table_sheet && column.sheet->has_margins != 0;
-}
-
-bool Is_Level(const Column& column, double value)
-{
-    return value >= 1.0 && value < (Has_Margin(column) ? 2.0 : 1.0) + std::max(column.nlevels, 0);
+    const Number_Print numbers = request.Use_Formats ? Number_Print::by_format : Number_Print::general;
+    return {.numbers = numbers, .level_values = numbers, .margins = true};
 }
 
 /// The mark behind a name by which a reader knows the column's type again.
@@ -200,6 +158,7 @@ private:
     Sheet& sheet_;
     Text_Layout layout_;
     Output_File& file_;
+    Printing_Rules rules_ = Rules_Of_Request();
     std::vector<Column_Writing> columns_;
     Line_Buffer line_;
     std::string missing_;  ///< as a missing value prints
@@ -220,13 +179,11 @@ void Text_Table_Writer::Print_Missing()
 
 void Text_Table_Writer::Start_Column(const Column& column)
 {
-    const Cell_Kind kind = Kind_Of(column);
-    const bool left = column.justify == default_side ? kind == Cell_Kind::text : column.justify == left_side;
-    columns_.push_back({&column, kind, left, First_Row_Of(column)});
+    const bool left =
+        column.justify == default_side ? Is_Text_Like(column.type) : column.justify == left_side;
+    columns_.push_back({Column_Printer(column, rules_), left, First_Row_Of(column)});
     Column_Writing& state = columns_.back();
     state.cell = column.first_cell;
-    if (kind == Cell_Kind::factor)
-        state.levels = Listed_Levels(column);
     if (layout_.padded)
         state.width = Measured_Width(state);
 }
@@ -235,8 +192,9 @@ void Text_Table_Writer::Start_Column(const Column& column)
 /// they occur or not; a missing cell only where there is one.
 std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
 {
-    const Column& column = *state.column;
-    const bool factor = state.kind == Cell_Kind::factor;
+    const Column& column = state.printer.Printed();
+    const bool factor = state.printer.Kind_Of_Cells() == Cell_Kind::factor;
+    const std::int32_t listed = state.printer.Listed_Levels();
     std::size_t widest = column.name.size() + (factor ? 1 : Name_Mark(column).size());
     const auto take_printed = [&] {
         widest = std::max(widest, line_.Size());
@@ -244,20 +202,20 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
         line_.Clear();
     };
     line_.Clear();
-    for (std::int32_t level = 1; level <= std::ssize(state.levels); ++level) {
+    for (std::int32_t level = 1; level <= listed; ++level) {
         Put_Level(state, level);
         take_printed();
     }
-    if (factor && std::ssize(state.levels) < column.nlevels) {
+    if (factor && listed < column.nlevels) {
         Put_Level(state, column.nlevels);
         take_printed();
     }
-    if (factor && Has_Margin(column)) {
+    if (factor && state.printer.Is_Level(column.nlevels + 1)) {
         Put_Level(state, column.nlevels + 1);
         take_printed();
     }
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
-        if (factor && Is_Level(column, cell->value.number))
+        if (factor && state.printer.Is_Level(cell->value.number))
             continue;
         Put_Cell(state, *cell);
         take_printed();
@@ -294,19 +252,14 @@ void Text_Table_Writer::Put_Text(std::string_view text)
         line_.Put(text);
 }
 
+/// A number is printed where it goes.
 void Text_Table_Writer::Put_Level(const Column_Writing& state, std::int32_t level)
 {
-    const Column& column = *state.column;
-    std::string_view text;
-    if (level <= std::ssize(state.levels)) {
-        text = state.levels[static_cast<std::size_t>(level) - 1];
-    } else if (level > column.nlevels) {
-        text = column.sheet->margin_label;
-    } else {
-        line_.Advance_To(Print_Integer(line_.Reserve(Number_Text_Room), level));
-        return;
-    }
-    if (column.factor_kind == factor_with_labels)
+    char* const room = line_.Reserve(Number_Text_Room);
+    const std::string_view text = state.printer.Level(level, room);
+    if (text.data() == room)
+        line_.Advance_To(room + text.size());
+    else if (state.printer.Printed().factor_kind == factor_with_labels)
         Put_Text(text);
     else
         line_.Put(text);
@@ -314,28 +267,22 @@ void Text_Table_Writer::Put_Level(const Column_Writing& state, std::int32_t leve
 
 void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
 {
-    if (Is_Level(*state.column, value))
+    if (state.printer.Is_Level(value))
         Put_Level(state, static_cast<std::int32_t>(value));
     else
-        line_.Put(state.column->factor_kind == factor_with_labels ? std::string_view(" ")
-                                                                  : std::string_view(missing_));
+        line_.Put(state.printer.Printed().factor_kind == factor_with_labels ? std::string_view(" ")
+                                                                            : std::string_view(missing_));
 }
 
 inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
 {
     const double value = cell.value.number;
-    switch (state.kind) {
+    switch (state.printer.Kind_Of_Cells()) {
     case Cell_Kind::number:
         if (!(value > sheet_.missing_value))
             line_.Put(missing_);
         else
-            line_.Advance_To(Print_General(line_.Reserve(Number_Text_Room), value, General_Digits));
-        break;
-    case Cell_Kind::formatted_number:
-        if (!(value > sheet_.missing_value))
-            line_.Put(missing_);
-        else
-            line_.Advance_To(Format_Cell_Number(line_.Reserve(Number_Text_Room), *state.column, value));
+            line_.Advance_To(state.printer.Print_Number(line_.Reserve(Number_Text_Room), value));
         break;
     case Cell_Kind::text:
         Put_Text(cell.Text());
@@ -399,8 +346,9 @@ void Text_Table_Writer::Write_Names()
         const std::size_t start = line_.Size();
         if (start > 0 && layout_.layout != Layout::fixed)
             line_.Put(layout_.separator);
-        const std::string name = std::string(state.column->name).append(Name_Mark(*state.column));
-        const bool left = state.column->justify == left_side;
+        const Column& column = state.printer.Printed();
+        const std::string name = std::string(column.name).append(Name_Mark(column));
+        const bool left = column.justify == left_side;
         if (layout_.layout == Layout::fixed) {
             if (left)
                 line_.Put(' ');

@@ -170,6 +170,26 @@ Rows By_Row(const Sheet& sheet)
     return rows;
 }
 
+TEST_F(Join, Merges_On_As_Many_Keys_As_A_Reader_Needs)
+{
+    Merge_Request wanted;
+    wanted.key_count = Most_Merge_Keys;
+    Sheet* const sheets[] = {New_Sheet_With_Rows(2), New_Sheet_With_Rows(2)};
+    for (std::size_t key = 0; key < Most_Merge_Keys; ++key) {  // only the last tells the rows apart
+        const std::string name = "k" + std::to_string(key);
+        const bool last = key + 1 == Most_Merge_Keys;
+        wanted.target_keys[key] = Add_Cells(sheets[0], variate_column, name, {"1", last ? "2" : "1"});
+        wanted.source_keys[key] = Add_Cells(sheets[1], variate_column, name, {last ? "2" : "1", "1"});
+    }
+    Add_Cells(sheets[1], variate_column, "x", {"20", "10"});
+    wanted.target = sheets[0];
+    wanted.source = sheets[1];
+    ASSERT_TRUE(Merge_Sheets(wanted));
+    EXPECT_EQ(Numbers_Of(*sheets[0]->last_column), (std::vector<double>{10, 20}));
+    ++wanted.key_count;
+    EXPECT_FALSE(Merge_Sheets(wanted));
+}
+
 TEST_F(Join, Merges_As_Nested_Loops_Do)
 {
     std::minstd_rand random;

@@ -1,0 +1,97 @@
+#include "model/column_printer.h"
+
+#include "model/level_tables.h"
+
+#include <algorithm>
+
+namespace ingester {
+
+namespace {
+
+Column_Printer::Kind Kind_Of(const Column& column)
+{
+    if (Is_Text_Like(column.type))
+        return Column_Printer::Kind::text;
+    return column.type == factor_column ? Column_Printer::Kind::factor : Column_Printer::Kind::number;
+}
+
+/// The digits of a column's numbers; 0 where its format decides.
+int Digits_Of(const Column& column, Number_Print numbers, int digits)
+{
+    constexpr int all_digits = 15;
+    if (column.format == date_format_mark || numbers == Number_Print::by_format)
+        return 0;
+    if (numbers == Number_Print::general)
+        return digits;
+    return column.decimals >= 0 ? 0 : all_digits;
+}
+
+char* Print_Level_Value(char* target, const Column& factor, double value, Number_Print rule, int digits)
+{
+    if (rule == Number_Print::as_said)
+        return Format_Cell_Fully(target, factor, value);
+    return rule == Number_Print::by_format || factor.format == date_format_mark
+               ? Format_Cell_Number(target, factor, value)
+               : Print_General(target, value, digits);
+}
+
+bool Has_Margin(const Column& column, const Printing_Rules& rules)
+{
+    return rules.margins && column.sheet->type == table_sheet && column.sheet->has_margins != 0;
+}
+
+}  // namespace
+
+std::vector<const char*> Printed_Levels(const Column& factor, Number_Print level_values, int digits,
+                                        Text_Arena& room)
+{
+    if (factor.factor_kind == factor_with_labels)
+        return Label_Table(factor);
+    std::vector<const char*> printed;
+    if (factor.factor_kind != factor_with_levels)
+        return printed;
+    char text[Number_Text_Room];
+    for (const Level_Node* node = factor.level_values; node != nullptr; node = node->next)
+        printed.push_back(
+            room.Store({text, Print_Level_Value(text, factor, node->value.number, level_values, digits)}));
+    return printed;
+}
+
+Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules)
+    : column_(&column), digits_(Digits_Of(column, rules.numbers, rules.digits)), kind_(Kind_Of(column))
+{
+    if (kind_ != Kind::factor)
+        return;
+    const std::int32_t nlevels = std::max(column.nlevels, 0);
+    level_end_ = (Has_Margin(column, rules) ? 2.0 : 1.0) + nlevels;
+    if (column.factor_kind == plain_factor)
+        return;
+    levels_ = std::make_unique<Levels>();
+    levels_->texts = Printed_Levels(column, rules.level_values, rules.digits, levels_->room);
+    if (std::ssize(levels_->texts) > nlevels)
+        levels_->texts.resize(static_cast<std::size_t>(nlevels));
+}
+
+std::string_view Column_Printer::Level(std::int32_t level, char* room) const
+{
+    if (level <= Listed_Levels())
+        return Text_Arena::View(levels_->texts[static_cast<std::size_t>(level) - 1]);
+    if (level > column_->nlevels)
+        return column_->sheet->margin_label;
+    return {room, Print_Integer(room, level)};
+}
+
+std::string_view Column_Printer::Print(const Cell_Node& cell, char* room, const Missing_Prints& missing) const
+{
+    if (kind_ == Kind::text)
+        return cell.Text();
+    const double value = cell.value.number;
+    if (kind_ == Kind::number)
+        return Is_Present(*column_->sheet, value) ? std::string_view(room, Print_Number(room, value))
+                                                  : missing.number;
+    if (Is_Level(value))
+        return Level(static_cast<std::int32_t>(value), room);
+    return column_->factor_kind == factor_with_labels ? missing.label : missing.number;
+}
+
+}  // namespace ingester
