@@ -43,12 +43,16 @@ static_assert(Kinds_Are_In_Order());
 
 }  // namespace
 
+std::string Loss_Ledger::Key_Of_Entry(Loss_Kind kind, std::string_view column)
+{
+    return std::string(1, static_cast<char>(kind)).append(column);
+}
+
 Loss& Loss_Ledger::Entry_Of(Loss_Kind kind, std::string_view column)
 {
     if (entries_.size() >= most_entries)
         column = {};
-    std::string key(1, static_cast<char>(kind));
-    key += column;
+    std::string key = Key_Of_Entry(kind, column);
     if (const auto found = places_.find(key); found != places_.end())
         return entries_[found->second];
     places_.emplace(std::move(key), entries_.size());
@@ -67,6 +71,18 @@ void Loss_Ledger::Note(Loss_Kind kind, std::string_view column, std::int64_t row
         loss.example = example.substr(0, longest_example);
     }
     loss.count += count;
+}
+
+void Loss_Ledger::Withdraw(Loss_Kind kind, std::string_view column)
+{
+    const auto found = places_.find(Key_Of_Entry(kind, column));
+    if (found == places_.end())
+        return;
+    const std::size_t place = found->second;
+    entries_.erase(entries_.begin() + static_cast<std::ptrdiff_t>(place));
+    places_.erase(found);
+    for (auto& [key, later] : places_)
+        later -= later > place ? 1 : 0;
 }
 
 void Loss_Ledger::Add(const Loss_Ledger& other)

@@ -45,6 +45,9 @@ public:
     void Note(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,
               std::int64_t count = 1);
 
+    /// Takes back what was noted: it could be kept in another way.
+    void Withdraw(Loss_Kind kind, std::string_view column);
+
     /// Adds what another ledger holds.
     void Add(const Loss_Ledger& other);
 
@@ -62,6 +65,7 @@ public:
 
 private:
     Loss& Entry_Of(Loss_Kind kind, std::string_view column);
+    [[nodiscard]] static std::string Key_Of_Entry(Loss_Kind kind, std::string_view column);
 
     std::vector<Loss> entries_;
     std::unordered_map<std::string, std::size_t> places_;  ///< of the entries, by kind and column

@@ -30,6 +30,12 @@ TEST(Losses, Add_Up_By_Kind_And_Column)
     EXPECT_EQ(ledger.Entries()[2].count, 5);
     EXPECT_EQ(ledger.Entries()[2].first_row, 1);
     EXPECT_EQ(ledger.Barred(), "it is odd");
+
+    ledger.Withdraw(Loss_Kind::letter_replaced, "a");
+    ledger.Withdraw(Loss_Kind::date_out_of_range, "a");
+    ledger.Note(Loss_Kind::text_cut, "b", 9, "z");
+    ASSERT_EQ(ledger.Entries().size(), 3U);
+    EXPECT_EQ(ledger.Entries()[1].count, 6);
 }
 
 TEST(Losses, Of_A_Million_Columns_Stay_Few)

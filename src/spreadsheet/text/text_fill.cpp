@@ -2,10 +2,12 @@
 #include "model/cell_appender.h"
 #include "model/cell_text.h"
 #include "model/claims.h"
+#include "model/column_names.h"
 #include "model/date_format.h"
 #include "model/names.h"
 #include "model/subset.h"
 #include "model/text_columns.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "spreadsheet/text/text_format.h"
@@ -49,6 +51,12 @@ void Cut_Type_Mark(Column& column)
 constexpr std::int32_t New_Column_Width = 6;
 constexpr std::int64_t Spare_Rows = 8;
 constexpr std::size_t Columns_Ahead = 12;
+
+/// A number that is too great or too small for a cell.
+bool Is_Beyond_Doubles(std::string_view text)
+{
+    return Parse_Number(text.data(), text.data() + text.size()).status == Number_Status::out_of_range;
+}
 
 class Sheet_Filler {
 public:
@@ -95,6 +103,7 @@ private:
     void Fill_Number(const Text_Field& field, Column_Filling& state);
     void Fill_Checked(const Text_Field& field, Column_Filling& state);
     void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
+    void Note_Field(Loss_Kind kind, const Column& column, const Text_Field& field) const;
     void Append_Blank(Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
     static void Become(Column_Filling& state, std::int32_t type, Filling filling);
@@ -273,6 +282,8 @@ void Sheet_Filler::Turn_To_Text(Column_Filling& state)
     for (Cell_Node* cell = &state.cells.Last(); cell != nullptr; cell = cell->prev)
         cell->value = empty_;
     state.rows_to_redo = row_;
+    request.losses.Withdraw(Loss_Kind::number_not_held, state.column->name);  // as texts they can be held
+    request.losses.Withdraw(Loss_Kind::number_clipped, state.column->name);
 }
 
 /// A field that is not simply a number up to its separator; its cell is there, and missing.
@@ -282,15 +293,27 @@ void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
     switch (Kind_Of_Field(walker_.Content(field), value)) {
     case Field_Kind::number:
         state.cells.Last().value.number = value;
+        if (value == Greatest_Number)
+            Note_Field(Loss_Kind::number_clipped, *state.column, field);
         break;
     case Field_Kind::nothing:
+        if (Is_Beyond_Doubles(Trim_Copy(walker_.Content(field).text)))
+            Note_Field(Loss_Kind::number_not_held, *state.column, field);
         break;
     case Field_Kind::text:
         if (state.filling == Filling::numbers_so_far)
             Turn_To_Text(state);
         Fill_Text(field, *state.column, state.cells.Last());
+        if (state.filling == Filling::numbers)
+            Note_Field(Loss_Kind::text_not_number, *state.column, field);
         break;
     }
+}
+
+/// What a field of the row under way loses in its column.
+void Sheet_Filler::Note_Field(Loss_Kind kind, const Column& column, const Text_Field& field) const
+{
+    Note_Loss(kind, column.name, row_ + 1, Trim_Copy(walker_.Content(field).text));
 }
 
 /// The quick road: a number that fills its field, as most do.
@@ -318,7 +341,8 @@ void Sheet_Filler::Refuse_Extra_Columns()
         Report_Message_Long("Maximum number of columns (%li) exceeded.\nIgnoring extra columns.\n",
                             request.Max_Columns);
     columns_full_ = true;
-    request.losses.Note_Unread("columns beyond the greatest number");
+    Note_Loss(Loss_Kind::beyond_limit, {}, 0, "columns beyond the greatest number");
+    request.losses.Bar_Replacing("columns beyond the greatest number would be lost");
 }
 
 /// A line with more fields than any before it. Columns have as many cells as there are rows.
@@ -422,8 +446,10 @@ void Sheet_Filler::Finish_Rows(const char* last_line)
 
 void Sheet_Filler::Report_Oddities() const
 {
-    if (const long nuls = shape_.nuls + walker_.Nuls(); nuls > 0)
+    if (const long nuls = shape_.nuls + walker_.Nuls(); nuls > 0) {
         Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", nuls);
+        Note_Loss(Loss_Kind::letter_replaced, {}, 0, "NUL", nuls);
+    }
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
     if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos) {
         Report_Message_Long(
@@ -440,6 +466,7 @@ void Sheet_Filler::Report_Cut_Texts() const
     if (cut_texts_ == 0)
         return;
     Report_Message_Long("Warning: %li texts of more than 10000 characters were cut.\n", cut_texts_);
+    Note_Loss(Loss_Kind::text_cut, {}, 0, "more than 10000 letters", cut_texts_);
     request.losses.Bar_Replacing("texts of it would be cut");
 }
 
