@@ -64,18 +64,14 @@ Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules
         return;
     const std::int32_t nlevels = std::max(column.nlevels, 0);
     level_end_ = (Has_Margin(column, rules) ? 2.0 : 1.0) + nlevels;
-    if (column.factor_kind == plain_factor)
-        return;
-    levels_ = std::make_unique<Levels>();
-    levels_->texts = Printed_Levels(column, rules.level_values, rules.digits, levels_->room);
-    if (std::ssize(levels_->texts) > nlevels)
-        levels_->texts.resize(static_cast<std::size_t>(nlevels));
+    Text_Arena room;
+    for (const char* const level : Printed_Levels(column, rules.level_values, rules.digits, room))
+        if (std::ssize(levels_) < nlevels)
+            levels_.emplace_back(Text_Arena::View(level));
 }
 
-std::string_view Column_Printer::Level(std::int32_t level, char* room) const
+std::string_view Column_Printer::Unlisted_Level(std::int32_t level, char* room) const
 {
-    if (level <= Listed_Levels())
-        return Text_Arena::View(levels_->texts[static_cast<std::size_t>(level) - 1]);
     if (level > column_->nlevels)
         return column_->sheet->margin_label;
     return {room, Print_Integer(room, level)};

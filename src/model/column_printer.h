@@ -5,8 +5,9 @@
 #include "model/sheet.h"
 #include "support/number_text.h"
 
+#include <cstddef>
 #include <cstdint>
-#include <memory>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -63,24 +64,21 @@ public:
     [[nodiscard]] bool Is_Level(double value) const { return value >= 1.0 && value < level_end_; }
 
     /// Levels that have a label or a level value of their own.
-    [[nodiscard]] std::int32_t Listed_Levels() const
-    {
-        return levels_ == nullptr ? 0 : static_cast<std::int32_t>(levels_->texts.size());
-    }
+    [[nodiscard]] std::int32_t Listed_Levels() const { return static_cast<std::int32_t>(levels_.size()); }
 
     /// What level `level` (from 1) prints as: its label, its value, or its number, printed into `room`;
     /// behind the last one the margin's label.
-    [[nodiscard]] std::string_view Level(std::int32_t level, char* room) const;
+    [[nodiscard]] std::string_view Level(std::int32_t level, char* room) const
+    {
+        return level <= Listed_Levels() ? levels_[static_cast<std::size_t>(level) - 1]
+                                        : Unlisted_Level(level, room);
+    }
 
 private:
-    /// Of Factors only: a wide Sheet has many columns, and each sweep over its rows touches all printers.
-    struct Levels {
-        std::vector<const char*> texts;
-        Text_Arena room;
-    };
+    [[nodiscard]] std::string_view Unlisted_Level(std::int32_t level, char* room) const;
 
     const Column* column_;
-    std::unique_ptr<Levels> levels_;
+    std::vector<std::string> levels_;  ///< short ones stand in the list itself, so that a look-up is one
     double level_end_ = 0;
     int digits_ = 0;  ///< 0: by the Column's format
     Kind kind_;
