@@ -6,7 +6,7 @@ set -euo pipefail
 # "package" is looked up with dpkg, "package:command" is there when the command is.
 needs_of() {
     case $1 in
-        build) echo g++:g++ cmake:cmake ninja-build:ninja libcli11-dev libgtest-dev zlib1g-dev libcurl4-openssl-dev ;;
+        build) echo g++:g++ cmake:cmake ninja-build:ninja libcli11-dev libgtest-dev zlib1g-dev libcurl4-openssl-dev libutf8proc-dev ;;
         test) echo pkgconf:pkg-config ;;
         bench) echo python3:python3 ;;
         fuzz) echo clang:clang++ libclang-rt-dev ;;

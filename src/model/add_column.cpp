@@ -2,6 +2,7 @@
 #include "model/column_rules.h"
 #include "model/sheet.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -16,7 +17,7 @@ const Level_Node* Find_Label(const Column& column, std::string_view text, bool i
 {
     level = 1.0;
     for (const Level_Node* node = column.labels; node != nullptr; node = node->next, level += 1.0)
-        if (ignore_case ? Equal_Ignoring_Case(node->Text(), text) : node->Text() == text)
+        if (ignore_case ? Equal_Folded(node->Text(), text) : node->Text() == text)
             return node;
     return nullptr;
 }
@@ -139,7 +140,7 @@ bool Copy_Levels(Column& column, const Column_Request& wanted)
         for (Level_Node* to = column.labels; to != nullptr && from != nullptr;
              to = to->next, from = from->next) {
             to->value.text = column.texts.Store(from->Text());
-            column.label_width = std::max(column.label_width, static_cast<std::int32_t>(to->Text().size()));
+            column.label_width = Wider(column.label_width, to->Text());
         }
         column.width = std::max(column.width, column.label_width);
         column.factor_kind = factor_with_labels;

@@ -82,6 +82,7 @@ struct Request_Globals : Lasting_Globals {
     bool Qtl_Map_Given = false;
     Fixed_Text<Short_Name_Width> Qtl_Map_File;
     Fixed_Text<80> Missing_Input_Text = "*";
+    Fixed_Text<60> Input_Encoding;  ///< the code that inputs are declared to be in; empty: none is
     std::int32_t Fixed_Lines = -1;
     bool Keep_Probe_Statistics = true;
     std::int32_t Lines_Per_Record = 1;

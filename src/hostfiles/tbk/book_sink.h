@@ -1,6 +1,7 @@
 // The stream that a book is written to, in the book's byte order.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tbk/tbk_format.h"
 #include "platform/files.h"
 #include "support/byte_fields.h"
@@ -40,15 +41,18 @@ public:
     [[nodiscard]] Output_File& File() { return *file_; }
     void Put_Short_Text(std::string_view text)
     {
-        text = text.substr(0, Short_Text_Width);
+        text = texts_.In_File(text).substr(0, Short_Text_Width);
         Put(static_cast<std::uint8_t>(text.size()));
         Put_Bytes(text);
     }
     void Put_Long_Text(std::string_view text)
     {
+        text = texts_.In_File(text);
         Put(In_A_Word(static_cast<std::int64_t>(text.size())));
         Put_Bytes(text);
     }
+
+    [[nodiscard]] Host_Text_Out& Texts() { return texts_; }
 
     /// Puts a number into bytes that go out later.
     template <class T> void Put_In_Order(std::byte* bytes, T value) const
@@ -94,6 +98,7 @@ public:
 
 private:
     Output_File* file_;
+    Host_Text_Out texts_;
     std::endian order_;
     bool too_large_ = false;
     std::int64_t record_at_ = 0;

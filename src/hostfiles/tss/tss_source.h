@@ -1,6 +1,7 @@
 // The stream that the file is read from, in the byte order of its magic word.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tss/tss_format.h"
 #include "platform/files.h"
 
@@ -50,11 +51,20 @@ public:
     /// passed over. `text` grows as the bytes come, whatever `length` claims.
     [[nodiscard]] bool Read_Bytes(std::int64_t length, std::size_t kept, std::string& text);
 
+    /// The same, of a text.
+    [[nodiscard]] bool Read_Letters(std::int64_t length, std::size_t kept, std::string& text)
+    {
+        if (!Read_Bytes(length, kept, text))
+            return false;
+        Take_From_Host(text);
+        return true;
+    }
+
     /// A counted text. False for a negative length.
     [[nodiscard]] bool Read_Text(std::size_t kept, std::string& text)
     {
         std::int32_t length;
-        return Read_Count(length) && Read_Bytes(length, kept, text);
+        return Read_Count(length) && Read_Letters(length, kept, text);
     }
 
     [[nodiscard]] bool Skip(std::int64_t bytes);

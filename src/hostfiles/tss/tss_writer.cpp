@@ -111,6 +111,7 @@ bool Write_Sheet(Sheet& sheet, Output_File& file)
         if (sink.Failed())
             return false;
     }
+    sink.Texts().Go_To({});
     if (!Write_Row_Marks(sheet, sink))
         return false;
     Write_Auxiliary_Records(sheet, sink);

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "hostfiles/shared/host_sheet.h"
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tss/tss_format.h"
 #include "platform/files.h"
 
@@ -22,9 +23,11 @@ public:
     void Put_Bytes(std::string_view bytes) { file_->Write(bytes); }
     void Put_Text(std::string_view text)
     {
+        text = texts_.In_File(text);
         Put(static_cast<std::int32_t>(text.size()));
         Put_Bytes(text);
     }
+    [[nodiscard]] Host_Text_Out& Texts() { return texts_; }
     template <class Record, class... Fields>
     void Put(const Record& record, const std::tuple<Fields...>& layout)
     {
@@ -33,6 +36,7 @@ public:
 
 private:
     Output_File* file_;
+    Host_Text_Out texts_;
 };
 
 /// A name, made up when it is empty: the reader refuses an empty one.

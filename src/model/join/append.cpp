@@ -7,6 +7,7 @@
 #include "model/number_format.h"
 #include "model/sort.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -49,7 +50,7 @@ bool Add_Label(Column& factor, std::string_view label)
     for (Level_Node* node = factor.labels; node != nullptr; node = node->next)
         node->value.text = *next++;
     factor.factor_kind = factor_with_labels;
-    factor.label_width = std::max(factor.label_width, static_cast<std::int32_t>(label.size()));
+    factor.label_width = Wider(factor.label_width, label);
     return true;
 }
 

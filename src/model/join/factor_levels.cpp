@@ -4,6 +4,7 @@
 #include "model/level_tables.h"
 #include "request/messages.h"
 #include "support/distinct_keys.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 
 #include <algorithm>
@@ -152,7 +153,7 @@ bool Add_Labels(Column& target, const Column& source, const std::vector<std::int
     const char* const* label = labels.data();
     for (Level_Node* node = target.labels; node != nullptr; node = node->next) {
         node->value.text = target.texts.Store(Text_Arena::View(*label++));
-        target.label_width = std::max(target.label_width, static_cast<std::int32_t>(node->Text().size()));
+        target.label_width = Wider(target.label_width, node->Text());
     }
     return true;
 }

@@ -8,6 +8,7 @@
 #include "request/messages.h"
 #include "request/request.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -271,8 +272,8 @@ std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
         }
         text = undoubled_;
     }
-    cut_texts_ += text.size() > Long_Text_Width ? 1 : 0;
-    text = text.substr(0, Long_Text_Width);
+    cut_texts_ += Has_More_Letters(text, Long_Text_Width) ? 1 : 0;
+    text = First_Letters(text, Long_Text_Width);
     return trim_ ? Trim_Copy(text) : text;
 }
 
@@ -280,7 +281,7 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
 {
     const Field_Content content = walker_.Content(field);
     const std::string_view text = Text_Of(content);
-    if (text.size() > Text_Cell_Width && column.type == text_column)
+    if (column.type == text_column && Has_More_Letters(text, Text_Cell_Width))
         column.type = long_text_column;
     if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);

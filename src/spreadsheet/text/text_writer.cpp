@@ -6,6 +6,7 @@
 #include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -83,9 +84,10 @@ public:
     void Pad(std::size_t start, std::int32_t width, bool left)
     {
         const std::size_t size = used_ - start;
-        if (size >= static_cast<std::size_t>(width))
+        const std::size_t letters = Letter_Count(View().substr(start));
+        if (letters >= static_cast<std::size_t>(width))
             return;
-        const std::size_t blanks = static_cast<std::size_t>(width) - size;
+        const std::size_t blanks = static_cast<std::size_t>(width) - letters;
         Reserve(blanks);
         char* const field = bytes_.data() + start;
         if (!left)
@@ -237,9 +239,9 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
 {
     const Column& column = *state.column;
     const bool factor = state.kind == Cell_Kind::factor;
-    std::size_t widest = column.name.size() + (factor ? 1 : Name_Mark(column).size());
+    std::size_t widest = Letter_Count(column.name) + (factor ? 1 : Name_Mark(column).size());
     const auto take_printed = [&] {
-        widest = std::max(widest, line_.Size());
+        widest = std::max(widest, Letter_Count(line_.View()));
         cells_stay_ = cells_stay_ && Stays_In_Place(line_.View());
         line_.Clear();
     };
@@ -369,7 +371,9 @@ void Text_Table_Writer::Write_Line()
         ++broken_lines_;
     while (line.size() > Greatest_Written_Line) {
         const std::size_t found = line.substr(0, Greatest_Written_Line).rfind(layout_.separator);
-        const std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+        std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+        while (Letters_Are_Utf8() && taken > 1 && Goes_On(line[taken]))
+            --taken;
         file_.Write(line.substr(0, taken));
         file_.Write(Line_End);
         line.remove_prefix(taken);
