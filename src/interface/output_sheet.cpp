@@ -4,6 +4,7 @@
 #include "platform/folders.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -65,7 +66,7 @@ bool Find_Output_Sheet(const std::string& output_name)
         return true;
     }
     const auto found = std::ranges::find_if(
-        *listed, [&wanted](const std::string& name) { return Equal_Ignoring_Case(name, wanted); });
+        *listed, [&wanted](const std::string& name) { return Equal_Folded(name, wanted); });
     if (!wanted.empty() && found != listed->end()) {
         Update_Sheet(*found, true);
         request.Add_To_Output = true;

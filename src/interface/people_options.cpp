@@ -87,6 +87,7 @@ void Take_People_Options(std::string& infile, std::string& outfile)
     for (std::string* const text : {&infile, &outfile})
         if (text->find("/+") != std::string::npos)
             Take_From(*text);
+    Use_Utf8_Text(For_People(People_Rule::utf8_text));
 }
 
 }  // namespace ingester

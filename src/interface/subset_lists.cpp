@@ -2,6 +2,7 @@
 
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "platform/text_codes.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/text.h"
@@ -47,6 +48,7 @@ bool Read_Column_Subset(std::string_view name)
     for (long i = 0; i < count && file.Read_Line(line, List_Line_Width); ++i)
         if (const std::string_view entry = Trim_Copy(line); !entry.empty())  // which no column is known by
             request.Subset_Names.emplace_back(entry);
+    Take_Lines_Into_Letters(request.Subset_Names);
     request.Subset_Name_Count = static_cast<std::int32_t>(request.Subset_Names.size());
     return Finish_List(file);
 }

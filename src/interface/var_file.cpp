@@ -7,8 +7,10 @@
 #include "model/text_columns.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "platform/text_codes.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -36,11 +38,20 @@ struct Var_List {
     std::vector<std::string> lines;  ///< behind the count
 };
 
+/// A mark that tells UTF-8 is no part of the first line.
+void Cut_Mark(std::string& line)
+{
+    std::size_t length;
+    if (Letters_Are_Utf8() && Code_Of_Mark(line, length) == Utf_8_Code())
+        line.erase(0, length);
+}
+
 Var_List Load_Var_List(Input_File& file)
 {
     Var_List list;
     std::string line;
     bool more = file.Read_Line(line, Longest_Line);
+    Cut_Mark(line);
     list.by_name = more && Trim_Copy(line) == By_Names_Line;
     list.count = more ? std::max(Leading_Integer(line), 0L) : 0;
     if (list.by_name || list.count > 0)
@@ -53,6 +64,7 @@ Var_List Load_Var_List(Input_File& file)
         std::ranges::replace(line, '\0', ' ');  // which would end a name
         list.lines.emplace_back(Trim_Copy(line));
     }
+    Take_Lines_Into_Letters(list.lines);
     return list;
 }
 

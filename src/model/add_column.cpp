@@ -3,6 +3,7 @@
 #include "model/factor_lists.h"
 #include "model/sheet.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -18,7 +19,7 @@ const Level_Node* Find_Label(const Column& column, std::string_view text, bool i
 {
     level = 1.0;
     for (const Level_Node* node = column.labels; node != nullptr; node = node->next, level += 1.0)
-        if (ignore_case ? Equal_Ignoring_Case(node->Text(), text) : node->Text() == text)
+        if (ignore_case ? Equal_Folded(node->Text(), text) : node->Text() == text)
             return node;
     return nullptr;
 }

@@ -3,6 +3,7 @@
 #include "model/date_text.h"
 #include "request/losses.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -17,7 +18,7 @@ bool Is_Missing_Text(std::string_view text)
     if (request.Missing_Input_Text.empty())
         return false;
     text = Trim_Copy(text);
-    return text.empty() || Equal_Ignoring_Case(text, request.Missing_Input_Text);
+    return text.empty() || Equal_Folded(text, request.Missing_Input_Text);
 }
 
 double Cell_Number(std::string_view text, double missing)
@@ -46,9 +47,9 @@ namespace {
 /// The tests by which a text finds a label, tried in this order over all labels.
 constexpr bool (*Label_Tests[])(std::string_view label, std::string_view text) = {
     [](std::string_view label, std::string_view text) { return label == text; },
-    [](std::string_view label, std::string_view text) { return Equal_Ignoring_Case(label, text); },
+    [](std::string_view label, std::string_view text) { return Equal_Folded(label, text); },
     [](std::string_view label, std::string_view text) { return label.starts_with(text); },
-    [](std::string_view label, std::string_view text) { return Starts_Ignoring_Case(label, text); },
+    [](std::string_view label, std::string_view text) { return Starts_Folded(label, text); },
 };
 
 /// The label that shares the longest start with the text, when it is the longest by itself; else 0.
@@ -59,7 +60,7 @@ std::int32_t Longest_Common_Start(const Column& column, std::string_view text)
     std::int32_t level = 0;
     for (const Level_Node* label = column.labels; label != nullptr; label = label->next) {
         ++level;
-        const std::size_t common = Common_Start(label->Text(), text);
+        const std::size_t common = Common_Letters(label->Text(), text);
         if (common > longest) {
             longest = common;
             best = level;

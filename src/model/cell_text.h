@@ -2,6 +2,7 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "support/letters.h"
 
 #include <string_view>
 
@@ -21,7 +22,7 @@ bool Set_Cell_From_Text(Column* column, std::int32_t row, std::string_view text)
 /// A Text column becomes Long Text when `text` is too wide for a cell of it.
 inline void Make_Room_For(Column& column, std::string_view text)
 {
-    if (text.size() > Text_Cell_Width && column.type == text_column) [[unlikely]]
+    if (column.type == text_column && Has_More_Letters(text, Text_Cell_Width)) [[unlikely]]
         column.type = long_text_column;
 }
 

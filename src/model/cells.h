@@ -18,7 +18,8 @@ union Cell_Value {
     const char* text;
 };
 
-/// One cell of a Column: 24 bytes.
+/// One cell of a Column: 24 bytes. All text in the model is in the code that the request's text has, see
+/// support/letters.h.
 struct Cell_Node {
     Cell_Node* next;
     Cell_Node* prev;

@@ -9,17 +9,16 @@
 
 namespace ingester {
 
-void Name_From_File(Column& column, std::string_view given)
+void Name_From_Input(Column& column, std::string_view spelled, std::string_view name)
 {
-    const std::string_view bare = Trim_Copy(given);
-    column.name = Make_Valid_Name(bare);
+    column.name = Make_Valid_Name(name);
     Use_Bracket_Text(column);
-    column.input_name = bare;
-    if (!request.Names_Kept_As_They_Stand || column.name == bare || bare.empty())
+    column.input_name = Trim_Copy(spelled);
+    if (!request.Names_Kept_As_They_Stand || name.empty() || column.name == name)
         return;
-    Note_Loss(Loss_Kind::name_changed, column.name, 0, bare);
+    Note_Loss(Loss_Kind::name_changed, column.name, 0, name);
     if (column.extra.empty())
-        column.extra = bare;
+        column.extra = name;
 }
 
 void Make_Name_Valid(Column& column)

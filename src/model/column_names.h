@@ -7,11 +7,11 @@
 
 namespace ingester {
 
-/// Gives a Column the name that a file has for it: `name`, made valid unless names stand as they are;
-/// `input_name`, by which lists find it as well; and the text of a bracketed suffix in `extra`. Of a name
-/// beyond the width that stands as it is the whole goes to `extra`. An empty name gives the next automatic
-/// one.
-void Name_From_File(Column& column, std::string_view given);
+/// Gives a Column the name that an input has for it, which spells it `spelled` and means `name`, without
+/// marks: made valid unless names stand as they are, with the text of a bracketed suffix in `extra`; lists
+/// find it under both. The whole of a name that is too wide to stand goes to `extra`. An empty one gives the
+/// next automatic name.
+void Name_From_Input(Column& column, std::string_view spelled, std::string_view name);
 
 /// Makes a name valid that stood as it was. Where that changes it, the change is a loss and the old name
 /// becomes the description of a Column that has none.

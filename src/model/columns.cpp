@@ -4,6 +4,7 @@
 #include "model/sheet.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -36,7 +37,7 @@ std::int32_t Count_Stem(const Sheet& sheet, std::string_view stem)
 {
     std::int32_t count = 0;
     for (const Column* column = sheet.first_column; column != nullptr; column = column->next)
-        if (column->type != row_column && Equal_Ignoring_Case(Stem_Of(column->name), stem))
+        if (column->type != row_column && Equal_Folded(Stem_Of(column->name), stem))
             ++count;
     return count;
 }
@@ -150,7 +151,7 @@ Column* New_Data_Column(Sheet* sheet, std::int32_t type, std::string_view name, 
     column->width = 6;
     if (Is_Text_Like(column->type)) {
         column->decimals = 0;
-        column->width = static_cast<std::int32_t>(column->name.size()) + 2;
+        column->width = Wider(0, column->name) + 2;
     } else if (column->type == factor_column) {
         column->nlevels = 2;
     }

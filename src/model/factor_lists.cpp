@@ -27,7 +27,7 @@ bool Set_Labels(Column& factor, const Factor_Lists& lists, std::int32_t count)
         const std::size_t index = next++;
         return factor.texts.Store(
             index < lists.labels.size()
-                ? lists.labels[index].substr(0, lists.label_width)
+                ? First_Letters(lists.labels[index], lists.label_width)
                 : Factor_Label_Or_Level(factor, static_cast<std::int32_t>(index) + 1, room));
     });
 }
@@ -35,7 +35,7 @@ bool Set_Labels(Column& factor, const Factor_Lists& lists, std::int32_t count)
 void Note_Cut_Labels(const Column& factor, const Factor_Lists& lists)
 {
     for (const std::string_view label : lists.labels)
-        if (label.size() > lists.label_width)
+        if (Has_More_Letters(label, lists.label_width))
             Note_Loss(Loss_Kind::text_cut, factor.name, 0, label);
 }
 

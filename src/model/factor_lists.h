@@ -2,6 +2,7 @@
 #pragma once
 
 #include "model/sheet.h"
+#include "support/letters.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -11,7 +12,7 @@
 
 namespace ingester {
 
-/// Characters of the longest label.
+/// Letters of the longest label.
 constexpr std::size_t Long_Label_Width = 250;
 
 /// Replaces a Factor's level values by `count` that `next` hands out in turn; with none, by no list.
@@ -39,12 +40,12 @@ template <class Next> [[nodiscard]] bool Put_Labels(Column& factor, std::int32_t
     }
     if (!Make_Labels(factor, count))
         return false;
-    auto widest = static_cast<std::size_t>(std::max(factor.label_width, 0));
+    std::int32_t widest = std::max(factor.label_width, 0);
     for (Level_Node* node = factor.labels; node != nullptr; node = node->next) {
         node->value.text = next();
-        widest = std::max(widest, node->Text().size());
+        widest = Wider(widest, node->Text());
     }
-    factor.label_width = static_cast<std::int32_t>(widest);
+    factor.label_width = widest;
     return true;
 }
 

@@ -1,5 +1,6 @@
 #include "model/factor_order.h"
 
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -58,9 +59,9 @@ std::vector<std::size_t> Natural_Places(const Column* column, std::int32_t order
         return places;
     const Name_List names = order->names(column->sheet->settings);
     for (const Level_Node* label = column->labels; label != nullptr; label = label->next) {
-        const std::string_view start = label->Text().substr(0, order->compared);
+        const std::string_view start = First_Letters(label->Text(), order->compared);
         const auto* const name = std::find_if(names.begin(), names.end(), [&](std::string_view entry) {
-            return !entry.empty() && Equal_Ignoring_Case(start, entry.substr(0, order->compared));
+            return !entry.empty() && Equal_Folded(start, First_Letters(entry, order->compared));
         });
         if (name == names.end())
             return {};

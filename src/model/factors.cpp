@@ -6,6 +6,7 @@
 #include "model/number_format.h"
 #include "request/messages.h"
 #include "support/distinct_keys.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -281,8 +282,7 @@ bool Gather_Texts(const Column& column, bool trim, std::size_t limit, Gathering<
             continue;
         }
         const std::string_view whole = cell->Text();
-        const std::string_view text =
-            trim ? Trim_Copy(whole, Long_Label_Width) : whole.substr(0, Long_Label_Width);
+        const std::string_view text = First_Letters(trim ? Trim_Copy(whole) : whole, Long_Label_Width);
         if (!text.empty())
             numberer.Take(row, text);
         if (numberer.Count() > limit)
@@ -300,29 +300,22 @@ struct Label_Place {
     std::uint32_t key;
 };
 
-bool Less_Ignoring_Case(std::string_view a, std::string_view b)
-{
-    return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end(), [](char x, char y) {
-        return static_cast<unsigned char>(To_Lower(x)) < static_cast<unsigned char>(To_Lower(y));
-    });
-}
-
 std::uint64_t Start_Of(std::string_view text, bool by_case_free)
 {
+    if (by_case_free)
+        return Folded_Start(text);
     std::uint64_t start = 0;
-    for (std::size_t i = 0; i < sizeof start; ++i) {
-        const char c = i < text.size() ? text[i] : '\0';
-        start = start << 8 | static_cast<unsigned char>(by_case_free ? To_Lower(c) : c);
-    }
+    for (std::size_t i = 0; i < sizeof start; ++i)
+        start = start << 8 | static_cast<unsigned char>(i < text.size() ? text[i] : '\0');
     return start;
 }
 
-/// Characters that all labels begin with.
+/// Bytes that all labels begin with, no letter taken apart.
 std::size_t Shared_Start(const std::vector<std::string_view>& keys)
 {
     std::size_t shared = keys.empty() ? 0 : keys.front().size();
     for (const std::string_view key : keys)
-        shared = std::min(shared, Common_Start(key, keys.front()));
+        shared = std::min(shared, Common_Letters(key, keys.front()));
     return shared;
 }
 
@@ -337,7 +330,7 @@ void Sort_Labels(const std::vector<std::string_view>& keys, bool by_case_free,
     std::sort(places.begin(), places.end(), [&](const Label_Place& a, const Label_Place& b) {
         if (a.start != b.start)
             return a.start < b.start;
-        return by_case_free ? Less_Ignoring_Case(keys[a.key], keys[b.key]) : keys[a.key] < keys[b.key];
+        return by_case_free ? Less_Folded(keys[a.key], keys[b.key]) : keys[a.key] < keys[b.key];
     });
     std::transform(places.begin(), places.end(), order.begin(),
                    [](const Label_Place& place) { return place.key; });
@@ -436,21 +429,22 @@ template <class Text_Of> bool Turn_Into_Text(Column& column, bool text_only, Tex
 {
     std::vector<const char*> texts;
     texts.reserve(Cells_Of(column));
-    std::size_t widest = 0;
+    constexpr auto text_width = static_cast<std::int32_t>(Text_Cell_Width);
+    std::int32_t widest = 0;
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
         texts.push_back(Cell_Is_Present(column, *cell) ? text_of(cell->value.number) : Text_Arena::Empty());
-        widest = std::max(widest, Text_Arena::View(texts.back()).size());
+        widest = Wider(widest, Text_Arena::View(texts.back()));
     }
-    if (text_only && widest > Text_Cell_Width)
+    if (text_only && widest > text_width)
         return false;
     const char* const* text = texts.data();
     for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
         cell->value.text = *text++;
     Drop_Levels(column);
-    column.nlevels = static_cast<std::int32_t>(widest);
+    column.nlevels = widest;
     column.format = general_format;
     column.text_cell_width = Text_Cell_Width;
-    Set_Column_Type(column, widest > Text_Cell_Width ? long_text_column : text_column);
+    Set_Column_Type(column, widest > text_width ? long_text_column : text_column);
     return true;
 }
 

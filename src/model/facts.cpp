@@ -2,6 +2,7 @@
 #include "model/level_tables.h"
 #include "model/number_format.h"
 #include "model/sheet.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -123,10 +124,10 @@ namespace {
 
 std::int32_t Widest_Text(const Cell_Node* node)
 {
-    std::size_t widest = 0;
+    std::int32_t widest = 0;
     for (; node != nullptr; node = node->next)
-        widest = std::max(widest, node->Text().size());
-    return static_cast<std::int32_t>(widest);
+        widest = Wider(widest, node->Text());
+    return widest;
 }
 
 std::int32_t Widest_Number(const Column& column, const Cell_Node* node)
@@ -165,7 +166,7 @@ std::int32_t Compute_Text_Width(Column* column)
         return Measure_Factor(*column) + 1;
     std::int32_t widest = Measure_Factor(*column);
     if (column->sheet->has_margins != 0)
-        widest = std::max(widest, static_cast<std::int32_t>(column->sheet->margin_label.size()));
+        widest = Wider(widest, column->sheet->margin_label);
     return column->label_width = widest;
 }
 
@@ -182,7 +183,7 @@ void Compute_Column_Width(Column* column)
         widest = Measure_Factor(*column);
     else
         widest = Widest_Number(*column, column->first_cell);
-    const auto name_width = std::min(static_cast<std::int32_t>(column->name.size()), most_name_width);
+    const auto name_width = std::min(Wider(0, column->name), most_name_width);
     column->width = std::max(widest, name_width) + 1;
 }
 

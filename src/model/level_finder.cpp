@@ -1,6 +1,7 @@
 #include "model/level_finder.h"
 
 #include "model/level_tables.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -49,11 +50,6 @@ std::int32_t Level_Finder::Nearest(double value)
 
 namespace {
 
-bool Less_Ignoring_Case(std::string_view a, std::string_view b)
-{
-    return std::ranges::lexicographical_compare(a, b, {}, To_Lower, To_Lower);
-}
-
 /// The least level of the labels from `first` on that begin as `starts` says.
 template <class Place, class Starts> std::int32_t First_Level(Place first, Place end, Starts starts)
 {
@@ -74,12 +70,12 @@ void Level_Finder::Sort_Labels()
     }
     case_free_ = exact_;
     std::ranges::stable_sort(exact_, {}, &Label::text);
-    std::ranges::stable_sort(case_free_, Less_Ignoring_Case, &Label::text);
+    std::ranges::stable_sort(case_free_, Less_Folded, &Label::text);
 }
 
 std::int32_t Level_Finder::Sharing_Most_Of_Its_Start(std::string_view text) const
 {
-    const auto common = [&](auto place) { return Common_Start(place->text, text); };
+    const auto common = [&](auto place) { return Common_Letters(place->text, text); };
     const auto behind = std::ranges::lower_bound(exact_, text, {}, &Label::text);
     auto best = behind;
     if (behind == exact_.end() || (behind != exact_.begin() && common(std::prev(behind)) > common(behind)))
@@ -99,13 +95,13 @@ std::int32_t Level_Finder::Of_Label(std::string_view text)
     const auto found = std::ranges::lower_bound(exact_, text, {}, &Label::text);
     if (found != exact_.end() && found->text == text)
         return found->level;
-    const auto alike = std::ranges::lower_bound(case_free_, text, Less_Ignoring_Case, &Label::text);
-    if (alike != case_free_.end() && Equal_Ignoring_Case(alike->text, text))
+    const auto alike = std::ranges::lower_bound(case_free_, text, Less_Folded, &Label::text);
+    if (alike != case_free_.end() && Equal_Folded(alike->text, text))
         return alike->level;
     const auto begins = [&](std::string_view label) { return label.starts_with(text); };
     if (const std::int32_t level = First_Level(found, exact_.end(), begins); level > 0)
         return level;
-    const auto begins_alike = [&](std::string_view label) { return Starts_Ignoring_Case(label, text); };
+    const auto begins_alike = [&](std::string_view label) { return Starts_Folded(label, text); };
     if (const std::int32_t level = First_Level(alike, case_free_.end(), begins_alike); level > 0)
         return level;
     return Sharing_Most_Of_Its_Start(text);

@@ -1,6 +1,7 @@
 #include "model/names.h"
 
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 #include "support/windows_1252.h"
 
@@ -30,20 +31,15 @@ constexpr Known_Suffix Known_Suffixes[] = {
 
 /// Characters that become words.
 struct Character_Word {
-    char character;
+    std::string_view letter;
     std::string_view word;
 };
 constexpr Character_Word Character_Words[] = {
-    {'<', "lt"}, {'>', "gt"}, {'@', "at"}, {'=', "eq"}, {'\xF2', "ge"}, {'\xF3', "le"},
+    {"<", "lt"},    {">", "gt"},    {"@", "at"},      {"=", "eq"},
+    {"\xF2", "ge"}, {"\xF3", "le"}, {"\u2265", "ge"}, {"\u2264", "le"},
 };
 
-/// What automatic names and bracket numbers have come to.
-struct Name_State {
-    std::int32_t next_bracket_number = 1;
-    std::int32_t next_suffix_number = 1;
-    Fixed_Text<Extra_Width> bracket_text;
-};
-Name_State name_state;
+Name_Counters name_state;  // the number of columns is that of the settings
 
 }  // namespace
 
@@ -54,7 +50,7 @@ Telling_Parts Tell_Parts(std::string_view name)
     constexpr std::size_t telling_width = 32;
     name = Trim_Copy(name);
     const std::size_t start = Bracket_Start(name);
-    return {name.substr(0, std::min(start, telling_width)), name.substr(start)};
+    return {First_Letters(name.substr(0, start), telling_width), name.substr(start)};
 }
 
 std::size_t Bracket_Start(std::string_view name)
@@ -66,9 +62,10 @@ std::string Shorten_Bracket_Name(std::string_view name, std::size_t limit)
 {
     const std::size_t start = Bracket_Start(name);
     const std::string_view suffix = name.substr(start);
-    if (name.size() <= limit || suffix.size() >= limit)
-        return std::string(name.substr(0, limit));
-    return std::string(name.substr(0, limit - suffix.size())).append(suffix);
+    const std::size_t suffix_letters = Letter_Count(suffix);
+    if (!Has_More_Letters(name, limit) || suffix_letters >= limit)
+        return std::string(First_Letters(name, limit));
+    return std::string(First_Letters(name.substr(0, start), limit - suffix_letters)).append(suffix);
 }
 
 void Remember_Bracket_Text(std::string_view text)
@@ -88,7 +85,20 @@ void Use_Bracket_Text(Column& column)
 
 void Reset_Name_Counters()
 {
-    name_state = Name_State{};
+    name_state = Name_Counters{};
+}
+
+Name_Counters Get_Name_Counters()
+{
+    Name_Counters counters = name_state;
+    counters.next_column_number = Get_Settings().next_column_number;
+    return counters;
+}
+
+void Set_Name_Counters(const Name_Counters& counters)
+{
+    name_state = counters;
+    Get_Settings().next_column_number = counters.next_column_number;
 }
 
 // --- Automatic names -----------------------------------------------------------------------------
@@ -98,8 +108,8 @@ std::string Default_Column_Name(std::int32_t number)
     Settings& settings = Get_Settings();
     const long shown = number < 1 ? settings.next_column_number++ : number;
     if (settings.prefix_given && settings.bracket_names != 0)
-        return Format_Text("%.8s[%li]", settings.column_prefix.c_str(), shown);
-    return Format_Text("%.6s%li", settings.column_prefix.c_str(), shown);
+        return Format_Text("%s[%li]", settings.column_prefix.c_str(), shown);
+    return std::string(First_Letters(settings.column_prefix, 6)).append(std::to_string(shown));
 }
 
 // --- Characters ----------------------------------------------------------------------------------
@@ -116,10 +126,27 @@ namespace {
     return Is_Name_Start(c) || Is_Digit(c);
 }
 
+/// Whether a name may begin with a letter, which may be of any script in UTF-8.
+[[nodiscard]] bool Is_Name_Start(std::string_view letter)
+{
+    return letter.size() == 1 ? Is_Name_Start(letter.front())
+                              : Is_Letter_Of_Any_Script(First_Utf8(letter).character);
+}
+
+[[nodiscard]] bool Is_Name_Letter(std::string_view letter)
+{
+    if (letter.size() == 1)
+        return Is_Name_Character(letter.front());
+    const char32_t character = First_Utf8(letter).character;
+    return Is_Letter_Of_Any_Script(character) || Is_Mark_Of_Any_Script(character)
+           || Is_Digit_Of_Any_Script(character);
+}
+
+/// Letters of Windows-1252 lose their accents.
 [[nodiscard]] bool Is_Folded(char c)
 {
     const auto byte = static_cast<unsigned char>(c);
-    return byte >= 128 && byte <= 254;
+    return !Letters_Are_Utf8() && byte >= 128 && byte <= 254;
 }
 
 [[nodiscard]] std::string_view Without_Outer_Quotes(std::string_view name)
@@ -143,14 +170,30 @@ void Append_Underscore(std::string& name)
     return c >= 32 && c <= 126 ? c : ' ';
 }
 
-void Append_Folded_Character(std::string& name, char c)
+void Append_Quoted_Letter(std::string& name, std::string_view letter)
+{
+    if (letter.size() > 1)
+        name.append(letter);
+    else
+        name.push_back(Fold_Quoted_Character(letter.front()));
+}
+
+void Append_Folded_Letter(std::string& name, std::string_view letter)
 {
     for (const Character_Word& entry : Character_Words)
-        if (entry.character == c) {
-            if (name.size() < Name_Width)
+        if (entry.letter == letter) {
+            if (Letter_Count(name) < Name_Width)
                 name.append(entry.word);
             return;
         }
+    const char c = letter.front();
+    if (letter.size() > 1) {
+        if (Is_Name_Letter(letter))
+            name.append(letter);
+        else
+            Append_Underscore(name);
+        return;
+    }
     const char folded = Is_Folded(c) ? Latin_Fold(static_cast<unsigned char>(c)) : c;
     if (c == ']' && name.ends_with('['))
         name.pop_back();  // nothing stood between them
@@ -164,18 +207,23 @@ void Append_Folded_Character(std::string& name, char c)
 [[nodiscard]] std::string Fold_Characters(std::string_view given)
 {
     std::string name;
-    for (std::size_t at = 0; at < given.size(); ++at) {
-        if (given.substr(at, Quoted_Open.size()) != Quoted_Open) {
-            Append_Folded_Character(name, given[at]);
+    while (!given.empty()) {
+        if (!given.starts_with(Quoted_Open)) {
+            const std::string_view letter = First_Letter(given);
+            Append_Folded_Letter(name, letter);
+            given.remove_prefix(letter.size());
             continue;
         }
-        const std::size_t first = at + Quoted_Open.size();
-        const std::size_t end = std::min(given.find(Quoted_Close, first), given.size());
         name.append(Quoted_Open);
-        for (const char c : given.substr(first, end - first))
-            name.push_back(Fold_Quoted_Character(c));
-        name.append(given.substr(end, Quoted_Close.size()));
-        at = end + Quoted_Close.size() - 1;
+        given.remove_prefix(Quoted_Open.size());
+        for (std::string_view letter; !given.empty() && !given.starts_with(Quoted_Close);
+             given.remove_prefix(letter.size())) {
+            letter = First_Letter(given);
+            Append_Quoted_Letter(name, letter);
+        }
+        const std::string_view close = given.substr(0, Quoted_Close.size());
+        name.append(close);
+        given.remove_prefix(close.size());
     }
     return name;
 }
@@ -254,9 +302,10 @@ void Turn_Swapped_Brackets(std::string& name)
 [[nodiscard]] std::string Without_Brackets(std::string_view given)
 {
     std::string name;
-    for (const char c : given) {
-        if (Is_Name_Character(c))
-            name.push_back(c);
+    for (std::string_view letter; !given.empty(); given.remove_prefix(letter.size())) {
+        letter = First_Letter(given);
+        if (Is_Name_Letter(letter))
+            name.append(letter);
         else
             Append_Underscore(name);
     }
@@ -297,13 +346,13 @@ void Turn_Swapped_Brackets(std::string& name)
             inner = std::to_string(Suffix_Number(level.text));
             texts.append(texts.empty() ? "" : " ").append(level.text);
         } else {
-            const std::size_t taken = suffix.size() + Quoted_Open.size() + Quoted_Close.size();
-            const std::string_view held = level.text.substr(0, room > taken ? room - taken : 0);
+            const std::size_t taken = Letter_Count(suffix) + Quoted_Open.size() + Quoted_Close.size();
+            const std::string_view held = First_Letters(level.text, room > taken ? room - taken : 0);
             if (held.empty())
                 break;
             inner.append("'").append(held).append("'");
         }
-        if (suffix.size() + inner.size() + 2 > room)
+        if (Letter_Count(suffix) + Letter_Count(inner) + 2 > room)
             break;
         suffix.append("[").append(inner).append("]");
     }
@@ -319,13 +368,13 @@ void Turn_Swapped_Brackets(std::string& name)
     const std::size_t start = std::min(name.find('['), name.size());
     const Bracket_Parts parts = Take_Levels(std::string_view(name).substr(start));
     const bool no_room = !parts.levels.empty() && !parts.levels.back().quoted && !parts.levels.back().closed
-                         && name.size() >= Name_Width;
+                         && Letter_Count(name) >= Name_Width;
     if (parts.text_behind || no_room)
         return Without_Brackets(name);
     std::string stem = name.substr(0, start);
     std::replace(stem.begin(), stem.end(), ']', '_');
     const std::string suffix = Make_Suffix(parts.levels, Name_Width - 1);
-    return stem.substr(0, Name_Width - suffix.size()) + suffix;
+    return std::string(First_Letters(stem, Name_Width - Letter_Count(suffix))).append(suffix);
 }
 
 }  // namespace
@@ -334,13 +383,13 @@ void Turn_Swapped_Brackets(std::string& name)
 
 std::string Make_Valid_Name(std::string_view name)
 {
-    if (request.Names_Kept_As_They_Stand)
-        return std::string(name.substr(0, Name_Width));
+    if (request.Names_Kept_As_They_Stand && !(name.empty() && For_People(People_Rule::free_names)))
+        return std::string(First_Letters(name, Name_Width));
     const std::string_view given = Without_Outer_Quotes(Trim_Copy(name));
     if (given.empty())
         return Default_Column_Name(0);
     std::string valid = Fold_Characters(Shorten_Bracket_Name(given, Name_Width));
-    if (!Is_Name_Start(given.front()))
+    if (!Is_Name_Start(First_Letter(given)))
         valid.insert(valid.begin(), '%');
     valid = Shorten_Bracket_Name(valid, Name_Width);
     if (valid.ends_with('_') && valid.size() > 1 && !given.ends_with('_'))
@@ -363,13 +412,14 @@ bool Cut_End_Mark(std::string& name, std::string_view marks)
 
 }  // namespace
 
-Name_Marks Read_Name_Marks(std::string_view name)
+namespace {
+
+/// Takes all marks off the end of `name`.
+Name_Marks Take_End_Marks(std::string_view& name)
 {
     constexpr std::pair<char, std::int32_t> type_marks[] = {
         {'!', factor_column}, {'#', variate_column}, {'$', text_column}};
     Name_Marks marks;
-    marks.date = Find_Ignoring_Case(name, ":D") != std::string_view::npos;
-    marks.time = !marks.date && Find_Ignoring_Case(name, ":T") != std::string_view::npos;
     for (bool found = true; std::exchange(found, false);) {
         for (const auto& [mark, type] : type_marks)
             if (marks.type == 0 && name.ends_with(mark)) {
@@ -382,6 +432,8 @@ Name_Marks Read_Name_Marks(std::string_view name)
         const char c = To_Upper(name.back());
         if (c != 'D' && c != 'T' && c != 'E' && !Is_Digit(c))
             continue;
+        marks.date = marks.date || c == 'D';
+        marks.time = marks.time || c == 'T';
         marks.exponent = marks.exponent || c == 'E';
         if (Is_Digit(c))
             marks.decimals = c - '0';
@@ -391,21 +443,42 @@ Name_Marks Read_Name_Marks(std::string_view name)
     return marks;
 }
 
+/// Hosts know marks of dates and times anywhere in a name.
+void Find_Date_Marks(std::string_view name, Name_Marks& marks)
+{
+    marks.date = Find_Ignoring_Case(name, ":D") != std::string_view::npos;
+    marks.time = Find_Ignoring_Case(name, ":T") != std::string_view::npos;
+}
+
+}  // namespace
+
+Name_Marks Read_Name_Marks(std::string_view name)
+{
+    std::string_view bare = name;
+    Name_Marks marks = Take_End_Marks(bare);
+    if (!For_People(People_Rule::free_names))
+        Find_Date_Marks(name, marks);
+    marks.time = marks.time && !marks.date;
+    return marks;
+}
+
 std::string Name_In_Lists(std::string_view name)
 {
     std::string bare = Strip_Name_Mark(name);
     if (bare.empty() || bare.find(Quoted_Open) != std::string::npos)
         return bare;
-    const Name_State state = name_state;
-    const std::int32_t next_column_number = Get_Settings().next_column_number;
+    const Name_Counters counters = Get_Name_Counters();
     std::string valid = Make_Valid_Name(bare);
-    name_state = state;
-    Get_Settings().next_column_number = next_column_number;
+    Set_Name_Counters(counters);
     return valid;
 }
 
 std::string Strip_Name_Mark(std::string_view name)
 {
+    if (For_People(People_Rule::free_names)) {
+        static_cast<void>(Take_End_Marks(name));
+        return std::string(name);
+    }
     constexpr std::string_view marks_anywhere = "DdTt";
     constexpr std::string_view end_marks = "Ee0123456789";
     std::string stripped;

@@ -42,6 +42,17 @@ struct Telling_Parts {
 /// Starts the counters of bracket numbers anew.
 void Reset_Name_Counters();
 
+/// What automatic names, bracket numbers and the texts that these replaced have come to. A reading that
+/// begins again goes back to it.
+struct Name_Counters {
+    std::int32_t next_bracket_number = 1;
+    std::int32_t next_suffix_number = 1;
+    Fixed_Text<Extra_Width> bracket_text;
+    std::int32_t next_column_number = 1;
+};
+[[nodiscard]] Name_Counters Get_Name_Counters();
+void Set_Name_Counters(const Name_Counters& counters);
+
 /// Names must differ in their first 32 characters, a bracket suffix apart: later ones of a clash get a
 /// number, and their old name goes to `extra`. For Vector, Scalar and one-way Table Sheets.
 void Make_Column_Names_Unique(Sheet* sheet);

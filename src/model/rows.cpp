@@ -2,6 +2,7 @@
 #include "model/sheet.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -23,9 +24,9 @@ bool Insertion_Fits(std::int32_t count)
 
 void Set_Text(Column& column, Cell_Node& cell, std::string_view text)
 {
-    text = text.substr(0, column.type == long_text_column ? Long_Text_Width : Text_Cell_Width);
+    text = First_Letters(text, column.type == long_text_column ? Long_Text_Width : Text_Cell_Width);
     cell.value.text = column.texts.Store(text);
-    column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(text.size()));
+    column.nlevels = Wider(column.nlevels, text);
 }
 
 bool Insert_Cells(Column* column, std::int32_t position, std::int32_t count)

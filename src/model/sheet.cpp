@@ -37,6 +37,7 @@ Sheet::~Sheet()
 void Init_Library()
 {
     request.settings = Settings{};
+    Use_Utf8_Text(For_People(People_Rule::utf8_text));
     Reset_Name_Counters();
 }
 

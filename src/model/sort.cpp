@@ -2,6 +2,7 @@
 
 #include "model/level_tables.h"
 #include "model/row_fields.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -15,7 +16,7 @@ namespace ingester {
 std::string_view Sort_Key::Text(std::size_t row) const
 {
     const std::string_view text = Text_Arena::View(texts[row]);
-    return trimmed ? Trim_Copy(text, width) : text.substr(0, width);
+    return First_Letters(trimmed ? Trim_Copy(text) : text, width);
 }
 
 namespace {
@@ -222,12 +223,34 @@ private:
     std::vector<Group> waiting_;
 };
 
+bool Folds_Beyond_Ascii(const Sort_Key& key)
+{
+    const auto ascii = [](const char* text) { return Is_Ascii(Text_Arena::View(text)); };
+    return Letters_Are_Utf8() && !std::ranges::all_of(key.texts, ascii);
+}
+
+/// A key whose texts, kept in `texts`, are compared byte by byte.
+Sort_Key Folded_Key(const Sort_Key& key, Text_Arena& texts)
+{
+    Sort_Key folded{key.numbers, {}, Text_Arena::greatest_length};
+    for (std::size_t row = 0; row < key.texts.size(); ++row)
+        folded.texts.push_back(texts.Store(Folded(key.Text(row))));
+    return folded;
+}
+
 }  // namespace
 
 std::vector<std::uint32_t> Sorted_Rows(std::span<const Sort_Key> keys, bool ascending, bool ignore_case,
                                        std::vector<std::uint8_t>* parted_by)
 {
     const std::size_t rows = keys.empty() ? 0 : keys.front().Rows();
+    if (ignore_case && std::ranges::any_of(keys, Folds_Beyond_Ascii)) {
+        Text_Arena texts;
+        std::vector<Sort_Key> folded;
+        for (const Sort_Key& key : keys)
+            folded.push_back(Folded_Key(key, texts));
+        return Row_Sorter(folded, ascending, false, parted_by).Sort(rows);
+    }
     return Row_Sorter(keys, ascending, ignore_case, parted_by).Sort(rows);
 }
 

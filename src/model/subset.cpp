@@ -70,13 +70,6 @@ void Missing_Names::Tell(const std::string& name)
         Report_Message_Text(warning_, name.c_str());
 }
 
-void Name_From_Input(Column& column, std::string_view spelled, std::string_view name)
-{
-    column.name = Make_Valid_Name(name);
-    Use_Bracket_Text(column);
-    column.input_name = Trim_Copy(spelled);
-}
-
 namespace {
 
 /// The names of the list stand for one column each.

@@ -54,10 +54,6 @@ private:
     int told_ = 0;
 };
 
-/// Names a Column as a file `spells` it, less the marks that `name` doesn't have: cleaned, with the text of a
-/// bracketed suffix in `extra`. Lists find it by either spelling.
-void Name_From_Input(Column& column, std::string_view spelled, std::string_view name);
-
 /// For each data Column of a Sheet, by its place, whether the request's list has it; with a list, each notes
 /// its `input_place`. Names must be as they are to stay.
 [[nodiscard]] std::vector<bool> Wanted_Columns(Sheet& sheet);

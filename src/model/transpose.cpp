@@ -7,6 +7,7 @@
 #include "model/names.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -140,17 +141,17 @@ bool Add_Label_Column(Transposition& work)
                         static_cast<std::int32_t>(work.data.size()));
     if (labels == nullptr)
         return false;
-    std::size_t widest = 0;
+    std::int32_t widest = 0;
     const Old_Column* old = work.data.data();
     for (Cell_Node* cell = labels->first_cell; cell != nullptr; cell = cell->next, ++old) {
         const std::string_view name = old->column->name;
-        widest = std::max(widest, name.size());
+        widest = Wider(widest, name);
         if (texts)
             Set_Text(*labels, *cell, name);
         else
             cell->value.number = Label_Number(name, from.missing_value);
     }
-    labels->width = static_cast<std::int32_t>(widest);
+    labels->width = widest;
     return true;
 }
 
@@ -326,7 +327,7 @@ Cell_Value Take_Cell(Old_Column& old, Column& column, double missing, std::span<
     if (text) {
         const std::string_view printed = old.printer->Print(*old.cell, room.data());
         value.text = column.texts.Store(printed);
-        column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(printed.size()));
+        column.nlevels = Wider(column.nlevels, printed);
     } else {
         value.number = Is_Text_Like(old.column->type) ? missing : Number_Of(old);
     }

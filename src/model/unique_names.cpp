@@ -1,5 +1,7 @@
 #include "model/names.h"
 
+#include "request/losses.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -25,7 +27,7 @@ struct Told_Name {
 [[nodiscard]] Told_Name Tell_Name(std::string_view name)
 {
     const std::size_t start = Bracket_Start(name);
-    return {std::string(name.substr(0, std::min(start, Told_Width))), std::string(name.substr(start))};
+    return {std::string(First_Letters(name.substr(0, start), Told_Width)), std::string(name.substr(start))};
 }
 
 /// The names of the columns so far. A name without a suffix clashes with all of its stem.
@@ -68,7 +70,7 @@ struct Stem_And_Number {
 
 [[nodiscard]] Stem_And_Number Stem_To_Number(const std::string& stem)
 {
-    if (stem.size() <= 2)
+    if (!Has_More_Letters(stem, 2))
         return {stem + '_', 1};
     const std::size_t last = stem.size() - 1;
     if (Is_Digit(stem[last]) && stem[last - 1] == '_')
@@ -78,12 +80,13 @@ struct Stem_And_Number {
 
 Told_Name Taken_Names::Numbered(const Told_Name& name)
 {
-    const std::string suffix = name.suffix.size() <= Greatest_Kept_Suffix ? name.suffix : std::string();
-    const std::size_t room = std::min(Told_Width, Name_Width - suffix.size());
+    const std::string suffix =
+        !Has_More_Letters(name.suffix, Greatest_Kept_Suffix) ? name.suffix : std::string();
+    const std::size_t room = std::min(Told_Width, Name_Width - Letter_Count(suffix));
     auto [stem, number] = Stem_To_Number(name.stem);
     std::int32_t end = 10;
     for (std::size_t digits = 1;; ++digits, end *= 10) {
-        const std::string start = stem.substr(0, room - digits);
+        const std::string start(First_Letters(stem, room - digits));
         // Names never come free, so a search goes on where the one before it ended. Numbers of one
         // digit may start anywhere and are tried each time.
         std::int32_t& next = digits == 1 ? number : Next_Number(start, suffix, end / 10);
@@ -102,7 +105,7 @@ void Keep_Old_Name(Column& column)
     const std::string_view extra = column.extra;
     if (extra.empty())
         column.extra = std::string(" ").append(name);
-    else if (name.size() + extra.size() + 2 <= Extra_Width)
+    else if (Letter_Count(name) + Letter_Count(extra) + 2 <= Extra_Width)
         column.extra = std::string(name).append(": ").append(extra);
 }
 
@@ -122,8 +125,10 @@ void Make_Column_Names_Unique(Sheet* sheet)
         Told_Name name = Tell_Name(column->name);
         if (taken.Clashes(name)) {
             name = taken.Numbered(name);
+            const std::string unique = name.stem + name.suffix;
+            Note_Loss(Loss_Kind::name_changed, column->name, 0, unique);
             Keep_Old_Name(*column);
-            column->name = name.stem + name.suffix;
+            column->name = unique;
         }
         taken.Add(name);
     }

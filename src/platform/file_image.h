@@ -5,6 +5,7 @@
 
 #include <cstddef>
 #include <memory>
+#include <string_view>
 
 namespace ingester {
 
@@ -23,6 +24,9 @@ public:
     /// Takes the rest of an open file. False when it can't be read, or when there is no room.
     [[nodiscard]] bool Load(Input_File& file);
 
+    /// Holds `bytes`, which may be its own, from now on. False when there is no room: it is as it was then.
+    [[nodiscard]] bool Replace(std::string_view bytes);
+
     [[nodiscard]] char* Bytes() const { return bytes_; }
     [[nodiscard]] std::size_t Size() const { return size_; }
     [[nodiscard]] bool Changed() const;
@@ -34,11 +38,13 @@ public:
 private:
     [[nodiscard]] bool Map(const Input_File& file);
     [[nodiscard]] bool Read_All(Input_File& file);
+    void Free();
 
     char* bytes_ = nullptr;
     std::size_t size_ = 0;
     std::size_t mapped_ = 0;    ///< length of the mapping; 0: the bytes came from malloc
     std::size_t released_ = 0;  ///< bytes given back so far
+    bool changed_ = false;      ///< an earlier mapping lost bytes
 };
 
 }  // namespace ingester

@@ -1,6 +1,7 @@
 #include "platform/clipboard.h"
 #include "platform/files.h"
-#include "support/windows_1252.h"
+#include "platform/text_codes.h"
+#include "support/utf8.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -168,7 +169,8 @@ bool Keep_Text(std::string text, std::string_view scratch_name)
     Output_File file;
     if (!file.Open_Scratch(scratch_name))
         return false;
-    file.Write(Is_Utf8(text) ? Utf8_To_Windows_1252(text) : text);
+    Text_Converter converter = Sure_Converter(Utf_8_Code(), Code_Of_Letters());
+    file.Write(Is_Utf8(text) ? converter.Convert(text) : text);
     return file.Close();
 }
 
@@ -179,8 +181,9 @@ bool Load_Text(std::string_view name, const Memory_File& target)
     if (!file.Open(name))
         return false;
     std::string text(static_cast<std::size_t>(file.Size()), '\0');
+    Text_Converter converter = Sure_Converter(Code_Of_Letters(), Utf_8_Code());
     return file.Read_Exactly(text.data(), text.size())
-           && target.Set_Text(Is_Utf8(text) ? text : Windows_1252_To_Utf8(text));
+           && target.Set_Text(Is_Utf8(text) ? text : converter.Convert(text));
 }
 
 }  // namespace

@@ -7,6 +7,7 @@
 #include <csignal>
 #include <cstdint>
 #include <cstdlib>
+#include <cstring>
 
 #include <sys/mman.h>
 #include <unistd.h>
@@ -72,6 +73,11 @@ constexpr std::size_t First_Room = std::size_t{1} << 20;
 
 File_Image::~File_Image()
 {
+    Free();
+}
+
+void File_Image::Free()
+{
     if (mapped_ == 0) {
         std::free(bytes_);
         return;
@@ -80,9 +86,23 @@ File_Image::~File_Image()
     ::munmap(bytes_, mapped_);
 }
 
+bool File_Image::Replace(std::string_view bytes)
+{
+    auto* const own = static_cast<char*>(Take_Memory(nullptr, bytes.size() + slack));
+    if (own == nullptr)
+        return false;
+    std::memcpy(own, bytes.data(), bytes.size());
+    changed_ = Changed();
+    Free();
+    bytes_ = own;
+    size_ = bytes.size();
+    mapped_ = released_ = 0;
+    return true;
+}
+
 bool File_Image::Changed() const
 {
-    return mapped_ != 0 && watched.lost != 0;
+    return changed_ || (mapped_ != 0 && watched.lost != 0);
 }
 
 void File_Image::Release_Before(const char* at)

@@ -20,4 +20,7 @@ constexpr std::size_t People_Rule_Count = 6;
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);
 
+/// Turns `utf8_text` on or off, before the request has any text of its own: the letters follow it.
+void Use_Utf8_Text(bool on);
+
 }  // namespace ingester

@@ -18,8 +18,9 @@ public:
     [[nodiscard]] bool Holds(char c) const { return holds_[static_cast<unsigned char>(c)]; }
 
     /// Writes the offsets in `text` of all members to `offsets`, which has room for `text.size()`
-    /// rounded up to 64. Returns how many there are. Fewer than 4 GB at a time.
-    std::size_t Find_All(std::string_view text, std::uint32_t* offsets) const;
+    /// rounded up to 64. Returns how many there are. Fewer than 4 GB at a time. `ascii` becomes false when a
+    /// byte is beyond ASCII.
+    std::size_t Find_All(std::string_view text, std::uint32_t* offsets, bool& ascii) const;
 
 private:
     std::array<bool, 256> holds_{};

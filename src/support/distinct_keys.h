@@ -1,7 +1,7 @@
 // Distinct keys, numbered in the order in which they come.
 #pragma once
 
-#include "support/text.h"
+#include "support/letters.h"
 
 #include <array>
 #include <bit>
@@ -51,22 +51,20 @@ struct Exact_Keys {
     }
 };
 
-/// Texts equal but for the case of ASCII letters.
+/// Texts equal but for the case of their letters.
 struct Case_Free_Keys {
     static void Prefetch(std::string_view key) { __builtin_prefetch(key.data()); }
-    [[nodiscard]] static bool Equal(std::string_view a, std::string_view b)
-    {
-        return Equal_Ignoring_Case(a, b);
-    }
+    [[nodiscard]] static bool Equal(std::string_view a, std::string_view b) { return Equal_Folded(a, b); }
     [[nodiscard]] static std::uint64_t Hash(std::string_view key, std::uint64_t seed)
     {
         std::uint64_t word = 0;
-        for (std::size_t i = 0; i < key.size(); ++i) {
-            word = word << 8 | static_cast<unsigned char>(To_Lower(key[i]));
-            if (i % sizeof word == sizeof word - 1)
+        std::size_t size = 0;
+        For_Folded_Bytes(key, [&](char c) {
+            word = word << 8 | static_cast<unsigned char>(c);
+            if (++size % sizeof word == 0)
                 seed = Mix_Words(word, seed);
-        }
-        return Mix_Words(word, seed ^ key.size());
+        });
+        return Mix_Words(word, seed ^ size);
     }
 };
 

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <string_view>
 
 namespace ingester {
 
@@ -41,90 +42,12 @@ constexpr char32_t Signs[] = {
 constexpr unsigned char First_Sign = 128;
 static_assert(std::size(Signs) == 32);
 
-char32_t Character_Of(unsigned char byte)
+}  // namespace
+
+char32_t Windows_1252_Character(unsigned char byte)
 {
     const bool sign = byte >= First_Sign && byte < First_Sign + std::size(Signs);
     return sign ? Signs[byte - First_Sign] : byte;
-}
-
-char Byte_Of(char32_t character)
-{
-    if (character < First_Sign || (character >= First_Sign + std::size(Signs) && character <= 255))
-        return static_cast<char>(character);
-    const auto* const sign = std::ranges::find(Signs, character);
-    return sign == std::end(Signs) ? '?' : static_cast<char>(First_Sign + (sign - std::begin(Signs)));
-}
-
-struct Utf8_Character {
-    char32_t character = 0;
-    std::size_t length = 0;  ///< 0: not valid
-};
-
-/// The character that a text begins with.
-Utf8_Character First_Of(std::string_view text)
-{
-    constexpr char32_t smallest[] = {0, 0, 0x80, 0x800, 0x10000};
-    const auto lead = static_cast<unsigned char>(text.front());
-    if (lead < First_Sign)
-        return {lead, 1};
-    const std::size_t length = lead >= 0xF0 ? 4 : (lead >= 0xE0 ? 3 : 2);
-    if (lead < 0xC0 || lead > 0xF7 || text.size() < length)
-        return {};
-    char32_t character = lead & (0x7FU >> length);
-    for (const char c : text.substr(1, length - 1)) {
-        const auto byte = static_cast<unsigned char>(c);
-        if ((byte & 0xC0U) != 0x80)
-            return {};
-        character = (character << 6U) | (byte & 0x3FU);
-    }
-    const bool surrogate = character >= 0xD800 && character <= 0xDFFF;
-    return character < smallest[length] || character > 0x10FFFF || surrogate
-               ? Utf8_Character{}
-               : Utf8_Character{character, length};
-}
-
-}  // namespace
-
-bool Is_Utf8(std::string_view text)
-{
-    while (!text.empty()) {
-        const std::size_t length = First_Of(text).length;
-        if (length == 0)
-            return false;
-        text.remove_prefix(length);
-    }
-    return true;
-}
-
-std::string Utf8_To_Windows_1252(std::string_view text)
-{
-    std::string bytes;
-    bytes.reserve(text.size());
-    while (!text.empty()) {
-        const auto [character, length] = First_Of(text);
-        bytes += Byte_Of(character);
-        text.remove_prefix(std::max<std::size_t>(length, 1));
-    }
-    return bytes;
-}
-
-std::string Windows_1252_To_Utf8(std::string_view text)
-{
-    std::string utf8;
-    utf8.reserve(text.size());
-    for (const char c : text) {
-        const char32_t character = Character_Of(static_cast<unsigned char>(c));
-        if (character < First_Sign) {
-            utf8 += c;
-            continue;
-        }
-        if (character >= 0x800)
-            utf8 += static_cast<char>(0xE0U | (character >> 12U));
-        utf8 += static_cast<char>(character >= 0x800 ? 0x80U | ((character >> 6U) & 0x3FU)
-                                                     : 0xC0U | (character >> 6U));
-        utf8 += static_cast<char>(0x80U | (character & 0x3FU));
-    }
-    return utf8;
 }
 
 }  // namespace ingester

@@ -1,9 +1,7 @@
-// Windows-1252: the upper half folded to plain letters, and texts of it in UTF-8 and back.
+// Windows-1252: its characters, and its upper half folded to plain letters.
 #pragma once
 
 #include <array>
-#include <string>
-#include <string_view>
 
 namespace ingester {
 
@@ -16,12 +14,7 @@ extern const std::array<char, 127> Latin_Fold_Table;
     return Latin_Fold_Table[byte - 128U];
 }
 
-[[nodiscard]] bool Is_Utf8(std::string_view text);
-
-/// A valid UTF-8 text in Windows-1252, with "?" for characters that it lacks.
-[[nodiscard]] std::string Utf8_To_Windows_1252(std::string_view text);
-
-/// Every byte comes back as it was: those that stand for no letter become controls of their number.
-[[nodiscard]] std::string Windows_1252_To_Utf8(std::string_view text);
+/// The character of a byte. Bytes that stand for no letter are controls of their number.
+[[nodiscard]] char32_t Windows_1252_Character(unsigned char byte);
 
 }  // namespace ingester

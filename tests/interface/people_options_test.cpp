@@ -90,6 +90,11 @@ TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
         EXPECT_EQ(Convert(input, "a.tab").first, 0);
         EXPECT_EQ(On_One_Line(Get("a.tab")), table);
     }
+    Put("marks.csv", "Start:Date,sown:D,how much?!!,:T,\"\"\n1,5/6/2020,x,10:30,7\n");
+    EXPECT_EQ(Convert("marks.csv/+names", "a.tab/u").first, 0);
+    EXPECT_EQ(On_One_Line(Get("a.tab")), "Start:Date\tsown\thow much?!\tC1\tC2|1\t05/06/2020\tx\t10:30\t7|")
+        << "marks are such at the end of a name only";
+
     const Host_Answer answer = Convert("a.csv/+names/+losses", "a.gen");
     EXPECT_NE(answer.second.find("Lost in Plot 1: 1 names changed (Plot_1).\n"), std::string::npos)
         << answer.second;
@@ -142,6 +147,19 @@ TEST_F(People_Options, Know_Further_Endings_And_Types)
     }
     Put("binary", std::string("\x01\x02\x03 data\n", 9));
     EXPECT_EQ(Convert("binary/+types", "a.tab").first, 3);
+}
+
+TEST_F(People_Options, Declare_The_Code_Of_The_Input)
+{
+    Put("a.csv", "t,n\nB\x84r,1\n");
+    EXPECT_EQ(Convert("a.csv/+people/+encoding=850", "a.tab").first, 0);
+    EXPECT_EQ(On_One_Line(Get("a.tab")), "t\tn|B\xC3\xA4r\t1|");
+    EXPECT_EQ(Convert("a.csv/+encoding=cp437", "a.tab").first, 0);
+    EXPECT_EQ(On_One_Line(Get("a.tab")), "t\tn|B\xE4r\t1|") << "a host's text is Windows-1252";
+    const Host_Answer unknown = Convert("a.csv/+encoding=latin17", "a.tab");
+    EXPECT_EQ(unknown.first, 5);
+    EXPECT_TRUE(unknown.second.starts_with("Error: The encoding latin17 is not known. The nearest ones: "))
+        << unknown.second;
 }
 
 TEST_F(People_Options, Name_The_Secondary_File_Beside_A_List)

@@ -2,6 +2,7 @@
 
 #include "hostfiles/shared/host_sheet.h"
 #include "model/factors.h"
+#include "support/letters.h"
 
 #include <cmath>
 
@@ -59,7 +60,7 @@ void Checker::Check_Cell(const Column& column, const Cell_Node& cell, std::int64
     // Unbuffered columns are stored as Text, so a null text is lawful in every kind of text.
     if (Is_Text_Like(column.type) && cell.value.text != nullptr) {
         const std::size_t width = column.type == long_text_column ? Long_Text_Width : Text_Cell_Width;
-        Expect(cell.Text().size() <= width, "too long a text in cell", index);
+        Expect(!Has_More_Letters(cell.Text(), width), "too long a text in cell", index);
         Expect(cell.value.text[cell.Text().size()] == '\0', "an open text in cell", index);
     } else if (column.type == factor_column && !(cell.value.number < 1.0)) {
         const double level = cell.value.number;
@@ -93,7 +94,7 @@ void Checker::Check_Column(const Sheet& sheet, const Column& column, std::int64_
     for (const Cell_Node* cell = column.first_cell; cell != nullptr && faults_.empty(); cell = cell->next)
         Check_Cell(column, *cell, at++);
     for (const Level_Node* label = column.labels; label != nullptr && faults_.empty(); label = label->next)
-        Expect(label->value.text != nullptr && label->Text().size() <= Long_Label_Width,
+        Expect(label->value.text != nullptr && !Has_More_Letters(label->Text(), Long_Label_Width),
                "a label that is no text", 0);
     const bool factor = column.type == factor_column;
     Expect(!factor || column.factor_kind != factor_with_levels || column.level_values_count >= column.nlevels,

@@ -125,6 +125,7 @@ std::string_view Name_Of(const Column& column)
 
 bool Write_Column_Script(Column& column, Script_Buffer& script)
 {
+    script.Texts().Go_To(column.name);
     switch (column.type) {
     case row_column:
         return true;

@@ -71,6 +71,7 @@ void Script_Buffer::Flush()
 void Write_Script_Text(std::string_view text, bool keep_whole, bool flush, Script_Buffer& script)
 {
     if (!text.empty()) {
+        text = script.Texts().Cross(text);
         char* const target = script.Reserve(text.size());
         std::memcpy(target, text.data(), text.size());
         script.Take(target + text.size(), keep_whole);
@@ -102,7 +103,7 @@ void Write_Quoted(std::string_view before, std::string_view text, std::size_t li
                   bool keep_whole, Script_Buffer& script)
 {
     constexpr std::size_t quotes = 2;
-    text = text.substr(0, limit);
+    text = script.Texts().Cross(text).substr(0, limit);
     char* target = script.Reserve(before.size() + 2 * text.size() + quotes + after.size());
     target = Copy_Text(target, before);
     *target++ = '\'';

@@ -1,6 +1,7 @@
 // The text of a script: lines of limited length, escaped texts, and numbers.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "model/cells.h"
 #include "platform/files.h"
 
@@ -46,6 +47,8 @@ public:
     /// No line is broken until it is set back: a long text stands as it is.
     void Set_Verbatim(bool verbatim) { verbatim_ = verbatim; }
 
+    [[nodiscard]] Host_Text_Out& Texts() { return texts_; }
+
     /// Ends the last line and hands everything to the file.
     void Flush();
 
@@ -60,6 +63,7 @@ private:
     [[nodiscard]] std::string_view Break_Before(std::string_view piece, bool keep_whole) const;
 
     Output_File& file_;
+    Host_Text_Out texts_;
     std::size_t capacity_ = 0;
     std::unique_ptr<char[]> bytes_;
     std::size_t used_ = 0;

@@ -1,5 +1,6 @@
 #include "hostfiles/shared/host_sheet.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -27,13 +28,6 @@ struct Member {
     std::string stem;
     std::vector<Member_Level> levels;
 };
-
-std::string Folded(std::string_view text)
-{
-    std::string folded(text);
-    std::ranges::transform(folded, folded.begin(), To_Lower);
-    return folded;
-}
 
 /// Takes one bracket off the front of `rest`. False where none stands.
 bool Take_Level(std::string_view& rest, Member_Level& level)

@@ -1,6 +1,7 @@
 // The stream that a book is written to, in the book's byte order.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tbk/tbk_format.h"
 #include "platform/field_sink.h"
 
@@ -18,12 +19,18 @@ public:
     [[nodiscard]] bool Failed() const { return too_large_ || Field_Sink::Failed(); }
 
     void Put_Byte(std::int32_t value) { Put(static_cast<std::uint8_t>(value)); }
-    void Put_Short_Text(std::string_view text) { Put_Text<std::uint8_t>(text.substr(0, Short_Text_Width)); }
+    void Put_Short_Text(std::string_view text)
+    {
+        Put_Text<std::uint8_t>(texts_.Cross(text).substr(0, Short_Text_Width));
+    }
     void Put_Long_Text(std::string_view text)
     {
+        text = texts_.Cross(text);
         Put(In_A_Word(static_cast<std::int64_t>(text.size())));
         Put_Bytes(text);
     }
+
+    [[nodiscard]] Host_Text_Out& Texts() { return texts_; }
 
     /// The head of a record of known length; of one whose length is told by `End_Record`.
     void Put_Record_Head(std::int32_t type, std::int64_t length)
@@ -54,6 +61,7 @@ public:
     }
 
 private:
+    Host_Text_Out texts_;
     bool too_large_ = false;
     std::int64_t record_at_ = 0;
 };

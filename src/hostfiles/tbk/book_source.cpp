@@ -133,7 +133,7 @@ std::int32_t Book_Source::Read_Short_Text(std::string* text, std::size_t limit)
     std::uint8_t length;
     std::string passed_over;
     return Read(length)
-                   && Read_Bytes(length, text == nullptr ? 0 : limit, text == nullptr ? passed_over : *text)
+                   && Read_Letters(length, text == nullptr ? 0 : limit, text == nullptr ? passed_over : *text)
                ? length
                : -1;
 }
@@ -141,7 +141,7 @@ std::int32_t Book_Source::Read_Short_Text(std::string* text, std::size_t limit)
 bool Book_Source::Read_Long_Text(std::string& text, std::size_t limit)
 {
     std::int32_t length;
-    return Read(length) && (length >= 0 || Corrupt()) && Read_Bytes(length, limit, text);
+    return Read(length) && (length >= 0 || Corrupt()) && Read_Letters(length, limit, text);
 }
 
 bool Book_Source::Corrupt(const char* fault)
@@ -187,6 +187,7 @@ bool Book_Source::Peek_Page_Name(std::int64_t offset, std::string& name)
     if (got < name_at + length)
         return false;
     name.assign(reinterpret_cast<const char*>(bytes.data() + name_at), std::min(length, Page_Name_Width));
+    Take_From_Host(name);
     return true;
 }
 

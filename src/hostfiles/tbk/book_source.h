@@ -1,6 +1,7 @@
 // The records of a book, read one behind the other in the book's byte order.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tbk/tbk_format.h"
 #include "platform/files.h"
 #include "support/byte_fields.h"
@@ -70,8 +71,15 @@ public:
         return Read(first) && Read(second, rest...);
     }
 
-    /// `length` bytes, `kept` of them at most into `text`.
+    /// `length` bytes, `kept` of them at most into `text`; the same of a text.
     [[nodiscard]] bool Read_Bytes(std::int64_t length, std::size_t kept, std::string& text);
+    [[nodiscard]] bool Read_Letters(std::int64_t length, std::size_t kept, std::string& text)
+    {
+        if (!Read_Bytes(length, kept, text))
+            return false;
+        Take_From_Host(text);
+        return true;
+    }
     [[nodiscard]] bool Skip(std::int64_t count);
 
     /// A text behind its length. A null `text` passes over it. The length in the book, below 0 for a fault.

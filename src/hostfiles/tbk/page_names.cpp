@@ -1,7 +1,9 @@
 #include "hostfiles/tbk/page_names.h"
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tbk/tbk.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -70,9 +72,9 @@ std::size_t Sheet_Number_Of(std::string_view request_text, std::size_t sheets)
 std::string Page_Name_Of(const Sheet& sheet)
 {
     if (!sheet.sheet_name.empty())
-        return std::string(sheet.sheet_name.view());
+        return As_Held_By_Host(sheet.sheet_name);
     const std::string_view asked = request.Output_Sheet_Name;
-    return asked.empty() ? "Sheet1" : std::string(asked.substr(0, Page_Name_Width));
+    return asked.empty() ? "Sheet1" : As_Held_By_Host(First_Letters(asked, Page_Name_Width));
 }
 
 std::string Add_Unique_Page_Name(std::vector<std::string>& names, std::string_view name)
@@ -81,12 +83,12 @@ std::string Add_Unique_Page_Name(std::vector<std::string>& names, std::string_vi
     constexpr std::string_view automatic = "Sheet";
     const bool numbered = name.starts_with(automatic) && Leading_Integer(name.substr(automatic.size())) > 0;
     const auto taken = [&](const std::string& candidate) {
-        return std::ranges::any_of(
-            names, [&](const std::string& other) { return Equal_Ignoring_Case(other, candidate); });
+        return std::ranges::any_of(names,
+                                   [&](const std::string& other) { return Equal_Folded(other, candidate); });
     };
     std::string candidate(name);
     for (long n = 1; n <= most_tries && taken(candidate); ++n) {
-        const std::string_view base = name.substr(0, n < 10 ? 29 : n < 100 ? 28 : 27);
+        const std::string_view base = First_Letters(name, n < 10 ? 29 : n < 100 ? 28 : 27);
         candidate =
             numbered ? Format_Text("Sheet%li", n) : Format_Text("%s_%li", std::string(base).c_str(), n);
     }

@@ -8,6 +8,7 @@
 #include "model/row_fields.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -25,26 +26,19 @@ struct Best_Page {
     std::string name;
 };
 
-std::string Upper(std::string_view text)
-{
-    std::string upper(text);
-    std::ranges::transform(upper, upper.begin(), To_Upper);
-    return upper;
-}
-
 /// The page whose name begins most like the request.
 Best_Page Find_Best_Page(Book_Source& source, const Sheet_Offsets& offsets, std::string_view asked)
 {
-    const std::string wanted = Upper(asked);
+    const std::string wanted = Folded(asked);
     Best_Page best;
     std::string name;
     for (std::size_t i = 0; i < offsets.size(); ++i) {
         if (!source.Peek_Page_Name(offsets[i], name))
             continue;  // the others may be read all the same
-        const std::size_t common = Common_Start(Upper(name), wanted);
+        const std::size_t common = Common_Letters(Folded(name), wanted);
         if (common > best.common)
             best = {i, common, name};
-        if (common == wanted.size() && common == name.size())
+        if (Equal_Folded(name, asked))
             break;
     }
     return best;
@@ -65,7 +59,7 @@ bool Choose_Sheet(Book_Reading& reading, const Sheet_Offsets& offsets)
         const Best_Page best = Find_Best_Page(reading.source, offsets, asked);
         if (best.common == 0)
             return Fail("Specifed sheet name %s not found in Tabulon TBK file.\n", asked.c_str());
-        request.Sheet_Name_Was_Exact = Equal_Ignoring_Case(best.name, asked);
+        request.Sheet_Name_Was_Exact = Equal_Folded(best.name, asked);
         if (!request.Sheet_Name_Was_Exact)
             Report_Message(
                 Format_Text("Warning: inexact match on sheet name: '%.100s' selected for '%.100s'.\n",

@@ -78,6 +78,7 @@ bool Read_Text_Record(Book_Reading& reading)
     if (!Start_Cells(reading, "Text items do not match specified number of rows") || !source.Read(widest))
         return false;
     Cell_Appender cells(column, std::min<std::int64_t>(reading.stored_length, source.Left()));
+    std::string room;
     for (std::int32_t row = 0; row < reading.stored_length; ++row) {
         std::uint8_t length;
         const std::byte* const bytes = source.Read(length) ? source.Take(length) : nullptr;
@@ -88,7 +89,8 @@ bool Read_Text_Record(Book_Reading& reading)
         else if (length > widest)
             reading.Note("Text column length exceeds specified maximum");
         const std::size_t kept = std::min<std::size_t>(length, Text_Cell_Width);
-        cells.Append({.text = column.texts.Store({reinterpret_cast<const char*>(bytes), kept})});
+        const std::string_view text = From_Host({reinterpret_cast<const char*>(bytes), kept}, room);
+        cells.Append({.text = column.texts.Store(text)});
         column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(kept));
     }
     cells.Finish(reading.stored_length);
@@ -111,7 +113,7 @@ bool Read_Long_Text_Record(Book_Reading& reading)
             return false;
         if (length < 0)
             return source.Corrupt("Text length is negative");
-        if (!source.Read_Bytes(length, Long_Text_Width, text))
+        if (!source.Read_Letters(length, Long_Text_Width, text))
             return false;
         if (length > static_cast<std::int32_t>(Long_Text_Width)) {
             static const std::string fault =
@@ -121,7 +123,7 @@ bool Read_Long_Text_Record(Book_Reading& reading)
             reading.Note("Text column length exceeds specified maximum for column");
         }
         cells.Append({.text = column.texts.Store(text)});
-        column.nlevels = std::max(column.nlevels, static_cast<std::int32_t>(text.size()));
+        column.nlevels = Wider(column.nlevels, text);
     }
     cells.Finish(reading.stored_length);
     return true;
@@ -263,7 +265,7 @@ bool Read_Label_Record(Book_Reading& reading)
         if (length > static_cast<std::int32_t>(Long_Label_Width))
             reading.Note("Factor labels truncated");
         node->value.text = column.texts.Store(label);
-        column.label_width = std::max(column.label_width, static_cast<std::int32_t>(label.size()));
+        column.label_width = Wider(column.label_width, label);
     }
     return true;
 }

@@ -79,7 +79,7 @@ bool Read_Text_Block(Book_Source& source, std::string& block, std::int32_t& coun
     if (stated <= 0)
         return stated == 0 || source.Corrupt();
     if (!source.Read(bytes) || (bytes < 0 && !source.Corrupt())
-        || !source.Read_Bytes(bytes, static_cast<std::size_t>(bytes), block))
+        || !source.Read_Letters(bytes, static_cast<std::size_t>(bytes), block))
         return false;
     if (!block.empty() && block.back() != '\0')
         block.push_back('\0');
@@ -97,7 +97,7 @@ bool Read_Dummy_Name(Book_Reading& reading)
     sheet.analysis_dummy_plain = marked ? 0 : 1;
     if (marked)
         name.erase(0, 1);
-    sheet.analysis_dummy = name.empty() ? name : Make_Valid_Name(name.substr(0, Name_Width));
+    sheet.analysis_dummy = name.empty() ? name : Make_Valid_Name(First_Letters(name, Name_Width));
     return true;
 }
 
@@ -302,7 +302,7 @@ bool Read_Cell_Comment(Book_Reading& reading)
     std::int32_t length = 0;
     std::string text;
     if (!source.Skip(number) || !source.Read(row, column) || !source.Skip(2 * number) || !source.Read(marker)
-        || (marker > 0 && !source.Read(length)) || (length > 0 && !source.Read_Bytes(length, kept, text)))
+        || (marker > 0 && !source.Read(length)) || (length > 0 && !source.Read_Letters(length, kept, text)))
         return false;
     const bool has_cell = row >= 1 && column >= 1 && column <= std::ssize(reading.columns);
     if (request.Replace_Book_Data && has_cell && text.starts_with("*M"))

@@ -5,6 +5,7 @@
 #include "platform/folders.h"
 #include "request/losses.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/progress.h"
 #include "support/text.h"
 
@@ -345,7 +346,7 @@ std::optional<std::size_t> Find_Page(std::span<const std::string> names, std::st
     if (const auto found = std::ranges::find(looked_at, page); found != looked_at.end())
         return static_cast<std::size_t>(found - looked_at.begin());
     for (std::size_t i = looked_at.size(); i > 0; --i)
-        if (Equal_Ignoring_Case(looked_at[i - 1], page))
+        if (Equal_Folded(looked_at[i - 1], page))
             return i - 1;
     const std::size_t number = Sheet_Number_Of(page, names.size());
     return number == 0 ? std::nullopt : std::optional(number - 1);
@@ -382,7 +383,7 @@ bool Replace_Sheet_In_TBK(const char* file_name, Sheet* sheet, std::string_view 
         return Fail("Sheet %s not found in Tabulon file %.100s.\n", std::string(page).c_str(),
                     book_name.c_str());
     // A number says which sheet, and is no name for it.
-    const bool named = Equal_Ignoring_Case(names[*found], page);
+    const bool named = Equal_Folded(names[*found], page);
     const Book_Change change{{{sheet, named ? std::string(page) : names[*found]}}, found};
     return Update_Book(book, file_name, book_name, change);
 }

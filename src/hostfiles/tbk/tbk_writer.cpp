@@ -28,7 +28,7 @@ void Write_Sheet_Start(const Sheet& sheet, Book_Sink& sink, std::string_view pag
     sink.Put(sheet.column_count, sheet.row_count, Marker_In_File(sheet));
     for (const std::int16_t flag : {sheet.host_flag_a, sheet.read_only, sheet.host_flag_b, sheet.host_flag_c})
         sink.Put_Byte(flag);
-    sink.Put_Short_Text(page.substr(0, Page_Name_Width));
+    sink.Put_Short_Text(First_Letters(page, Page_Name_Width));
     sink.End_Record();
 }
 
@@ -249,6 +249,7 @@ bool Write_Sheet_Group(Sheet& sheet, Book_Sink& sink, std::string_view page, Gro
     Write_Structure_Name(sheet, sink);
     Write_Hidden_Map(sheet, sink);
     Rewrite_Offsets(sink, table, Write_Columns(sheet, sink, form));
+    sink.Texts().Go_To({});
     Write_Analysis(sheet, sink);
     Write_Title(sheet, sink);
     Write_Conditional_Mode(sheet, sink);

@@ -164,6 +164,7 @@ void Write_Texts(Column& column, Book_Sink& sink)
         sink.Put_Byte(std::min(widest, static_cast<std::int32_t>(Short_Text_Width)));
     const Cell_Node* cell = column.first_cell;
     for (std::int32_t row = 0; row < length; ++row) {
+        sink.Texts().Go_To_Row(row + 1);
         const std::string_view text = cell == nullptr ? std::string_view{} : cell->Text();
         if (long_text)
             sink.Put_Long_Text(text);
@@ -256,18 +257,18 @@ void Write_Labels(Column& column, std::int32_t nlevels, Book_Sink& sink)
 {
     if (column.label_count < 1)
         return;
-    std::size_t widest = 0;
+    std::int32_t widest = 0;
     std::vector<std::string> labels;
     const Level_Node* node = column.labels;
     for (long level = 1; level <= nlevels; ++level) {
         const std::string_view label = node == nullptr ? std::string_view{} : node->Text();
         labels.push_back(label.empty() ? Format_Text("<%li>", level) : std::string(label));
-        widest = std::max(widest, labels.back().size());
+        widest = Wider(widest, labels.back());
         node = node == nullptr ? nullptr : node->next;
     }
     sink.Start_Record(level_labels_record);
     sink.Put(nlevels);
-    sink.Put_Byte(static_cast<std::int32_t>(std::min(widest, Short_Text_Width)));
+    sink.Put_Byte(std::min(widest, static_cast<std::int32_t>(Short_Text_Width)));
     for (const std::string& label : labels)
         sink.Put_Short_Text(label);
     sink.End_Record();
@@ -367,6 +368,7 @@ void Write_IPRINT(const Column& column, Book_Sink& sink)
 
 void Write_Column_Group(Column& column, Book_Sink& sink, Group_Form form)
 {
+    sink.Texts().Go_To(column.name);
     Write_Column_Start(column, sink);
     Write_Extra(column, sink);
     Write_Option(column, sink);

@@ -4,6 +4,7 @@
 #include "hostfiles/shared/host_sheet.h"
 #include "hostfiles/tss/tss.h"
 #include "model/names.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 
@@ -55,6 +56,8 @@ void Limit_Columns(TSS_Reading& reading)
         return;
     Report_Message("Warning too many columns to read in.\n");
     Report_Message_Long("Warning Columns above %li NOT transfered.\n", limit);
+    Note_Loss(Loss_Kind::beyond_limit, {}, 0, "columns beyond the greatest number",
+              reading.columns - limit - 1);
     reading.columns = limit + 1;
 }
 
@@ -116,7 +119,7 @@ bool Read_Variate_Pointer(TSS_Reading& reading)
     std::string name;
     if (length < 0)
         return false;
-    if (!reading.source.Read_Bytes(length, greatest_length, name))
+    if (!reading.source.Read_Letters(length, greatest_length, name))
         return reading.Ends_Early();
     if (length > greatest_length)
         Report_Message("Pointer to Variate columns was truncated in reading TSS file.\n");
@@ -132,7 +135,7 @@ bool Read_Name(TSS_Source& source, std::string& name, const char* none, const ch
         return Fail(none);
     if (length > static_cast<std::int32_t>(Name_Width))
         Report_Message(too_long);
-    return source.Read_Bytes(length, Name_Width, name) || Fail(none);
+    return source.Read_Letters(length, Name_Width, name) || Fail(none);
 }
 
 bool Read_Matrix_Block(TSS_Reading& reading)

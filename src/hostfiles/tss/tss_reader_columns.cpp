@@ -3,6 +3,7 @@
 #include "model/cell_appender.h"
 #include "model/factor_lists.h"
 #include "model/names.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/number_text.h"
@@ -92,7 +93,7 @@ bool Length_Fits(const TSS_Reading& reading, std::int32_t length, std::int32_t o
 bool Read_Texts_And_Display(TSS_Source& source, Column_Record& record)
 {
     std::int32_t length;
-    if (!source.Read(length) || length <= 0 || !source.Read_Bytes(length, Name_Width, record.name)
+    if (!source.Read(length) || length <= 0 || !source.Read_Letters(length, Name_Width, record.name)
         || record.name.front() == '\0')
         return false;
     if (source.version >= 3 && !source.Read_Text(Extra_Width, record.description))
@@ -215,7 +216,7 @@ bool Read_Labels(TSS_Source& source, Column& column, std::int32_t count)
     labels.reserve(static_cast<std::size_t>(source.Possible(count, sizeof(std::int32_t))));
     for (std::int32_t i = 0; i < count; ++i) {
         std::int32_t length;
-        if (!source.Read_Count(length) || !source.Read_Bytes(length, Text_Cell_Width, label))
+        if (!source.Read_Count(length) || !source.Read_Letters(length, Text_Cell_Width, label))
             return false;
         labels.push_back(column.texts.Store(label));
         column.label_width = std::max(column.label_width, length);
@@ -304,7 +305,7 @@ bool Read_Text_Cells(TSS_Reading& reading, Column& column, std::int32_t count, s
     std::int32_t kept = 0;
     for (std::int32_t row = 0; row < count; ++row) {
         std::int32_t length;
-        if (!reading.source.Read_Count(length) || !reading.source.Read_Bytes(length, Text_Cell_Width, text))
+        if (!reading.source.Read_Count(length) || !reading.source.Read_Letters(length, Text_Cell_Width, text))
             return false;
         if (!reading.rows.Keeps(row))
             continue;
@@ -325,7 +326,7 @@ bool Read_Long_Text_Cells(TSS_Reading& reading, Column& column, std::int32_t cou
     bool told = false;
     for (std::int32_t row = 0; row < count; ++row) {
         std::int32_t length;
-        if (!reading.source.Read_Count(length) || !reading.source.Read_Bytes(length, Long_Text_Width, text))
+        if (!reading.source.Read_Count(length) || !reading.source.Read_Letters(length, Long_Text_Width, text))
             return Fail("Error: Negative text length.\n");
         if (!reading.rows.Keeps(row))
             continue;
@@ -334,8 +335,10 @@ bool Read_Long_Text_Cells(TSS_Reading& reading, Column& column, std::int32_t cou
                                        column.name.c_str(), static_cast<long>(greatest)));
             told = true;
         }
+        if (length > greatest)
+            Note_Loss(Loss_Kind::text_cut, column.name, row + 1, text);
         cells.Append({.text = column.texts.Store(text)});
-        width = std::max(width, static_cast<std::int32_t>(text.size()));
+        width = Wider(width, text);
         ++kept;
     }
     cells.Finish(kept);
@@ -399,10 +402,10 @@ std::int32_t Width_Of_Cells(const Column& column, std::int32_t text_width)
         if (column.type == factor_column && column.factor_kind == factor_with_labels) {
             width = 3;
             for (const Level_Node* label = column.labels; label != nullptr; label = label->next)
-                width = std::max(width, static_cast<std::int32_t>(label->Text().size()));
+                width = Wider(width, label->Text());
         }
     }
-    return std::max(width, static_cast<std::int32_t>(column.name.size()) + 2);
+    return std::max(width, Wider(0, column.name) + 2);
 }
 
 void Set_Width(Column& column, std::int32_t file_width, std::int32_t text_width)
@@ -410,7 +413,7 @@ void Set_Width(Column& column, std::int32_t file_width, std::int32_t text_width)
     const Sheet& sheet = *column.sheet;
     column.width = file_width != 0 ? file_width : Width_Of_Cells(column, text_width);
     if (column.type == factor_column && sheet.type == table_sheet && sheet.has_margins != 0)
-        column.width = std::max(column.width, static_cast<std::int32_t>(sheet.margin_label.size()));
+        column.width = Wider(column.width, sheet.margin_label);
 }
 
 // --- Columns -----------------------------------------------------------------------------------------

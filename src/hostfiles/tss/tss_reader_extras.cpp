@@ -221,7 +221,7 @@ bool Read_Saved_Restrictions(TSS_Reading& reading)
             return false;
         if (length < 0 || length > longest_name)
             return Fail("Invalid Saved Restriction Name length in TSS File.\n");
-        if (!source.Read_Bytes(length, longest_name, restriction.name) || !source.Read(rows))
+        if (!source.Read_Letters(length, longest_name, restriction.name) || !source.Read(rows))
             return false;
         if (rows != reading.head.row_count)
             return Fail("Invalid Saved Restriction row count in TSS File.\n");

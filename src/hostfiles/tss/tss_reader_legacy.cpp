@@ -105,7 +105,7 @@ bool Read_DDE_Link(TSS_Reading& reading)
             return false;
         if (length > Greatest_Text_Block)
             return Fail("Corrupt DDE Link in TSS file\n");
-        if (!reading.source.Read_Bytes(length, Greatest_Text_Block, *text))
+        if (!reading.source.Read_Letters(length, Greatest_Text_Block, *text))
             return false;
     }
     std::int32_t flag;

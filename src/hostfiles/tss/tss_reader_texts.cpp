@@ -41,6 +41,7 @@ bool Read_Text_Block(TSS_Source& source, std::int32_t bytes, std::string& block,
             ++empty_texts;
     }
     block.resize(std::max(block.size(), std::min(size, block.size() + empty_texts)));
+    Take_From_Host(block);
     return true;
 }
 
@@ -61,7 +62,7 @@ bool Read_Dummy_Name(TSS_Reading& reading)
     Sheet& sheet = *reading.sheet;
     std::int32_t length;
     std::string name;
-    if (!reading.source.Read_Count(length) || !reading.source.Read_Bytes(length, Name_Width + 1, name))
+    if (!reading.source.Read_Count(length) || !reading.source.Read_Letters(length, Name_Width + 1, name))
         return false;
     if (name.empty())
         return true;
@@ -72,7 +73,7 @@ bool Read_Dummy_Name(TSS_Reading& reading)
     if (length - (marked ? 1 : 0) > static_cast<std::int32_t>(Name_Width))
         Report_Message("Analysis dummy name truncated in reading TSS File.\n");
     if (!name.empty())
-        sheet.analysis_dummy = Valid_Name_Of_No_Column(name.substr(0, Name_Width));
+        sheet.analysis_dummy = Valid_Name_Of_No_Column(First_Letters(name, Name_Width));
     return true;
 }
 
@@ -133,7 +134,7 @@ bool Read_Pointer_Members(TSS_Source& source, Host_Pointer& pointer)
             return false;
         if (length < 0)
             return Fail("Bad pointer object in TSS file.\n");
-        if (!source.Read_Bytes(length, Name_Width, pointer.members.emplace_back()))
+        if (!source.Read_Letters(length, Name_Width, pointer.members.emplace_back()))
             return false;
     }
     return true;
@@ -161,7 +162,7 @@ bool Read_Pointers(TSS_Reading& reading)
             return false;
         if (length < 0)
             return Fail("Bad pointer object in TSS file.\n");
-        if (!source.Read_Bytes(length, Name_Width, pointer.name)
+        if (!source.Read_Letters(length, Name_Width, pointer.name)
             || (pointer.kind == 0 && !Read_Pointer_Members(source, pointer)))
             return false;
         reading.sheet->pointers.push_back(std::move(pointer));

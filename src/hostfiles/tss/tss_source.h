@@ -1,6 +1,7 @@
 // The stream that the file is read from, in the byte order of its magic word.
 #pragma once
 
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tss/tss_format.h"
 #include "platform/field_source.h"
 
@@ -26,6 +27,22 @@ public:
             return field.since > version || Read(record.*field.member);
         };
         return std::apply([&](const auto&... field) { return (read(field) && ...); }, layout);
+    }
+
+    /// As `Read_Bytes`, of a text.
+    [[nodiscard]] bool Read_Letters(std::int64_t length, std::size_t kept, std::string& text)
+    {
+        if (!Read_Bytes(length, kept, text))
+            return false;
+        Take_From_Host(text);
+        return true;
+    }
+
+    /// A counted text. False for a negative length.
+    [[nodiscard]] bool Read_Text(std::size_t kept, std::string& text)
+    {
+        std::int32_t length;
+        return Read_Count(length) && Read_Letters(length, kept, text);
     }
 };
 

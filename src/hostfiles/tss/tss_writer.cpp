@@ -3,6 +3,7 @@
 
 #include "hostfiles/tss/tss.h"
 #include "model/names.h"
+#include "request/losses.h"
 #include "request/messages.h"
 
 #include <algorithm>
@@ -72,6 +73,7 @@ bool Write_Row_Marks(Sheet& sheet, TSS_Sink& sink)
         return true;
     if (!Has_Row_Marks(sheet)) {
         Report_Message("Warning: The restriction of the rows is not saved with a matrix that has labels.\n");
+        Note_Loss(Loss_Kind::metadata_dropped, {}, 0, "the restriction of the rows");
         return true;
     }
     if (!Need_Rows(&sheet))
@@ -111,6 +113,7 @@ bool Write_Sheet(Sheet& sheet, Output_File& file)
         if (sink.Failed())
             return false;
     }
+    sink.Texts().Go_To({});
     if (!Write_Row_Marks(sheet, sink))
         return false;
     Write_Auxiliary_Records(sheet, sink);

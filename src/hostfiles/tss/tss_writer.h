@@ -2,6 +2,7 @@
 #pragma once
 
 #include "hostfiles/shared/host_sheet.h"
+#include "hostfiles/shared/host_text.h"
 #include "hostfiles/tss/tss_format.h"
 #include "platform/field_sink.h"
 
@@ -17,11 +18,17 @@ public:
     using Field_Sink::Field_Sink;
     using Field_Sink::Put;
 
+    void Put_Text(std::string_view text) { Field_Sink::Put_Text(texts_.Cross(text)); }
+    [[nodiscard]] Host_Text_Out& Texts() { return texts_; }
+
     template <class Record, class... Fields>
     void Put(const Record& record, const std::tuple<Fields...>& layout)
     {
         std::apply([&](const auto&... field) { (Put(record.*field.member), ...); }, layout);
     }
+
+private:
+    Host_Text_Out texts_;
 };
 
 /// A name, made up when it is empty: the reader refuses an empty one.

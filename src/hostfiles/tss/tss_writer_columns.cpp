@@ -70,11 +70,11 @@ Display_Record Display_Of(const Column& column)
 /// The mode is one more character, of texts that have one.
 void Write_Attached_Text(const Column& column, TSS_Sink& sink)
 {
-    const std::string& text = column.attached_text;
-    if (text.empty() || column.attached_mode == 0) {
-        sink.Put_Text(text);
+    if (column.attached_text.empty() || column.attached_mode == 0) {
+        sink.Put_Text(column.attached_text);
         return;
     }
+    const std::string_view text = sink.Texts().Cross(column.attached_text);
     const char mode = static_cast<char>(column.attached_mode);
     sink.Put(static_cast<std::int32_t>(text.size()) + 1);
     sink.Put_Bytes(text);
@@ -121,6 +121,7 @@ void Write_Text_Column(Column& column, std::int32_t length, TSS_Sink& sink)
     sink.Put(Compute_Text_Width(&column));
     const Cell_Node* cell = column.first_cell;
     for (std::int32_t row = 0; row < length; ++row) {
+        sink.Texts().Go_To_Row(row + 1);
         sink.Put_Text(cell == nullptr ? std::string_view{} : cell->Text());
         cell = cell == nullptr ? nullptr : cell->next;
     }
@@ -191,6 +192,7 @@ void Write_Factor_Column(Column& column, std::int32_t length, TSS_Sink& sink)
 void Write_TSS_Column(Column& column, TSS_Sink& sink)
 {
     const std::int32_t length = std::clamp(column.length, 0, std::max(column.sheet->row_count, 0));
+    sink.Texts().Go_To(column.name);
     sink.Put(Type_In_File(column));
     sink.Put(length);
     sink.Put_Text(Name_In_File(column));

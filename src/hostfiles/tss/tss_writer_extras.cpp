@@ -102,7 +102,7 @@ void Write_Texts(std::string_view block, std::int32_t count, TSS_Sink& sink)
 /// Size and count of a block in front of its texts; the size alone for none.
 void Write_Text_Block(const std::string& block, std::int32_t count, TSS_Sink& sink)
 {
-    sink.Put(static_cast<std::int32_t>(block.size()));
+    sink.Put(static_cast<std::int32_t>(Letter_Count(block)));
     if (block.empty())
         return;
     sink.Put(count);

@@ -9,6 +9,7 @@
 #include "interface/var_file.h"
 #include "model/sheet.h"
 #include "platform/files.h"
+#include "platform/text_codes.h"
 #include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "support/text.h"
@@ -37,6 +38,18 @@ Request_Status Take_Rules_For_People(Request_Run& run)
 {
     Take_People_Options(run.infile, run.outfile);
     return Done;
+}
+
+/// A code that nobody knows would be taken for none.
+Request_Status Know_Encoding(Request_Run&)
+{
+    if (request.Input_Encoding.empty() || Find_Text_Code(request.Input_Encoding) != nullptr)
+        return Done;
+    std::string near;
+    for (const std::string_view name : Nearest_Code_Names(request.Input_Encoding))
+        near.append(near.empty() ? "" : ", ").append(name);
+    return Stop(Request_Status::not_imported, "Error: The encoding %s is not known. The nearest ones: %s.\n",
+                request.Input_Encoding.c_str(), near.c_str());
 }
 
 Request_Status Fetch_Named_Secondary(Request_Run& run)

@@ -8,6 +8,7 @@
 #include "model/number_format.h"
 #include "model/sort.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 

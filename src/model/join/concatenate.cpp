@@ -2,6 +2,7 @@
 
 #include "model/names.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <string>
@@ -25,14 +26,6 @@ bool Fit_Together(const Sheet* target, const Sheet* source)
 bool Replaces(const Column& column)
 {
     return column.type >= scalar_column && column.type <= matrix_column;
-}
-
-std::string Folded(std::string_view name)
-{
-    std::string folded(name);
-    for (char& c : folded)
-        c = To_Lower(c);
-    return folded;
 }
 
 void Fit_Missing_Values(Sheet& source, double missing)

@@ -5,6 +5,7 @@
 #include "model/level_tables.h"
 #include "request/messages.h"
 #include "support/distinct_keys.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 
 #include <algorithm>

@@ -5,6 +5,7 @@
 #include "model/join/merge_rows.h"
 #include "model/names.h"
 #include "model/row_fields.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "support/text.h"
 
@@ -130,6 +131,15 @@ void Spread_New_Cells(Column& column, const std::vector<Merged_Row>& plan, std::
     column.cursor_index = -1;
 }
 
+void Tell_Lost_Values(const Cell_Transfer& transfer)
+{
+    const Column& target = transfer.Target();
+    Note_Loss(Loss_Kind::label_dropped, target.name, 0, "values without an equal in the output");
+    Report_Message(
+        Format_Text("Warning: some values of %s have no equal in %s, and were not kept as they are.\n",
+                    transfer.Source().name.c_str(), target.name.c_str()));
+}
+
 /// Writes the rows of the source into one column of the result.
 void Write_Source_Rows(const Merge_Request& wanted, const Merged_Column& merged,
                        const std::vector<Merged_Row>& plan)
@@ -153,9 +163,7 @@ void Write_Source_Rows(const Merge_Request& wanted, const Merged_Column& merged,
         transfer.Put(to, values[from]);
     }
     if (transfer.Has_Lost())
-        Report_Message(
-            Format_Text("Warning: some values of %s have no equal in %s, and were not kept as they are.\n",
-                        transfer.Source().name.c_str(), transfer.Target().name.c_str()));
+        Tell_Lost_Values(transfer);
 }
 
 bool Add_Rows_At_End(Sheet& sheet, std::size_t count)

@@ -5,6 +5,7 @@
 #include "model/factors.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -18,16 +19,7 @@ namespace {
 /// Below 0, 0 or above 0, as the first text stands to the second.
 int Compare_Texts(std::string_view a, std::string_view b, bool ignore_case)
 {
-    if (!ignore_case)
-        return a.compare(b);
-    const std::size_t shared = std::min(a.size(), b.size());
-    for (std::size_t i = 0; i < shared; ++i) {
-        const int difference =
-            static_cast<unsigned char>(To_Lower(a[i])) - static_cast<unsigned char>(To_Lower(b[i]));
-        if (difference != 0)
-            return difference;
-    }
-    return a.size() < b.size() ? -1 : a.size() > b.size() ? 1 : 0;
+    return ignore_case ? Compare_Folded(a, b) : a.compare(b);
 }
 
 int Compare_Numbers(double a, double b, double tolerance)

@@ -1,6 +1,7 @@
 // How a line is cut into fields, and what a field says.
 #include "request/request.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -53,10 +54,26 @@ void Field_Walker::Look_At_Next_Window()
         window_ = window_end_;
         window_end_ += std::min(text_.last - window_, Window_Size);
         const auto size = static_cast<std::size_t>(window_end_ - window_);
-        found_ = marks_.Find_All({window_, size}, places_.data());
+        bool ascii = true;
+        found_ = marks_.Find_All({window_, size}, places_.data(), ascii);
+        if (text_.watched && (!ascii || !check_.Is_Whole()))
+            Check_Window();
         Blank_Out_Nuls();
     } while (found_ == 0);
     next_ = 0;
+}
+
+/// Windows that the walk comes to again were found good. One that it jumped to begins a line.
+void Field_Walker::Check_Window()
+{
+    const char* const first = std::max<const char*>(window_, checked_);
+    if (first >= window_end_)
+        return;
+    if (first != checked_)
+        check_ = Utf8_Check();
+    checked_ = window_end_;
+    if (!check_.Take({first, static_cast<std::size_t>(window_end_ - first)}))
+        throw Text_Malformed();
 }
 
 /// A NUL would end the text for everything that reads it. A window ahead, so that whoever looks at the
@@ -162,7 +179,7 @@ Field_Kind Kind_Of_Field(const Field_Content& content, double& value)
     const std::string_view text = Trim_Copy(content.text);
     value = 0.0;
     const std::string_view missing = request.Missing_Input_Text;
-    if (text.empty() || (missing != "*" && Equal_Ignoring_Case(text, missing)))
+    if (text.empty() || (missing != "*" && Equal_Folded(text, missing)))
         return Field_Kind::nothing;
     const char* const last = text.data() + text.size();
     const Parsed_Number parsed = Parse_Number(text.data(), last);

@@ -11,6 +11,7 @@
 #include "request/messages.h"
 #include "request/request.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -44,7 +45,7 @@ void Cut_Type_Mark(Column& column)
     const std::string_view name = column.name;
     if (name.empty())
         column.name = Default_Column_Name(0);
-    else if (name.find_last_of("!#$") == name.size() - 1)
+    else if (!For_People(People_Rule::free_names) && name.find_last_of("!#$") == name.size() - 1)
         column.name = std::string(name.substr(0, name.size() - 1));
 }
 
@@ -261,8 +262,8 @@ std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
         }
         text = undoubled_;
     }
-    cut_texts_ += text.size() > Long_Text_Width ? 1 : 0;
-    text = text.substr(0, Long_Text_Width);
+    cut_texts_ += Has_More_Letters(text, Long_Text_Width) ? 1 : 0;
+    text = First_Letters(text, Long_Text_Width);
     return trim_ ? Trim_Copy(text) : text;
 }
 

@@ -4,8 +4,10 @@
 #include "model/sheet.h"
 #include "platform/file_image.h"
 #include "platform/files.h"
+#include "platform/text_codes.h"
 #include "support/byte_scan.h"
 #include "support/fixed_text.h"
+#include "support/utf8.h"
 
 #include <cstdint>
 #include <exception>
@@ -26,16 +28,35 @@ struct Text_Buffer {
     char* first = nullptr;
     char* last = nullptr;
     std::int64_t lines_before = 0;  ///< lines of the file that were cut off in front
+    bool watched = false;           ///< it may turn out that this is no UTF-8
 
     [[nodiscard]] std::string_view Text() const { return {first, static_cast<std::size_t>(last - first)}; }
     [[nodiscard]] bool Holds(char c) const { return Text().find(c) != std::string_view::npos; }
 };
 
+/// What is known of the code of a text.
+struct Text_Code_State {
+    std::size_t head = 0;           ///< bytes in front of the text that tell its code
+    bool watched = false;           ///< taken for UTF-8 until something else is met
+    Text_Code otherwise = nullptr;  ///< what it is then; malformed UTF-8 where that was told or declared
+};
+
+/// Finds what code the file's bytes are in, and brings them into that of all letters, unless they are taken
+/// for UTF-8: those are looked at while they are read. False after a message.
+bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& state);
+
+/// A text that was watched is not UTF-8: brings it into the code of all letters. False after a message.
+bool Convert_Malformed(const std::string& name, const Text_Code_State& state, File_Image& image,
+                       Text_Buffer& buffer);
+
+/// The same for a text of one line that tells no code.
+bool Take_Line_Into_Code(std::string& line);
+
 /// Loads the lines that the request's options keep into `image`. `strip_titles` drops the quoted
 /// lines that a text begins with. `buffer` is empty for no lines; `rewritten` tells that the image
 /// no longer is the file's. False after a message.
 bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
-                     bool& rewritten);
+                     Text_Code_State& code, bool& rewritten);
 
 /// Whether a line, with its end or without, is of a length that is read; false after a message that
 /// calls it line `number`.
@@ -68,9 +89,13 @@ struct Field_Content {
 /// The line end that a text stopped with is gone: its file was changed while it was read.
 struct Text_Changed : std::exception {};
 
+/// A text that was taken for UTF-8 is none.
+struct Text_Malformed : std::exception {};
+
 /// Walks the fields of a text, behind which `Readable_Behind` bytes may be read. The places of separators,
 /// line ends and quotes are found for a window of the text at once, so that cutting a field is looking up
-/// where the next of them stands. NULs become blanks ahead of the walk. Throws `Text_Changed`.
+/// where the next of them stands. NULs become blanks ahead of the walk. Throws `Text_Changed` and, where the
+/// text is watched, `Text_Malformed`.
 class Field_Walker {
 public:
     Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer);
@@ -138,6 +163,7 @@ private:
     [[nodiscard]] Text_Field Next_Quoted();
     [[nodiscard]] bool More_Behind(char end);
     void Look_At_Next_Window();
+    void Check_Window();
     void Blank_Out_Nuls();
 
     Text_Buffer text_;
@@ -152,6 +178,8 @@ private:
     std::vector<std::uint32_t> places_;  ///< of the marks in the window
     std::size_t next_ = 0;
     std::size_t found_ = 0;
+    Utf8_Check check_;               ///< of a text that is watched
+    const char* checked_ = nullptr;  ///< up to here
 };
 
 /// The type of a column about which its fields have said nothing yet.

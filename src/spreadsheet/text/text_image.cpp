@@ -92,9 +92,10 @@ std::string_view Blanks_Of(std::string_view file_name)
 /// Copies the kept lines to the head of the image; they never outrun the lines still to be read.
 class Line_Keeper {
 public:
-    Line_Keeper(File_Image& image, const Line_Range& range, std::string_view blanks, bool strip_titles)
+    Line_Keeper(File_Image& image, std::size_t head, const Line_Range& range, std::string_view blanks,
+                bool strip_titles)
         : image_(image), range_(range), blanks_(blanks),
-          lines_(std::string_view(image.Bytes(), image.Size())), next_(image.Bytes()),
+          lines_(std::string_view(image.Bytes(), image.Size()).substr(head)), next_(image.Bytes()),
           titles_pending_(strip_titles), start_pending_(!request.Start_Text.empty())
     {}
 
@@ -233,9 +234,10 @@ bool Keeps_Every_Line(const Line_Range& range)
 }
 
 /// The text without its leading blank lines and titles.
-void Cut_Head(const File_Image& image, std::string_view blanks, bool strip_titles, Text_Buffer& buffer)
+void Cut_Head(const File_Image& image, std::size_t head, std::string_view blanks, bool strip_titles,
+              Text_Buffer& buffer)
 {
-    buffer = {image.Bytes(), image.Bytes() + image.Size()};
+    buffer = {image.Bytes() + head, image.Bytes() + image.Size()};
     if (buffer.last[-1] != '\n' && buffer.last[-1] != '\r')
         *buffer.last++ = '\n';
     Line_Source lines(buffer.Text());
@@ -269,7 +271,7 @@ bool Line_Is_Short_Enough(std::string_view line, std::int64_t number)
 }
 
 bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Text_Buffer& buffer,
-                     bool& rewritten)
+                     Text_Code_State& code, bool& rewritten)
 {
     const Line_Range range = Range_Of(request.Cell_Range);
     rewritten = false;
@@ -277,13 +279,17 @@ bool Load_Text_Image(Input_File& file, bool strip_titles, File_Image& image, Tex
         return Fail("Error: First line > Last line in cell range.\n");
     if (!image.Load(file))
         return Fail_To_Read(file.Name());
-    if (image.Size() == 0)
+    if (!Settle_Code(file.Name(), image, code))
+        return false;
+    if (image.Size() <= code.head)
         return true;
     const std::string_view blanks = Blanks_Of(file.Name());
     rewritten = !Keeps_Every_Line(range);
-    if (rewritten)
-        return Line_Keeper(image, range, blanks, strip_titles).Keep(buffer);
-    Cut_Head(image, blanks, strip_titles, buffer);
+    if (rewritten && !Line_Keeper(image, code.head, range, blanks, strip_titles).Keep(buffer))
+        return false;
+    if (!rewritten)
+        Cut_Head(image, code.head, blanks, strip_titles, buffer);
+    buffer.watched = code.watched;
     return true;
 }
 

@@ -6,6 +6,7 @@
 #include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -44,6 +45,8 @@ bool Fields_Stand_In_Columns(Input_File& file)
     for (std::string line; file.Read_Line(line, Greatest_Line) && !line.empty();) {
         if (line.find(Title_Words) != std::string::npos)
             continue;
+        if (Letters_Are_Utf8())
+            std::erase_if(line, Goes_On);  // a byte a letter
         const bool padded = length == 0 || line.size() == length;
         if (!padded || line.find_first_of(",\t") != std::string::npos)
             return true;  // written by others, or not in such columns
@@ -70,7 +73,7 @@ bool Read_Text_Lines(Input_File& file)
     for (long number = 1; number <= wanted; ++number)
         if (!file.Read_Line(line, line.max_size()))
             return Fail("Could not read data file %.200s.\n", file.Name().c_str());
-    if (!Line_Is_Short_Enough(line, wanted))
+    if (!Line_Is_Short_Enough(line, wanted) || !Take_Line_Into_Code(line))
         return false;
     const char separator =
         request.Custom_Separators.empty() ? '\t' : request.Custom_Separators.view().front();
@@ -83,7 +86,7 @@ bool Read_Text_Lines(Input_File& file)
     std::string_view rest = line;
     for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next) {
         const std::size_t end = std::min(rest.find(separator), rest.size());
-        Set_Cell_From_Text(*column, *cell, Trim_Copy(rest.substr(0, end), Text_Cell_Width));
+        Set_Cell_From_Text(*column, *cell, First_Letters(Trim_Copy(rest.substr(0, end)), Text_Cell_Width));
         rest.remove_prefix(std::min(end + 1, rest.size()));
     }
     return file.Close();

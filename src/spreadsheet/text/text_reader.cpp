@@ -53,6 +53,18 @@ void Make_Factors(Sheet& sheet, const Text_Shape& shape, const Text_Scan_Options
     }
 }
 
+/// A Sheet whose text turns out to be malformed goes before the text is read again.
+bool Fill_Unless_Malformed(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
+                           const Text_Buffer& buffer, File_Image* image)
+{
+    try {
+        return Fill_Text_Sheet(sheet, shape, options, buffer, image);
+    } catch (const Text_Malformed&) {
+        Free_Sheet(sheet);
+        throw;
+    }
+}
+
 }  // namespace
 
 bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
@@ -70,7 +82,7 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     Sheet* const earlier = Current_Sheet;
     Sheet* const sheet = Setup_Text_Sheet(shape, variate_column);
     Current_Sheet = earlier;
-    if (sheet == nullptr || !Fill_Text_Sheet(sheet, shape, options, buffer, image))
+    if (sheet == nullptr || !Fill_Unless_Malformed(sheet, shape, options, buffer, image))
         return false;
     Make_Factors(*sheet, shape, options);
     Make_Column_Names_Unique(sheet);
@@ -78,28 +90,56 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
     return true;
 }
 
+namespace {
+
+/// How the fields of a text are separated, as far as its name and its head tell.
+struct Text_Separation {
+    bool tabs = false;
+    bool commas = false;
+    bool blanks = false;
+};
+
+/// Reads a text and, where it was taken for UTF-8 and is none, reads it again as what it is.
+bool Parse_In_Its_Code(const std::string& name, const Text_Separation& by, const Text_Code_State& code,
+                       Text_Buffer& buffer, File_Image& image, bool rewritten)
+{
+    const Name_Counters counters = Get_Name_Counters();
+    const Loss_Ledger losses = request.losses;
+    try {
+        return Parse_Text_Buffer(buffer, by.tabs, by.commas, by.blanks, rewritten ? nullptr : &image);
+    } catch (const Text_Malformed&) {
+        Set_Name_Counters(counters);
+        request.losses = losses;
+    }
+    return Convert_Malformed(name, code, image, buffer)
+           && Parse_Text_Buffer(buffer, by.tabs, by.commas, by.blanks);
+}
+
+}  // namespace
+
 bool Read_CSV(Input_File& file)
 {
-    bool csv_file = Ends_Ignoring_Case(file.Name(), ".csv");
-    bool tab_file = Ends_Ignoring_Case(file.Name(), ".tab");
-    const bool strip_titles = !csv_file && !tab_file;
-    bool blank_separated = false;
+    Text_Separation by;
+    by.commas = Ends_Ignoring_Case(file.Name(), ".csv");
+    by.tabs = Ends_Ignoring_Case(file.Name(), ".tab");
+    const bool strip_titles = !by.commas && !by.tabs;
     bool rewritten;
     File_Image image;
     Text_Buffer buffer;
-    if (!Load_Text_Image(file, strip_titles, image, buffer, rewritten) || buffer.Text().empty())
+    Text_Code_State code;
+    if (!Load_Text_Image(file, strip_titles, image, buffer, code, rewritten) || buffer.Text().empty())
         return false;
     if (!request.Custom_Separators.empty())
-        csv_file = true;
+        by.commas = true;
     else if (strip_titles && !buffer.Holds('\t') && !buffer.Holds(','))
-        blank_separated = true;
+        by.blanks = true;
     else if (strip_titles && buffer.Holds('\t'))
-        tab_file = true;
+        by.tabs = true;
     Sheet* const earlier = Current_Sheet;
     bool good = false;
     bool changed = false;
     try {
-        good = Parse_Text_Buffer(buffer, tab_file, csv_file, blank_separated, rewritten ? nullptr : &image);
+        good = Parse_In_Its_Code(file.Name(), by, code, buffer, image, rewritten);
     } catch (const Text_Changed&) {
         changed = true;
     }

@@ -2,10 +2,12 @@
 #include "model/column_printer.h"
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
@@ -80,9 +82,10 @@ public:
     void Pad(std::size_t start, std::int32_t width, bool left)
     {
         const std::size_t size = used_ - start;
-        if (size >= static_cast<std::size_t>(width))
+        const std::size_t letters = Letter_Count(View().substr(start));
+        if (letters >= static_cast<std::size_t>(width))
             return;
-        const std::size_t blanks = static_cast<std::size_t>(width) - size;
+        const std::size_t blanks = static_cast<std::size_t>(width) - letters;
         Reserve(blanks);
         char* const field = bytes_.data() + start;
         if (!left)
@@ -195,9 +198,9 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
     const Column& column = state.printer.Printed();
     const bool factor = state.printer.Kind_Of_Cells() == Cell_Kind::factor;
     const std::int32_t listed = state.printer.Listed_Levels();
-    std::size_t widest = column.name.size() + (factor ? 1 : Name_Mark(column).size());
+    std::size_t widest = Letter_Count(column.name) + (factor ? 1 : Name_Mark(column).size());
     const auto take_printed = [&] {
-        widest = std::max(widest, line_.Size());
+        widest = std::max(widest, Letter_Count(line_.View()));
         cells_stay_ = cells_stay_ && Stays_In_Place(line_.View());
         line_.Clear();
     };
@@ -316,7 +319,9 @@ void Text_Table_Writer::Write_Line()
         ++broken_lines_;
     while (line.size() > Greatest_Written_Line) {
         const std::size_t found = line.substr(0, Greatest_Written_Line).rfind(layout_.separator);
-        const std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+        std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+        while (Letters_Are_Utf8() && taken > 1 && Goes_On(line[taken]))
+            --taken;
         file_.Write(line.substr(0, taken));
         file_.Write(Line_End);
         line.remove_prefix(taken);
@@ -400,6 +405,24 @@ std::string Title_Name(std::string_view file_name)
 
 }  // namespace
 
+namespace {
+
+/// A text holds cells and names. A description that begins with a blank is a name that became another one,
+/// which the ledger knows.
+void Note_What_Texts_Lack(const Sheet& sheet)
+{
+    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
+        if (!column->extra.empty() && !column->extra.view().starts_with(' '))
+            Note_Loss(Loss_Kind::metadata_dropped, column->name, 0, column->extra);
+        if (column->factor_kind == factor_with_labels && column->level_values != nullptr)
+            Note_Loss(Loss_Kind::metadata_dropped, column->name, 0, "level values behind the labels");
+    }
+    if (sheet.title_line_count > 0 && request.Add_Mode == Add_Modes::none)
+        Note_Loss(Loss_Kind::metadata_dropped, {}, 0, sheet.title_lines.c_str(), sheet.title_line_count);
+}
+
+}  // namespace
+
 bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
 {
     if (sheet == nullptr || sheet->row_count < 1 || sheet->column_count < 1)
@@ -420,6 +443,7 @@ bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
         writer.Write_Title(Title_Name(file_name));
     if (!request.Omit_Header)
         writer.Write_Names();
+    Note_What_Texts_Lack(*sheet);
     return writer.Write_Rows() && file.Close();
 }
 

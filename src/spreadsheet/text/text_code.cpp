@@ -1,0 +1,74 @@
+// The code of a text that is read.
+#include "request/losses.h"
+#include "request/messages.h"
+#include "request/text_crossing.h"
+#include "spreadsheet/text/text_format.h"
+#include "support/letters.h"
+
+#include <utility>
+
+namespace ingester {
+
+namespace {
+
+void Note_Replaced(Text_Converter& converter)
+{
+    if (const std::int64_t losses = converter.Take_Losses(); losses > 0)
+        Note_Loss(Loss_Kind::letter_replaced, {}, 0, "malformed text", losses);
+}
+
+/// The text of an image in the code of all letters takes its place.
+bool Convert_Image(std::string_view text, Text_Code from, const std::string& name, File_Image& image)
+{
+    Text_Converter converter;
+    if (!Open_Converter(converter, from, Code_Of_Letters()))
+        return false;
+    if (!image.Replace(converter.Convert(text)))
+        return Fail_To_Read(name);
+    Note_Replaced(converter);
+    return true;
+}
+
+}  // namespace
+
+bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& state)
+{
+    const Text_Code declared = Declared_Code();
+    state = {};
+    if (declared == nullptr && !Letters_Are_Utf8())
+        return true;
+    const std::string_view bytes(image.Bytes(), image.Size());
+    std::size_t mark_length;
+    const Text_Code marked = Code_Of_Mark(bytes, mark_length);
+    if (declared != nullptr && marked != declared)
+        mark_length = 0;
+    const Text_Code code = declared != nullptr ? declared : marked;
+    if (code != nullptr && (code != Utf_8_Code() || !Letters_Are_Utf8()))
+        return Convert_Image(bytes.substr(mark_length), code, name, image);
+    state.head = mark_length;
+    state.watched = true;
+    state.otherwise = code == nullptr ? Windows_1252_Code() : code;
+    return true;
+}
+
+bool Convert_Malformed(const std::string& name, const Text_Code_State& state, File_Image& image,
+                       Text_Buffer& buffer)
+{
+    if (!Convert_Image(buffer.Text(), state.otherwise, name, image))
+        return false;
+    buffer.first = image.Bytes();
+    buffer.last = image.Bytes() + image.Size();
+    buffer.watched = false;
+    return true;
+}
+
+bool Take_Line_Into_Code(std::string& line)
+{
+    Text_Crossing texts;
+    if (!texts.Open_Input(Code_Of_Input(nullptr, line)))
+        return false;
+    line = std::string(texts.Cross(line));
+    return true;
+}
+
+}  // namespace ingester

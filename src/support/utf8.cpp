@@ -1,0 +1,83 @@
+#include "support/utf8.h"
+
+#include <array>
+#include <initializer_list>
+
+namespace ingester {
+
+namespace {
+
+/// What may come next, each as the place of its six bits in a word of the table: `malformed` is a step to
+/// itself, whatever comes.
+enum State : std::uint8_t {
+    malformed = 0,
+    between = 6,  ///< a letter may begin
+    one_more = 12,
+    two_more = 18,
+    three_more = 24,
+    behind_e0 = 30,  ///< overlong below A0
+    behind_ed = 36,  ///< a surrogate from A0 on
+    behind_f0 = 42,  ///< overlong below 90
+    behind_f4 = 48,  ///< beyond the last character from 90 on
+};
+
+using Steps = std::array<std::uint64_t, 256>;
+
+constexpr void Add_Steps(Steps& steps, unsigned first, unsigned last, State from, State to)
+{
+    for (unsigned byte = first; byte <= last; ++byte)
+        steps[byte] |= std::uint64_t{to} << from;
+}
+
+constexpr Steps Make_Steps()
+{
+    struct Lead {
+        unsigned first, last;
+        State to;
+    };
+    constexpr Lead leads[] = {
+        {0x00, 0x7F, between},   {0xC2, 0xDF, one_more},   {0xE0, 0xE0, behind_e0},
+        {0xE1, 0xEC, two_more},  {0xED, 0xED, behind_ed},  {0xEE, 0xEF, two_more},
+        {0xF0, 0xF0, behind_f0}, {0xF1, 0xF3, three_more}, {0xF4, 0xF4, behind_f4},
+    };
+    Steps steps{};
+    for (const Lead& lead : leads)
+        Add_Steps(steps, lead.first, lead.last, between, lead.to);
+    Add_Steps(steps, 0x80, 0xBF, one_more, between);
+    Add_Steps(steps, 0x80, 0xBF, two_more, one_more);
+    Add_Steps(steps, 0x80, 0xBF, three_more, two_more);
+    Add_Steps(steps, 0xA0, 0xBF, behind_e0, one_more);
+    Add_Steps(steps, 0x80, 0x9F, behind_ed, one_more);
+    Add_Steps(steps, 0x90, 0xBF, behind_f0, two_more);
+    Add_Steps(steps, 0x80, 0x8F, behind_f4, two_more);
+    return steps;
+}
+
+constexpr Steps Next_States = Make_Steps();
+
+}  // namespace
+
+/// One look-up and one shift a byte; only the shifts wait for each other.
+bool Utf8_Check::Take(std::string_view part)
+{
+    if (state_ == between && Is_Ascii(part))
+        return true;
+    std::uint64_t state = state_;
+    for (const char c : part)
+        state = Next_States[static_cast<unsigned char>(c)] >> (state & 63U);
+    state_ = state & 63U;
+    return state_ != malformed;
+}
+
+bool Utf8_Check::Is_Whole() const
+{
+    return state_ == between;
+}
+
+bool Is_Utf8(std::string_view text)
+{
+    Utf8_Check check;
+    return check.Take(text) && check.Is_Whole();
+}
+
+}  // namespace ingester
