@@ -1,6 +1,6 @@
 # The everyday commands. Everything that is made lies under build/.
 .DEFAULT_GOAL := help
-.PHONY: help run test bench fuzz build install format check-format tidy clean
+.PHONY: help run test bench fuzz docs build install format check-format tidy clean
 
 READER = text
 SECONDS = 60
@@ -16,6 +16,7 @@ help:
 	@echo 'make test                           build and run the tests'
 	@echo 'make bench [BENCH_OPTIONS=...]      measure against the peers that are installed'
 	@echo 'make fuzz READER=text SECONDS=60    feed a reader with hostile bytes'
+	@echo 'make docs                           write docs/formats.md anew'
 	@echo 'make build                          build everything in build/release'
 	@echo 'make install [PREFIX=/usr/local]    install the command, the library and its header'
 	@echo 'make format | check-format | tidy   clang-format in place, as a check; clang-tidy'
@@ -36,6 +37,11 @@ bench: $(RELEASE)
 
 fuzz:
 	@tools/fuzz.sh $(READER) $(SECONDS)
+
+docs: $(RELEASE)
+	@cmake --build build/release --target ingester_command
+	@tools/make_docs.sh build/release/ingester >build/formats.md
+	@mv build/formats.md docs/formats.md
 
 build: $(RELEASE)
 	@cmake --build build/release

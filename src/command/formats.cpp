@@ -24,6 +24,12 @@ std::string Extensions_Of(const Format_Driver& format)
     return any_other ? "any other" : std::string(format.extensions);
 }
 
+void Print_Row(const char* pattern, const Format_Driver& format)
+{
+    std::printf(pattern, std::string(format.name).c_str(), format.read != nullptr ? "yes" : "-",
+                format.write != nullptr ? "yes" : "-", Extensions_Of(format).c_str());
+}
+
 void Print_Table(bool all)
 {
     std::size_t hidden = 0;
@@ -33,12 +39,18 @@ void Print_Table(bool all)
             ++hidden;
             continue;
         }
-        std::printf("%-36s %-6s %-7s %s\n", std::string(format.name).c_str(),
-                    format.read != nullptr ? "yes" : "-", format.write != nullptr ? "yes" : "-",
-                    Extensions_Of(format).c_str());
+        Print_Row("%-36s %-6s %-7s %s\n", format);
     }
     if (hidden > 0)
         std::printf("\n%zu more are recognised and refused with a message; --all lists them.\n", hidden);
+}
+
+void Print_Markdown()
+{
+    std::puts("| Format | Reads | Writes | Extensions |\n|---|---|---|---|");
+    for (const Format_Driver& format : All_Formats())
+        if (Is_Built(format))
+            Print_Row("| %s | %s | %s | %s |\n", format);
 }
 
 /// Names and extensions of the table need no escapes.
@@ -66,8 +78,10 @@ int Run_Formats(int argc, const char* const* argv)
 {
     CLI::App app{Description, "ingester formats"};
     bool json = false;
+    bool markdown = false;
     bool all = false;
     app.add_flag("--json", json, "Print all formats as JSON, for programs");
+    app.add_flag("--markdown", markdown, "Print what is read and written as a table in Markdown");
     app.add_flag("--all", all, "List formats that are only recognised as well");
     try {
         app.parse(argc, argv);
@@ -76,6 +90,8 @@ int Run_Formats(int argc, const char* const* argv)
     }
     if (json)
         Print_JSON();
+    else if (markdown)
+        Print_Markdown();
     else
         Print_Table(all);
     return 0;

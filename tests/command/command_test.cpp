@@ -190,7 +190,7 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
 {
     const std::string command = std::filesystem::path(INGESTER_COMMAND).parent_path().string();
     const std::string begin = "cd '" + Path("try") + "' && PATH='" + command + "':$PATH && TMPDIR=. && ";
-    std::ifstream read_me(INGESTER_README);
+    std::ifstream read_me(INGESTER_PROJECT "/README.md");
     int examples = 0;
     for (std::string line; std::getline(read_me, line);) {
         const bool runs = line.starts_with("ingester ") || line.find("| ingester ") != std::string::npos;
@@ -211,6 +211,16 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
         EXPECT_EQ(Get("try/shown").find("was not found"), std::string::npos) << line;
     }
     EXPECT_GT(examples, 20);
+}
+
+TEST_F(Command_Test, The_Document_Of_Formats_Is_Made_From_Their_Table)
+{
+    const std::string made = Path("formats.md");
+    const std::string make =
+        "'" INGESTER_PROJECT "/tools/make_docs.sh' '" INGESTER_COMMAND "' >'" + made + "'";
+    ASSERT_EQ(std::system(make.c_str()), 0);
+    EXPECT_EQ(std::system(("diff -u '" INGESTER_PROJECT "/docs/formats.md' '" + made + "'").c_str()), 0)
+        << "make docs brings docs/formats.md up to date";
 }
 
 TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)

@@ -1,4 +1,5 @@
 // Whole requests on a system that refuses: whatever they ask of it, one thing after the other.
+#include "faults_below_kinds.h"
 #include "host_fixture.h"
 #include "platform/gzip_file.h"
 #include "support/refusing.h"
@@ -16,49 +17,6 @@ const std::string Table = "plot,kind!,name,day,yield\n1,oats,ann,3/2/2001,2.5\n2
                           "3,oats,cy,5/2/2001,4\n4,bean,,6/2/2001,5\n5,rye,\"d, e\",*,6.25\n";
 
 using Files_And_Bytes = std::map<std::string, std::string>;
-
-/// One kind of request: its records, and the files that are there before. "pipe" and "url" bring
-/// what is in "in.csv".
-struct Request_Kind {
-    Texts records;
-    Texts before;
-};
-
-const Request_Kind Kinds[] = {
-    {{"in.csv", "new.tab"}, {"in.csv"}},
-    {{"pipe", "o.csv"}, {"in.csv", "o.csv"}},
-    {{"url", "o.csv"}, {"in.csv", "o.csv"}},
-    {{"in.csv/tr", "o.csv"}, {"in.csv", "o.csv"}},
-    {{"in.csv/lt=1/z=;", "o.csv"}, {"in.csv", "o.csv"}},
-    {{"in.csv/c=2:3/s=3/e=5", "o.txt"}, {"in.csv", "o.txt"}},
-    {{"in.csv", "o.csv/rewrite=7"}, {"in.csv", "o.csv"}},
-    {{"in.csv/v", "o.csv"}, {"in.csv", "in.VAR", "o.csv"}},
-    {{"in.csv/v", "o.csv"}, {"in.csv", "o.csv"}},
-    {{"in.csv", "o.csv", "", "", "columns/s"}, {"in.csv", "columns", "o.csv"}},
-    {{"in.csv", "o.csv", "", "", "rows/r"}, {"in.csv", "rows", "o.csv"}},
-    {{"in.csv.gz", "o.csv"}, {"in.csv.gz", "o.csv"}},
-    {{"in.csv", "new.tss"}, {"in.csv"}},
-    {{"in.csv", "o.tss"}, {"in.csv", "o.tss"}},
-    {{"in.tss/db", "o.csv"}, {"in.tss", "o.csv"}},
-    {{"long.tss", "o.csv"}, {"long.tss", "o.csv"}},
-    {{"in.csv", "new.tbk"}, {"in.csv"}},
-    {{"in.tbk", "o.csv"}, {"in.tbk", "o.csv"}},
-    {{"in.tbk/w", "o.csv"}, {"in.tbk", "o.csv"}},
-    {{"in.tbk.gz", "o.csv"}, {"in.tbk.gz", "o.csv"}},
-    {{"long.tbk", "o.csv"}, {"long.tbk", "o.csv"}},
-    {{"in.csv", "o.tbk/a=Added"}, {"in.csv", "o.tbk"}},
-    {{"in.csv", "long.tbk/a=Added"}, {"in.csv", "long.tbk"}},
-    {{"in.csv", "o.tbk/r=Second"}, {"in.csv", "o.tbk"}},
-    {{"in.csv", "o.tbk.gz/a=Added"}, {"in.csv", "o.tbk.gz"}},
-    {{"in.csv", "o.gen/p"}, {"in.csv", "o.gen", "o.$V$"}},
-    {{"in.csv", "o.csv/@"}, {"in.csv", "o.csv"}},
-    {{"in.csv", "o.tss/@,from"}, {"in.csv", "o.tss"}},
-    {{"in.csv", "o.tbk/@/!=Second"}, {"in.csv", "o.tbk"}},
-    {{"in.csv", "o.csv/&"}, {"in.csv", "o.csv"}},
-    {{"in.csv", "o.csv/%=1"}, {"in.csv", "in.mrg", "o.csv"}},
-    {{"in.csv", "o.tss/%=1"}, {"in.csv", "in.mrg", "o.tss"}},
-    {{"in.csv", "o.tbk/%=1U/!=Second"}, {"in.csv", "in.mrg", "o.tbk"}},
-};
 
 /// What goes wrong. Where others follow the first, nobody asks for words: they may be refused as well.
 const Refusal Ways[] = {
@@ -107,12 +65,7 @@ protected:
         Put("in.mrg", "1\nplot\n");
         Put("columns", "2\nV\nplot\nyield\n");
         Put("rows", "5\n1\n0\n1\n1\n0\n");
-        const std::pair<const char*, const char*> made[] = {
-            {"in.csv", "in.tss"},         {"in.csv", "in.tbk/a=First"}, {"in.csv", "in.tbk/a=Second"},
-            {"o.csv", "o.tss"},           {"o.csv", "o.tbk/a=First"},   {"o.csv", "o.tbk/a=Second"},
-            {"o.csv", "o.tbk/a=Third"},   {"long.csv", "long.tss"},     {"long.csv", "long.tbk/a=First"},
-            {"in.csv", "long.tbk/a=Last"}};
-        for (const auto& [input, output] : made)
+        for (const auto& [input, output] : Made)
             ASSERT_EQ(Convert(input, output).first, 0) << output;
         for (const char* const name : {"in.csv", "in.tbk", "o.tbk"})
             ASSERT_TRUE(Compress_File(Request_Name(name), Request_Name(name) + ".gz"));
@@ -165,7 +118,7 @@ protected:
     void Put_Pass_File(const Request_Kind& kind) const
     {
         Texts records = kind.records;
-        for (const std::size_t name : {0, 1, 4})
+        for (const std::size_t name : {0U, 1U, 4U})
             if (name < records.size())
                 records[name] = Request_Name(records[name]);
         if (kind.records[0] == "url")

@@ -1,10 +1,9 @@
-// The table of formats, and the list of them that users read.
+// The table of formats.
 #include "interface/format_drivers.h"
 
 #include <gtest/gtest.h>
 
-#include <fstream>
-#include <set>
+#include <tuple>
 
 namespace ingester {
 namespace {
@@ -24,26 +23,6 @@ TEST(Format_Drivers, Outputs_Are_Chosen_By_Their_Extension)
     ASSERT_NE(Driver_Of_Code(43), nullptr);
     EXPECT_EQ(Driver_Of_Code(43)->code, 43);
     EXPECT_FALSE(Read_Data_File("a", 3, "a") || Read_Data_File("a", 99, "a")) << "there are no such readers";
-}
-
-TEST(Format_Drivers, The_Document_Lists_What_Is_Read_And_Written)
-{
-    std::set<std::string> built;
-    for (const Format_Driver& format : All_Formats()) {
-        if (format.read == nullptr && format.write == nullptr)
-            continue;
-        const bool any_other = format.write != nullptr && format.extensions.empty();
-        const std::string extensions(any_other ? "any other" : format.extensions);
-        built.insert("| " + std::string(format.name) + (format.read != nullptr ? " | yes" : " | -")
-                     + (format.write != nullptr ? " | yes |" : " | - |") + (extensions.empty() ? "" : " ")
-                     + extensions + " |");
-    }
-    std::set<std::string> told;
-    std::ifstream document(INGESTER_DOCS "/formats.md");
-    for (std::string line; std::getline(document, line);)
-        if (line.starts_with("| ") && !line.starts_with("| Format"))
-            told.insert(line);
-    EXPECT_EQ(told, built);
 }
 
 }  // namespace

@@ -323,7 +323,7 @@ Memory Used_Memory()
     return {pages * ::sysconf(_SC_PAGESIZE), static_cast<long>(heap.uordblks + heap.hblkhd)};
 }
 
-#ifdef __SANITIZE_ADDRESS__
+#ifdef INGESTER_SANITIZED
 constexpr Memory Most_Growth = {1L << 40, 1L << 40};  // what is freed stays for a while
 #else
 constexpr Memory Most_Growth = {2 << 20, 64 << 10};

@@ -31,7 +31,7 @@ using Cells_Without_Room = Request_Test;
 
 TEST_F(Cells_Without_Room, Leave_The_Sheet_As_It_Was)
 {
-#if defined(__SANITIZE_ADDRESS__)
+#ifdef INGESTER_SANITIZED
     GTEST_SKIP() << "sanitizers need all the address space";
 #endif
     Sheet* const sheet = New_Sheet_With_Rows(2);

@@ -256,7 +256,7 @@ TEST_F(TSS_Columns, And_Rows_Are_Left_Out)
         {symmetric, {}, {1, 0, 1}, "a S1|3; c S6", "0 02 1:5 2:7 | 0 0"},
     };
     for (const auto& [items, names, rows, cells, also] : cases) {
-        const Sheet* const sheet = Read(items, [&] {
+        const Sheet* const sheet = Read(items, [&names = names, &rows = rows] {
             request.Subset_Columns = !names.empty();
             request.Subset_By_Number = names == Texts{"2", "1"};
             request.Subset_Names = names;

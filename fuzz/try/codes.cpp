@@ -1,22 +1,13 @@
 // The target of text conversions: the first two bytes of an input choose the codes.
+#include "function.h"
 #include "platform/text_codes.h"
 #include "support/letters.h"
 
-#include <cstdio>
-#include <cstdlib>
 #include <iterator>
 
 namespace ingester {
 
 namespace {
-
-void Must(bool holds, const char* what)
-{
-    if (holds)
-        return;
-    std::fprintf(stderr, "%s\n", what);
-    std::abort();
-}
 
 constexpr const char* Codes[] = {"utf8",    "1252",   "utf16le",     "utf16be", "utf32le", "utf32be",
                                  "cp437",   "1255",   "932",         "936",     "949",     "950",
@@ -53,12 +44,10 @@ void Try_Codes(Text_Code from, Text_Code to, std::string_view text)
 
 }  // namespace
 
-}  // namespace ingester
-
-extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+/// The head: the codes that a text comes from and goes into.
+void Try_Function(std::string_view head, std::string_view text)
 {
-    using namespace ingester;
-    if (size >= 2)
-        Try_Codes(Chosen(data[0]), Chosen(data[1]), {reinterpret_cast<const char*>(data) + 2, size - 2});
-    return 0;
+    Try_Codes(Chosen(static_cast<std::uint8_t>(head[0])), Chosen(static_cast<std::uint8_t>(head[1])), text);
 }
+
+}  // namespace ingester

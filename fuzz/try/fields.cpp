@@ -1,9 +1,8 @@
 // The source of typed fields: the first bytes of an input say what is read, and how, from the rest.
+#include "function.h"
 #include "platform/field_source.h"
 
 #include <algorithm>
-#include <cstdio>
-#include <cstdlib>
 #include <iterator>
 #include <span>
 #include <string>
@@ -16,14 +15,6 @@ namespace {
 
 constexpr std::size_t Head_Size = 16;
 constexpr std::size_t Most_Kept = 1000;
-
-void Must(bool holds, const char* what)
-{
-    if (holds)
-        return;
-    std::fprintf(stderr, "%s\n", what);
-    std::abort();
-}
 
 struct Record {
     std::int8_t small = 0;
@@ -123,13 +114,13 @@ void Try_Fields(std::span<const std::byte> head, std::span<const std::byte> byte
 
 }  // namespace
 
-}  // namespace ingester
-
-extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+/// The head: the order, and the first step; the text begins with the others.
+void Try_Function(std::string_view head, std::string_view text)
 {
-    using namespace ingester;
-    const auto bytes = std::as_bytes(std::span(data, size));
-    if (size >= Head_Size)
+    const std::string whole = std::string(head).append(text);
+    const auto bytes = std::as_bytes(std::span(whole));
+    if (bytes.size() >= Head_Size)
         Try_Fields(bytes.first(Head_Size), bytes.subspan(Head_Size));
-    return 0;
 }
+
+}  // namespace ingester
