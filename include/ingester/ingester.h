@@ -15,6 +15,24 @@
  * worksheet, the cell range, a secondary file and a subset file. Names of files may carry slash
  * options, so their folders are written with backslashes.
  *
+ * What serves people better than hosts count on is off unless the input or the output file string asks for it, by
+ * keys that begin with "/+", as no other key does:
+ *
+ *   /+people         all of these rules
+ *   /+utf8           texts are UTF-8 instead of Windows-1252, but for the host's own files
+ *   /+names          names of columns stand as they are until an output can't hold them
+ *   /+losses         what could not be kept is told at the end of the messages
+ *   /+vain           options that mean nothing to the input are told
+ *   /+endings        outputs are known by further endings
+ *   /+types          inputs are recognised by further tests
+ *
+ * and beside these rules:
+ *
+ *   /+strict         anything that can't be kept makes the request fail, and the old output stays
+ *   /+report=FILE    what could not be kept is written into a file, as JSON
+ *   /+encoding=NAME  the code of the input's texts, as UTF-8, latin1 or 850
+ *   /+secondary=FILE the secondary file, where its record in the pass file holds a list
+ *
  * One call at a time in a process; calls may follow each other.
  */
 #ifndef INGESTER_INGESTER_H

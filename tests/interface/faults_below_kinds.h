@@ -48,6 +48,9 @@ inline const Request_Kind Kinds[] = {
     {{"in.csv", "o.csv/%=1"}, {"in.csv", "in.mrg", "o.csv"}},
     {{"in.csv", "o.tss/%=1"}, {"in.csv", "in.mrg", "o.tss"}},
     {{"in.csv", "o.tbk/%=1U/!=Second"}, {"in.csv", "in.mrg", "o.tbk"}},
+    {{"in.csv/+people", "o.tss"}, {"in.csv", "o.tss"}},
+    {{"in.csv/+people/+encoding=932", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv/+people/+strict", "o.tbk/a=Added"}, {"in.csv", "o.tbk"}},
 };
 
 /// What is converted to have the files that are there before; in this order.

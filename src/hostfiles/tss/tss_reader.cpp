@@ -58,6 +58,7 @@ void Limit_Columns(TSS_Reading& reading)
     Report_Message_Long("Warning Columns above %li NOT transfered.\n", limit);
     Note_Loss(Loss_Kind::beyond_limit, {}, 0, "columns beyond the greatest number",
               reading.columns - limit - 1);
+    request.losses.Bar_Replacing("columns beyond the greatest number would be lost");
     reading.columns = limit + 1;
 }
 
@@ -291,6 +292,8 @@ bool Read_Sheet(TSS_Reading& reading)
         || !Read_Type_Block(reading))
         return false;
     const bool whole = Read_Columns(reading);
+    if (!whole)
+        request.losses.Note_Unread("what stands behind a fault of it");
     Limit_Rows(reading);
     if (whole && !Read_Auxiliary_Records(reading))
         return false;

@@ -335,8 +335,10 @@ bool Read_Long_Text_Cells(TSS_Reading& reading, Column& column, std::int32_t cou
                                        column.name.c_str(), static_cast<long>(greatest)));
             told = true;
         }
-        if (length > greatest)
+        if (length > greatest) {
             Note_Loss(Loss_Kind::text_cut, column.name, row + 1, text);
+            request.losses.Bar_Replacing("texts of it would be cut");
+        }
         cells.Append({.text = column.texts.Store(text)});
         width = Wider(width, text);
         ++kept;

@@ -3,33 +3,20 @@
 
 #include "hostfiles/tss/tss.h"
 #include "hostfiles/tss/tss_bytes.h"
-#include "interface/host_fixture.h"
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
+#include "support/reader_fixture.h"
 
-#include <functional>
-#include <span>
 #include <sstream>
 
 namespace ingester {
 
-class TSS_Test : public Host_Test {
+class TSS_Test : public Reader_Test {
 protected:
-    /// Reads bytes under the options that `prepare` sets; null when they were refused. Any Sheet has to be
-    /// sound.
-    static Sheet* Read(
-        const std::string& bytes, const std::function<void()>& prepare = [] {})
+    /// Reads bytes under the options that `prepare` sets; null when they were refused.
+    static Sheet* Read(const std::string& bytes, const Change& prepare = {})
     {
-        Start_Request("t");
-        prepare();
-        Input_File file(std::as_bytes(std::span(bytes)), "small.tss");
-        if (!Read_TSS(file))
-            return nullptr;
-        EXPECT_EQ(Check_Sheet(*Current_Sheet), "");
-        return Current_Sheet;
+        return Read_Bytes(Read_TSS, bytes, "small.tss", prepare);
     }
-    static Sheet* Read(
-        const Items& items, const std::function<void()>& prepare = [] {})
+    static Sheet* Read(const Items& items, const Change& prepare = {})
     {
         return Read(Encode(items), prepare);
     }

@@ -1,8 +1,7 @@
 #include "spreadsheet/text/text.h"
 
-#include "support/cell_lists.h"
-#include "support/check_sheet.h"
 #include "support/progress.h"
+#include "support/reader_fixture.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -13,38 +12,16 @@
 namespace ingester {
 namespace {
 
-using Change = std::function<void()>;
+using Case = Reader_Case;
 
-/// One text to a table: its bytes, the Sheet (empty for none), what is set before, what is said.
-struct Case {
-    const char* told;
-    std::string text, sheet;
-    Change change = {};
-    std::string message = {};
-};
-
-class Text_Reader : public Request_Test {
+class Text_Reader : public Reader_Test {
 protected:
-    /// The Sheet of a text in a request of its own; null for none.
     static Sheet* Read(std::string_view text, const char* name, const Change& change = {})
     {
-        Start_Request("t");
-        if (change)
-            change();
-        Input_File file(std::as_bytes(std::span(text)), name);
-        if (!Read_CSV(file))
-            return nullptr;
-        EXPECT_EQ(Check_Sheet(*Current_Sheet), "");
-        return Current_Sheet;
+        return Read_Bytes(Read_CSV, text, name, change);
     }
 
-    void Try(std::span<const Case> cases) const
-    {
-        for (const Case& tried : cases) {
-            EXPECT_EQ(Render(Read(tried.text, "X.CSV", tried.change)), tried.sheet) << tried.told;
-            EXPECT_EQ(Messages(), tried.message.empty() ? "" : tried.message + ":\n") << tried.told;
-        }
-    }
+    void Try(std::span<const Case> cases) const { Try_Bytes(Read_CSV, "X.CSV", cases); }
 };
 
 TEST_F(Text_Reader, Names_And_Separators)
