@@ -55,17 +55,36 @@ constexpr Steps Make_Steps()
 
 constexpr Steps Next_States = Make_Steps();
 
+/// The state behind a text. One look-up and one shift a byte; only the shifts wait for each other.
+inline __attribute__((always_inline)) std::uint64_t Walk_Bytes(std::string_view text, std::uint64_t state)
+{
+    for (const char c : text)
+        state = Next_States[static_cast<unsigned char>(c)] >> (state & 63U);
+    return state & 63U;
+}
+
+std::uint64_t Walk_Plainly(std::string_view text, std::uint64_t state)
+{
+    return Walk_Bytes(text, state);
+}
+
+#if defined(__x86_64__)
+/// There shifts by any number take one step.
+__attribute__((target("bmi2"))) std::uint64_t Walk_Fast(std::string_view text, std::uint64_t state)
+{
+    return Walk_Bytes(text, state);
+}
+
+const auto Walk = __builtin_cpu_supports("bmi2") ? Walk_Fast : Walk_Plainly;
+#else
+const auto Walk = Walk_Plainly;
+#endif
+
 }  // namespace
 
-/// One look-up and one shift a byte; only the shifts wait for each other.
 bool Utf8_Check::Take(std::string_view part)
 {
-    if (state_ == between && Is_Ascii(part))
-        return true;
-    std::uint64_t state = state_;
-    for (const char c : part)
-        state = Next_States[static_cast<unsigned char>(c)] >> (state & 63U);
-    state_ = state & 63U;
+    state_ = Walk(part, state_);
     return state_ != malformed;
 }
 
@@ -77,7 +96,7 @@ bool Utf8_Check::Is_Whole() const
 bool Is_Utf8(std::string_view text)
 {
     Utf8_Check check;
-    return check.Take(text) && check.Is_Whole();
+    return Is_Ascii(text) || (check.Take(text) && check.Is_Whole());
 }
 
 }  // namespace ingester
