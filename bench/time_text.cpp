@@ -92,6 +92,7 @@ struct Task {
     const char* output = nullptr;   ///< null: the input is read, no more
     const char* columns = nullptr;  ///< not null: their numbers, with commas between them
     std::string_view form = "packed";
+    bool utf8 = false;  ///< the request's text is UTF-8
 };
 
 bool Fail_On(const char* name, const char* done)
@@ -104,6 +105,7 @@ bool Fail_On(const char* name, const char* done)
 bool Time_Reading(const Task& task)
 {
     Start_Request();
+    Use_Utf8_Text(task.utf8);
     if (task.columns != nullptr)
         Keep_Columns_Of(task.columns);
     Print_Memory("before");
@@ -160,7 +162,11 @@ int main(int count, char** arguments)
     const bool held = count > 1 && std::string_view(arguments[1]) == "--held";
     if (held)
         ++arguments, --count;
+    const bool utf8 = count > 1 && std::string_view(arguments[1]) == "--utf8";
+    if (utf8)
+        ++arguments, --count;
     Task task{count > 1 ? arguments[1] : nullptr};
+    task.utf8 = utf8;
     if (count == 3)
         task.columns = arguments[2];
     if (count == 4) {
@@ -168,11 +174,12 @@ int main(int count, char** arguments)
         task.form = arguments[3];
     }
     if (count < 2 || count > 4 || std::ranges::find(Forms, task.form) == std::end(Forms)) {
-        std::fputs("usage: time_text [--held] FILE [OUTPUT packed|padded|script|tss|tbk]\n"
-                   "       time_text [--held] FILE COLUMN,COLUMN...\n"
-                   "--held does all of it twice, the second time in the memory of the first;\n"
-                   "of lines with the same name the last one counts.\n",
-                   stderr);
+        std::fputs(
+            "usage: time_text [--held] [--utf8] FILE [OUTPUT packed|padded|script|tss|tbk]\n"
+            "       time_text [--held] [--utf8] FILE COLUMN,COLUMN...\n"
+            "--held does all of it twice, the second time in the memory of the first;\n"
+            "of lines with the same name the last one counts. --utf8 reads and writes as for people.\n",
+            stderr);
         return 2;
     }
     if (held) {

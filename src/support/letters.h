@@ -45,7 +45,7 @@ struct Folded_Letter {
 
 [[nodiscard]] inline std::size_t Letter_Count(std::string_view text)
 {
-    return Letters_Are_Utf8() ? letters::Count_Utf8(text) : text.size();
+    return !Letters_Are_Utf8() || Is_Ascii(text) ? text.size() : letters::Count_Utf8(text);
 }
 
 /// The first `limit` letters, never more than four bytes for each.
@@ -92,7 +92,15 @@ struct Folded_Letter {
 
 [[nodiscard]] inline bool Equal_Folded(std::string_view a, std::string_view b)
 {
-    return Letters_Are_Utf8() ? letters::Compare_Folded_Utf8(a, b) == 0 : Equal_Ignoring_Case(a, b);
+    if (!Letters_Are_Utf8() || a.empty() || b.empty())
+        return Equal_Ignoring_Case(a, b);
+    // No sign or digit of ASCII is another letter folded, so most texts differ at once.
+    const char first_of_a = To_Lower(a.front());
+    const char first_of_b = To_Lower(b.front());
+    const auto stands_alone = [](char c) { return static_cast<unsigned char>(c) < 0x80 && !Is_Letter(c); };
+    if (first_of_a != first_of_b && (stands_alone(first_of_a) || stands_alone(first_of_b)))
+        return false;
+    return letters::Compare_Folded_Utf8(a, b) == 0;
 }
 
 [[nodiscard]] inline bool Less_Folded(std::string_view a, std::string_view b)

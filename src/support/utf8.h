@@ -13,17 +13,24 @@ namespace ingester {
 [[nodiscard]] inline bool Is_Ascii(std::string_view text)
 {
     constexpr std::uint64_t high_bits = 0x8080808080808080U;
-    std::uint64_t seen = 0;
-    std::uint64_t word = 0;
-    const char* at = text.data();
-    for (std::size_t left = text.size() / sizeof word; left > 0; --left, at += sizeof word) {
+    const auto word_at = []<class Word>(const char* at, Word word) {
         std::memcpy(&word, at, sizeof word);
-        seen |= word;
+        return word;
+    };
+    const char* const first = text.data();
+    const char* const last = first + text.size();
+    std::uint64_t seen = 0;
+    if (text.size() >= sizeof seen) {
+        for (const char* at = first; last - at > std::ptrdiff_t{sizeof seen}; at += sizeof seen)
+            seen |= word_at(at, std::uint64_t{});
+        seen |= word_at(last - sizeof seen, std::uint64_t{});  // which may overlap the one before
+    } else if (text.size() >= sizeof(std::uint32_t)) {
+        seen = word_at(first, std::uint32_t{}) | word_at(last - sizeof(std::uint32_t), std::uint32_t{});
+    } else {
+        for (const char c : text)
+            seen |= static_cast<unsigned char>(c);
     }
-    word = 0;
-    for (std::size_t left = text.size() % sizeof word; left > 0; --left)
-        word |= static_cast<unsigned char>(*at++);
-    return ((seen | word) & high_bits) == 0;
+    return (seen & high_bits) == 0;
 }
 
 /// A byte that goes on with a letter.

@@ -200,7 +200,8 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
     const std::int32_t listed = state.printer.Listed_Levels();
     std::size_t widest = Letter_Count(column.name) + (factor ? 1 : Name_Mark(column).size());
     const auto take_printed = [&] {
-        widest = std::max(widest, Letter_Count(line_.View()));
+        if (line_.Size() > widest)
+            widest = std::max(widest, Letter_Count(line_.View()));
         cells_stay_ = cells_stay_ && Stays_In_Place(line_.View());
         line_.Clear();
     };
