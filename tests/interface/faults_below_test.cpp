@@ -4,6 +4,7 @@
 #include "platform/gzip_file.h"
 #include "support/refusing.h"
 
+#include <cctype>
 #include <map>
 
 #include <fcntl.h>
@@ -48,7 +49,7 @@ bool Holds(const Files_And_Bytes& files, const Files_And_Bytes::value_type& one)
     return found != files.end() && found->second == one.second;
 }
 
-class Faults_Below : public Host_Test {
+class Faults_Below : public Host_Test, public testing::WithParamInterface<Request_Kind> {
 protected:
     void SetUp() override
     {
@@ -199,72 +200,78 @@ protected:
     std::string faults_;  ///< told at the end, when there is a standard output again
 };
 
-TEST_F(Faults_Below, Leave_The_Old_Output_Or_The_New_One)
+TEST_P(Faults_Below, Leave_The_Old_Output_Or_The_New_One)
 {
-    for (const Request_Kind& kind : Kinds) {
+    const Request_Kind& kind = GetParam();
+    Prepare(kind);
+    static_cast<void>(Run({}));  // what is made once is made now
+    Prepare(kind);
+    const Outcome plain = Run({});
+    std::map<std::string, std::string> found;
+    found[plain.faults] += " for nothing";
+    if ((plain.answer.first != 0 && plain.answer.first != no_rows) || plain.asked < 60)
+        found[" fails by itself: " + plain.answer.second];
+    for (Refusal refusal : Ways)
+        for (std::optional<Asked> refused = Asked::memory; refused;) {
+            ++refusal.number;
+            Prepare(kind);
+            const Outcome disturbed = Run(refusal);
+            refused = disturbed.refused;
+            if (refused)
+                found[Faults_Of(kind, plain, disturbed, refusal.onwards)] +=
+                    Format_Text(" %li/%li", static_cast<long>(refusal.number), static_cast<long>(*refused));
+        }
+    found.erase("");
+    for (const auto& [faults, numbers] : found)
+        faults_ += kind.records[0] + " to " + kind.records[1] + ":" + faults + " refused" + numbers + "\n";
+}
+
+TEST_P(Faults_Below, Leave_The_Old_Output_Or_The_New_One_When_The_Process_Ends)
+{
+    const Request_Kind& kind = GetParam();
+    Prepare(kind);
+    const Outcome plain = Run({});
+    const Files_And_Bytes before = Files_Before(kind);
+    int how = SIGKILL;
+    for (int number = 1; WIFSIGNALED(how); ++number) {
         Prepare(kind);
-        static_cast<void>(Run({}));  // what is made once is made now
-        Prepare(kind);
-        const Outcome plain = Run({});
-        std::map<std::string, std::string> found;
-        found[plain.faults] += " for nothing";
-        if ((plain.answer.first != 0 && plain.answer.first != no_rows) || plain.asked < 60)
-            found[" fails by itself: " + plain.answer.second];
-        for (Refusal refusal : Ways)
-            for (std::optional<Asked> refused = Asked::memory; refused;) {
-                ++refusal.number;
-                Prepare(kind);
-                const Outcome disturbed = Run(refusal);
-                refused = disturbed.refused;
-                if (refused)
-                    found[Faults_Of(kind, plain, disturbed, refusal.onwards)] += Format_Text(
-                        " %li/%li", static_cast<long>(refusal.number), static_cast<long>(*refused));
-            }
-        found.erase("");
-        for (const auto& [faults, numbers] : found)
-            faults_ +=
-                kind.records[0] + " to " + kind.records[1] + ":" + faults + " refused" + numbers + "\n";
+        const ::pid_t child = ::fork();
+        if (child == 0) {
+            Put_Pass_File(kind);  // named by the process
+            const Refusing refusing(
+                {.number = number, .kinds = {Asked::write, Asked::rename}, .kills = true});
+            ::_exit(INGESTER("", "", 0, 0));
+        }
+        ::waitpid(child, &how, 0);
+        const std::string name = kind.records[0] + " to " + kind.records[1] + Format_Text(" %i: ", number);
+        const Files_And_Bytes left = All_Files();
+        bool untouched = true;
+        for (const auto& one : before) {
+            const auto made = plain.files.find(one.first);
+            const bool is_new = made == plain.files.end() ? !left.contains(one.first) : Holds(left, *made);
+            untouched = untouched && Holds(left, one);
+            if (!Holds(left, one) && !is_new)
+                faults_ += name + one.first + " is neither old nor new\n";
+        }
+        // What lies about doesn't keep the next request from its work.
+        Put_Pass_File(kind);
+        const Outcome next = Run({});
+        for (const auto& one : plain.files)
+            if (untouched && !Holds(next.files, one))
+                faults_ += name + one.first + " is not made the next time\n";
     }
 }
 
-TEST_F(Faults_Below, Leave_The_Old_Output_Or_The_New_One_When_The_Process_Ends)
+std::string Name_Of(const testing::TestParamInfo<Request_Kind>& kind)
 {
-    for (const Request_Kind& kind : Kinds) {
-        Prepare(kind);
-        const Outcome plain = Run({});
-        const Files_And_Bytes before = Files_Before(kind);
-        int how = SIGKILL;
-        for (int number = 1; WIFSIGNALED(how); ++number) {
-            Prepare(kind);
-            const ::pid_t child = ::fork();
-            if (child == 0) {
-                Put_Pass_File(kind);  // named by the process
-                const Refusing refusing(
-                    {.number = number, .kinds = {Asked::write, Asked::rename}, .kills = true});
-                ::_exit(INGESTER("", "", 0, 0));
-            }
-            ::waitpid(child, &how, 0);
-            const std::string name =
-                kind.records[0] + " to " + kind.records[1] + Format_Text(" %i: ", number);
-            const Files_And_Bytes left = All_Files();
-            bool untouched = true;
-            for (const auto& one : before) {
-                const auto made = plain.files.find(one.first);
-                const bool is_new =
-                    made == plain.files.end() ? !left.contains(one.first) : Holds(left, *made);
-                untouched = untouched && Holds(left, one);
-                if (!Holds(left, one) && !is_new)
-                    faults_ += name + one.first + " is neither old nor new\n";
-            }
-            // What lies about doesn't keep the next request from its work.
-            Put_Pass_File(kind);
-            const Outcome next = Run({});
-            for (const auto& one : plain.files)
-                if (untouched && !Holds(next.files, one))
-                    faults_ += name + one.first + " is not made the next time\n";
-        }
-    }
+    std::string name = kind.param.records[0] + " to " + kind.param.records[1];
+    for (char& character : name)
+        if (std::isalnum(static_cast<unsigned char>(character)) == 0)
+            character = '_';
+    return std::to_string(kind.index) + "_" + name;
 }
+
+INSTANTIATE_TEST_SUITE_P(Kinds, Faults_Below, testing::ValuesIn(Kinds), Name_Of);
 
 }  // namespace
 }  // namespace ingester
