@@ -1,8 +1,10 @@
 #include "model/column_names.h"
 
 #include "model/names.h"
+#include "platform/text_codes.h"
 #include "request/losses.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <string>
@@ -21,10 +23,26 @@ void Name_From_Input(Column& column, std::string_view spelled, std::string_view 
         column.extra = name;
 }
 
+namespace {
+
+/// A name as hosts hold it, whose letters are those of Windows-1252 without their accents.
+std::string Valid_For_Hosts(std::string_view name)
+{
+    if (!Letters_Are_Utf8())
+        return Make_Valid_Name(name);
+    const std::string held(Sure_Converter(Utf_8_Code(), Windows_1252_Code()).Convert(name));
+    letter_code = Letter_Code::windows_1252;
+    std::string valid = Make_Valid_Name(held);
+    letter_code = Letter_Code::utf_8;
+    return valid;
+}
+
+}  // namespace
+
 void Make_Name_Valid(Column& column)
 {
     const std::string old_name(column.name.view());
-    const std::string valid = Make_Valid_Name(old_name);
+    const std::string valid = Valid_For_Hosts(old_name);
     if (valid == old_name)
         return;
     Note_Loss(Loss_Kind::name_changed, old_name, 0, valid);

@@ -4,7 +4,9 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "request/request.h"
+#include "support/letters.h"
 
+#include <algorithm>
 #include <array>
 #include <memory>
 #include <string>
@@ -42,6 +44,22 @@ void Start_Message_File()
     message_path[path.copy(message_path.data(), message_path.size() - 1)] = '\0';
 }
 
+namespace {
+
+/// A text that a format has cut inside a letter loses the rest of it.
+std::string Without_Cut_Letters(std::string_view text)
+{
+    std::string whole;
+    while (!text.empty()) {
+        const std::size_t length = First_Utf8(text).length;
+        whole.append(text.substr(0, length));
+        text.remove_prefix(std::max<std::size_t>(length, 1));
+    }
+    return whole;
+}
+
+}  // namespace
+
 void Report_Message(std::string_view text)
 {
     if (message_file == nullptr) {
@@ -50,7 +68,10 @@ void Report_Message(std::string_view text)
             return;  // silent by design: messages have no other way out
         message_file = std::move(file);
     }
-    message_file->Write(text);
+    if (Letters_Are_Utf8() && !Is_Utf8(text))
+        message_file->Write(Without_Cut_Letters(text));
+    else
+        message_file->Write(text);
 }
 
 void Report_Message_Text(const char* format, const char* text)

@@ -2,6 +2,7 @@
 #include "model/calendar.h"
 #include "model/cell_appender.h"
 #include "model/claims.h"
+#include "model/column_names.h"
 #include "model/column_printer.h"
 #include "model/factor_lists.h"
 #include "model/foreign_dates.h"

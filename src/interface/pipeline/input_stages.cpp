@@ -18,6 +18,7 @@
 #include <iterator>
 #include <limits>
 #include <utility>
+#include <vector>
 
 namespace ingester {
 
@@ -246,8 +247,11 @@ Request_Status Read_Merge_Keys(Request_Run& run)
     if (file.Open(Find_Companion(name)) && file.Read_Line(line, longest_line))
         request.Merge_Key_Count = std::min<std::int32_t>(
             request.Merge_Key_Count, static_cast<std::int32_t>(std::clamp(Leading_Integer(line), 0L, 9L)));
-    while (std::ssize(request.Merge_Keys) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
-        Take_Merge_Keys(line);
+    std::vector<std::string> lines;
+    while (std::ssize(lines) < request.Merge_Key_Count && file.Read_Line(line, longest_line))
+        lines.push_back(line);
+    Take_Lines_Into_Letters(lines);
+    std::ranges::for_each(lines, Take_Merge_Keys);
     const bool whole = file.Close() && Merge_Keys_Are_Whole();
     if (downloaded)
         Delete_File(name);
