@@ -159,7 +159,8 @@ TEST_F(Command_Test, Joins_Files)
         Put("all.csv", "plot,kind\n1,oats\n2,rye\n");
         const Ran ran = Run(line + " --no-quotes", "plot,x\n2,3\n");
         EXPECT_EQ(ran.status, 0) << line;
-        EXPECT_EQ(ran.out + ran.err, "") << line;
+        const bool renamed = joined.find("kind1") != std::string::npos;
+        EXPECT_EQ(ran.out + ran.err, renamed ? "Lost in kind: 1 names changed (kind1).\n" : "") << line;
         EXPECT_EQ(On_One_Line(Get("all.csv")), joined) << line;
         EXPECT_EQ(Get("yields.mrg"), "not ours");
     }

@@ -81,10 +81,10 @@ TEST_F(People_Options, A_Strict_Request_Leaves_The_Old_Output)
 
 TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
 {
-    Put("a.csv", "Plot 1,Yield (t/ha),x\n1,2,x\n");
+    Put("a.csv", "Plot no,Yield (t/ha),x\n1,2,x\n");
     const std::pair<const char*, const char*> cases[] = {
-        {"a.csv/+names", "Plot 1\tYield (t/ha)\tx|1\t2\tx|"},
-        {"a.csv", "Plot_1\tYield_t_ha\tx|1\t2\tx|"},
+        {"a.csv/+names", "Plot no\tYield (t/ha)\tx|1\t2\tx|"},
+        {"a.csv", "Plot_no\tYield_t_ha\tx|1\t2\tx|"},
     };
     for (const auto& [input, table] : cases) {
         EXPECT_EQ(Convert(input, "a.tab").first, 0);
@@ -92,21 +92,22 @@ TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
     }
     Put("marks.csv", "Start:Date,sown:D,how much?!!,:T,\"\"\n1,5/6/2020,x,10:30,7\n");
     EXPECT_EQ(Convert("marks.csv/+names", "a.tab/u").first, 0);
-    EXPECT_EQ(On_One_Line(Get("a.tab")), "Start:Date\tsown\thow much?!\tC1\tC2|1\t05/06/2020\tx\t10:30\t7|")
+    EXPECT_EQ(On_One_Line(Get("a.tab")),
+              "Start:Date\tsown\thow much?!\tC1\tC2|1\t05/06/2020\tx\t10:30:00\t7|")
         << "marks are such at the end of a name only";
 
     const Host_Answer answer = Convert("a.csv/+names/+losses", "a.gen");
-    EXPECT_NE(answer.second.find("Lost in Plot 1: 1 names changed (Plot_1).\n"), std::string::npos)
+    EXPECT_NE(answer.second.find("Lost in Plot no: 1 names changed (Plot_no).\n"), std::string::npos)
         << answer.second;
     const std::string script = Get("a.gen");
     EXPECT_NE(script.find("Yield_t_ha"), std::string::npos) << script;
     EXPECT_NE(script.find("Yield (t/ha)"), std::string::npos) << "the description tells the old name";
 
-    Put("more.csv", "Plot 1,Yield (t/ha)\n7,8\n");  // by name, in an output whose names are valid
+    Put("more.csv", "Plot no,Yield (t/ha)\n7,8\n");  // by name, in an output whose names are valid
     ASSERT_EQ(Convert("a.csv/+names", "all.tss").first, 0);
     ASSERT_EQ(Convert("more.csv/+names", "all.tss/@").first, 0);
     ASSERT_EQ(Convert("all.tss", "all.tab").first, 0);
-    EXPECT_EQ(On_One_Line(Get("all.tab")), "Plot_1\tYield_t_ha\tx|1\t2\tx|7\t8\t|");
+    EXPECT_EQ(On_One_Line(Get("all.tab")), "Plot_no\tYield_t_ha\tx|1\t2\tx|7\t8\t|");
 }
 
 TEST_F(People_Options, Marks_Of_A_List_Act_Under_Free_Names)
@@ -154,7 +155,7 @@ TEST_F(People_Options, Declare_The_Code_Of_The_Input)
     Put("a.csv", "t,n\nB\x84r,1\n");
     EXPECT_EQ(Convert("a.csv/+people/+encoding=850", "a.tab").first, 0);
     EXPECT_EQ(On_One_Line(Get("a.tab")), "t\tn|B\xC3\xA4r\t1|");
-    EXPECT_EQ(Convert("a.csv/+encoding=cp437", "a.tab").first, 0);
+    EXPECT_EQ(Convert("a.csv/+types/+encoding=cp437", "a.tab").first, 0);
     EXPECT_EQ(On_One_Line(Get("a.tab")), "t\tn|B\xE4r\t1|") << "a host's text is Windows-1252";
     const Host_Answer unknown = Convert("a.csv/+encoding=latin17", "a.tab");
     EXPECT_EQ(unknown.first, 5);

@@ -71,8 +71,6 @@ TEST_F(Text_Code_Of_Files, Is_Told_Declared_Or_Found)
         EXPECT_EQ(Losses(), tried.losses) << tried.told;
         EXPECT_EQ(Messages(), "") << tried.told;
     }
-    EXPECT_EQ(Read("a\n1\n", "latin99"), "");
-    EXPECT_EQ(Messages(), "Error: The encoding latin99 is not known.\n:\n");
 }
 
 /// Letters lie across the windows that are looked at, and what was read before the text turned out to be of
