@@ -15,8 +15,8 @@
  * worksheet, the cell range, a secondary file and a subset file. Names of files may carry slash
  * options, so their folders are written with backslashes.
  *
- * What serves people better than hosts count on is off unless the input or the output file string asks for it, by
- * keys that begin with "/+", as no other key does:
+ * What serves people better than hosts count on is off unless the input or the output file string asks
+ * for it, by keys that begin with "/+", as no other key does:
  *
  *   /+people         all of these rules
  *   /+utf8           texts are UTF-8 instead of Windows-1252, but for the host's own files
