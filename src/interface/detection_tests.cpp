@@ -2,6 +2,7 @@
 
 #include "interface/file_detection.h"
 #include "request/people_rules.h"
+#include "request/text_crossing.h"
 #include "support/byte_fields.h"
 #include "support/text.h"
 
@@ -144,6 +145,12 @@ bool Holds_No_Controls(const Detection_Head& head)
     });
 }
 
+/// Only texts have a code of letters that a user can declare and no test knows.
+bool Is_Declared_Text(const Detection_Head& /*head*/)
+{
+    return Declared_Code() != nullptr;
+}
+
 /// Numbers in magics are little-endian. Tests of text take either case unless the format is strict.
 constexpr Detection_Test Detection_Tests[] = {
     {book_file, {Bytes(0, "TBK\x01KVX\0"sv)}},
@@ -279,6 +286,7 @@ constexpr Detection_Test Further_Tests[] = {
     {plain_text_file, {Bytes(0, "\xEF\xBB\xBF"sv)}},  // marks that texts in Unicode begin with
     {plain_text_file, {Bytes(0, "\xFF\xFE"sv)}},
     {plain_text_file, {Bytes(0, "\xFE\xFF"sv)}},
+    {plain_text_file, {Bytes(0, "\0\0\xFE\xFF"sv)}},
 };
 
 constexpr Detection_Test Text_Tests[] = {
@@ -288,6 +296,7 @@ constexpr Detection_Test Text_Tests[] = {
 /// Behind the text that hosts know.
 constexpr Detection_Test Further_Text_Tests[] = {
     {plain_text_file, {}, "", Holds_No_Controls},
+    {plain_text_file, {}, "", Is_Declared_Text},
 };
 
 /// A magic must lie within the head.

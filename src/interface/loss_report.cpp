@@ -2,6 +2,7 @@
 
 #include "platform/files.h"
 #include "platform/folders.h"
+#include "platform/text_codes.h"
 #include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
@@ -33,15 +34,20 @@ std::string Line_Of(const Loss& loss)
     return line + ".\n";
 }
 
+std::string In_Utf8(std::string_view text)
+{
+    return std::string(Sure_Converter(Code_Of_Letters(), Utf_8_Code()).Convert(text));
+}
+
 /// One entry, in an order that people like to read.
 nlohmann::ordered_json Entry_Of(const Loss& loss)
 {
     nlohmann::ordered_json entry;
     entry["kind"] = Key_Of(loss.kind);
-    entry["column"] = loss.column;
+    entry["column"] = In_Utf8(loss.column);
     entry["first_row"] = loss.first_row;
     entry["count"] = loss.count;
-    entry["example"] = loss.example;
+    entry["example"] = In_Utf8(loss.example);
     return entry;
 }
 
@@ -71,11 +77,12 @@ void Tell_Losses()
 
 bool Write_Loss_Report(std::string_view file_name)
 {
+    const Scratch_File scratch(std::string(file_name).append(".$$$"));  // an older report stays until then
     Output_File file(Output_File::small_buffer);
-    bool written = file.Open(file_name);
+    bool written = Delete_File(scratch.Name()) && file.Open(scratch.Name());
     if (written) {
         file.Write(Report_Text());
-        written = file.Close();
+        written = file.Close() && Replace_File(scratch.Name(), file_name);
     }
     return written || Fail("The report %.500s could not be written.\n", std::string(file_name).c_str());
 }

@@ -65,6 +65,7 @@ constexpr Stage Stages[] = {
     Forbid_Losses,
     Write_Output,
     Forbid_Losses,
+    Report_Losses,
     Write_Column_List,
     Fill_Clipboard,
     Replace_Old_Output,
@@ -99,8 +100,8 @@ Request_Status Process_Request(std::string infile, std::string outfile, std::int
     run.outfile = std::move(outfile);
     const Request_Status status = Run_Stages(run);
     Tell_Losses();
-    if (!request.Loss_Report_Name.empty() && !Write_Loss_Report(request.Loss_Report_Name))
-        return status == Done ? Request_Status::output_failed : status;
+    if (!run.reported && !request.Loss_Report_Name.empty())
+        static_cast<void>(Write_Loss_Report(request.Loss_Report_Name));  // the request has failed already
     rows = Current_Sheet == nullptr ? 0 : Current_Sheet->row_count;
     return status;
 }

@@ -179,8 +179,7 @@ constexpr Slash_Option Genotype_Table[] = {
 };
 
 constexpr Slash_Option Input_Table[] = {
-    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT"),
-     Of_Some_Readers},
+    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT")},
     {"/g=", Take_Delete_Marker, "version number in the host's scratch names"},
     {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column",
      Bare("skip-lines", "N"), Of_Some_Readers},

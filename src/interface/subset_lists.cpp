@@ -5,6 +5,7 @@
 #include "platform/text_codes.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -21,7 +22,11 @@ constexpr std::size_t Count_Line_Width = 100;
 long Read_List_Count(Input_File& file)
 {
     std::string line;
-    return file.Read_Line(line, Count_Line_Width) ? Leading_Integer(line) : 0;
+    if (!file.Read_Line(line, Count_Line_Width))
+        return 0;
+    std::size_t mark_length;
+    const bool marked = Letters_Are_Utf8() && Code_Of_Mark(line, mark_length) == Utf_8_Code();
+    return Leading_Integer(std::string_view(line).substr(marked ? mark_length : 0));
 }
 
 /// A list that was read to its end has done its service.

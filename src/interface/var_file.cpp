@@ -1,5 +1,6 @@
 #include "interface/var_file.h"
 
+#include "model/column_names.h"
 #include "model/date_format.h"
 #include "model/factors.h"
 #include "model/names.h"
@@ -190,9 +191,8 @@ void Change_Column(Column* column, const std::string& line)
     const std::string name = Strip_Name_Mark(line);
     if (name.empty())
         return;  // nothing but marks: the column keeps its name
-    column->name = Make_Valid_Name(name);
+    Name_By_Choice(*column, name);
     column->table_label.clear();  // the name is what labels it from now on
-    Use_Bracket_Text(*column);
 }
 
 std::vector<Column*> Columns_Of(const Sheet& sheet)

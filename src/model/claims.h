@@ -29,7 +29,9 @@ constexpr std::int64_t Cells_Per_Byte = 2;
 [[nodiscard]] constexpr bool Claim_Is_Acceptable(std::int64_t rows, std::int64_t columns, std::int64_t bytes,
                                                  std::int64_t cells_per_byte = Cells_Per_Byte)
 {
-    return rows >= 0 && columns >= 0 && rows <= Most_Rows(columns, bytes, cells_per_byte);
+    constexpr std::int64_t always_allowed_columns = 1 << 16;
+    return rows >= 0 && columns >= 0 && columns <= std::max(always_allowed_columns, bytes)
+           && rows <= Most_Rows(columns, bytes, cells_per_byte);
 }
 
 }  // namespace ingester

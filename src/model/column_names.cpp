@@ -18,15 +18,20 @@ void Name_From_Input(Column& column, std::string_view spelled, std::string_view 
     column.input_name = Trim_Copy(spelled);
     if (!request.Names_Kept_As_They_Stand || name.empty() || column.name == name)
         return;
-    Note_Loss(Loss_Kind::name_changed, column.name, 0, name);
+    Note_Loss(Loss_Kind::name_changed, name, 0, column.name);
     if (column.extra.empty())
-        column.extra = name;
+        column.extra = std::string(" ").append(name);  // the blank tells that it is an old name
 }
 
-namespace {
+void Name_By_Choice(Column& column, std::string_view name)
+{
+    column.name = Make_Valid_Name(name);
+    if (request.Names_Kept_As_They_Stand && column.name != name)
+        Note_Loss(Loss_Kind::name_changed, name, 0, column.name);
+    Use_Bracket_Text(column);
+}
 
-/// A name as hosts hold it, whose letters are those of Windows-1252 without their accents.
-std::string Valid_For_Hosts(std::string_view name)
+std::string Valid_Host_Name(std::string_view name)
 {
     if (!Letters_Are_Utf8())
         return Make_Valid_Name(name);
@@ -37,19 +42,17 @@ std::string Valid_For_Hosts(std::string_view name)
     return valid;
 }
 
-}  // namespace
-
 void Make_Name_Valid(Column& column)
 {
     const std::string old_name(column.name.view());
-    const std::string valid = Valid_For_Hosts(old_name);
+    const std::string valid = Valid_Host_Name(old_name);
     if (valid == old_name)
         return;
     Note_Loss(Loss_Kind::name_changed, old_name, 0, valid);
     column.name = valid;
     Use_Bracket_Text(column);
     if (column.extra.empty())
-        column.extra = old_name;
+        column.extra = std::string(" ").append(old_name);
 }
 
 }  // namespace ingester

@@ -13,6 +13,12 @@ namespace ingester {
 /// next automatic name.
 void Name_From_Input(Column& column, std::string_view spelled, std::string_view name);
 
+/// A name as hosts hold it: valid, and of their letters, without accents.
+[[nodiscard]] std::string Valid_Host_Name(std::string_view name);
+
+/// Gives a Column a name of the user's choice. What the model can't hold of it is a loss.
+void Name_By_Choice(Column& column, std::string_view name);
+
 /// Makes a name valid that stood as it was. Where that changes it, the change is a loss and the old name
 /// becomes the description of a Column that has none.
 void Make_Name_Valid(Column& column);

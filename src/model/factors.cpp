@@ -4,6 +4,7 @@
 #include "model/factor_order.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "support/distinct_keys.h"
 #include "support/letters.h"
@@ -282,7 +283,10 @@ bool Gather_Texts(const Column& column, bool trim, std::size_t limit, Gathering<
             continue;
         }
         const std::string_view whole = cell->Text();
-        const std::string_view text = First_Letters(trim ? Trim_Copy(whole) : whole, Long_Label_Width);
+        const std::string_view label = trim ? Trim_Copy(whole) : whole;
+        const std::string_view text = First_Letters(label, Long_Label_Width);
+        if (text.size() < label.size()) [[unlikely]]
+            Note_Loss(Loss_Kind::text_cut, column.name, 0, label);
         if (!text.empty())
             numberer.Take(row, text);
         if (numberer.Count() > limit)

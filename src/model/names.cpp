@@ -383,6 +383,7 @@ void Turn_Swapped_Brackets(std::string& name)
 
 std::string Make_Valid_Name(std::string_view name)
 {
+    name = name.substr(0, name.find('\0'));  // where a name in a Column ends
     if (request.Names_Kept_As_They_Stand && !(name.empty() && For_People(People_Rule::free_names)))
         return std::string(First_Letters(name, Name_Width));
     const std::string_view given = Without_Outer_Quotes(Trim_Copy(name));
@@ -414,8 +415,8 @@ bool Cut_End_Mark(std::string& name, std::string_view marks)
 
 namespace {
 
-/// Takes all marks off the end of `name`.
-Name_Marks Take_End_Marks(std::string_view& name)
+/// Takes all marks off the end of `name`; those of number formats mean something in lists only.
+Name_Marks Take_End_Marks(std::string_view& name, bool number_formats = true)
 {
     constexpr std::pair<char, std::int32_t> type_marks[] = {
         {'!', factor_column}, {'#', variate_column}, {'$', text_column}};
@@ -430,7 +431,7 @@ Name_Marks Take_End_Marks(std::string_view& name)
         if (name.size() < 2 || name[name.size() - 2] != ':')
             continue;
         const char c = To_Upper(name.back());
-        if (c != 'D' && c != 'T' && c != 'E' && !Is_Digit(c))
+        if (c != 'D' && c != 'T' && !(number_formats && (c == 'E' || Is_Digit(c))))
             continue;
         marks.date = marks.date || c == 'D';
         marks.time = marks.time || c == 'T';
@@ -493,6 +494,15 @@ std::string Strip_Name_Mark(std::string_view name)
     if (!cut)
         Cut_End_Mark(stripped, end_marks);
     return stripped;
+}
+
+std::string Strip_Input_Mark(std::string_view name)
+{
+    if (!For_People(People_Rule::free_names))
+        return Strip_Name_Mark(name);
+    std::string_view bare = name;
+    static_cast<void>(Take_End_Marks(bare, false));
+    return std::string(bare.empty() ? name : bare);
 }
 
 }  // namespace ingester

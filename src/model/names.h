@@ -75,4 +75,8 @@ struct Name_Marks {
 /// one ":E" or ":" with a digit.
 [[nodiscard]] std::string Strip_Name_Mark(std::string_view name);
 
+/// The same of a name that an input has for a column: for people only the marks of types, dates and times go,
+/// and a name that is nothing but a mark stands.
+[[nodiscard]] std::string Strip_Input_Mark(std::string_view name);
+
 }  // namespace ingester

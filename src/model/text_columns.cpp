@@ -42,7 +42,8 @@ void Begin_Warnings(bool& begun, std::string_view title)
 
 void Warn_Of_Number(const Column& column, long row, std::string_view text, double number)
 {
-    Note_Loss(Loss_Kind::text_not_number, column.name, row, text);
+    if (!Is_Present(*column.sheet, number))
+        Note_Loss(Loss_Kind::text_not_number, column.name, row, text);
     Begin_Warnings(request.Number_Warnings_Begun, "Text to Number Conversion Warnings\n \n");
     const std::string words(text);
     if (Is_Present(*column.sheet, number))

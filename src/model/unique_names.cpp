@@ -1,6 +1,7 @@
 #include "model/names.h"
 
 #include "request/losses.h"
+#include "request/request.h"
 #include "support/letters.h"
 #include "support/text.h"
 
@@ -13,7 +14,14 @@ namespace ingester {
 namespace {
 
 /// The host tells names by this many characters.
-constexpr std::size_t Told_Width = 32;
+constexpr std::size_t Host_Told_Width = 32;
+
+/// Names that stand as they are are told by all of their letters.
+std::size_t Told_Width()
+{
+    const bool whole = request.Names_Kept_As_They_Stand && For_People(People_Rule::free_names);
+    return whole ? Name_Width : Host_Told_Width;
+}
 
 /// A longer suffix leaves no room for a stem with a number.
 constexpr std::size_t Greatest_Kept_Suffix = 50;
@@ -27,7 +35,7 @@ struct Told_Name {
 [[nodiscard]] Told_Name Tell_Name(std::string_view name)
 {
     const std::size_t start = Bracket_Start(name);
-    return {std::string(First_Letters(name.substr(0, start), Told_Width)), std::string(name.substr(start))};
+    return {std::string(First_Letters(name.substr(0, start), Told_Width())), std::string(name.substr(start))};
 }
 
 /// The names of the columns so far. A name without a suffix clashes with all of its stem.
@@ -82,7 +90,7 @@ Told_Name Taken_Names::Numbered(const Told_Name& name)
 {
     const std::string suffix =
         !Has_More_Letters(name.suffix, Greatest_Kept_Suffix) ? name.suffix : std::string();
-    const std::size_t room = std::min(Told_Width, Name_Width - Letter_Count(suffix));
+    const std::size_t room = std::min(Told_Width(), Name_Width - Letter_Count(suffix));
     auto [stem, number] = Stem_To_Number(name.stem);
     std::int32_t end = 10;
     for (std::size_t digits = 1;; ++digits, end *= 10) {

@@ -51,8 +51,9 @@ std::int64_t Field_Source::Possible(std::int64_t claimed, std::int64_t size) con
 {
     constexpr std::int64_t unknown_size = 1 << 16;
     const std::int64_t all = file_->Size();
-    return std::min(claimed,
-                    all > 0 ? std::max<std::int64_t>(all - file_->Position(), 0) / size : unknown_size);
+    return std::min(claimed, all > 0 ? std::max<std::int64_t>(all - file_->Position(), 0)
+                                           / std::max<std::int64_t>(size, 1)
+                                     : unknown_size);
 }
 
 }  // namespace ingester

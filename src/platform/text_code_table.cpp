@@ -135,6 +135,24 @@ std::size_t Distance(std::string_view a, std::string_view b)
 
 }  // namespace
 
+namespace {
+
+/// To the nearest of a code's names.
+std::size_t Least_Distance(const std::string& bare, const Text_Code_Facts& code)
+{
+    std::size_t least = Distance(bare, Bare_Name(code.name));
+    if (code.page != 0)
+        least = std::min(least, Distance(std::string(Without_Page_Word(bare)), std::to_string(code.page)));
+    for (std::string_view rest = code.aliases; !rest.empty();) {
+        const std::size_t end = std::min(rest.find(' '), rest.size());
+        least = std::min(least, Distance(bare, std::string(rest.substr(0, end))));
+        rest.remove_prefix(std::min(end + 1, rest.size()));
+    }
+    return least;
+}
+
+}  // namespace
+
 Text_Code Text_Code_Of_Page(std::int32_t page)
 {
     const auto* const found = std::ranges::find(Text_Codes, page, &Text_Code_Facts::page);
@@ -163,8 +181,7 @@ std::vector<std::string_view> Nearest_Code_Names(std::string_view name)
     const std::string bare = Bare_Name(name.substr(0, longest_name));
     std::vector<std::pair<std::size_t, Text_Code>> near;
     for (const Text_Code_Facts& code : Text_Codes)
-        if (const std::size_t away = Distance(bare, Bare_Name(code.name)); away <= bare.size() / 2)
-            near.emplace_back(away, &code);
+        near.emplace_back(Least_Distance(bare, code), &code);
     std::ranges::stable_sort(near, {}, [](const auto& entry) { return entry.first; });
     std::vector<std::string_view> names;
     for (std::size_t i = 0; i < std::min(near.size(), most_names); ++i)

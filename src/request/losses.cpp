@@ -2,7 +2,9 @@
 
 #include "request/messages.h"
 #include "request/request.h"
+#include "support/letters.h"
 
+#include <algorithm>
 #include <array>
 #include <utility>
 
@@ -50,9 +52,11 @@ std::string Loss_Ledger::Key_Of_Entry(Loss_Kind kind, std::string_view column)
 
 Loss& Loss_Ledger::Entry_Of(Loss_Kind kind, std::string_view column)
 {
-    if (entries_.size() >= most_entries)
-        column = {};
     std::string key = Key_Of_Entry(kind, column);
+    if (entries_.size() >= most_entries && !places_.contains(key)) {
+        column = {};
+        key = Key_Of_Entry(kind, column);
+    }
     if (const auto found = places_.find(key); found != places_.end())
         return entries_[found->second];
     places_.emplace(std::move(key), entries_.size());
@@ -68,7 +72,9 @@ void Loss_Ledger::Note(Loss_Kind kind, std::string_view column, std::int64_t row
     Loss& loss = Entry_Of(kind, column);
     if (loss.count == 0) {
         loss.first_row = row;
-        loss.example = example.substr(0, longest_example);
+        loss.example = First_Letters(example, longest_example);
+        std::ranges::replace_if(
+            loss.example, [](char c) { return c >= 0 && c < ' '; }, ' ');
     }
     loss.count += count;
 }
@@ -89,14 +95,14 @@ void Loss_Ledger::Add(const Loss_Ledger& other)
 {
     for (const Loss& loss : other.entries_)
         Note(loss.kind, loss.column, loss.first_row, loss.example, loss.count);
-    if (!other.barred_.empty())
+    if (other.barred_)
         barred_ = other.barred_;
 }
 
 void Loss_Ledger::Note_Unread(std::string_view part, std::int64_t count)
 {
     Note(Loss_Kind::input_unread, {}, 0, part, count);
-    barred_ = std::string(part).append(" would be lost");
+    Bar_Replacing(std::string(part).append(" would be lost"));
 }
 
 void Note_Loss(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,

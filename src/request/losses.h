@@ -3,6 +3,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
@@ -39,7 +40,7 @@ struct Loss {
 class Loss_Ledger {
 public:
     static constexpr std::size_t most_entries = 1000;
-    static constexpr std::size_t longest_example = 200;
+    static constexpr std::size_t longest_example = 200;  ///< in letters
 
     /// `row` counts from 1, 0 for none; `example` is what was lost, or why.
     void Note(Loss_Kind kind, std::string_view column, std::int64_t row, std::string_view example,
@@ -55,10 +56,10 @@ public:
     void Note_Unread(std::string_view part, std::int64_t count = 1);
 
     /// The file that was read can't be replaced by its Sheet, though nothing was left unread.
-    void Bar_Replacing(std::string_view why) { barred_ = why; }
+    void Bar_Replacing(std::string_view why) { barred_.emplace(why); }
 
     /// Why that is so, the reason given last; empty when it can.
-    [[nodiscard]] const std::string& Barred() const { return barred_; }
+    [[nodiscard]] std::string Barred() const { return barred_.value_or(""); }
 
     /// In the order in which they were first noted.
     [[nodiscard]] const std::vector<Loss>& Entries() const { return entries_; }
@@ -69,7 +70,7 @@ private:
 
     std::vector<Loss> entries_;
     std::unordered_map<std::string, std::size_t> places_;  ///< of the entries, by kind and column
-    std::string barred_;
+    std::optional<std::string> barred_;                    ///< a fresh ledger holds no memory
 };
 
 /// Enters a loss of the request that runs.

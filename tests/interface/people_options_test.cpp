@@ -75,7 +75,16 @@ TEST_F(People_Options, A_Strict_Request_Leaves_The_Old_Output)
             EXPECT_EQ(Files(), before) << input << output;
             EXPECT_EQ(Get("old.tab") + Get("book.tbk"), "old" + book) << output;
         }
+    // What the writer alone can't hold, written in place, and a report that can't be written.
     Put("good.csv", "a,t\n1,x\n");
+    ASSERT_EQ(Convert("good.csv/#", "told.tss").first, 0);
+    Put("label.csv", "a['one'],t\n1,x\n");
+    ASSERT_EQ(Convert("label.csv", "told.tss").first, 0);
+    EXPECT_EQ(Convert("told.tss/+strict", "old.tab/av").first, 6);
+    EXPECT_EQ(Convert("good.csv/+report=none\\r.json", "old.tab").first, 6);
+    for (const char* const report : {"good.csv", "old.tab"})
+        EXPECT_EQ(Convert("good.csv/+report='" + Request_Name(report) + "'", "old.tab").first, 6) << report;
+    EXPECT_EQ(Get("old.tab") + Get("good.csv"), "olda,t\n1,x\n");
     EXPECT_EQ(Convert("good.csv/+strict", "old.tab").first, 0);
 }
 
@@ -93,7 +102,7 @@ TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
     Put("marks.csv", "Start:Date,sown:D,how much?!!,:T,\"\"\n1,5/6/2020,x,10:30,7\n");
     EXPECT_EQ(Convert("marks.csv/+names", "a.tab/u").first, 0);
     EXPECT_EQ(On_One_Line(Get("a.tab")),
-              "Start:Date\tsown\thow much?!\tC1\tC2|1\t05/06/2020\tx\t10:30:00\t7|")
+              "Start:Date\tsown\thow much?!\t:T\tC1|1\t05/06/2020\tx\t10:30:00\t7|")
         << "marks are such at the end of a name only";
 
     const Host_Answer answer = Convert("a.csv/+names/+losses", "a.gen");
@@ -110,6 +119,21 @@ TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
     EXPECT_EQ(On_One_Line(Get("all.tab")), "Plot_no\tYield_t_ha\tx|1\t2\tx|7\t8\t|");
 }
 
+TEST_F(People_Options, Keys_Of_Joins_Go_By_The_Names_That_Columns_Get)
+{
+    Put("a.csv", "my key,x\na,1\nb,2\n");
+    Put("b.csv", "my key,y\nb,5\na,6\n");
+    Put("b.mrg", "1\nmy key\n");
+    ASSERT_EQ(Convert("a.csv/+people", "all.tss").first, 0);
+    ASSERT_EQ(Convert("b.csv/+people", "all.tss/%=1").first, 0);
+    ASSERT_EQ(Convert("all.tss/+people", "all.tab").first, 0);
+    EXPECT_EQ(On_One_Line(Get("all.tab")), "my_key\tx\ty|a\t1\t6|b\t2\t5|");
+    const std::string question = "How satisfied are you with the service overall";
+    Put("long.csv", question + "?," + question + "!,b\n1,2,3\n");
+    EXPECT_EQ(Convert("long.csv/+people", "long.tab/u").first, 0);
+    EXPECT_TRUE(Get("long.tab").starts_with(question + "?\t" + question + "\tb")) << Get("long.tab");
+}
+
 TEST_F(People_Options, Marks_Of_A_List_Act_Under_Free_Names)
 {
     Put("a.csv", "k,v\n1,5\n2,6\n");
@@ -123,15 +147,15 @@ TEST_F(People_Options, Tell_Of_Options_Given_In_Vain)
     Put("a.csv", "k,v\n1,5\n");
     ASSERT_EQ(Convert("a.csv", "a.tss").first, 0);
     EXPECT_EQ(
-        Convert("a.tss/+vain/n/tr/x=NA", "b.tss").second,
-        "Warning: --missing means nothing to this input, Tabulon Spreadsheet, and had no effect.\n"
-        "Warning: --no-names means nothing to this input, Tabulon Spreadsheet, and had no effect.\n:\n");
+        Convert("a.tss/+vain/n/tr/s=NA", "b.tss").second,
+        "Warning: --no-names means nothing to this input, Tabulon Spreadsheet, and had no effect.\n"
+        "Warning: --start means nothing to this input, Tabulon Spreadsheet, and had no effect.\n:\n");
     EXPECT_EQ(Convert("a.csv/+vain/n/x=NA", "b.tss").second, "");
     EXPECT_EQ(
         Call({Request_Name("a.csv/+vain"), Request_Name("b.tss"), "Two"}).second,
         "Warning: --sheet means nothing to this input, delimited or other plain text, and had no effect.\n"
         ":\n");
-    EXPECT_EQ(Convert("a.tss/n/x=NA", "b.tss").second, "") << "hosts give what they like";
+    EXPECT_EQ(Convert("a.tss/n/s=NA", "b.tss").second, "") << "hosts give what they like";
 }
 
 TEST_F(People_Options, Know_Further_Endings_And_Types)

@@ -174,7 +174,7 @@ TEST(Text_Codes, Are_Found_By_Name_And_Number)
         EXPECT_EQ(Find_Text_Code(name), nullptr) << name;
     EXPECT_EQ(Nearest_Code_Names("utf9").front(), "UTF-8");
     EXPECT_EQ(Nearest_Code_Names("windows1259").size(), 3U);
-    EXPECT_TRUE(Nearest_Code_Names("xyzzy").empty());
+    EXPECT_EQ(Nearest_Code_Names("xyzzy").size(), 3U);
 }
 
 TEST(Text_Codes, Are_Told_From_Bytes)

@@ -1,6 +1,7 @@
 #include "hostfiles/script/script.h"
 
 #include "hostfiles/script/script_parts.h"
+#include "model/column_names.h"
 #include "model/names.h"
 #include "request/messages.h"
 #include "request/request.h"
@@ -65,11 +66,11 @@ void Name_Structures(Sheet& sheet)
 {
     if (!Has_Structure_Columns(sheet)) {
         sheet.structure_name =
-            sheet.structure_name.empty() ? Default_Column_Name(0) : Make_Valid_Name(sheet.structure_name);
+            sheet.structure_name.empty() ? Default_Column_Name(0) : Valid_Host_Name(sheet.structure_name);
         return;
     }
     for (Column* column = sheet.first_column->next; column != nullptr; column = column->next)
-        column->name = column->name.empty() ? Default_Column_Name(0) : Make_Valid_Name(column->name);
+        column->name = column->name.empty() ? Default_Column_Name(0) : Valid_Host_Name(column->name);
 }
 
 /// A comment of the host's stands in double quotes; one in the name would end it.
@@ -78,7 +79,8 @@ void Write_Source(const Sheet& sheet, Script_Buffer& script)
     if (sheet.source_file.empty())
         return;
     std::string name;
-    for (const char c : sheet.source_file.view()) {
+    // A comment for the reader's eye: a letter that the host lacks is no loss of data.
+    for (const char c : As_Held_By_Host(sheet.source_file)) {
         if (c == '"')
             name += c;
         name += static_cast<unsigned char>(c) < ' ' ? ' ' : c;
@@ -111,7 +113,7 @@ void Write_Pointer(const Sheet& sheet, Script_Buffer& script)
 {
     if (request.Pointer_Name.empty())
         return;
-    const std::string pointer = Make_Valid_Name(request.Pointer_Name);
+    const std::string pointer = Valid_Host_Name(request.Pointer_Name);
     const std::vector<std::string_view> names = Structure_Names(sheet);
     if (std::ranges::find(names, pointer) != names.end()) {
         Report_Message_Text("Warning: pointer %s not written, as data have that name.\n", pointer.c_str());

@@ -2,6 +2,7 @@
 
 #include "hostfiles/shared/host_text.h"
 #include "hostfiles/tbk/tbk.h"
+#include "request/losses.h"
 #include "request/request.h"
 #include "support/letters.h"
 #include "support/text.h"
@@ -71,10 +72,14 @@ std::size_t Sheet_Number_Of(std::string_view request_text, std::size_t sheets)
 
 std::string Page_Name_Of(const Sheet& sheet)
 {
-    if (!sheet.sheet_name.empty())
-        return As_Held_By_Host(sheet.sheet_name);
     const std::string_view asked = request.Output_Sheet_Name;
-    return asked.empty() ? "Sheet1" : As_Held_By_Host(First_Letters(asked, Page_Name_Width));
+    const std::string_view name = sheet.sheet_name.empty() ? asked : sheet.sheet_name.view();
+    if (name.empty())
+        return "Sheet1";
+    std::string held = As_Held_By_Host(First_Letters(name, Page_Name_Width));
+    if (const std::string_view whole = asked.starts_with(name) ? asked : name; held != whole)
+        Note_Loss(Loss_Kind::name_changed, {}, 0, std::string("sheet ").append(whole));
+    return held;
 }
 
 std::string Add_Unique_Page_Name(std::vector<std::string>& names, std::string_view name)

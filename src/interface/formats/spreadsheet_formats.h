@@ -45,7 +45,7 @@ constexpr Format_Driver Spreadsheet_Formats[] = {
     {.code = plain_text_file,
      .name = "delimited or other plain text",
      .read = Any_Code<Read_Plain_Text>,
-     .options = "/x= /lt= /csv /n /y /s /e /z= range"},
+     .options = "/lt= /csv /n /y /s /e /z= range encoding"},
     {.code = tab_text_file,
      .name = "text with tabs",
      .extensions = ".tab",

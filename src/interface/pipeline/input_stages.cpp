@@ -30,7 +30,9 @@ Request_Run::~Request_Run()
         Delete_File(request.Secondary_File);
     if (map_downloaded)
         Delete_File(request.Qtl_Map_File);
-    if (writing && (temp_output != outfile || !output_was_there))
+    if (held_back)
+        Delete_File(temp_output);
+    else if (writing && (temp_output != outfile || !output_was_there))
         Delete_File(temp_output);
 }
 
@@ -111,6 +113,10 @@ Request_Status Reflow_Lines(Request_Run& run)
 Request_Status Cut_Input_Options(Request_Run& run)
 {
     request.Input_Keys_Given = Cut_Options(Input_Options(), run.infile);
+    if (Letters_Are_Utf8() && !Is_Ascii(request.Custom_Separators))
+        return Stop(Request_Status::not_imported,
+                    "Error: Separators beyond ASCII, as %s, can't be used with texts in UTF-8.\n",
+                    request.Custom_Separators.c_str());
     return Done;
 }
 
@@ -317,6 +323,12 @@ Request_Status Refuse_Same_File(Request_Run& run)
 {
     if (Equal_Ignoring_Case(run.infile, run.outfile) || Same_File(run.infile, run.outfile))
         return Stop(Request_Status::output_failed, "Input and output files are the same.\n");
+    const std::string report(request.Loss_Report_Name.view());
+    if (!report.empty()
+        && (Same_File(report, run.infile) || Same_File(report, run.outfile) || report == run.outfile)) {
+        request.Loss_Report_Name.clear();  // which would be written all the same
+        return Stop(Request_Status::output_failed, "The report and the input or output are the same file.\n");
+    }
     return Done;
 }
 

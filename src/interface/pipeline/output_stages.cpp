@@ -1,14 +1,34 @@
 // Stages that write the Sheet and put the new file in the place of an old one.
 #include "interface/clipboard.h"
 #include "interface/file_detection.h"
+#include "interface/loss_report.h"
 #include "interface/pipeline/stages.h"
 #include "interface/var_file.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "platform/files.h"
 #include "request/losses.h"
 #include "request/request.h"
 
 namespace ingester {
+
+namespace {
+
+/// Hands a finished file to a device or a pipe.
+bool Copy_Into(const std::string& from, const std::string& special)
+{
+    constexpr std::size_t block_size = 1 << 16;
+    std::vector<char> block(block_size);
+    Input_File file;
+    Output_File to;
+    if (!file.Open(from) || !to.Open(special))
+        return false;
+    while (const std::size_t got = file.Read(block.data(), block.size()))
+        to.Write(block.data(), got);
+    return file.Close() && to.Close();
+}
+
+}  // namespace
 
 /// An existing output is written beside itself, so that it stays whole until the new one is.
 Request_Status Name_Temporary_Output(Request_Run& run)
@@ -19,8 +39,14 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     }
     run.output_was_there = File_Exists(run.outfile);
     // A device or a pipe takes the text itself; a rename would put a file in its place.
-    request.Write_Via_Temp = request.Write_Via_Temp && run.output_was_there && !Is_Special_File(run.outfile);
+    const bool special = Is_Special_File(run.outfile);
+    request.Write_Via_Temp = (request.Write_Via_Temp || request.Strict) && run.output_was_there && !special;
     run.temp_output = run.outfile;
+    if (special && request.Strict) {  // it gets nothing before it is known that nothing was lost
+        run.held_back = true;
+        run.temp_output = Get_Temp_Folder().append("OUT").append(request.Scratch_Stem).append(".$$$");
+        return Done;
+    }
     if (!request.Write_Via_Temp || run.Updates_Output())
         return Done;
     run.temp_output = With_Extension(run.outfile, ".$$$");
@@ -97,8 +123,20 @@ Request_Status Fill_Clipboard(Request_Run& run)
     return Done;
 }
 
+Request_Status Report_Losses(Request_Run& run)
+{
+    run.reported = true;
+    return request.Loss_Report_Name.empty() || Write_Loss_Report(request.Loss_Report_Name)
+               ? Done
+               : Request_Status::output_failed;
+}
+
 Request_Status Replace_Old_Output(Request_Run& run)
 {
+    if (run.held_back)
+        return Copy_Into(run.temp_output, run.outfile)
+                   ? Done
+                   : Stop(Request_Status::output_failed, "Output file not written.\n");
     if (run.temp_output != run.outfile && !Replace_File(run.temp_output, run.outfile))
         return Stop(Request_Status::rename_failed, "Could not rename temporary file.\n");
     run.writing = false;

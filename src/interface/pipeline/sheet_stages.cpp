@@ -18,6 +18,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <utility>
 
 namespace ingester {
 
@@ -88,6 +89,10 @@ Request_Status Tell_Vain_Options(Request_Run&)
         Tell_Vain("--sheet", *input);
     if (!request.Cell_Range.empty() && !Acts_On(*input, "range"))
         Tell_Vain("--range", *input);
+    if (!request.Input_Encoding.empty() && !Acts_On(*input, "encoding"))
+        Tell_Vain("--encoding", *input);
+    if (!request.Named_Secondary_File.empty() && !Acts_On(*input, "secondary"))
+        Tell_Vain("--secondary", *input);
     return Done;
 }
 
@@ -236,12 +241,31 @@ Request_Status Keep_Range_Of_Columns(Request_Run&)
     return Done;
 }
 
+namespace {
+
+/// Keys name columns as the input and the output have them, which are those of hosts now.
+void Fit_Key_Names()
+{
+    for (std::vector<std::string>* const keys : {&request.Merge_Keys, &request.Merge_With_Keys})
+        for (std::string& key : *keys)
+            key = Valid_Host_Name(key);
+    if (request.Merge_Key.empty())
+        return;
+    request.Merge_Key = Valid_Host_Name(request.Merge_Key);
+    if (request.Add_Mode == Add_Modes::merge && !request.Merge_With.empty())
+        request.Merge_With = Valid_Host_Name(request.Merge_With);
+}
+
+}  // namespace
+
 /// Names that stood as they were become valid where the output needs it.
 Request_Status Fit_Names_To_Output(Request_Run& run)
 {
-    if (!For_People(People_Rule::free_names) || run.output->names != Held_Names::valid)
+    const bool only_summary = request.Print_Summary && Is_Special_File(run.outfile);
+    if (!For_People(People_Rule::free_names) || run.output->names != Held_Names::valid || only_summary)
         return Done;
-    request.Names_Kept_As_They_Stand = false;
+    if (std::exchange(request.Names_Kept_As_They_Stand, false))
+        Fit_Key_Names();
     for (Column* column = Current_Sheet->first_column; column != nullptr; column = column->next)
         if (column->type != row_column)
             Make_Name_Valid(*column);

@@ -28,8 +28,10 @@ struct Request_Run {
     bool genotype = false;      ///< the input goes the road of genotype files
     bool host_scratch = false;  ///< the output is a scratch file of the host's own
     bool output_was_there = false;
-    bool writing = false;   ///< `temp_output` is begun and not finished
-    bool finished = false;  ///< nothing is left to do
+    bool held_back = false;  ///< `temp_output` goes into a device or a pipe in the end
+    bool reported = false;   ///< what was lost is in the report
+    bool writing = false;    ///< `temp_output` is begun and not finished
+    bool finished = false;   ///< nothing is left to do
     std::int32_t input_code = 0;
     std::int32_t output_code = 0;
     const Format_Driver* output = nullptr;
@@ -132,6 +134,8 @@ Request_Status Write_Output(Request_Run& run);
 void Begin_Writing(Request_Run& run);
 Request_Status Write_Column_List(Request_Run& run);
 Request_Status Fill_Clipboard(Request_Run& run);
+/// Writes the report that was asked for, while the old output is there still.
+Request_Status Report_Losses(Request_Run& run);
 Request_Status Replace_Old_Output(Request_Run& run);
 
 }  // namespace ingester

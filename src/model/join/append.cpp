@@ -7,6 +7,7 @@
 #include "model/level_tables.h"
 #include "model/number_format.h"
 #include "model/sort.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "support/letters.h"
 #include "support/number_text.h"
@@ -205,6 +206,12 @@ void Copy_Cells(Cell_Transfer& transfer, std::int32_t first_row)
     }
 }
 
+void Note_Left_Out(const Column& source, Left_Out_List& left_out)
+{
+    left_out.Note(source);
+    Note_Loss(Loss_Kind::label_dropped, source.name, 0, "values that the output's column can't hold");
+}
+
 /// False when the Sheet has no room for a column.
 bool Append_Column(Sheet& target, Column_Pair pair, std::int32_t first_row, Left_Out_List& left_out)
 {
@@ -217,12 +224,12 @@ bool Append_Column(Sheet& target, Column_Pair pair, std::int32_t first_row, Left
     Cell_Transfer transfer;
     if (pair.target == nullptr || !Make_Room_For_Texts(*pair.target, *pair.source)
         || !transfer.Prepare(*pair.target, *pair.source, 0.0, false)) {
-        left_out.Note(*pair.source);
+        Note_Left_Out(*pair.source, left_out);
         return true;
     }
     Copy_Cells(transfer, first_row);
     if (transfer.Has_Lost())
-        left_out.Note(*pair.source);
+        Note_Left_Out(*pair.source, left_out);
     if (is_new)
         Compute_Column_Width(pair.target);
     return true;

@@ -17,6 +17,14 @@ void Note_Replaced(Text_Converter& converter)
         Note_Loss(Loss_Kind::letter_replaced, {}, 0, "malformed text", losses);
 }
 
+/// Bytes of a letter, of codes that have two orders; else 0.
+int Bare_Family(Code_Kind kind)
+{
+    if (kind == Code_Kind::utf_16_little || kind == Code_Kind::utf_16_big)
+        return 2;
+    return kind == Code_Kind::utf_32_little || kind == Code_Kind::utf_32_big ? 4 : -static_cast<int>(kind);
+}
+
 /// The text of an image in the code of all letters takes its place.
 bool Convert_Image(std::string_view text, Text_Code from, const std::string& name, File_Image& image)
 {
@@ -40,9 +48,12 @@ bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& st
     const std::string_view bytes(image.Bytes(), image.Size());
     std::size_t mark_length;
     const Text_Code marked = Code_Of_Mark(bytes, mark_length);
-    if (declared != nullptr && marked != declared)
+    // A text in UTF-16 or UTF-32 says by its mark which order its bytes have: the other reads as no letter.
+    const bool of_both_orders = declared != nullptr && marked != nullptr && declared->kind != marked->kind
+                                && Bare_Family(declared->kind) == Bare_Family(marked->kind);
+    if (declared != nullptr && marked != declared && !of_both_orders)
         mark_length = 0;
-    const Text_Code code = declared != nullptr ? declared : marked;
+    const Text_Code code = declared != nullptr && !of_both_orders ? declared : marked;
     if (code != nullptr && (code != Utf_8_Code() || !Letters_Are_Utf8()))
         return Convert_Image(bytes.substr(mark_length), code, name, image);
     state.head = mark_length;

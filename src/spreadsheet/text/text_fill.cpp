@@ -170,7 +170,7 @@ void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
     const Name_Marks marks = Read_Name_Marks(text);
     scan.make_date = marks.date;
     scan.make_time = marks.time;
-    Name_From_Input(column, text, Strip_Name_Mark(text));
+    Name_From_Input(column, text, Strip_Input_Mark(text));
 }
 
 /// An empty field leaves a column the name it has.

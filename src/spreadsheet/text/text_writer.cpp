@@ -1,5 +1,6 @@
 // A Sheet as text: tabs, commas, or columns of fixed width.
 #include "model/column_printer.h"
+#include "model/dropped_metadata.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "request/losses.h"
@@ -387,8 +388,11 @@ bool Text_Table_Writer::Write_Rows()
     }
     if (broken_lines_ > 0 && Keeps_Old_Output())
         return Fail("Error: The output was left as it is, since lines of it would be broken.\n");
-    if (broken_lines_ > 0)
+    if (broken_lines_ > 0) {
         Report_Message_Long("Warning: %li lines were too long and have been broken.\n", broken_lines_);
+        Note_Loss(Loss_Kind::beyond_limit, {}, 0, "lines that were broken, which read as more rows",
+                  broken_lines_);
+    }
     return true;
 }
 
@@ -402,24 +406,6 @@ std::string Title_Name(std::string_view file_name)
         || Starts_Ignoring_Case(name, "$Std_In$"))
         name = request.Source_Base_Name;
     return std::string(name);
-}
-
-}  // namespace
-
-namespace {
-
-/// A text holds cells and names. A description that begins with a blank is a name that became another one,
-/// which the ledger knows.
-void Note_What_Texts_Lack(const Sheet& sheet)
-{
-    for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next) {
-        if (!column->extra.empty() && !column->extra.view().starts_with(' '))
-            Note_Loss(Loss_Kind::metadata_dropped, column->name, 0, column->extra);
-        if (column->factor_kind == factor_with_labels && column->level_values != nullptr)
-            Note_Loss(Loss_Kind::metadata_dropped, column->name, 0, "level values behind the labels");
-    }
-    if (sheet.title_line_count > 0 && request.Add_Mode == Add_Modes::none)
-        Note_Loss(Loss_Kind::metadata_dropped, {}, 0, sheet.title_lines.c_str(), sheet.title_line_count);
 }
 
 }  // namespace
@@ -444,7 +430,7 @@ bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
         writer.Write_Title(Title_Name(file_name));
     if (!request.Omit_Header)
         writer.Write_Names();
-    Note_What_Texts_Lack(*sheet);
+    Note_Dropped_Metadata(*sheet);
     return writer.Write_Rows() && file.Close();
 }
 

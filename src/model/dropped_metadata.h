@@ -1,0 +1,11 @@
+// What a Sheet tells beside cells and names, for formats that hold nothing else.
+#pragma once
+
+#include "model/sheet.h"
+
+namespace ingester {
+
+/// Enters in the ledger the descriptions, the level values behind labels and the title that an output lacks.
+void Note_Dropped_Metadata(const Sheet& sheet);
+
+}  // namespace ingester
