@@ -146,10 +146,9 @@ TEST_F(People_Options, Tell_Of_Options_Given_In_Vain)
 {
     Put("a.csv", "k,v\n1,5\n");
     ASSERT_EQ(Convert("a.csv", "a.tss").first, 0);
-    EXPECT_EQ(
-        Convert("a.tss/+vain/n/tr/s=NA", "b.tss").second,
-        "Warning: --no-names means nothing to this input, Tabulon Spreadsheet, and had no effect.\n"
-        "Warning: --start means nothing to this input, Tabulon Spreadsheet, and had no effect.\n:\n");
+    EXPECT_EQ(Convert("a.tss/+vain/n/tr/s=NA", "b.tss").second,
+              "Warning: --no-names means nothing to this input, Tabulon Spreadsheet, and had no effect.\n"
+              "Warning: --start means nothing to this input, Tabulon Spreadsheet, and had no effect.\n:\n");
     EXPECT_EQ(Convert("a.csv/+vain/n/x=NA", "b.tss").second, "");
     EXPECT_EQ(
         Call({Request_Name("a.csv/+vain"), Request_Name("b.tss"), "Two"}).second,
