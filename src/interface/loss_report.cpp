@@ -23,7 +23,9 @@ std::string Line_Of(const Loss& loss)
     std::string line = "Lost";
     if (!loss.column.empty())
         line.append(" in ").append(loss.column);
-    line.append(Format_Text(": %lld ", static_cast<long long>(loss.count))).append(Words_Of(loss.kind));
+    line.append(": ").append(Words_Of(loss.kind));
+    if (loss.count > 1)
+        line.append(Format_Text(", %lld times", static_cast<long long>(loss.count)));
     std::string first;
     if (loss.first_row > 0)
         first = Format_Text("row %lld", static_cast<long long>(loss.first_row));

@@ -2,6 +2,7 @@
 #include "model/list.h"
 #include "model/names.h"
 #include "model/sheet.h"
+#include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/letters.h"
@@ -349,8 +350,13 @@ bool Delete_Empty_Columns(Sheet* sheet)
         return true;
     if (Find_Empty_Columns(sheet, true) == 0)
         return true;
-    Delete_Columns(
-        *sheet, [](const Column& column) { return column.all_empty != 0 && column.protected_column == 0; });
+    const auto goes = [](const Column& column) {
+        return column.all_empty != 0 && column.protected_column == 0;
+    };
+    for (const Column* column = sheet->first_column; column != nullptr; column = column->next)
+        if (!column->input_name.empty() && goes(*column))  // nobody misses one without a name
+            Note_Loss(Loss_Kind::metadata_dropped, column->name, 0, "a column without data");
+    Delete_Columns(*sheet, goes);
     return true;
 }
 

@@ -29,7 +29,7 @@ constexpr std::array<Kind_Words, Loss_Kind_Count> Kinds = {{
     {Loss_Kind::label_dropped, "label_dropped", "labels dropped or merged"},
     {Loss_Kind::missing_codes_merged, "missing_codes_merged", "missing codes merged"},
     {Loss_Kind::beyond_limit, "beyond_limit", "columns or rows beyond a limit"},
-    {Loss_Kind::metadata_dropped, "metadata_dropped", "descriptions that can't be held"},
+    {Loss_Kind::metadata_dropped, "metadata_dropped", "descriptions and the like that are not kept"},
     {Loss_Kind::input_unread, "input_unread", "parts of the input not read"},
 }};
 

@@ -40,8 +40,8 @@ TEST_F(People_Options, Are_Cut_From_Both_Strings)
 TEST_F(People_Options, Tell_Losses_Only_Where_They_Are_Asked_To)
 {
     const std::string text = "a,d:D,n\n1,5/6/2020,1\n2,soon,2\n3,later,3\n\n4,5/6/2020,4\n";
-    const std::string told = "Lost in d: 2 texts that are no numbers or dates (first: row 2: soon).\n";
-    const std::string unread = "Lost: 1 parts of the input not read (lines behind an empty line of it).\n";
+    const std::string told = "Lost in d: texts that are no numbers or dates, 2 times (first: row 2: soon).\n";
+    const std::string unread = "Lost: parts of the input not read (lines behind an empty line of it).\n";
     Put("a.csv", text);
     const Host_Answer host = Convert("a.csv", "host.tab");
     EXPECT_EQ(host.first, 0);
@@ -106,7 +106,7 @@ TEST_F(People_Options, Names_Stand_Until_The_Output_Cannot_Hold_Them)
         << "marks are such at the end of a name only";
 
     const Host_Answer answer = Convert("a.csv/+names/+losses", "a.gen");
-    EXPECT_NE(answer.second.find("Lost in Plot no: 1 names changed (Plot_no).\n"), std::string::npos)
+    EXPECT_NE(answer.second.find("Lost in Plot no: names changed (Plot_no).\n"), std::string::npos)
         << answer.second;
     const std::string script = Get("a.gen");
     EXPECT_NE(script.find("Yield_t_ha"), std::string::npos) << script;
