@@ -10,8 +10,10 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/host_process.h"
+#include "platform/text_codes.h"
 #include "request/request.h"
 #include "support/text.h"
+#include "support/utf8.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -124,6 +126,15 @@ bool Name_Is_Carried(const std::string& given)
 std::string Rules_Of(const Command_Options& options)
 {
     return Spell_People_Rules(~options.host_rules);
+}
+
+/// What a terminal gives in UTF-8, as the names that it stands for are in the request.
+std::string In_Request_Code(const Command_Options& options, const std::string& text)
+{
+    const bool host_text = options.host_rules.test(static_cast<std::size_t>(People_Rule::utf8_text));
+    if (!host_text || !Is_Utf8(text))
+        return text;
+    return std::string(Sure_Converter(Utf_8_Code(), Windows_1252_Code()).Convert(text));
 }
 
 bool Request_Can_Carry(const Conversion& conversion)
@@ -250,7 +261,7 @@ std::vector<std::string> Request_Records(const Conversion& conversion)
     std::vector<std::string> records = {conversion.input.request + asked + options.input_options,
                                         output + Packed_Option(options, output) + options.output_options};
     if (chosen || !options.sheet.empty() || !options.range.empty())
-        records.push_back(options.sheet);
+        records.push_back(In_Request_Code(options, options.sheet));
     if (chosen || !options.range.empty())
         records.push_back(options.range);
     if (!lists.columns.empty())
@@ -260,23 +271,24 @@ std::vector<std::string> Request_Records(const Conversion& conversion)
     return records;
 }
 
-bool Write_List(const std::string& name, const std::string& text)
+bool Write_List(const Command_Options& options, const std::string& name, const std::string& text)
 {
     Output_File file;
     if (text.empty())
         return true;
     if (!file.Open_Scratch(name))
         return false;
-    file.Write(text);
+    file.Write(In_Request_Code(options, text));
     return file.Close();
 }
 
 bool Write_Lists(const Conversion& conversion)
 {
     const Choice_Lists& lists = conversion.lists;
-    return Write_List(Column_List_Name(conversion), lists.columns)
-           && Write_List(Row_List_Name(conversion), lists.rows)
-           && Write_List(Change_List_Name(conversion), lists.changes);
+    const Command_Options& options = conversion.options;
+    return Write_List(options, Column_List_Name(conversion), lists.columns)
+           && Write_List(options, Row_List_Name(conversion), lists.rows)
+           && Write_List(options, Change_List_Name(conversion), lists.changes);
 }
 
 bool Write_Pass_File(const Conversion& conversion, const std::string& name)
@@ -309,7 +321,7 @@ bool Put_Merge_Keys(Conversion& conversion, const std::string& folder)
     Output_File file;
     if (!file.Open_Scratch(With_Extension(link, ".mrg")))
         return false;
-    file.Write(lines);
+    file.Write(In_Request_Code(conversion.options, lines));
     return file.Close();
 }
 

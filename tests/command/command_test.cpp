@@ -63,6 +63,8 @@ TEST_F(Command_Test, Converts)
 {
     const std::string all = On_One_Line(Crops_Tab);
     Put("few.csv", "x,y\n1,oats\n");
+    Put("latin.csv", "plot,h\xF6"
+                     "he\n1,2\n");
     Put("rows.txt", "# the good ones\n1\n\n 3 - 9\r\n");
     const std::tuple<const char*, const char*, std::string> cases[] = {
         {"crops.csv out.tab", "out.tab", all},
@@ -74,6 +76,7 @@ TEST_F(Command_Test, Converts)
         {"few.csv q.csv --no-names --no-quotes \"--out-options=/mv='-'\"", "q.csv", "C1,C2|x,y|1,oats|"},
         {"crops.csv c.tab --columns 2:2 --no-header", "c.tab", "oats|rye|barley|"},
         {"few.csv y.tab --no-names '--write-missing=it is'", "y.tab", "C1\tC2|x\ty|1\toats|"},
+        {"latin.csv l.tab --host-text --keep h\u00F6he --rename h\u00F6he=H", "l.tab", "H|2|"},
         {"few.csv m.tab --missing oats --host-losses", "m.tab", "x|1|"},
         {"--force crops.csv old.tab", "old.tab", all},
         {"crops.csv k.tab --keep yield,plot --rename plot=Block --type=plot=factor", "k.tab",
