@@ -1,11 +1,11 @@
 #include "interface/subset_lists.h"
 
+#include "interface/list_lines.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/text_codes.h"
 #include "request/messages.h"
 #include "request/request.h"
-#include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -24,9 +24,8 @@ long Read_List_Count(Input_File& file)
     std::string line;
     if (!file.Read_Line(line, Count_Line_Width))
         return 0;
-    std::size_t mark_length;
-    const bool marked = Letters_Are_Utf8() && Code_Of_Mark(line, mark_length) == Utf_8_Code();
-    return Leading_Integer(std::string_view(line).substr(marked ? mark_length : 0));
+    Cut_Mark(line);
+    return Leading_Integer(line);
 }
 
 /// A list that was read to its end has done its service.

@@ -1,5 +1,6 @@
 #include "interface/var_file.h"
 
+#include "interface/list_lines.h"
 #include "model/column_names.h"
 #include "model/date_format.h"
 #include "model/factors.h"
@@ -38,14 +39,6 @@ struct Var_List {
     bool by_name = false;
     std::vector<std::string> lines;  ///< behind the count
 };
-
-/// A mark that tells UTF-8 is no part of the first line.
-void Cut_Mark(std::string& line)
-{
-    std::size_t length;
-    if (Letters_Are_Utf8() && Code_Of_Mark(line, length) == Utf_8_Code())
-        line.erase(0, length);
-}
 
 Var_List Load_Var_List(Input_File& file)
 {

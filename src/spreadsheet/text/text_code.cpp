@@ -17,12 +17,14 @@ void Note_Replaced(Text_Converter& converter)
         Note_Loss(Loss_Kind::letter_replaced, {}, 0, "malformed text", losses);
 }
 
-/// Bytes of a letter, of codes that have two orders; else 0.
-int Bare_Family(Code_Kind kind)
+/// Whether two codes are one but for the order of their bytes.
+bool Differ_In_Order(Code_Kind a, Code_Kind b)
 {
-    if (kind == Code_Kind::utf_16_little || kind == Code_Kind::utf_16_big)
-        return 2;
-    return kind == Code_Kind::utf_32_little || kind == Code_Kind::utf_32_big ? 4 : -static_cast<int>(kind);
+    const auto are = [&](Code_Kind little, Code_Kind big) {
+        return (a == little && b == big) || (a == big && b == little);
+    };
+    return are(Code_Kind::utf_16_little, Code_Kind::utf_16_big)
+           || are(Code_Kind::utf_32_little, Code_Kind::utf_32_big);
 }
 
 /// The text of an image in the code of all letters takes its place.
@@ -49,8 +51,8 @@ bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& st
     std::size_t mark_length;
     const Text_Code marked = Code_Of_Mark(bytes, mark_length);
     // A text in UTF-16 or UTF-32 says by its mark which order its bytes have: the other reads as no letter.
-    const bool of_both_orders = declared != nullptr && marked != nullptr && declared->kind != marked->kind
-                                && Bare_Family(declared->kind) == Bare_Family(marked->kind);
+    const bool of_both_orders =
+        declared != nullptr && marked != nullptr && Differ_In_Order(declared->kind, marked->kind);
     if (declared != nullptr && marked != declared && !of_both_orders)
         mark_length = 0;
     const Text_Code code = declared != nullptr && !of_both_orders ? declared : marked;
