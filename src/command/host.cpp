@@ -384,11 +384,27 @@ std::string Unfinished_File(const Sent_Name& output)
     return name;
 }
 
+/// A request that only rewrites lines ends with the status of a table without rows, whatever has happened.
+void Settle_Rewriting(const Conversion& conversion, Answer& answer)
+{
+    const std::int32_t fields = Options_Rewrite_Lines(conversion.options.output_options);
+    if (fields < 1 || answer.status != INGESTER_NO_ROWS)
+        return;
+    const bool written = answer.messages.find("Output file not written.") == std::string::npos;
+    answer.status = written                                 ? INGESTER_SUCCESS
+                    : File_Exists(conversion.input.request) ? INGESTER_OUTPUT_FAILED
+                                                            : INGESTER_INPUT_UNREADABLE;
+    if (written)
+        Say(conversion.output.native,
+            Format_Text("lines were joined until they held %li fields", static_cast<long>(fields)));
+}
+
 Answer Convert(const Conversion& conversion)
 {
     const std::string unfinished = Unfinished_File(conversion.output);
     Remove_On_Signal(unfinished);
     Answer answer = Call_Library(conversion);
+    Settle_Rewriting(conversion, answer);
     if (!answer.Is_Good() && !unfinished.empty())
         Delete_File(unfinished);
     Remove_On_Signal({});

@@ -135,6 +135,12 @@ bool Options_Join_With_Output(std::string_view options)
     return Options_Ask_For(options, [] { return request.Add_Mode != Add_Modes::none; });
 }
 
+std::int32_t Options_Rewrite_Lines(std::string_view options)
+{
+    std::string rest(options);
+    return Take_Reflow_Order(rest).fields;
+}
+
 bool Options_Name_Joined_Sheet(std::string_view options)
 {
     return Options_Ask_For(

@@ -2,6 +2,7 @@
 // options ask for, and messages told in the user's own names.
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <string_view>
 
@@ -21,6 +22,9 @@ struct Sent_Name {
 
 /// The output options ask for a table that is joined with the one in an existing output.
 [[nodiscard]] bool Options_Join_With_Output(std::string_view options);
+
+/// The output options ask for lines that hold so many fields, in the place of a table; 0 when they don't.
+[[nodiscard]] std::int32_t Options_Rewrite_Lines(std::string_view options);
 
 /// The output options give a name to a sheet although the result keeps that of the sheet it is joined with.
 [[nodiscard]] bool Options_Name_Joined_Sheet(std::string_view options);

@@ -21,6 +21,9 @@ constexpr std::array<People_Rule_Option, People_Rule_Count> Rules = {{
     {People_Rule::further_endings, "/+endings", "host-endings",
      "outputs are known by the host's endings only"},
     {People_Rule::further_types, "/+types", "host-types", "inputs are recognised as the host does"},
+    {People_Rule::kept_levels, "/+levels", "host-levels",
+     "joins match Factors by their lists alone, and numbers with the nearest level"},
+    {People_Rule::further_dates, "/+dates", "host-dates", "dates are read in the host's forms only"},
 }};
 
 constexpr Slash_Option Others[] = {

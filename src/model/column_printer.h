@@ -22,7 +22,7 @@ enum class Number_Print : std::uint8_t {
 
 struct Printing_Rules {
     Number_Print numbers = Number_Print::as_said;
-    Number_Print level_values = Number_Print::by_format;
+    Number_Print level_values = Number_Print::as_said;
     int digits = 15;       ///< for `general`: a double holds so many decimal ones
     bool margins = false;  ///< one more level of a Table's Factor stands for its margin
 };

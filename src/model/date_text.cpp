@@ -4,6 +4,7 @@
 #include "model/date_format.h"
 #include "model/sheet.h"
 #include "model/time_text.h"
+#include "model/usual_dates.h"
 #include "request/settings.h"
 #include "support/number_text.h"
 #include "support/text.h"
@@ -415,19 +416,45 @@ private:
 
 constexpr Possible_Layouts Possible;
 
-/// The last resort: six digits or more in front of something else, or a day number.
+/// The last resort: six digits or more in front of something else, or a day number. A time isn't cut off.
 bool Read_Without_Layout(std::string_view text, std::int32_t form, double& value)
 {
     constexpr std::size_t day_and_month = 4;
     const std::size_t end = text.find_first_of("/-:,\\ ");
     if (end == std::string_view::npos)
         return Is_Day_Number(text, value) && value > 0.0;
-    if (end <= day_and_month)
+    if (end <= day_and_month || text.find(':', end + 1) != std::string_view::npos)
         return false;
     const Date_Parts date = {Read_Part_Number(text.substr(0, 2), false),
                              Read_Part_Number(text.substr(2, 2), false),
                              Read_Part_Number(text.substr(day_and_month, end - day_and_month), false)};
     return Value_Of(date, form, value);
+}
+
+/// Whether a text that could not be read has all parts of its layout: then it is that of no day, or no time,
+/// and nothing else.
+bool Has_Parts_Of_Layout(const Text_Layout& layout, const Cut_Text& cut)
+{
+    Date_Parts date;
+    double number;
+    switch (layout.reading) {
+    case Reading::date:
+    case Reading::date_time:
+        return Take_Parts(layout, cut, false, date) && Is_Year(date.year);
+    case Reading::time:
+    case Reading::hours:
+        return cut.Has_Time();
+    default:
+        return Whole_Number_Text(cut.whole, number);
+    }
+}
+
+bool Read_Loosely(std::size_t layout, const Cut_Text& cut, std::int32_t form, bool strict, double& value)
+{
+    if (layout != No_Layout && Read_By_Layout(Text_Layouts[layout], cut, form, strict, value))
+        return true;
+    return !strict && (layout == No_Layout || !Has_Parts_Of_Layout(Text_Layouts[layout], cut))
+           && Read_Without_Layout(cut.whole, form, value);
 }
 
 bool Says_No_Date(std::string_view trimmed)
@@ -446,21 +473,15 @@ std::size_t Date_Layout_Of(std::int32_t format)
 bool Text_To_Date(std::string_view text, double& value, std::int32_t form, std::int32_t format,
                   double missing, bool strict)
 {
-    text = Trim_Copy(text, Text_Cell_Width);
+    Date_Text_Room room;
+    text = Usual_Date_Text(Trim_Copy(text, Text_Cell_Width), room);
     value = missing;
     if (Says_No_Date(text))
         return true;
-    const std::size_t layout = Date_Layout_Of(format);
+    Cut_Text cut;
+    Cut(text, cut);
     double read;
-    if (layout != No_Layout) {
-        Cut_Text cut;
-        Cut(text, cut);
-        if (Read_By_Layout(Text_Layouts[layout], cut, form, strict, read)) {
-            value = read;
-            return true;
-        }
-    }
-    if (strict || !Read_Without_Layout(text, form, read))
+    if (!Read_Loosely(Date_Layout_Of(format), cut, form, strict, read) || read > Max_Date(form))
         return false;
     value = read;
     return true;
@@ -505,7 +526,8 @@ inline Strict_Readings Read_Numbers_By_All(const Cut_Text& cut)
 Strict_Readings Read_By_All_Layouts(std::string_view text)
 {
     constexpr double first_day = Serial_Offset + 1.0;  // of the serials
-    text = Trim_Copy(text, Text_Cell_Width);
+    Date_Text_Room room;
+    text = Usual_Date_Text(Trim_Copy(text, Text_Cell_Width), room);
     if (Says_No_Date(text))
         return {.blank = true};
     Cut_Text cut;
@@ -516,7 +538,7 @@ Strict_Readings Read_By_All_Layouts(std::string_view text)
     for (std::uint64_t left = Possible.Of(cut); left != 0; left &= left - 1) {
         const Text_Layout& layout = Text_Layouts[std::countr_zero(left)];
         double value;
-        if (!Read_By_Layout(layout, cut, 1, true, value))
+        if (!Read_By_Layout(layout, cut, 1, true, value) || value > Max_Date(1))
             continue;
         const std::uint64_t bit = left & (~left + 1);
         if (readings.good == 0)

@@ -270,22 +270,45 @@ bool Should_Be_Factor(const Column* column)
     return column->length >= least_length;
 }
 
+namespace {
+
+/// Changes all numbers of a column that a missing value may stand in.
+template <class Change> void Change_Numbers(Column& column, Change change)
+{
+    for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
+        change(cell->value.number);
+    for (Level_Node* level = column.level_values; level != nullptr; level = level->next)
+        change(level->value.number);
+    change(column.range_low);
+    change(column.range_high);
+    if (column.sheet != nullptr && column.sheet->type == table_sheet)
+        change(column.table_margin_value);
+}
+
+}  // namespace
+
 void Change_Missing_Value(Column* column, double new_value, double old_value)
 {
     if (column == nullptr || Is_Text_Like(column->type))
         return;
-    const auto change = [&](double& value) {
+    Change_Numbers(*column, [&](double& value) {
         if (Doubles_Equal(value, old_value))
             value = new_value;
-    };
-    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
-        change(cell->value.number);
-    for (Level_Node* level = column->level_values; level != nullptr; level = level->next)
-        change(level->value.number);
-    change(column->range_low);
-    change(column->range_high);
-    if (column->sheet != nullptr && column->sheet->type == table_sheet)
-        change(column->table_margin_value);
+    });
+}
+
+void Use_Usual_Missing_Value(Sheet& sheet)
+{
+    const double marker = sheet.missing_value;
+    if (marker == Missing_Value)
+        return;
+    sheet.missing_value = Missing_Value;
+    for (Column* column = sheet.first_column; column != nullptr; column = column->next)
+        if (!Is_Text_Like(column->type))
+            Change_Numbers(*column, [&](double& value) {
+                if (!(value > marker))
+                    value = Missing_Value;
+            });
 }
 
 }  // namespace ingester

@@ -86,15 +86,21 @@ std::int32_t Level_Finder::Sharing_Most_Of_Its_Start(std::string_view text) cons
     return longest == 0 || shared ? 0 : best->level;
 }
 
-std::int32_t Level_Finder::Of_Label(std::string_view text)
+std::int32_t Level_Finder::Of_Exact_Label(std::string_view text)
 {
     if (labels_.empty())
         Sort_Labels();
+    const auto found = std::ranges::lower_bound(exact_, text, {}, &Label::text);
+    return found != exact_.end() && found->text == text ? found->level : 0;
+}
+
+std::int32_t Level_Finder::Of_Label(std::string_view text)
+{
+    if (const std::int32_t level = text.empty() ? 0 : Of_Exact_Label(text); level > 0)
+        return level;
     if (text.empty() || exact_.empty())
         return 0;
     const auto found = std::ranges::lower_bound(exact_, text, {}, &Label::text);
-    if (found != exact_.end() && found->text == text)
-        return found->level;
     const auto alike = std::ranges::lower_bound(case_free_, text, Less_Folded, &Label::text);
     if (alike != case_free_.end() && Equal_Folded(alike->text, text))
         return alike->level;

@@ -30,6 +30,9 @@ public:
     /// begin with it.
     [[nodiscard]] std::int32_t Of_Label(std::string_view text);
 
+    /// The level with just that label, or 0.
+    [[nodiscard]] std::int32_t Of_Exact_Label(std::string_view text);
+
 private:
     struct Label {
         std::string_view text;

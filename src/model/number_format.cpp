@@ -53,6 +53,14 @@ char* Format_Cell_Number(char* target, const Column& column, double value)
     return Format_Number(target, value, column.format, column.decimals, column.sheet->missing_value);
 }
 
+char* Format_Cell_Fully(char* target, const Column& column, double value)
+{
+    constexpr int all_digits = 15;
+    const bool decimals_said = column.decimals >= 0 || column.format == date_format_mark;
+    return decimals_said || !Is_Present(*column.sheet, value) ? Format_Cell_Number(target, column, value)
+                                                              : Print_General(target, value, all_digits);
+}
+
 std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target)
 {
     const Level_Node* node = column.factor_kind == factor_with_labels   ? column.labels
@@ -62,17 +70,9 @@ std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level,
         node = node->next;
     if (node != nullptr && column.factor_kind == factor_with_labels)
         return node->Text();
-    char* const end = node != nullptr ? Format_Cell_Number(target, column, node->value.number)
+    char* const end = node != nullptr ? Format_Cell_Fully(target, column, node->value.number)
                                       : Print_Integer(target, level);
     return {target, static_cast<std::size_t>(end - target)};
-}
-
-char* Format_Cell_Fully(char* target, const Column& column, double value)
-{
-    constexpr int all_digits = 15;
-    const bool decimals_said = column.decimals >= 0 || column.format == date_format_mark;
-    return decimals_said || !Is_Present(*column.sheet, value) ? Format_Cell_Number(target, column, value)
-                                                              : Print_General(target, value, all_digits);
 }
 
 std::string_view Format_Cell(const Column& column, const Cell_Node& cell, char* target)

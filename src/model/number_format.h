@@ -24,8 +24,8 @@ char* Format_Cell_Number(char* target, const Column& column, double value);
 /// The same of a present or missing number.
 char* Format_Cell_Fully(char* target, const Column& column, double value);
 
-/// What cell `level` of a Factor prints as: its label, level value or number. Valid until `target`
-/// (of `Number_Text_Room`) changes. `level` is from 1.
+/// What level `level` (from 1) of a Factor prints as: its label, its level value as a cell of that value
+/// would, or its number. Valid until `target` (of `Number_Text_Room`) changes.
 [[nodiscard]] std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target);
 
 }  // namespace ingester

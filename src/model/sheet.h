@@ -366,6 +366,10 @@ bool Column_Statistics(const Column* column, Column_Summary& summary);
 /// Replaces a missing value by another, wherever a numeric column holds one.
 void Change_Missing_Value(Column* column, double new_value, double old_value);
 
+/// Makes `Missing_Value` what tells missing numbers in a Sheet whose file has another marker: numbers that
+/// aren't above it become that, in cells, level values and limits.
+void Use_Usual_Missing_Value(Sheet& sheet);
+
 /// The data Columns of a type; 99 stands for all types. With `only_selected` those that are marked by
 /// `range_selected`.
 constexpr std::int32_t Any_Column_Type = 99;

@@ -1,12 +1,20 @@
 #include "model/source_column.h"
 
+#include "model/names.h"
 #include "request/request.h"
 
 namespace ingester {
 
+Column* Find_Source_Column(const Sheet* sheet, std::string_view name)
+{
+    Column* const found = Find_Column(sheet, name);
+    return found != nullptr ? found : Find_Column(sheet, Make_Valid_Name(name));
+}
+
 bool Add_Source_Column(Sheet* sheet)
 {
-    if (sheet == nullptr || request.Merge_Key.empty() || Find_Column(sheet, request.Merge_Key) != nullptr)
+    if (sheet == nullptr || request.Merge_Key.empty()
+        || Find_Source_Column(sheet, request.Merge_Key) != nullptr)
         return sheet != nullptr;
     Text_Arena texts;
     Level_Node label{};

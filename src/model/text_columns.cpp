@@ -7,6 +7,7 @@
 #include "model/text_number.h"
 #include "request/losses.h"
 #include "request/messages.h"
+#include "request/people_rules.h"
 #include "request/request.h"
 
 #include <algorithm>
@@ -47,9 +48,9 @@ void Warn_Of_Number(const Column& column, long row, std::string_view text, doubl
     Begin_Warnings(request.Number_Warnings_Begun, "Text to Number Conversion Warnings\n \n");
     const std::string words(text);
     if (Is_Present(*column.sheet, number))
-        Fail("Column %s Row %4li: %s read as %.12g\n", column.name.c_str(), row, words.c_str(), number);
+        Warn("Column %s Row %4li: %s read as %.12g\n", column.name.c_str(), row, words.c_str(), number);
     else
-        Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, words.c_str());
+        Warn("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, words.c_str());
 }
 
 }  // namespace
@@ -215,34 +216,48 @@ constexpr std::int32_t Other_Date_Formats[] = {35, 33, 10, 16, 8,  12, 14, 26, 3
                                                2,  4,  6,  27, 24, 22, 20, 19, 18};
 constexpr std::int32_t Other_Time_Formats[] = {36, 37, 38, 39};
 
-bool Read_Date_Cell(std::string_view text, std::int32_t format, double missing, double& value)
+bool Read_By_Other_Formats(std::string_view text, std::int32_t format, double missing, double& value)
 {
     const auto read_strictly = [&](std::int32_t other) {
         return Text_To_Date(text, value, 1, other, missing, true);
     };
-    if (Text_To_Date(text, value, 1, format, missing, false))
-        return true;
     if (format >= time_format && format <= seconds_format)
         return std::ranges::any_of(Other_Time_Formats, read_strictly);
     return std::ranges::any_of(Other_Date_Formats, read_strictly);
+}
+
+/// The whole of a text counts for people, before only its start does.
+bool Read_Date_Cell(const Column& column, long row, std::string_view text, std::int32_t format, double& value)
+{
+    const double missing = column.sheet->missing_value;
+    const bool whole_first = For_People(People_Rule::further_dates);
+    if (whole_first
+        && (Text_To_Date(text, value, 1, format, missing, true)
+            || Read_By_Other_Formats(text, format, missing, value)))
+        return true;
+    if (Text_To_Date(text, value, 1, format, missing, false)) {
+        if (whole_first)
+            Note_Loss(Loss_Kind::date_out_of_range, column.name, row, text);
+        return true;
+    }
+    return !whole_first && Read_By_Other_Formats(text, format, missing, value);
 }
 
 void Warn_Of_Date(const Column& column, long row, std::string_view text)
 {
     Note_Loss(Loss_Kind::text_not_number, column.name, row, text);
     Begin_Warnings(request.Date_Warnings_Begun, "Text to Date Conversion Warnings\n \n");
-    Fail("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, std::string(text).c_str());
+    Warn("Column %s Row %4li: %s read as *\n", column.name.c_str(), row, std::string(text).c_str());
 }
 
 void Read_Date_Cells(Column& column, std::int32_t format)
 {
-    const double missing = column.sheet->missing_value;
     long row = 0;
     for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {
         const std::string_view text = cell->Text();
         ++row;
         double value;
-        if (!Read_Date_Cell(text, format, missing, value))
+        if (!Read_Date_Cell(column, row, text, format, value))
             Warn_Of_Date(column, row, text);
         cell->value.number = value;
     }
@@ -258,6 +273,33 @@ bool Has_Times(const Column& column)
     return false;
 }
 
+/// Years of four digits, for people, where the year came first; dashes stay dashes.
+std::int32_t Year_First_Format(const Column& column)
+{
+    const Cell_Node* cell = column.first_cell;
+    while (cell != nullptr && cell->Text().empty())
+        cell = cell->next;
+    const bool dashed = cell != nullptr && cell->Text().find('-') != std::string_view::npos;
+    return dashed ? dashed_year_month_day_format : year_month_day_format;
+}
+
+std::int32_t Wanted_Format(const Column& column, const Date_Counts& counts)
+{
+    const std::int32_t format = Found_Format(counts, {.wanted = 1, .has_default = true});
+    const bool in_full = format == short_year_month_day_format && For_People(People_Rule::further_dates);
+    return in_full ? Year_First_Format(column) : format;
+}
+
+/// The code by which a column that is marked for times is read. For people it may hold dates with them.
+std::int32_t Wanted_Time_Format(const Column& column, const Date_Counts& counts)
+{
+    const std::int32_t times =
+        Found_Format(counts, {.wanted = time_format, .has_default = true, .time_mode = true});
+    const bool dated = For_People(People_Rule::further_dates)
+                       && counts.Hits(Best_Format(counts, {.wanted = 1})) > counts.Hits(times);
+    return dated ? Wanted_Format(column, counts) : times;
+}
+
 }  // namespace
 
 bool Text_Column_To_Date(Column* column, bool time_mode)
@@ -266,8 +308,8 @@ bool Text_Column_To_Date(Column* column, bool time_mode)
         return false;
     Remembered_Dates remembered(*column);
     const Date_Counts counts = Count_Readings(*column, false, &remembered);
-    const std::int32_t format = Found_Format(
-        counts, {.wanted = time_mode ? time_format : 1, .has_default = true, .time_mode = time_mode});
+    const std::int32_t format =
+        time_mode ? Wanted_Time_Format(*column, counts) : Wanted_Format(*column, counts);
     if (const double* value = remembered.Values_By(format); value != nullptr)
         for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
             cell->value.number = *value++;

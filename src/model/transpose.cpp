@@ -5,6 +5,7 @@
 #include "model/factor_lists.h"
 #include "model/level_tables.h"
 #include "model/names.h"
+#include "model/table_factor.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/letters.h"
@@ -163,18 +164,10 @@ std::int32_t New_Level_Count(const Transposition& work)
 
 bool Label_Levels(const Transposition& work, Column& factor)
 {
-    const std::int32_t state = work.from->label_state;
-    const bool valued = state == labels_by_level || state == labels_by_text_and_level;
-    const bool labelled = state == labels_by_text || state == labels_by_text_and_level;
-    const Old_Column* valued_by = work.data.data();
-    const Old_Column* labelled_by = work.data.data();
-    if (!Put_Level_Values(factor, valued ? factor.nlevels : 0,
-                          [&] { return (valued_by++)->column->table_margin_value; })
-        || !Put_Labels(factor, labelled ? factor.nlevels : 0,
-                       [&] { return factor.texts.Store(Label_Text(*(labelled_by++)->column)); }))
-        return false;
-    factor.factor_kind = Factor_Kind_Of(factor);
-    return true;
+    std::vector<const Column*> columns;
+    for (const Old_Column& old : std::span(work.data).first(static_cast<std::size_t>(factor.nlevels)))
+        columns.push_back(old.column);
+    return Take_Column_Levels(*work.from, columns, factor);
 }
 
 /// The factor across the old columns goes down the new rows.
@@ -185,9 +178,9 @@ bool Add_Row_Factor(Transposition& work)
                                            static_cast<std::int32_t>(work.data.size()));
     if (factor == nullptr)
         return false;
-    factor->extra = from.column_label_name.view();
+    Take_Column_Factor_Look(from, *factor);
     factor->nlevels = New_Level_Count(work);
-    if (factor->nlevels > 0 && !Label_Levels(work, *factor))
+    if (factor->nlevels > 0 && from.label_state > labels_by_position && !Label_Levels(work, *factor))
         return false;
     std::int32_t level = 0;
     for (Cell_Node* cell = factor->first_cell; cell != nullptr; cell = cell->next)
@@ -208,8 +201,7 @@ void Describe_Column_Factor(Transposition& work)
     }
     if (factor == nullptr || factor->type != factor_column)
         return;
-    to.row_label_name = factor->name.view();
-    to.column_label_name = factor->extra.view();
+    Keep_As_Column_Factor(to, *factor);
     to.label_state = (factor->level_values != nullptr ? labels_by_level : labels_by_position)
                      + (factor->labels != nullptr ? labels_by_text : labels_by_position);
     to.labelled_columns = factor->factor_kind == factor_with_labels ? 1 : 0;

@@ -25,6 +25,12 @@ template <class First, class... Rest> bool Fail(const char* format, First first,
     return false;
 }
 
+/// Reports what the user should know of a request that goes on.
+template <class First, class... Rest> void Warn(const char* format, First first, Rest... rest)
+{
+    Report_Message(Format_Text(format, first, rest...));
+}
+
 /// Reports that a file, or a list, could not be read to its end. Always false.
 bool Fail_To_Read(const std::string& file_name);
 

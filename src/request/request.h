@@ -35,6 +35,7 @@ constexpr std::int32_t Every_Column = 2147483647;
 struct Lasting_Globals {
     std::int32_t Text_Number_Mode = 3;  ///< how texts become numbers, 0 to 4
     bool Keep_As_Columns = true;        ///< images and sound become columns
+    std::int32_t Made_Up_Factors = 0;   ///< that scripts have named: none meets one of an earlier script
 };
 
 /// Everything else a request sets. A fresh value is assigned at the start of each, so nothing lingers.

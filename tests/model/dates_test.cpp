@@ -3,6 +3,7 @@
 #include "model/date_text.h"
 #include "model/number_format.h"
 #include "model/text_columns.h"
+#include "request/people_rules.h"
 #include "support/cell_lists.h"
 
 #include <cmath>
@@ -176,6 +177,7 @@ TEST_F(Dates, Texts_Read_By_Code)
         {"no",
          same,
          {"36 25:00:00", "39 1e3x", "40 1e999", "41 1/2/2003", "0 1/2/2003", "1 1/2/2003 :", "36 :"}},
+        {"no", same, {"17 20200230", "18 20200230", "6 08012020 25:00", "1 08012020 25:00", "2 8012020"}},
         {"1600-03-01 00:00:00", same, {"1  1 3-1600 "}},
         {"2000-02-29 00:00:00", same, {"2 29/2/2000"}},
         {"no", "1900-03-01 12:00:00", {"2 109573.5"}},
@@ -206,7 +208,8 @@ TEST_F(Dates, Texts_Read_By_Code)
         }
     for (const char* blank : {"", "  ", "*", "*x"})
         EXPECT_TRUE(Read(blank, 2, true) == "*" && Read_By_All_Layouts(blank).blank);
-    EXPECT_EQ(Read(std::string(10000, '1'), 2, false), "1.11111111111111e+89");
+    EXPECT_EQ(Read(std::string(10000, '1'), 2, false), "no");
+    EXPECT_EQ(Read("3067979", 2, false), "no") << "no day beyond the last one";
     EXPECT_EQ(Month_From_Short("Sept", false) + Month_From_Name("may", true), 9 + 5);
     EXPECT_EQ(Month_From_Short("Sept", true) + Month_From_Name("Ma", false), 0);
 }
@@ -270,6 +273,36 @@ TEST_F(Dates, Text_Columns_Become_Dates)
     EXPECT_EQ(Messages(), "Text to Date Conversion Warnings\n \n"
                           "Column x Row    5: some day read as *\n"
                           "Column x Row    2: noon read as *\n:\n");
+}
+
+TEST_F(Dates, People_Write_Them_In_More_Ways)
+{
+    const std::pair<Texts, const char*> cases[] = {
+        {{"2020-01-05T10:30:15.5", "2020-01-05T10:30:15Z", "x"}, "2020-01-05 10:30:15|2020-01-05 10:30:15|*"},
+        {{"2020-01-05 10:30 AM", "2020-01-05 12:30 am", "2020-01-05 1:30 PM"},
+         "2020-01-05 10:30:00|2020-01-05 00:30:00|2020-01-05 13:30:00"},
+        {{"01/25/2020 10:30 AM", "01/26/2020 11:30 PM"}, "2020-01-25 10:30:00|2020-01-26 23:30:00"},
+        {{"Jan 5, 2020", "January 6, 2020", "3.1.2020"},
+         "2020-01-05 00:00:00|2020-01-06 00:00:00|2020-01-03 00:00:00"},
+        {{"3.1.2020", "13.1.2020 8:15"}, "2020-01-03 00:00:00|2020-01-13 08:15:00"},
+        {{"5/1/2020", "6/1/2020 10h30"}, "2020-01-05 00:00:00|2020-01-06 00:00:00"},
+    };
+    for (const auto& [texts, dates] : cases)
+        for (const bool time_mode : {false, true}) {
+            Start_Request("t");
+            request.people.set(static_cast<std::size_t>(People_Rule::further_dates));
+            Column* const column = Lone_Column(text_column, texts);
+            ASSERT_TRUE(Text_Column_To_Date(column, time_mode));
+            std::string read;
+            for (const double value : Numbers_Of(*column))
+                read.append(read.empty() ? "" : "|").append(Shown(value, 1, 34));
+            EXPECT_EQ(read, dates) << texts.front();
+            const bool lossy = texts.back() == "x" || texts.back().ends_with("h30");
+            EXPECT_EQ(request.losses.Entries().size(), lossy ? 1 : 0) << texts.front();
+        }
+    Column* const early = Lone_Column(text_column, {"1999-01-05", "1998-02-06", "1997-03-04"});
+    ASSERT_TRUE(Text_Column_To_Date(early, false));
+    EXPECT_EQ(early->date_format, 27) << "years of four digits";
 }
 
 }  // namespace

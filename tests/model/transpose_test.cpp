@@ -61,6 +61,9 @@ TEST_F(Transpose, A_Table_Changes_Its_Factors)
     Put_Levels(*Column_At(sheet, 1), {10, 20}, {"north", "south"});
     Column_At(sheet, 2)->table_margin_value = 7;
     Column_At(sheet, 3)->table_margin_value = 8;
+    sheet->column_factor_format = date_format_mark;
+    sheet->column_factor_date = -2;
+    sheet->column_factor_decimals = 3;
     ASSERT_TRUE(Transpose_Sheet(sheet));
     const Sheet& once = *Current_Sheet;
     EXPECT_EQ(Render(&once), "kind F1|2|3; north T1|4|5; south T2|5|7; All T3|9|12");
@@ -68,9 +71,15 @@ TEST_F(Transpose, A_Table_Changes_Its_Factors)
     EXPECT_EQ(Levels_Of(*once.first_column->next), "A=7,B=8");
     EXPECT_EQ(once.first_column->next->next->table_margin_value, 10);
     EXPECT_TRUE(once.row_label_name == "site" && once.label_state == 3 && once.has_margins != 0);
+    const Column& kinds = *once.first_column->next;
+    EXPECT_EQ((std::vector{kinds.format, kinds.date_format, 1 * kinds.date_form, kinds.decimals}),
+              (std::vector{5, 2, 1, 3}));
+    EXPECT_EQ(once.column_factor_format, significant_digits_format) << "that of the sites";
     EXPECT_EQ(Check_Sheet(once), "");
     ASSERT_TRUE(Transpose_Sheet(Current_Sheet));
     EXPECT_EQ(Render(Current_Sheet), Render(sheet));
+    EXPECT_EQ(Current_Sheet->column_factor_date, -2);
+    EXPECT_EQ(Current_Sheet->column_factor_decimals, 3);
 }
 
 TEST_F(Transpose, Refuses_With_Words)

@@ -1,8 +1,11 @@
 // Matrices of the three shapes, with the labels of their rows and columns.
 #include "hostfiles/script/script_parts.h"
 #include "model/cell_text.h"
+#include "request/losses.h"
+#include "request/messages.h"
 #include "support/text.h"
 
+#include <algorithm>
 #include <span>
 #include <vector>
 
@@ -139,6 +142,22 @@ bool Write_Matrix_Script(Sheet& sheet, Script_Buffer& script)
     return true;
 }
 
+namespace {
+
+/// A spreadsheet that was cut short may lack columns; the matrix needs all of its values.
+void Tell_Missing_Columns(const Sheet& sheet, std::size_t columns)
+{
+    const auto lacking = static_cast<std::int64_t>(sheet.row_count) - static_cast<std::int64_t>(columns);
+    if (lacking < 1)
+        return;
+    Note_Loss(Loss_Kind::input_unread, sheet.structure_name, 0, "columns of a matrix that was cut short",
+              lacking);
+    Warn("Warning: The matrix %s lacks %li of its columns, whose values were written as missing.\n",
+         sheet.structure_name.c_str(), static_cast<long>(lacking));
+}
+
+}  // namespace
+
 bool Write_Symmetric_Script(Sheet& sheet, Script_Buffer& script)
 {
     const std::int64_t rows = sheet.row_count;
@@ -158,9 +177,14 @@ bool Write_Symmetric_Script(Sheet& sheet, Script_Buffer& script)
     Declare_Matrix("SYMMETRICMATRIX [rows=" + labels, *first, name, Small_Words, script);
     std::vector<Cell_Position> positions = Start_Columns(first);
     const std::span<Cell_Position> all = positions;
-    for (std::size_t row = 1; row <= all.size() && !script.Failed(); ++row)
-        Write_Next_Cells(all.first(row), script);
+    const Script_Number_Form form = Number_Form_Of(*first);
+    for (std::size_t row = 1; row <= static_cast<std::size_t>(rows) && !script.Failed(); ++row) {
+        Write_Next_Cells(all.first(std::min(row, all.size())), script);
+        for (std::size_t column = all.size(); column < row; ++column)
+            Write_Data_Number(sheet.missing_value, form, script);
+    }
     Write_Data_End(script);
+    Tell_Missing_Columns(sheet, all.size());
     return true;
 }
 

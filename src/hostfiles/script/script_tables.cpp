@@ -1,7 +1,8 @@
 // Tables of one, two and more ways, with the factors that classify them.
 #include "hostfiles/script/script_parts.h"
-#include "model/factor_lists.h"
 #include "model/names.h"
+#include "model/table_factor.h"
+#include "request/request.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
@@ -17,12 +18,9 @@ namespace {
 /// In a Table each Column is a structure or, with more than one way, a level of the last factor.
 constexpr Attribute_Words Table_Words = {" ; decimals=", "; extra=", "; drep="};
 
-/// Numbers the factors that are made up, so that they never meet one of an earlier script.
-std::int32_t made_up_factors = 0;
-
 std::string Make_Up_Factor(const char* name_start, std::int64_t levels, Script_Buffer& script)
 {
-    std::string name = name_start + std::to_string(++made_up_factors);
+    std::string name = name_start + std::to_string(++request.Made_Up_Factors);
     Write_Statement("FACTOR [modify=yes;", script);
     Write_Statement(Format_Text("levels=%li] %s\n", static_cast<long>(levels), name.c_str()), script);
     return name;
@@ -74,44 +72,18 @@ std::vector<std::string> Declare_Leading_Factors(const Sheet& sheet, Script_Buff
     return names;
 }
 
-/// Level values that are present, and no two the same.
-bool Tell_Levels_Apart(const Sheet& sheet, const Table_Shape& shape)
-{
-    std::vector<double> values;
-    for (const Column* column : shape.columns) {
-        if (column->type != table_column)
-            continue;
-        if (!Is_Present(sheet, column->table_margin_value))
-            return false;
-        values.push_back(column->table_margin_value);
-    }
-    std::sort(values.begin(), values.end());
-    return std::adjacent_find(values.begin(), values.end()) == values.end();
-}
-
 bool Any_Column_Changed(const Table_Shape& shape)
 {
     return std::any_of(shape.columns.begin(), shape.columns.end(),
                        [](const Column* column) { return column->modified != 0; });
 }
 
-/// Gives `factor` a level for each Table column: its level value and its label, where they tell.
 bool Take_Levels(Column& factor, const Table_Shape& shape)
 {
-    const Sheet& sheet = *factor.sheet;
-    const std::int32_t state = sheet.label_state;
-    const bool valued = state != labels_by_text && Tell_Levels_Apart(sheet, shape);
-    const bool labelled = state >= labels_by_text || (state == labels_by_level && !valued);
     std::vector<const Column*> columns;
     std::ranges::copy_if(shape.columns, std::back_inserter(columns),
                          [](const Column* column) { return column->type == table_column; });
-    return !columns.empty()
-           && Put_Level_Values(
-               factor, valued ? factor.nlevels : 0,
-               [column = columns.begin()]() mutable { return (*column++)->table_margin_value; })
-           && Put_Labels(factor, labelled ? factor.nlevels : 0, [&, column = columns.begin()]() mutable {
-                  return factor.texts.Store(Label_Text(**column++));
-              });
+    return Take_Column_Levels(*factor.sheet, columns, factor);
 }
 
 /// The factor across the columns. There is a real one where the Sheet names or labels it, or where
@@ -127,8 +99,8 @@ bool Declare_Column_Factor(Sheet& sheet, const Table_Shape& shape, std::string& 
     factor.type = factor_column;
     factor.sheet = &sheet;
     factor.nlevels = static_cast<std::int32_t>(shape.levels);
-    factor.extra = sheet.column_label_name.view();
-    name = sheet.row_label_name.empty() ? "_tf1_" + std::to_string(++made_up_factors)
+    Take_Column_Factor_Look(sheet, factor);
+    name = sheet.row_label_name.empty() ? "_tf1_" + std::to_string(++request.Made_Up_Factors)
                                         : Make_Valid_Name(sheet.row_label_name);
     factor.name = name;
     if ((labelled || Any_Column_Changed(shape)) && !Take_Levels(factor, shape))

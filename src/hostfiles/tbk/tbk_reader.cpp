@@ -540,6 +540,8 @@ bool Read_TBK(Input_File& file)
     reading.chooses = !request.Worksheet_Name.empty();
     const bool good = Read_Book(reading);
     Current_Sheet = good ? reading.sheet : nullptr;
+    if (Current_Sheet != nullptr)
+        Use_Usual_Missing_Value(*Current_Sheet);
     return good;
 }
 

@@ -272,6 +272,7 @@ bool Finish_Sheet(TSS_Reading& reading)
         return false;  // silent by design: the pipeline tells what was left out
     if (!Set_Row_Marks(reading) || !Select_Symmetric(sheet))
         return false;
+    Use_Usual_Missing_Value(sheet);
     Restore_Pointer_Names(&sheet);
     Set_Margin_Level(sheet);
     Make_Column_Names_Unique(&sheet);

@@ -1,14 +1,18 @@
 #include "model/join/append.h"
 
+#include "model/column_printer.h"
 #include "model/factor_lists.h"
 #include "model/factors.h"
 #include "model/join/cell_transfer.h"
+#include "model/join/column_copies.h"
 #include "model/join/column_index.h"
+#include "model/join/factor_levels.h"
+#include "model/join/refusals.h"
 #include "model/level_tables.h"
-#include "model/number_format.h"
 #include "model/sort.h"
+#include "model/source_column.h"
 #include "request/losses.h"
-#include "request/messages.h"
+#include "request/people_rules.h"
 #include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
@@ -23,11 +27,16 @@ namespace {
 
 bool Can_Be_Appended(const Sheet* target, const Sheet* source)
 {
-    const bool fits = target != nullptr && source != nullptr && source != target && source->row_count >= 1
-                      && target->type != scalar_sheet && target->type != symmetric_matrix_sheet
-                      && source->type != diagonal_matrix_sheet && source->type != symmetric_matrix_sheet
-                      && target->read_only == 0;
-    return fits || Fail("These data can't go beneath those: one of them holds no rows that could.\n");
+    if (Is_Refused({{target == nullptr || source == nullptr || source == target, Nothing_To_Join}}))
+        return false;
+    return !Is_Refused(
+        {{source->row_count < 1, No_Rows_To_Join},
+         {target->type == scalar_sheet,
+          "Scalars have one value each, so that no rows can go beneath them.\n"},
+         {target->type == symmetric_matrix_sheet, "No rows can go beneath those of a symmetric matrix.\n"},
+         {source->type == symmetric_matrix_sheet || source->type == diagonal_matrix_sheet,
+          "The rows of a symmetric or diagonal matrix can't go beneath others.\n"},
+         {target->read_only != 0, Output_Is_Read_Only}});
 }
 
 /// The Factor that tells where rows came from, and its level for the new ones.
@@ -39,12 +48,14 @@ struct Source_Mark {
 /// One more label. A Factor without any gets those that its levels print as.
 bool Add_Label(Column& factor, std::string_view label)
 {
+    constexpr int all_digits = 15;
     char text[Number_Text_Room];
-    std::vector<const char*> labels = Label_Table(factor);
+    std::vector<const char*> labels = Printed_Levels(factor, Number_Print::as_said, all_digits, factor.texts);
     labels.resize(std::min(labels.size(), static_cast<std::size_t>(factor.nlevels) - 1));
-    while (std::ssize(labels) < factor.nlevels - 1)
-        labels.push_back(factor.texts.Store(
-            Factor_Label_Or_Level(factor, static_cast<std::int32_t>(labels.size()) + 1, text)));
+    while (std::ssize(labels) < factor.nlevels - 1) {
+        const char* const end = Print_Integer(text, std::ssize(labels) + 1);
+        labels.push_back(factor.texts.Store({text, static_cast<std::size_t>(end - text)}));
+    }
     labels.push_back(factor.texts.Store(label));
     factor.factor_kind = factor_with_labels;
     return Put_Labels(factor, labels);
@@ -66,7 +77,7 @@ bool Extend_Source_Column(Column& factor, const Append_Request& wanted)
     const bool labelled = factor.label_count > 0 || !wanted.new_label.empty();
     if (factor.nlevels >= most_levels)
         return Fail("Factor %s has too many levels for one more.\n", factor.name.c_str());
-    factor.nlevels = std::max(factor.nlevels, 0) + 1;
+    Set_Level_Count(factor, std::max(factor.nlevels, 0) + 1);
     const std::string label = wanted.new_label.empty() ? Format_Text("%li", static_cast<long>(factor.nlevels))
                                                        : std::string(wanted.new_label);
     return (!labelled || Add_Label(factor, label))
@@ -91,11 +102,11 @@ Column* Make_Source_Column(Sheet& target, const Append_Request& wanted)
     return Add_Column(&target, column, target.column_count + 1, true);
 }
 
-bool Find_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark& mark)
+bool Ready_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark& mark)
 {
     if (wanted.source_column_name.empty())
         return true;
-    mark.column = Find_Column(&target, wanted.source_column_name);
+    mark.column = Find_Source_Column(&target, wanted.source_column_name);
     if (mark.column == nullptr) {
         mark.column = Make_Source_Column(target, wanted);
         mark.level = 2;
@@ -107,11 +118,18 @@ bool Find_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark
     return true;
 }
 
-void Mark_New_Rows(const Source_Mark& mark, std::int32_t first_row, std::int32_t rows)
+/// Where the rows of the source go.
+struct New_Rows {
+    std::int32_t first;
+    std::int32_t count;
+};
+
+void Mark_New_Rows(const Source_Mark& mark, New_Rows rows)
 {
     if (mark.column == nullptr)
         return;
-    for (Cell_Node* cell = Cell_At(mark.column, first_row); cell != nullptr && rows > 0; --rows) {
+    for (Cell_Node* cell = Cell_At(mark.column, rows.first); cell != nullptr && rows.count > 0;
+         --rows.count) {
         cell->value.number = mark.level;
         cell = cell->next;
     }
@@ -166,13 +184,13 @@ public:
     void Tell() const
     {
         if (!names_.empty())
-            Fail("Some column data has not been appended due to a data type mismatch.\n"
+            Warn("Some column data has not been appended due to a data type mismatch.\n"
                  "(e.g. text column data cannot be inserted into numeric column).\n"
                  "Columns were:\n%s.\n",
                  names_.c_str());
         else if (any_)
-            Fail("Some column data has not been appended due to a data type mismatch.\n"
-                 "(e.g. text column data cannot be inserted to numeric column).\n");
+            Report_Message("Some column data has not been appended due to a data type mismatch.\n"
+                           "(e.g. text column data cannot be inserted to numeric column).\n");
     }
 
 private:
@@ -181,26 +199,47 @@ private:
     bool any_ = false;
 };
 
+bool Holds_Words(const Column& factor)
+{
+    if (factor.type != factor_column || factor.factor_kind != factor_with_labels)
+        return false;
+    double number;
+    for (const Level_Node* label = factor.labels; label != nullptr; label = label->next)
+        if (!Whole_Number_Text(Trim_Copy(label->Text()), number))
+            return true;
+    return false;
+}
+
+/// Whether the target has to become a Text for these data. Factors can have new levels for people.
+bool Needs_Text(const Column& target, const Column& source)
+{
+    if (Is_Text_Like(target.type) || target.label_count > 0)
+        return false;
+    if (!For_People(People_Rule::kept_levels))
+        return Is_Text_Like(source.type);
+    return target.type != factor_column && (Is_Text_Like(source.type) || Holds_Words(source));
+}
+
 /// Texts go into numbers when these can become texts: Variates of a Vector, and Factors without labels.
 bool Make_Room_For_Texts(Column& target, const Column& source)
 {
-    if (Is_Text_Like(target.type) || !Is_Text_Like(source.type) || target.label_count > 0)
+    if (!Needs_Text(target, source))
         return true;
     const bool factor = target.type == factor_column;
     if ((!factor && target.type != variate_column) || target.sheet->type != vector_sheet
         || target.sheet->read_only != 0 || target.protected_column != 0)
-        return false;
-    Fail("Text column %s appended to variate column %s.\nConverting %s to a text for compatibility.\n",
+        return !Is_Text_Like(source.type);
+    Warn("Text column %s appended to variate column %s.\nConverting %s to a text for compatibility.\n",
          source.name.c_str(), target.name.c_str(), target.name.c_str());
     return factor ? Factor_To_Text(&target) : Variate_To_Text(&target);
 }
 
-void Copy_Cells(Cell_Transfer& transfer, std::int32_t first_row)
+void Copy_Cells(Cell_Transfer& transfer, New_Rows rows)
 {
-    const std::int32_t row = first_row + First_Row_Of(transfer.Source());
+    const std::int32_t row = rows.first + First_Row_Of(transfer.Source());
     Cell_Node* to = Cell_At(&transfer.Target(), row);
-    for (const Cell_Node* from = transfer.Source().first_cell; from != nullptr && to != nullptr;
-         from = from->next) {
+    for (const Cell_Node* from = transfer.Source().first_cell;
+         from != nullptr && to != nullptr && rows.count > 0; from = from->next, --rows.count) {
         transfer.Put(*to, from->value);
         to = to->next;
     }
@@ -213,7 +252,7 @@ void Note_Left_Out(const Column& source, Left_Out_List& left_out)
 }
 
 /// False when the Sheet has no room for a column.
-bool Append_Column(Sheet& target, Column_Pair pair, std::int32_t first_row, Left_Out_List& left_out)
+bool Append_Column(Sheet& target, Column_Pair pair, New_Rows rows, Left_Out_List& left_out)
 {
     const bool is_new = pair.target == nullptr;
     const bool never_texts = target.type != vector_sheet && Is_Text_Like(pair.source->type);
@@ -223,11 +262,11 @@ bool Append_Column(Sheet& target, Column_Pair pair, std::int32_t first_row, Left
         return false;
     Cell_Transfer transfer;
     if (pair.target == nullptr || !Make_Room_For_Texts(*pair.target, *pair.source)
-        || !transfer.Prepare(*pair.target, *pair.source, 0.0, false)) {
+        || !transfer.Prepare(*pair.target, *pair.source, {.all_digits = true})) {
         Note_Left_Out(*pair.source, left_out);
         return true;
     }
-    Copy_Cells(transfer, first_row);
+    Copy_Cells(transfer, rows);
     if (transfer.Has_Lost())
         Note_Left_Out(*pair.source, left_out);
     if (is_new)
@@ -242,15 +281,17 @@ bool Append_Sheet(Sheet* target, const Append_Request& wanted)
     if (!Can_Be_Appended(target, wanted.source))
         return false;
     Source_Mark mark;
-    const std::int32_t first_row = Movable_Rows(*target);  // a margin stays the last row
-    if (!Find_Source_Column(*target, wanted, mark)
-        || !Insert_Rows(target, first_row, wanted.source->row_count, false))
+    const New_Rows rows = {Movable_Rows(*target),
+                           Movable_Rows(*wanted.source)};  // a margin stays the last row
+    if (!Ready_Source_Column(*target, wanted, mark) || !Insert_Rows(target, rows.first, rows.count, false))
         return false;
-    Mark_New_Rows(mark, first_row, wanted.source->row_count);
+    Mark_New_Rows(mark, rows);
+    if (rows.count < wanted.source->row_count)
+        Note_Loss(Loss_Kind::beyond_limit, "", wanted.source->row_count, "the margin of the new table");
     Left_Out_List left_out(*wanted.source);
     for (const Column_Pair& pair : wanted.by_name ? Pair_By_Name(*target, *wanted.source)
                                                   : Pair_By_Position(*target, *wanted.source, mark.column))
-        if (!Append_Column(*target, pair, first_row, left_out))
+        if (!Append_Column(*target, pair, rows, left_out))
             return false;
     left_out.Tell();
     return true;

@@ -3,10 +3,14 @@
 #include "model/calendar.h"
 #include "model/cell_text.h"
 #include "model/column_printer.h"
-#include "model/factors.h"
+#include "model/factor_lists.h"
+#include "model/join/column_copies.h"
 #include "model/join/factor_levels.h"
+#include "model/join/label_numbers.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
+#include "request/people_rules.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 
 #include <algorithm>
@@ -19,121 +23,53 @@ namespace {
 
 constexpr int Level_Digits = 15;
 
-std::int32_t Plain_Type(std::int32_t type)
-{
-    return type == units_text_column ? text_column : type == units_variate_column ? variate_column : type;
-}
-
 }  // namespace
 
-Column* Copy_Column_Aside(const Column& column)
+/// Levels are matched with levels: of texts that may name labels, and for people of whatever goes to a
+/// Factor.
+bool Cell_Transfer::Has_To_Be_Factor() const
 {
-    Sheet* const current = Current_Sheet;
-    Sheet* const aside = New_Sheet();
-    Current_Sheet = current;
-    aside->settings = column.sheet->settings;
-    aside->missing_value = column.sheet->missing_value;
-    Column* const copy = New_Data_Column(aside, Plain_Type(column.type), column.name, column.length);
+    if (target_->type != factor_column || source_->type == factor_column)
+        return false;
+    return For_People(People_Rule::kept_levels) || (Is_Text_Like(source_->type) && target_->label_count > 0);
+}
+
+/// Dates in the form of the target's, as a Factor's values are compared without a look at theirs.
+void Cell_Transfer::Move_Dates(Column& copy)
+{
+    for (Cell_Node* cell = copy.first_cell; cell != nullptr; cell = cell->next) {
+        if (!Cell_Is_Present(copy, *cell))
+            continue;
+        cell->value.number = Moved_Date(cell->value.number);
+        lost_ = lost_ || !Is_Present(*target_->sheet, cell->value.number);
+    }
+    if (copy.format == date_format_mark && target_->format == date_format_mark)
+        copy.date_form = target_->date_form;
+}
+
+bool Cell_Transfer::Make_Source_A_Factor()
+{
+    Column* const copy = Copy_Column_Aside(*source_);
     if (copy == nullptr)
-        return nullptr;
-    const Cell_Node* from = column.first_cell;  // texts stay where they are: the request keeps them
-    for (Cell_Node* cell = copy->first_cell; cell != nullptr && from != nullptr; cell = cell->next) {
-        cell->value = from->value;
-        from = from->next;
-    }
-    copy->format = column.format;
-    copy->decimals = column.decimals;
-    copy->date_form = column.date_form;
-    copy->date_format = column.date_format;
-    aside->row_count = column.length;
-    aside->rows_due = true;
-    return copy;
+        return false;
+    if (Is_Text_Like(copy->type))
+        lost_ = source_->nlevels > static_cast<std::int32_t>(Long_Label_Width);  // what is longer is cut
+    else
+        Move_Dates(*copy);
+    source_ = copy;
+    return Turn_Into_Factor(*copy, rules_.ignore_case);
 }
 
-namespace {
-
-bool Has_Data(const Column& column)
-{
-    for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
-        if (Cell_Is_Present(column, *cell))
-            return true;
-    return false;
-}
-
-/// The type by which a Sheet takes data like those of `source`; `row_column` when it can't.
-std::int32_t Type_In(const Sheet& sheet, const Column& source)
-{
-    const bool has_units = sheet.leading_columns > 1;
-    switch (sheet.type) {
-    case vector_sheet:
-        if (Is_Text_Like(source.type) || source.type == factor_column)
-            return has_units ? Plain_Type(source.type) : source.type;
-        return variate_column;
-    case table_sheet:
-        return sheet.has_margins != 0 || Is_Text_Like(source.type) ? row_column : table_column;
-    case matrix_sheet:
-        return Is_Text_Like(source.type) ? row_column : matrix_column;
-    case diagonal_matrix_sheet:
-        return row_column;  // it has one column of data
-    default:
-        return source.type;
-    }
-}
-
-void Copy_Look(Column& column, const Column& source)
-{
-    column.format = source.format;
-    column.justify = source.justify;
-    column.date_format = source.date_format;
-    column.date_form = source.date_form;
-    column.width = source.width;
-    column.extra = source.extra;
-    column.range_low = source.range_low;
-    column.range_high = source.range_high;
-    column.decimals = source.decimals;
-    if (column.type == factor_column)
-        column.factor_kind = source.factor_kind;
-    Change_Missing_Value(&column, column.sheet->missing_value, source.sheet->missing_value);
-}
-
-}  // namespace
-
-Column* Add_Column_Like(Sheet& sheet, const Column& source)
-{
-    const std::int32_t type = Type_In(sheet, source);
-    if (type == row_column)
-        return nullptr;
-    Column_Request wanted{type, source.name, source.decimals, source.nlevels, ""};
-    if (source.type == factor_column) {
-        wanted.level_values = source.level_values;
-        wanted.level_values_count = source.level_values_count;
-        wanted.labels = source.labels;
-        wanted.label_count = source.label_count;
-    }
-    Column* const column = Add_Column(&sheet, wanted, sheet.column_count + 1, true);
-    if (column == nullptr)
-        return nullptr;
-    Copy_Look(*column, source);
-    if (column->type == factor_column)  // one of the labels may be empty
-        for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
-            cell->value.number = sheet.missing_value;
-    return column;
-}
-
-bool Cell_Transfer::Prepare(Column& target, const Column& source, double tolerance, bool ignore_case)
+bool Cell_Transfer::Prepare(Column& target, const Column& source, const Transfer_Rules& rules)
 {
     target_ = &target;
     source_ = &source;
+    rules_ = rules;
     levels_.Look_In(target);
-    const bool to_factor = target.type == factor_column;
-    if (to_factor && Is_Text_Like(source.type) && target.label_count > 0) {
-        Column* const copy = Copy_Column_Aside(source);
-        if (copy == nullptr || !Text_To_Factor(copy, ignore_case, false, 0))
-            return false;
-        source_ = copy;
-    }
+    if (Has_To_Be_Factor() && !Make_Source_A_Factor())
+        return false;
     if (source_->type == factor_column)
-        return Prepare_Levels(tolerance, ignore_case);
+        return Prepare_Levels();
     if (Is_Text_Like(source.type))
         Prepare_Texts();
     else
@@ -141,7 +77,25 @@ bool Cell_Transfer::Prepare(Column& target, const Column& source, double toleran
     return true;
 }
 
-bool Cell_Transfer::Prepare_Levels(double tolerance, bool ignore_case)
+/// Numbers taken from a Factor's values from 0 up to this stand as they are, in whatever form dates are.
+double Cell_Transfer::Value_Of_Level(double value) const
+{
+    constexpr double no_date = 2000000.0;
+    if (!Is_Present(*source_->sheet, value))
+        return target_->sheet->missing_value;
+    const bool as_it_is = source_->factor_kind == factor_with_levels && value >= 0.0 && value < no_date;
+    return as_it_is ? value : Moved_Date(value);
+}
+
+void Cell_Transfer::Prepare_Printed_Levels()
+{
+    way_ = Way::level_to_text;
+    texts_ = Printed_Levels(*source_, Number_Print::as_said, Level_Digits, target_->texts);
+    Make_Target_Long(std::ranges::any_of(
+        texts_, [](const char* text) { return Has_More_Letters(Text_Arena::View(text), Text_Cell_Width); }));
+}
+
+bool Cell_Transfer::Prepare_Levels()
 {
     Column& target = *target_;
     const Column& source = *source_;
@@ -149,47 +103,67 @@ bool Cell_Transfer::Prepare_Levels(double tolerance, bool ignore_case)
         way_ = Way::level;
         if (!Has_Data(source))
             return true;  // and no levels to speak of
-        return Merge_Factor_Levels(target, source, level_map_, tolerance, ignore_case);
+        return Merge_Factor_Levels(target, source, level_map_, rules_.tolerance, rules_.ignore_case);
     }
     if (Is_Text_Like(target.type)) {
-        way_ = Way::level_to_text;
-        texts_ = Printed_Levels(source, Number_Print::as_said, Level_Digits, target.texts);
+        Prepare_Printed_Levels();
         return true;
     }
     way_ = Way::level_to_number;
     numbers_ = Level_Table(source);
-    constexpr double no_date = 2000000.0;  // level values from 0 up to it stand as they are
     for (double& value : numbers_)
-        if (!Is_Present(*source.sheet, value))
-            value = target.sheet->missing_value;
-        else if (source.factor_kind != factor_with_levels || value < 0.0 || value >= no_date)
-            value = Moved_Date(value);
+        value = Value_Of_Level(value);
     if (!numbers_.empty())
         return true;
     Cell_Node cell{};
     for (const char* const label : Label_Table(source)) {
         Set_Cell_From_Text(target, cell, Text_Arena::View(label));
-        numbers_.push_back(cell.value.number);
+        const auto level = static_cast<double>(numbers_.size() + 1);
+        numbers_.push_back(rules_.words_by_number ? level : cell.value.number);
     }
     return true;
 }
 
+/// A Factor without lists has as many levels as the greatest number says.
+void Cell_Transfer::Make_Levels_For_Numbers()
+{
+    if (target_->type != factor_column || target_->factor_kind != plain_factor
+        || target_->level_values_count > 0)
+        return;
+    const bool texts = Is_Text_Like(source_->type);
+    double greatest = target_->nlevels;
+    for (const Cell_Node* cell = source_->first_cell; cell != nullptr; cell = cell->next) {
+        const double number = texts ? Number_Or_Date(*target_, cell->Text()) : Moved_Date(cell->value.number);
+        if (Is_Level_Number(number))
+            greatest = std::max(greatest, number);
+    }
+    if (greatest > target_->nlevels)
+        Set_Level_Count(*target_, static_cast<std::int32_t>(greatest));
+}
+
 void Cell_Transfer::Prepare_Numbers()
 {
-    if (target_->type == factor_column)
+    if (target_->type == factor_column) {
         way_ = Way::number_to_level;
-    else if (Is_Text_Like(target_->type))
+        Make_Levels_For_Numbers();
+    } else if (Is_Text_Like(target_->type)) {
         way_ = Way::print;
-    else
+    } else {
         way_ = Moved_Date(1.0) == 1.0 ? Way::number : Way::date;
+    }
+}
+
+void Cell_Transfer::Make_Target_Long(bool longer) const
+{
+    if (longer && target_->type == text_column && target_->sheet->type == vector_sheet)
+        Set_Column_Type(*target_, long_text_column);
 }
 
 void Cell_Transfer::Prepare_Texts()
 {
     way_ = Is_Text_Like(target_->type) ? Way::text : Way::read;
-    const bool wider = source_->type == long_text_column && target_->type == text_column;
-    if (wider && target_->sheet->type == vector_sheet)
-        Set_Column_Type(*target_, long_text_column);
+    Make_Levels_For_Numbers();
+    Make_Target_Long(source_->type == long_text_column);
 }
 
 /// A date in the form of the target's.
@@ -212,34 +186,44 @@ double Cell_Transfer::Level_Of_Number(double value)
     std::uint32_t number;
     met_.Number_Keys_Of(&value, 1, &number);
     if (number > met_levels_.size())
-        met_levels_.push_back(Find_Level(Moved_Date(value)));
+        met_levels_.push_back(Find_Level(value));
     return met_levels_[number - 1];
+}
+
+double Cell_Transfer::Nearest_Of(double value)
+{
+    const std::int32_t level = levels_.Nearest(value);
+    lost_ = lost_ || !Doubles_Equal(levels_.Value_Of(level), value);
+    return level > 0 ? level : target_->sheet->missing_value;
+}
+
+/// A label that just is the number, however it is spelled, comes before one that only begins so.
+double Cell_Transfer::Find_Label(double value)
+{
+    constexpr int all_digits = 20;
+    char room[Number_Text_Room];
+    const std::string_view spelled(room, rules_.all_digits
+                                             ? Print_General(room, Moved_Date(value), all_digits)
+                                             : Format_Cell_Fully(room, *source_, value));
+    if (const std::int32_t level = levels_.Of_Exact_Label(spelled); level > 0)
+        return level;
+    if (const std::int32_t level = Level_Labelled_As(levels_, *source_, value); level > 0)
+        return level;
+    lost_ = true;  // a label that only begins so is another one
+    const std::int32_t level = levels_.Of_Label(spelled);
+    return level > 0 ? level : target_->sheet->missing_value;
 }
 
 double Cell_Transfer::Find_Level(double value)
 {
-    constexpr int all_digits = 20;
-    Column& target = *target_;
-    const double missing = target.sheet->missing_value;
-    if (!Is_Present(*target.sheet, value))
-        return missing;
-    if (target.level_values_count > 0) {
-        const std::int32_t level = levels_.Nearest(value);
-        lost_ = lost_ || !Doubles_Equal(levels_.Value_Of(level), value);
-        return level;
-    }
-    if (target.factor_kind == plain_factor) {
-        if (!Is_Level_Number(value))
-            return missing;
-        target.nlevels = std::max(target.nlevels, static_cast<std::int32_t>(value));
-        return value;
-    }
-    char text[Number_Text_Room];
-    const std::string_view label(text,
-                                 static_cast<std::size_t>(Print_General(text, value, all_digits) - text));
-    const std::int32_t level = levels_.Of_Label(label);
-    lost_ = lost_ || levels_.Label_Of(level) != label;  // a label that only begins so is another one
-    return level > 0 ? level : missing;
+    const double moved = Moved_Date(value);
+    if (!Is_Present(*target_->sheet, moved))
+        return target_->sheet->missing_value;
+    if (target_->level_values_count > 0)
+        return Nearest_Of(moved);
+    if (target_->factor_kind != plain_factor)
+        return Find_Label(value);
+    return Is_Level_Number(moved) && moved <= target_->nlevels ? moved : target_->sheet->missing_value;
 }
 
 bool Cell_Transfer::Is_Missing(const Cell_Value& from) const
@@ -261,8 +245,7 @@ void Cell_Transfer::Read_Text(Cell_Node& to, std::string_view text)
     const bool to_factor = target_->type == factor_column;
     if (to_factor && target_->factor_kind == factor_with_levels) {
         const double value = Number_Or_Date(*target_, text);
-        const std::int32_t level = Is_Present(*target_->sheet, value) ? levels_.Nearest(value) : 0;
-        to.value.number = level > 0 ? level : target_->sheet->missing_value;
+        to.value.number = Is_Present(*target_->sheet, value) ? Nearest_Of(value) : value;
         return;
     }
     Set_Cell_From_Text(*target_, to, text);

@@ -10,13 +10,12 @@
 
 namespace ingester {
 
-/// A copy of a Column in a Sheet of its own, as Text or Variate when it is a units column: for
-/// conversions that must leave the Column itself alone. Null for want of room.
-[[nodiscard]] Column* Copy_Column_Aside(const Column& column);
-
-/// Adds a Column like `source`, with its look and its levels but without its data, behind those of `sheet`.
-/// Null when the Sheet can't have it, mostly after a message.
-[[nodiscard]] Column* Add_Column_Like(Sheet& sheet, const Column& source);
+struct Transfer_Rules {
+    double tolerance = 0.0;        ///< by which level values may differ, as a ratio
+    bool ignore_case = false;      ///< of labels
+    bool all_digits = false;       ///< numbers name labels by "%.20g" before what they print as
+    bool words_by_number = false;  ///< among numbers, labels stand for the numbers of their levels
+};
 
 /// Brings cells of one Column into another, whatever their types: levels are told by their labels or
 /// values, dates change their form, numbers print into texts.
@@ -24,7 +23,7 @@ class Cell_Transfer {
 public:
     /// Readies the way from `source` to `target`, which gets the levels, or the width, that it lacks.
     /// False for want of room.
-    [[nodiscard]] bool Prepare(Column& target, const Column& source, double tolerance, bool ignore_case);
+    [[nodiscard]] bool Prepare(Column& target, const Column& source, const Transfer_Rules& rules);
 
     /// The Column whose cells are to be put: `source`, or what it had to become.
     [[nodiscard]] const Column& Source() const { return *source_; }
@@ -52,17 +51,27 @@ private:
         read
     };
 
-    [[nodiscard]] bool Prepare_Levels(double tolerance, bool ignore_case);
+    [[nodiscard]] bool Has_To_Be_Factor() const;
+    [[nodiscard]] bool Make_Source_A_Factor();
+    void Move_Dates(Column& copy);
+    [[nodiscard]] bool Prepare_Levels();
+    void Prepare_Printed_Levels();
+    [[nodiscard]] double Value_Of_Level(double value) const;
     void Prepare_Numbers();
     void Prepare_Texts();
+    void Make_Target_Long(bool longer) const;
+    void Make_Levels_For_Numbers();
     [[nodiscard]] double Moved_Date(double value) const;
     [[nodiscard]] double Level_Of_Number(double value);
     [[nodiscard]] double Find_Level(double value);
+    [[nodiscard]] double Find_Label(double value);
+    [[nodiscard]] double Nearest_Of(double value);
     void Read_Text(Cell_Node& to, std::string_view text);
     void Put_Missing(Cell_Node& to) const;
 
     Column* target_ = nullptr;
     const Column* source_ = nullptr;
+    Transfer_Rules rules_;
     Way way_ = Way::number;
     bool lost_ = false;
     std::vector<std::int32_t> level_map_;

@@ -1,6 +1,9 @@
 #include "model/join/concatenate.h"
 
+#include "model/column_rules.h"
+#include "model/join/refusals.h"
 #include "model/names.h"
+#include "request/people_rules.h"
 #include "request/request.h"
 #include "support/letters.h"
 #include "support/text.h"
@@ -15,17 +18,20 @@ namespace {
 
 bool Fit_Together(const Sheet* target, const Sheet* source)
 {
-    if (target == nullptr || source == nullptr || target == source || target->read_only != 0
-        || target->row_count != source->row_count)
+    if (Is_Refused({{target == nullptr || source == nullptr || target == source, Nothing_To_Join}}))
         return false;
-    const bool same_type =
+    const bool keeps_type =
         source->type == vector_sheet || source->type == scalar_sheet || source->type == matrix_sheet;
-    return !same_type || source->type == target->type;
+    return !Is_Refused(
+        {{target->read_only != 0, Output_Is_Read_Only},
+         {keeps_type && source->type != target->type, "The table in the output is of another kind.\n"},
+         {target->row_count != source->row_count,
+          "The table in the output has another number of rows than the new data.\n"}});
 }
 
 bool Replaces(const Column& column)
 {
-    return column.type >= scalar_column && column.type <= matrix_column;
+    return (column.type >= scalar_column && column.type <= matrix_column) || column.type == long_text_column;
 }
 
 void Fit_Missing_Values(Sheet& source, double missing)
@@ -52,6 +58,19 @@ void Replace_Equal_Names(Sheet& target, Sheet& source)
     }
 }
 
+/// Labels of the source's units are data like others where they stand beside those of the target.
+void Turn_Units_Into_Data(Sheet& source)
+{
+    if (source.type != vector_sheet || !For_People(People_Rule::kept_levels))
+        return;
+    for (Column* column = source.first_column; column != nullptr;) {
+        Column* const next = column->next;
+        if (Is_Units(column->type))
+            Set_Column_Type(*column, column->type == units_text_column ? text_column : variate_column);
+        column = next;
+    }
+}
+
 /// The first column that goes behind those of the target. Factors of a Table classify it, and belong to
 /// nothing else.
 Column* First_To_Move(const Sheet& source)
@@ -59,7 +78,7 @@ Column* First_To_Move(const Sheet& source)
     if (source.type != vector_sheet && source.type != scalar_sheet)
         return nullptr;
     Column* column = source.first_column;
-    while (column != nullptr && !Replaces(*column) && column->type != long_text_column)
+    while (column != nullptr && !Replaces(*column))
         column = column->next;
     return column;
 }
@@ -86,12 +105,16 @@ std::int32_t Columns_To_Move(const Sheet& target, const Sheet& source, bool repl
 
 bool Concatenate_Sheets(Sheet* target, Sheet* source, bool replace_equal_names)
 {
-    if (!Fit_Together(target, source)
-        || Columns_To_Move(*target, *source, replace_equal_names)
-               > request.Max_Columns - target->column_count)
+    if (!Fit_Together(target, source))
         return false;
-    if (First_To_Move(*source) == nullptr
-        && (!replace_equal_names || (source->type != vector_sheet && source->type != matrix_sheet)))
+    Turn_Units_Into_Data(*source);
+    const bool replaces =
+        replace_equal_names && (source->type == vector_sheet || source->type == matrix_sheet);
+    if (Is_Refused({{Columns_To_Move(*target, *source, replace_equal_names)
+                         > request.Max_Columns - target->column_count,
+                     "There would be too many columns.\n"},
+                    {First_To_Move(*source) == nullptr && !replaces,
+                     "The new data have no column that could stand beside those of the output.\n"}}))
         return false;
     Fit_Missing_Values(*source, target->missing_value);
     if (replace_equal_names)

@@ -2,8 +2,10 @@
 
 #include "model/factor_lists.h"
 #include "model/factors.h"
+#include "model/join/level_meanings.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
+#include "request/people_rules.h"
 #include "support/distinct_keys.h"
 #include "support/letters.h"
 #include "support/number_text.h"
@@ -114,9 +116,7 @@ void Match_Values(const Column& target, const Column& source, double tolerance,
 /// The rest of the levels has no name but its number.
 bool Match_Numbers(const Column& target, const Column& source, std::vector<std::int32_t>& added)
 {
-    Fail("Factors %s and %s do not match with respect to the presence of labels and levels.\n"
-         "The matched rows may not be as expected.\n",
-         target.name.c_str(), source.name.c_str());
+    Warn_Of_Unlike_Lists(target, source);
     const std::int32_t more = source.nlevels - std::max(target.nlevels, 0);
     if (more > Most_Added_Levels)
         return false;
@@ -169,20 +169,16 @@ bool Is_Bare(const Column& factor)
     return factor.label_count < 1 && factor.level_values_count < 1;
 }
 
-}  // namespace
-
-bool Merge_Factor_Levels(Column& target, const Column& source, std::vector<std::int32_t>& map,
-                         double tolerance, bool ignore_case)
+bool Are_Both_Labelled(const Column& target, const Column& source)
 {
-    map.clear();
-    if (Is_Bare(target) && Is_Bare(source)) {
-        target.nlevels = std::max(target.nlevels, source.nlevels);
-        return true;
-    }
-    if (std::max(target.nlevels, source.nlevels) > Most_Added_Levels)
-        return false;
-    std::vector<std::int32_t> added;
-    if (target.label_count > 0 && source.label_count > 0) {
+    return target.label_count > 0 && source.label_count > 0;
+}
+
+/// As hosts have it: by the lists that both have, else by number. False for want of room.
+bool Match_Lists(Column& target, const Column& source, std::vector<std::int32_t>& map,
+                 std::vector<std::int32_t>& added, double tolerance, bool ignore_case)
+{
+    if (Are_Both_Labelled(target, source)) {
         if (ignore_case)
             Match_Labels<Case_Free_Keys>(target, source, map, added);
         else
@@ -192,11 +188,49 @@ bool Merge_Factor_Levels(Column& target, const Column& source, std::vector<std::
     } else if (!Match_Numbers(target, source, added)) {
         return false;
     }
-    if (added.empty())
+    return added.empty() || (Add_Labels(target, source, added) && Add_Values(target, source, added));
+}
+
+}  // namespace
+
+void Warn_Of_Unlike_Lists(const Column& target, const Column& source)
+{
+    Warn("Factors %s and %s do not match with respect to the presence of labels and levels.\n"
+         "The matched rows may not be as expected.\n",
+         target.name.c_str(), source.name.c_str());
+}
+
+void Set_Level_Count(Column& factor, std::int32_t nlevels)
+{
+    Sheet& sheet = *factor.sheet;
+    const double old_margin = factor.nlevels + 1.0;
+    factor.nlevels = nlevels;
+    if (sheet.type != table_sheet || sheet.has_margins == 0)
+        return;
+    const bool last_one = factor.next == nullptr || factor.next->type != factor_column;
+    if (last_one && sheet.margin_level == static_cast<std::int32_t>(old_margin))
+        sheet.margin_level = nlevels + 1;
+    for (Cell_Node* cell = factor.first_cell; cell != nullptr; cell = cell->next)
+        if (cell->value.number == old_margin)
+            cell->value.number = nlevels + 1.0;
+}
+
+bool Merge_Factor_Levels(Column& target, const Column& source, std::vector<std::int32_t>& map,
+                         double tolerance, bool ignore_case)
+{
+    map.clear();
+    if (Is_Bare(target) && Is_Bare(source)) {
+        Set_Level_Count(target, std::max(target.nlevels, source.nlevels));
         return true;
-    if (!Add_Labels(target, source, added) || !Add_Values(target, source, added))
+    }
+    if (std::max(target.nlevels, source.nlevels) > Most_Added_Levels)
         return false;
-    target.nlevels += static_cast<std::int32_t>(added.size());
+    std::vector<std::int32_t> added;
+    const bool by_meaning = For_People(People_Rule::kept_levels) && !Are_Both_Labelled(target, source);
+    if (!(by_meaning ? Match_Meanings(target, source, map, added, ignore_case)
+                     : Match_Lists(target, source, map, added, tolerance, ignore_case)))
+        return false;
+    Set_Level_Count(target, target.nlevels + static_cast<std::int32_t>(added.size()));
     return true;
 }
 

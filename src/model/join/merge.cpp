@@ -1,13 +1,13 @@
 #include "model/join/merge.h"
 
+#include "model/join/column_copies.h"
 #include "model/join/column_index.h"
 #include "model/join/merge_keys.h"
 #include "model/join/merge_rows.h"
+#include "model/join/refusals.h"
 #include "model/names.h"
 #include "model/row_fields.h"
 #include "request/losses.h"
-#include "request/messages.h"
-#include "support/text.h"
 
 #include <algorithm>
 #include <deque>
@@ -28,12 +28,15 @@ bool Can_Be_Merged(const Merge_Request& wanted)
 {
     const Sheet* const target = wanted.target;
     const Sheet* const source = wanted.source;
-    if (target == nullptr || source == nullptr || target == source || target->read_only != 0
-        || target->type == symmetric_matrix_sheet || source->type == symmetric_matrix_sheet
-        || target->row_count < 1 || source->row_count < 1)
+    if (Is_Refused({{target == nullptr || source == nullptr || target == source, Nothing_To_Join}})
+        || Is_Refused(
+            {{target->read_only != 0, Output_Is_Read_Only},
+             {target->type == symmetric_matrix_sheet || source->type == symmetric_matrix_sheet,
+              "The rows of a symmetric matrix can't be merged with others.\n"},
+             {source->row_count < 1, No_Rows_To_Join},
+             {target->row_count < 1, "The table in the output has no rows.\n"},
+             {target->type == scalar_sheet, "You cannot add a column of that type to this spreadsheet.\n"}}))
         return false;
-    if (target->type == scalar_sheet)
-        return Fail("You cannot add a column of that type to this spreadsheet.\n");
     if (wanted.key_count < 1 || wanted.key_count > static_cast<std::int32_t>(Most_Merge_Keys))
         return false;
     for (std::size_t key = 0; key < static_cast<std::size_t>(wanted.key_count); ++key)
@@ -82,7 +85,8 @@ public:
             if (partner == nullptr)
                 return Fail("You cannot add a column of that type to this spreadsheet.\n");
             Cell_Transfer& transfer = transfers_.emplace_back();
-            if (!transfer.Prepare(*partner, *source, wanted.tolerance, wanted.ignore_case))
+            if (!transfer.Prepare(*partner, *source,
+                                  {.tolerance = wanted.tolerance, .ignore_case = wanted.ignore_case}))
                 return Fail("Column cannot merge factors %s and %s.\n", partner->name.c_str(),
                             source->name.c_str());
             columns_.push_back({&transfer, false, is_new});
@@ -135,9 +139,8 @@ void Tell_Lost_Values(const Cell_Transfer& transfer)
 {
     const Column& target = transfer.Target();
     Note_Loss(Loss_Kind::label_dropped, target.name, 0, "values without an equal in the output");
-    Report_Message(
-        Format_Text("Warning: some values of %s have no equal in %s, and were not kept as they are.\n",
-                    transfer.Source().name.c_str(), target.name.c_str()));
+    Warn("Warning: some values of %s have no equal in %s, and were not kept as they are.\n",
+         transfer.Source().name.c_str(), target.name.c_str());
 }
 
 /// Writes the rows of the source into one column of the result.

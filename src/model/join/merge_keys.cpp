@@ -1,10 +1,14 @@
 #include "model/join/merge_keys.h"
 
 #include "model/calendar.h"
+#include "model/cell_text.h"
 #include "model/factor_lists.h"
 #include "model/factors.h"
+#include "model/join/column_copies.h"
+#include "model/join/label_numbers.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
+#include "request/people_rules.h"
 #include "support/letters.h"
 #include "support/text.h"
 
@@ -80,6 +84,11 @@ void Note_Unordered(Mixtures& mixtures, bool& flag, const Column& target, const 
     mixtures.mixed_source = &source;
 }
 
+bool Fail_Of_Unlike_Types(const Column& target, const Column& source)
+{
+    return Fail("Columns %s and %s data types do not match.\n", target.name.c_str(), source.name.c_str());
+}
+
 bool Check_Text_With_Factor(const Column& target, const Column& source, Mixtures& mixtures)
 {
     const bool factor_first = target.type == factor_column;
@@ -104,7 +113,7 @@ bool Check_Pair(const Column& target, const Column& source, Mixtures& mixtures)
     if ((factors[0] && texts[1]) || (texts[0] && factors[1]))
         return Check_Text_With_Factor(target, source, mixtures);
     if (texts[0] != texts[1])
-        return Fail("Columns %s and %s data types do not match.\n", target.name.c_str(), source.name.c_str());
+        return Fail_Of_Unlike_Types(target, source);
     if (factors[1] && !Levels_Ascend(source))
         Note_Unordered(mixtures, mixtures.levels_unordered, target, source);
     return true;
@@ -124,45 +133,102 @@ bool Check_Key_Pairs(const Merge_Request& wanted)
                    mixtures.mixed_target->name.c_str(), mixtures.mixed_source->name.c_str());
 }
 
-/// Numbers that are no level's are the keys of no row.
-void Part_From_All_Levels(const Column& source, Sort_Key& key)
+/// What the numbers of a key column are to a Factor without level values.
+struct Key_Numbers {
+    std::int32_t present = 0;
+    std::int32_t labels = 0;  ///< of them that labels answer to
+    std::int32_t levels = 0;  ///< that can be level numbers
+};
+
+/// Numbers that labels answer to, as texts that these labels are.
+bool Turn_Into_Labels(Column& copy, const std::vector<std::string_view>& labels)
 {
-    constexpr double no_key = -2.0;
-    std::size_t row = 0;
-    for (const Cell_Node* cell = source.first_cell; cell != nullptr && row < key.numbers.size();
-         cell = cell->next, ++row)
-        if (Cell_Is_Present(source, *cell) && !Is_Level_Number(cell->value.number))
-            key.numbers[row] = no_key;
+    copy.type = long_text_column;
+    auto label = labels.begin();
+    for (Cell_Node* cell = copy.first_cell; cell != nullptr; cell = cell->next)
+        cell->value.text = copy.texts.Store(*label++);
+    return Turn_Into_Factor(copy, false);
 }
 
-/// Numbers that are to match the levels of a Factor. Where it has no level values they are level numbers;
-/// where it has, they become values even if 1, 2, ... need no list.
-const Column* Numbers_As_Levels(const Column& target, const Column& source)
+/// Numbers that are to match the levels of a Factor without level values: those that its labels answer to, or
+/// else its level numbers. No key may get lost, so that one which is neither ends the merge.
+const Column* Numbers_As_Level_Numbers(const Column& target, const Column& source)
 {
-    const bool valued = target.level_values_count > 0;
     Column* const copy = Copy_Column_Aside(source);
     if (copy == nullptr)
         return nullptr;
     copy->type = variate_column;
-    bool present = false;
+    Level_Finder finder;
+    finder.Look_In(target);
+    Key_Numbers numbers;
+    std::vector<std::string_view> labels;
     for (Cell_Node* cell = copy->first_cell; cell != nullptr; cell = cell->next) {
-        if (!valued && !Is_Level_Number(cell->value.number))
-            cell->value.number = copy->sheet->missing_value;
-        present = present || Cell_Is_Present(*copy, *cell);
+        const bool present = Cell_Is_Present(*copy, *cell);
+        const std::int32_t level = present ? Level_Labelled_As(finder, source, cell->value.number) : 0;
+        labels.push_back(finder.Label_Of(level));
+        numbers.present += present ? 1 : 0;
+        numbers.labels += level > 0 ? 1 : 0;
+        numbers.levels += present && Is_Level_Number(cell->value.number) ? 1 : 0;
     }
-    if (!present) {
-        copy->type = factor_column;
-        copy->nlevels = 0;
-        return copy;
+    if (numbers.labels > 0 && numbers.labels == numbers.present)
+        return Turn_Into_Labels(*copy, labels) ? copy : nullptr;
+    if (numbers.labels > 0 || numbers.levels < numbers.present) {
+        Fail_Of_Unlike_Types(target, source);
+        return nullptr;
     }
-    if (!Variate_To_Factor(copy, valued, 0))
-        return nullptr;
-    if (!valued || copy->level_values_count > 0)
-        return copy;
-    if (!Put_Level_Values(*copy, copy->nlevels, [level = 0.0]() mutable { return ++level; }))
-        return nullptr;
-    copy->factor_kind = Factor_Kind_Of(*copy);
-    return copy;
+    if (numbers.present > 0)
+        return Variate_To_Factor(copy, false, 0) ? copy : nullptr;
+    return Turn_Into_Factor(*copy, false) ? copy : nullptr;
+}
+
+/// Where the Factor has level values, numbers become values even if 1, 2, ... need no list.
+const Column* Numbers_As_Levels(const Column& target, const Column& source)
+{
+    if (target.level_values_count < 1)
+        return Numbers_As_Level_Numbers(target, source);
+    Column* const copy = Copy_Column_Aside(source);
+    return copy != nullptr && Turn_Into_Factor(*copy, false) ? copy : nullptr;
+}
+
+/// How the labels of a Factor's levels stand to the numbers of a key column.
+struct Label_Words {
+    bool numbers = false;  ///< some are numbers
+    bool words = false;    ///< some aren't
+};
+
+/// Of the levels that cells hold.
+Label_Words Words_Among(const Column& target, const Column& source)
+{
+    Label_Words found;
+    const std::vector<const char*> labels = Label_Table(source);
+    for (const Cell_Node* cell = source.first_cell; cell != nullptr; cell = cell->next)
+        if (const char* const label = Of_Level<const char*>(labels, cell->value.number, nullptr)) {
+            const bool number = Is_Present(*target.sheet, Number_Or_Date(target, Text_Arena::View(label)));
+            found.numbers = found.numbers || number;
+            found.words = found.words || !number;
+        }
+    return found;
+}
+
+bool Is_Told_By_Labels(const Column& factor)
+{
+    return factor.type == factor_column && factor.level_values_count < 1 && factor.label_count > 0;
+}
+
+/// Labels that are to match numbers are numbers themselves, or all stand for the numbers of their levels.
+/// False after a message.
+bool Match_Words_With_Numbers(const Column& target, const Column& source, bool& by_number)
+{
+    if (Is_Text_Like(target.type) || target.type == factor_column || !Is_Told_By_Labels(source))
+        return true;
+    const Label_Words found = Words_Among(target, source);
+    by_number = found.words;
+    if (found.numbers && found.words)
+        return Fail_Of_Unlike_Types(target, source);
+    if (by_number && For_People(People_Rule::kept_levels))
+        Warn("Warning: the labels of %s are no numbers; the numbers of its levels were matched with %s.\n",
+             source.name.c_str(), target.name.c_str());
+    return true;
 }
 
 void Count_From_Days(const Column& column, const Column& other, Sort_Key& key)
@@ -184,17 +250,18 @@ void Unite_Missing(const Column& column, double missing, Sort_Key& key)
             number = missing;
 }
 
-/// The levels of the target that the cells of the source stand for.
-Sort_Key Transferred_Levels(Cell_Transfer& transfer, std::size_t rows)
+/// What the cells of the source become in the target; there is no level below 0.
+Sort_Key Transferred_Numbers(Cell_Transfer& transfer, std::size_t rows)
 {
+    const bool levels = transfer.Target().type == factor_column;
     Sort_Key key;
-    key.numbers.assign(rows, 0.0);
+    key.numbers.assign(rows, levels ? 0.0 : transfer.Target().sheet->missing_value);
     Cell_Node cell{};
     std::size_t row = 0;
     for (const Cell_Node* from = transfer.Source().first_cell; from != nullptr && row < rows;
          from = from->next) {
         transfer.Put(cell, from->value);
-        key.numbers[row++] = std::max(cell.value.number, 0.0);
+        key.numbers[row++] = levels ? std::max(cell.value.number, 0.0) : cell.value.number;
     }
     return key;
 }
@@ -212,9 +279,9 @@ Sort_Key Target_Key(const Column& target, const Column& source, std::size_t rows
 
 Sort_Key Source_Key(const Column& target, const Column& source, Cell_Transfer& transfer, std::size_t rows)
 {
-    if (target.type == factor_column)
-        return Transferred_Levels(transfer, rows);
     const bool text = Is_Text_Like(target.type);
+    if (target.type == factor_column || (!text && Is_Told_By_Labels(source)))
+        return Transferred_Numbers(transfer, rows);
     Sort_Key key = Make_Sort_Key(source, rows, text ? Factor_Mode::label : Factor_Mode::level_value);
     if (text) {
         key.width = std::max(key.width, target.type == long_text_column ? Long_Text_Width : Text_Cell_Width);
@@ -242,18 +309,17 @@ bool Make_Merge_Keys(const Merge_Request& wanted, Merge_Keys& keys)
         Column& target = *wanted.target_keys[key];
         const Column* source = wanted.source_keys[key];
         const bool numbers = !Is_Text_Like(source->type) && source->type != factor_column;
-        if (target.type == factor_column && numbers)
+        Transfer_Rules rules{.tolerance = wanted.tolerance, .ignore_case = wanted.ignore_case};
+        if (target.type == factor_column && numbers && !For_People(People_Rule::kept_levels))
             source = Numbers_As_Levels(target, *source);
-        if (source == nullptr)
+        if (source == nullptr || !Match_Words_With_Numbers(target, *source, rules.words_by_number))
             return false;
         // Before the levels of the target grow, which changes nothing in its cells.
         keys.target.push_back(Target_Key(target, *source, target_rows));
-        if (!keys.transfers[key].Prepare(target, *source, wanted.tolerance, wanted.ignore_case))
+        if (!keys.transfers[key].Prepare(target, *source, rules))
             return Fail("Column cannot merge factors %s and %s.\n", target.name.c_str(),
                         source->name.c_str());
         keys.source.push_back(Source_Key(target, *source, keys.transfers[key], source_rows));
-        if (numbers && target.type == factor_column && target.level_values_count < 1)
-            Part_From_All_Levels(*wanted.source_keys[key], keys.source.back());
     }
     return true;
 }

@@ -299,6 +299,16 @@ TEST_F(Script, Every_Structure_Comes_Back)
     };
     for (const auto& [sheet, expected] : cases)
         EXPECT_EQ(Heard(sheet), expected);
+    Sheet* const dated = labelled(Table_Of(2, {"row"}, {45000, 45001}), 1, "col");
+    dated->column_factor_format = date_format_mark;
+    dated->column_factor_date = 2;
+    dated->column_factor_decimals = -1;
+    EXPECT_NE(Heard(dated).find("levels=!(154512,154513)] col; extra='across'; drep=2|"), std::string::npos);
+    Sheet* const cut = Matrix_Of(symmetric_matrix_sheet, 0, {"1", "2", "3"});
+    while (cut->column_count > 2)
+        Unlink_Column(cut->last_column);
+    EXPECT_NE(Heard(cut).find("READ m|109517 109518 1 109519 * * :|"), std::string::npos) << Heard(cut);
+    EXPECT_NE(Messages().find("The matrix m lacks 1 of its columns"), std::string::npos);
     request.Pointer_Name = "p";
     EXPECT_TRUE(Heard(Table_Of(1, {"row"}, {0})).ends_with(":|-p|POINTER p; !p(row,c1)||"));
 }

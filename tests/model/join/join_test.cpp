@@ -1,4 +1,5 @@
 // Appends and merges of small random Sheets, held against nested loops over their rows as texts.
+#include "model/factors.h"
 #include "model/join/append.h"
 #include "model/join/concatenate.h"
 #include "model/join/factor_levels.h"
@@ -9,6 +10,7 @@
 #include "model/told_sheets.h"
 
 #include <algorithm>
+#include <chrono>
 #include <functional>
 #include <map>
 #include <random>
@@ -19,19 +21,59 @@ namespace {
 using Join = Request_Test;
 using Rows = std::vector<Texts>;  // by row, then column
 
-/// Ways to hold "1", "2", "3" and "" (for nothing) in a column.
-enum Form { numbers, texts, labels, values, plain };
-constexpr std::int32_t Type_Of_Form[] = {variate_column, text_column, factor_column, factor_column,
-                                         factor_column};
+/// Ways to hold three words, and "" for nothing, in a column.
+enum Form { numbers, texts, labels, values, plain, both };
+constexpr std::int32_t Type_Of_Form[] = {variate_column, text_column,   factor_column,
+                                         factor_column,  factor_column, factor_column};
 
-void Add_Form(Sheet* sheet, Form form, const std::string& name, const Texts& cells)
+/// The words of a column, in their order, and the forms that can hold them.
+struct Vocabulary {
+    Texts words;
+    std::vector<Form> forms;
+    bool dates = false;
+};
+
+std::string Long_Word(char first, std::size_t size)
+{
+    return std::string(size - 1, 'w') + first;  // all alike at their start
+}
+
+const Vocabulary Counts = {{"1", "2", "3"}, {numbers, texts, labels, values, plain}};
+const Vocabulary Vocabularies[] = {
+    Counts,
+    {{"0.1", "0.25", "0.3"}, {numbers, texts, labels, values}},
+    {{"1234567", "1234568", "1234569.5"}, {numbers, texts, labels, values}},
+    {{"01/02/2020", "02/02/2020", "03/02/2020"}, {numbers, labels, values}, true},
+    {{Long_Word('a', 89), Long_Word('b', 91), Long_Word('c', 240)}, {texts, labels, both}},
+};
+
+void Look_Like_Dates(Column& column, std::int16_t date_form)
+{
+    column.format = date_format_mark;
+    column.date_format = 2;
+    column.date_form = date_form;
+}
+
+/// `levels` of the words are those of a Factor.
+void Add_Form(Sheet* sheet, Form form, const std::string& name, const Texts& cells,
+              const Vocabulary& vocabulary = Counts, std::size_t levels = 3, std::int16_t date_form = 1)
 {
     Column* const column =
         New_Data_Column(sheet, Type_Of_Form[form], name, static_cast<std::int32_t>(cells.size()));
+    if (vocabulary.dates && (form == numbers || form == values))
+        Look_Like_Dates(*column, date_form);
+    if (form == texts && vocabulary.words[2].size() > Text_Cell_Width)
+        Set_Column_Type(*column, long_text_column);
     if (form >= labels) {
-        Put_Levels(*column, form == values ? std::vector<double>{1, 2, 3} : std::vector<double>{},
-                   form == labels ? Texts{"1", "2", "3"} : Texts{});
-        column->nlevels = 3;
+        const Texts words(vocabulary.words.begin(),
+                          vocabulary.words.begin() + static_cast<std::ptrdiff_t>(levels));
+        std::vector<double> level_values;
+        for (const std::string& word : words)
+            level_values.push_back(form == both ? 10.5 * (1.0 + static_cast<double>(level_values.size()))
+                                                : Number_Or_Date(*column, word));
+        Put_Levels(*column, form == values || form == both ? level_values : std::vector<double>{},
+                   form == labels || form == both ? words : Texts{});
+        column->nlevels = static_cast<std::int32_t>(levels);
         column->factor_kind = form == plain ? plain_factor : column->factor_kind;
     }
     const std::string* text = cells.data();
@@ -58,22 +100,31 @@ Merge_Request By_First_Column(Sheet* target, Sheet* source)
             .source_keys = {Column_At(source, 1)}};
 }
 
-Texts Random_Cells(std::minstd_rand& random, std::size_t rows, unsigned choices)
+/// Of the first `levels` words, and of nothing.
+Texts Random_Cells(std::minstd_rand& random, std::size_t rows, std::size_t levels,
+                   const Vocabulary& vocabulary = Counts)
 {
     Texts cells;
     while (cells.size() < rows) {
-        const auto value = random() % choices;
-        cells.push_back(value == 0 ? "" : std::to_string(value));
+        const std::size_t value = random() % (levels + 1);
+        cells.push_back(value == 0 ? "" : vocabulary.words[value - 1]);
     }
     return cells;
 }
 
+/// For people a Factor may lack levels that others have, and words in several forms meet. Words of dates in
+/// their two forms meet as numbers only: those of levels stand as they are.
 TEST_F(Join, Appended_Data_Keep_Their_Meaning_In_Every_Form)
 {
     std::minstd_rand random;
-    for (int round = 0; round < 3000; ++round) {
+    for (int round = 0; round < 6000; ++round) {
         Start_Request("t");
+        const bool people = random() % 2 == 0;
+        request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
         const bool by_name = random() % 2 == 0;
+        const Vocabulary& vocabulary = Vocabularies[random() % std::size(Vocabularies)];
+        const std::vector<Form>& forms = vocabulary.forms;
+        const bool dates_differ = vocabulary.dates && random() % 2 == 0;
         std::map<std::string, Texts> expected;  // by the column's final name
         Sheet* sheets[2];
         const std::size_t rows[] = {1 + random() % 4, 1 + random() % 4};
@@ -83,8 +134,11 @@ TEST_F(Join, Appended_Data_Keep_Their_Meaning_In_Every_Form)
             for (std::size_t i = 0; i < counts[side]; ++i) {
                 const bool paired = side == 0 || i < counts[0];
                 const std::string name = (paired || by_name ? "c" : "d") + std::to_string(i);
-                const Texts cells = Random_Cells(random, rows[side], 4);
-                Add_Form(sheets[side], static_cast<Form>(random() % 5), name, cells);
+                const std::size_t levels = people ? 1 + random() % 3 : 3;
+                const Texts cells = Random_Cells(random, rows[side], levels, vocabulary);
+                const Form form = dates_differ ? numbers : forms[random() % forms.size()];
+                Add_Form(sheets[side], form, name, cells, vocabulary, levels,
+                         static_cast<std::int16_t>(!dates_differ || random() % 2 == 0));
                 Texts& all = expected[name];
                 all.resize(side == 0 ? 0 : rows[0]);
                 all.insert(all.end(), cells.begin(), cells.end());
@@ -106,15 +160,20 @@ TEST_F(Join, Appended_Data_Keep_Their_Meaning_In_Every_Form)
         std::map<std::string, Texts> found;
         for (const Column* column = sheets[0]->first_column->next; column != nullptr; column = column->next)
             found[std::string(column->name)] = Plain_Cells(*column);
-        ASSERT_EQ(found, expected) << "round " << round;
+        ASSERT_EQ(found, expected) << "round " << round << Messages();
     }
 }
 
 /// Every pairing of key forms that sorts the same way on both sides.
-constexpr std::pair<Form, Form> Key_Forms[] = {{numbers, numbers}, {texts, texts},    {labels, labels},
-                                               {values, values},   {plain, plain},    {labels, texts},
-                                               {texts, labels},    {values, numbers}, {numbers, values},
-                                               {plain, numbers},   {numbers, plain}};
+constexpr std::pair<Form, Form> Key_Forms[] = {
+    {numbers, numbers}, {texts, texts},    {labels, labels},  {values, values},  {plain, plain},
+    {labels, texts},    {texts, labels},   {values, numbers}, {numbers, values}, {plain, numbers},
+    {numbers, plain},   {labels, numbers}, {numbers, labels}};
+
+/// For people levels of all forms meet, and numbers with any of them.
+constexpr std::pair<Form, Form> People_Key_Forms[] = {{plain, values},   {values, plain},  {labels, plain},
+                                                      {plain, labels},   {values, labels}, {labels, values},
+                                                      {values, numbers}, {plain, numbers}, {labels, numbers}};
 
 /// Rows of keys, "a" and "u" with what rows of keys, "u" and "b" bring them.
 Rows Merge_Plainly(const Rows& target, const Rows& source, const Merge_Request& wanted)
@@ -202,19 +261,24 @@ TEST_F(Join, Merges_As_Nested_Loops_Do)
         wanted.keep_present = random() % 4 == 0;
         wanted.skip_missing = random() % 4 == 0;
         wanted.ignore_case = random() % 4 == 0;
+        const bool people = random() % 2 == 0;
+        request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
+        const Vocabulary& vocabulary = Vocabularies[random() % 3];
         std::pair<Form, Form> forms[3];
         for (auto& pair : forms)
-            pair = Key_Forms[random() % std::size(Key_Forms)];
+            do
+                pair = people && random() % 2 == 0 ? People_Key_Forms[random() % std::size(People_Key_Forms)]
+                                                   : Key_Forms[random() % std::size(Key_Forms)];
+            while (&vocabulary != &Vocabularies[0] && (pair.first == plain || pair.second == plain));
         Sheet* sheets[2];
         for (std::size_t side = 0; side < 2; ++side) {
             const std::size_t rows = 1 + random() % 6;
             sheets[side] = New_Sheet_With_Rows(static_cast<std::int32_t>(rows));
             for (std::size_t key = 0; key < static_cast<std::size_t>(wanted.key_count); ++key) {
-                Texts cells = Random_Cells(random, rows, 4);
-                if (forms[key] == std::pair(plain, numbers))
-                    cells[0] = "2";  // numbers without any can't be levels
+                const std::size_t levels = people ? 1 + random() % 3 : 3;
                 Add_Form(sheets[side], side == 0 ? forms[key].first : forms[key].second,
-                         "k" + std::to_string(key), cells);
+                         "k" + std::to_string(key), Random_Cells(random, rows, levels, vocabulary),
+                         vocabulary, levels);
                 (side == 0 ? wanted.target_keys : wanted.source_keys)[key] = sheets[side]->last_column;
             }
             Texts places;
@@ -222,7 +286,9 @@ TEST_F(Join, Merges_As_Nested_Loops_Do)
                 places.push_back(std::to_string(row));
             if (side == 0)
                 Add_Form(sheets[side], numbers, "a", places);
-            Add_Form(sheets[side], static_cast<Form>(random() % 5), "u", Random_Cells(random, rows, 4));
+            const std::size_t levels = people ? 1 + random() % 3 : 3;
+            Add_Form(sheets[side], vocabulary.forms[random() % vocabulary.forms.size()], "u",
+                     Random_Cells(random, rows, levels, vocabulary), vocabulary, levels);
             if (side == 1)
                 Add_Form(sheets[side], numbers, "b", places);
         }
@@ -358,12 +424,157 @@ TEST_F(Join, A_Column_That_Cannot_Take_The_Data_Is_Told)
     }
 }
 
+/// What two Sheets of one column f become, in words: the levels, and the cells.
+std::string Joined_Factor(Sheet* target, Sheet* source, bool merge)
+{
+    Merge_Request wanted = By_First_Column(target, source);
+    wanted.update_columns = true;
+    EXPECT_TRUE(merge ? Merge_Sheets(wanted) : Append_Sheet(target, {.source = source}));
+    EXPECT_EQ(Check_Sheet(*target), "");
+    const Column& factor = *Find_Column(target, "f");
+    std::string told = factor.type == factor_column ? Levels_Of(factor) : "";
+    for (const std::string& cell : Plain_Cells(factor))
+        told += "|" + cell;
+    return told;
+}
+
+TEST_F(Join, People_Lose_No_Level_And_No_Number)
+{
+    const struct {
+        const char* cells;
+        std::vector<double> values;
+        Texts labels;
+        const char* source;
+        std::vector<double> source_values;
+        Texts source_labels;
+        const char* host;
+        const char* people;
+    } cases[] = {
+        {"f F1|2", {}, {}, "f F1|2", {3, 4}, {}, "#2|1|2|1|2", "#4|1|2|3|4"},
+        {"f F1|2", {1, 2}, {}, "f V3|8", {}, {}, "1,2|1|2|2|2", "1,2,3,8|1|2|3|8"},
+        {"f F1|2", {}, {}, "f V1.5|70000", {}, {}, "#2|1|2||", "1,2,1.5,70000|1|2|1.5|70000"},
+        {"f F1|2", {}, {"A", "B"}, "f V2|1", {}, {}, "A,B|A|B||", "A,B|A|B|B|A"},
+        {"f F1|2", {}, {"A", "B"}, "f V2|3", {}, {}, "A,B|A|B||", "A,B,2,3|A|B|2|3"},
+        {"f F1|2", {}, {"A", "7"}, "f V7|9", {}, {}, "A,7|A|7|7|", "A,7,9|A|7|7|9"},
+        {"f F1|2", {}, {"1.50", "2"}, "f V1.5", {}, {}, "1.50,2|1.50|2|1.50", "1.50,2|1.50|2|1.50"},
+        {"f F1|2", {10, 20}, {}, "f F1|2", {}, {"20", "ctl"}, "10,20|10|20|10|20", "10,20,ctl|10|20|20|ctl"},
+        {"f F1|2", {}, {}, "f F2|1", {}, {"A", "B"}, "#2|1|2|2|1", "A,B|A|B|B|A"},
+        {"f F1|2",
+         {10, 20},
+         {},
+         "f F1|2",
+         {20, 30},
+         {"x", "y"},
+         "10,20,30|10|20|20|30",
+         "10=10,x=20,y=30|10|x|x|y"},
+        {"f V1|2", {}, {}, "f F1|2", {}, {"3", "A"}, "|1|2|3|", "|1|2|3|A"},
+    };
+    for (const auto& one : cases)
+        for (const bool people : {false, true}) {
+            Start_Request("t");
+            request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
+            Sheet* const target = Sheet_Of(one.cells);
+            Sheet* const source = Sheet_Of(one.source);
+            if (!one.values.empty() || !one.labels.empty())
+                Put_Levels(*target->last_column, one.values, one.labels);
+            if (!one.source_values.empty() || !one.source_labels.empty())
+                Put_Levels(*source->last_column, one.source_values, one.source_labels);
+            EXPECT_EQ(Joined_Factor(target, source, false), people ? one.people : one.host) << one.source;
+        }
+}
+
+TEST_F(Join, Keys_Never_Become_Empty)
+{
+    const std::string types = "Columns k and k data types do not match.\n:\n";
+    const struct {
+        const char* target;
+        Texts labels;
+        const char* source;
+        Texts source_labels;
+        std::string host, people;  ///< the message, or else the keys and what stands beside them
+    } cases[] = {
+        {"k F1|2; y V1|2", {"A", "70001"}, "k V70001|70002; w V7|8", {}, types, "k A|70001|70002; w *|7|8"},
+        {"k F1|2; y V1|2", {"A", "70001"}, "k V70001; w V7", {}, "k A|70001; w *|7", "k A|70001; w *|7"},
+        {"k F1|2; y V1|2", {"0.3", "x"}, "k V0.3; w V7", {}, "k 0.3|x; w 7|*", "k 0.3|x; w 7|*"},
+        {"k F1|2; y V1|2", {"A", "B"}, "k V2|1; w V7|8", {}, "k A|B; w 8|7", "k A|B; w 8|7"},
+        {"k F1|2; y V1|2", {}, "k V2|1.5; w V7|8", {}, types, "k 1|2|1.5; w *|7|8"},
+        {"k V5|6; y V1|2", {}, "k F1|2; w V7|8", {"6", "A"}, types, types},
+        {"k V5|6; y V1|2", {}, "k F1|2; w V7|8", {"6", "9"}, "k 5|6|9; w *|7|8", "k 5|6|9; w *|7|8"},
+        {"k V1|6; y V1|2", {}, "k F1|2; w V7|8", {"x", "A"}, "k 1|6|2; w 7|*|8", "k 1|6|2; w 7|*|8"},
+    };
+    for (const auto& one : cases)
+        for (const bool people : {false, true}) {
+            Start_Request("t");
+            request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
+            Sheet* const target = Sheet_Of(one.target);
+            Sheet* const source = Sheet_Of(one.source);
+            if (!one.labels.empty())
+                Put_Levels(*Column_At(target, 1), {}, one.labels);
+            if (!one.source_labels.empty())
+                Put_Levels(*Column_At(source, 1), {}, one.source_labels);
+            const bool merged = Merge_Sheets(By_First_Column(target, source));
+            std::string told = merged ? "k" : Messages();
+            for (const std::string& key : merged ? Plain_Cells(*Column_At(target, 1)) : Texts{})
+                told += (told == "k" ? " " : "|") + key;
+            for (const Cell_Node* cell = merged ? target->last_column->first_cell : nullptr; cell != nullptr;
+                 cell = cell->next)
+                told += (cell->prev == nullptr ? "; w " : "|") + Render(*target->last_column, *cell);
+            EXPECT_EQ(told, people ? one.people : one.host) << one.source;
+        }
+}
+
+TEST_F(Join, The_Margin_Of_A_Table_Stays_Its_Last_Row)
+{
+    for (const bool marked : {false, true}) {
+        Start_Request("t");
+        Sheet* const target = Sheet_Of("f F1|2|3; b B10|20|30", table_sheet);
+        Put_Levels(*Column_At(target, 1), {}, {"x", "y"});
+        target->table_ways = target->has_margins = 1;
+        target->margin_level = 3;
+        Sheet* const source = Sheet_Of("f F1|2|3; b B7|8|15", table_sheet);
+        Put_Levels(*Column_At(source, 1), {}, {"z", "x"});
+        source->table_ways = source->has_margins = 1;
+        Append_Request wanted{.source = source};
+        if (marked)
+            wanted.source_column_name = "f";
+        wanted.new_label = marked ? "n" : "";
+        ASSERT_TRUE(Append_Sheet(target, wanted));
+        const Column& factor = *Column_At(target, 1);
+        EXPECT_EQ(Levels_Of(factor), marked ? "x,y,n,z" : "x,y,z");
+        EXPECT_EQ(Render(target), marked ? "f F1|2|4|1|5; b T10|20|7|8|30" : "f F1|2|3|1|4; b T10|20|7|8|30");
+        EXPECT_EQ(target->margin_level, factor.nlevels + 1);
+    }
+}
+
+// Looking each level up in a list took seconds for as many.
+TEST_F(Join, Sources_Are_Told_For_Many_Levels_At_Once)
+{
+    Sheet* const target = New_Sheet_With_Rows(80000);
+    Column* const factor = New_Data_Column(target, variate_column, "id", 80000);
+    double value = 0.5;
+    for (Cell_Node* cell = factor->first_cell; cell != nullptr; cell = cell->next)
+        cell->value.number = value++;
+    ASSERT_TRUE(Variate_To_Factor(factor, true, 0));
+    const auto start = std::chrono::steady_clock::now();
+    ASSERT_TRUE(
+        Append_Sheet(target, {.source = Sheet_Of("x V1"), .source_column_name = "id", .new_label = "n"}));
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+    EXPECT_EQ(factor->last_cell->value.number, 80001);
+    EXPECT_EQ(factor->label_count, 80001);
+}
+
 TEST_F(Join, A_Number_Between_Two_Levels_Is_The_First)
 {
-    Sheet* const target = Sheet_Of("f F1");
-    Put_Levels(*target->last_column, {2, 1});
-    ASSERT_TRUE(Append_Sheet(target, {.source = Sheet_Of("f V1.5|1.4")}));
-    EXPECT_EQ(Render(target), "f F1|1|2");
+    for (const char* const told : {"k V1|2; f V1.5|1", "k V1|2; f T1.5|1"}) {
+        Start_Request("t");
+        Sheet* const target = Sheet_Of("k V1|2; f F1|1");
+        Put_Levels(*target->last_column, {2, 1});
+        Merge_Request wanted = By_First_Column(target, Sheet_Of(told));
+        wanted.update_columns = true;
+        ASSERT_TRUE(Merge_Sheets(wanted));
+        EXPECT_EQ(Render(target), "k V1|2; f F1|2");
+        EXPECT_NE(Messages().find("some values of f have no equal in f"), std::string::npos) << told;
+    }
 }
 
 // A Vector of a file may have columns that end early: what moves rows gives them all of theirs first.
@@ -414,6 +625,21 @@ TEST_F(Join, Columns_Stand_Beside_Each_Other_Or_Take_The_Place_Of_Others)
         EXPECT_EQ(Render(target), expected);
         EXPECT_FALSE(Concatenate_Sheets(target, source, false)) << "nothing is left to move";
         EXPECT_FALSE(Concatenate_Sheets(target, New_Sheet_With_Rows(3), false));
+    }
+}
+
+TEST_F(Join, Units_Of_New_Data_Stand_Beside_Others_For_People)
+{
+    for (const bool people : {false, true}) {
+        Start_Request("t");
+        request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
+        Sheet* const target = Sheet_Of("u Up|q; a V1|2");
+        EXPECT_TRUE(Concatenate_Sheets(target, Sheet_Of("v Ur|s; b V3|4; n N5|6"), false));
+        EXPECT_EQ(Check_Sheet(*target), "");
+        std::string names;
+        for (const std::string& name : Names_Of(target))
+            names += name + " ";
+        EXPECT_EQ(names, people ? "Row u a v n b " : "Row u a b ");
     }
 }
 
