@@ -1,7 +1,6 @@
 #include "model/usual_dates.h"
 
 #include "model/time_text.h"
-#include "request/people_rules.h"
 #include "request/settings.h"
 #include "support/number_text.h"
 #include "support/text.h"
@@ -114,9 +113,9 @@ bool Holds_Other_Signs(std::string_view text)
 
 }  // namespace
 
-std::string_view Usual_Date_Text(std::string_view text, Date_Text_Room& room)
+std::string_view Rewritten_Date_Text(std::string_view text, Date_Text_Room& room)
 {
-    if (!For_People(People_Rule::further_dates) || !Holds_Other_Signs(text))
+    if (!Holds_Other_Signs(text))
         return text;
     Changing_Text changing(text, room);
     Part_At_T(changing);

@@ -62,7 +62,8 @@ void Add_Form(Sheet* sheet, Form form, const std::string& name, const Texts& cel
         New_Data_Column(sheet, Type_Of_Form[form], name, static_cast<std::int32_t>(cells.size()));
     if (vocabulary.dates && (form == numbers || form == values))
         Look_Like_Dates(*column, date_form);
-    if (form == texts && vocabulary.words[2].size() > Text_Cell_Width)
+    const auto is_long = [](const std::string& cell) { return cell.size() > Text_Cell_Width; };
+    if (form == texts && std::ranges::any_of(cells, is_long))
         Set_Column_Type(*column, long_text_column);
     if (form >= labels) {
         const Texts words(vocabulary.words.begin(),
@@ -616,6 +617,9 @@ TEST_F(Join, Columns_Stand_Beside_Each_Other_Or_Take_The_Place_Of_Others)
         {false, "A V1|2; b Tx|y; A_1 V7|8; B Tp|q; long Lr|s; d F1|2"},
         {true, "A V7|8; B Tp|q; long Lr|s; d F1|2"},
     };
+    Sheet* const longer = Sheet_Of("long Tx|y");
+    EXPECT_TRUE(Concatenate_Sheets(longer, Sheet_Of("LONG Lr|s"), true)) << "it was a Text before";
+    EXPECT_EQ(Render(longer), "LONG Lr|s");
     for (const auto& [unique, expected] : cases) {
         Start_Request("t");
         Sheet* const target = Sheet_Of("A V1|2; b Tx|y");
@@ -626,6 +630,19 @@ TEST_F(Join, Columns_Stand_Beside_Each_Other_Or_Take_The_Place_Of_Others)
         EXPECT_FALSE(Concatenate_Sheets(target, source, false)) << "nothing is left to move";
         EXPECT_FALSE(Concatenate_Sheets(target, New_Sheet_With_Rows(3), false));
     }
+}
+
+TEST_F(Join, The_Source_Column_Is_Found_Under_The_Name_That_It_Was_Given)
+{
+    Sheet* const target = Sheet_Of("x V1");
+    Append_Request wanted{.source_column_name = "my src", .new_label = "a"};
+    for (const char* const label : {"a", "b"}) {
+        wanted.source = Sheet_Of("x V2");
+        wanted.new_label = label;
+        ASSERT_TRUE(Append_Sheet(target, wanted));
+        target->last_column->name = "my_src";  // as a file gives it back
+    }
+    EXPECT_EQ(Render(target), "x V1|2|2; my_src F1|2|3");
 }
 
 TEST_F(Join, Units_Of_New_Data_Stand_Beside_Others_For_People)
