@@ -121,10 +121,12 @@ bool Round_To_Digits(double value, int wanted, Decimal_Digits& decimal)
     return rounded >= limit / 10;
 }
 
-/// Whether the digits are read as just that `value`: both parts are exact, so the division rounds as a reader does.
+/// Whether the digits are read as just that `value`: both parts are exact, so the division rounds as a reader
+/// does.
 bool Read_Back_As(double value, const Decimal_Digits& decimal)
 {
-    return static_cast<double>(decimal.whole) / Exact_Powers[static_cast<std::size_t>(decimal.scale)] == value;
+    return static_cast<double>(decimal.whole) / Exact_Powers[static_cast<std::size_t>(decimal.scale)]
+           == value;
 }
 
 /// Both write sixteen characters, of which `count` stay: a fixed length is two moves, no call.
