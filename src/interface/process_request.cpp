@@ -13,7 +13,7 @@ namespace {
 /// Every stage, in the order in which they act; the first that doesn't succeed ends the request.
 constexpr Stage Stages[] = {
     Take_Rules_For_People,
-    Know_Encoding,
+    Know_Encodings,
     Expand_Tokens,
     Fetch_Named_Secondary,
     Cut_Genotype_Options,

@@ -32,6 +32,12 @@ struct Text_Code_Facts {
 /// One of the codes that are offered; null for none.
 using Text_Code = const Text_Code_Facts*;
 
+/// Whether a code has every letter, and a mark that tells it at the head of a file.
+[[nodiscard]] inline bool Is_Unicode(Text_Code code)
+{
+    return code->kind < Code_Kind::one_byte;
+}
+
 /// By a name, as "Latin1" or "ISO_8859-1", or a page, as "cp1252" or "65001": case and signs don't count.
 [[nodiscard]] Text_Code Find_Text_Code(std::string_view name);
 [[nodiscard]] Text_Code Text_Code_Of_Page(std::int32_t page);

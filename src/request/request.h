@@ -44,7 +44,11 @@ struct Request_Globals : Lasting_Globals {
     bool Strict = false;                    ///< a loss makes the request fail
     Fixed_Text<Long_Name_Width> Loss_Report_Name;
     Fixed_Text<Long_Name_Width> Named_Secondary_File;  ///< by an option, beside lists of the pass file
-    Fixed_Text<60> Input_Encoding;  ///< the code of the input's letters, as it was declared
+    Fixed_Text<60> Input_Encoding;   ///< the code of the input's letters, as it was declared
+    Fixed_Text<60> Output_Encoding;  ///< the code of texts that are written; empty: that of all letters
+    bool Write_Marks = false;        ///< types are told behind names, and missing is "*"
+    bool Write_Crlf = false;
+    bool Write_Code_Mark = false;  ///< the mark of Unicode comes first
 
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
@@ -121,6 +125,7 @@ struct Request_Globals : Lasting_Globals {
 
     // Output options.
     Fixed_Text<90> Missing_Text = "*";
+    bool Missing_Text_Given = false;
     bool Write_Via_Temp = true;
     bool No_Return = false;
     bool Add_To_Output = false;

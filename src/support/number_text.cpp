@@ -31,6 +31,8 @@ struct Decimal_Digits {
     char text[32] = {};  ///< the digits stand at the end of the first half
     int count = 0;       ///< without the zeros at the end
     int point = 0;
+    std::uint64_t whole = 0;  ///< the digits as a number, zeros at the end included
+    int scale = 0;            ///< of them behind the point
 
     [[nodiscard]] const char* Digits(int all) const { return text + sizeof text / 2 - all; }
 };
@@ -114,7 +116,17 @@ bool Round_To_Digits(double value, int wanted, Decimal_Digits& decimal)
     Print_Sixteen_Digits(decimal.text, rounded, zeros);
     decimal.count = wanted - zeros;
     decimal.point = wanted - scale;
+    decimal.whole = rounded;
+    decimal.scale = scale;
     return rounded >= limit / 10;
+}
+
+/// Whether the digits are read as just that `value`: both parts are exact, so the division rounds as a reader
+/// does.
+bool Read_Back_As(double value, const Decimal_Digits& decimal)
+{
+    return static_cast<double>(decimal.whole) / Exact_Powers[static_cast<std::size_t>(decimal.scale)]
+           == value;
 }
 
 /// Both write sixteen characters, of which `count` stay: a fixed length is two moves, no call.
@@ -384,6 +396,21 @@ char* Print_General(char* target, double value, int digits)
         return Lay_Out_Plain(target, decimal, digits);
     }
     return Print_By_Library(target, value, std::chars_format::general, digits);
+}
+
+char* Print_Exactly(char* target, double value)
+{
+    if (Is_Plain_Integer(value, Plain_Integer_Limit))
+        return Print_Integer(target, static_cast<std::int64_t>(value));
+    Decimal_Digits decimal{};
+    const double size = std::fabs(value);
+    if (size >= 1e-4 && Round_To_Digits(size, Most_Quick_Digits, decimal)
+        && decimal.point <= Most_Quick_Digits && Read_Back_As(size, decimal)) {
+        if (value < 0.0)
+            *target++ = '-';
+        return Lay_Out_Plain(target, decimal, Most_Quick_Digits);
+    }
+    return std::to_chars(target, target + Number_Text_Room, value).ptr;
 }
 
 char* Print_Exponent(char* target, double value, int decimals)

@@ -43,6 +43,9 @@ constexpr std::size_t Number_Text_Room = 400;
 /// As printf's "%.{digits}g" prints a finite `value`; 1 to 40 digits. Returns the end of the text.
 char* Print_General(char* target, double value, int digits);
 
+/// The fewest digits that are read as just this finite `value` again.
+char* Print_Exactly(char* target, double value);
+
 /// As printf's "%.{decimals}e" prints it; 0 to 40 decimals.
 char* Print_Exponent(char* target, double value, int decimals);
 

@@ -16,7 +16,7 @@ namespace {
 constexpr int wrong = 100;  // such statuses begin here
 
 const std::string Crops = "plot,kind,yield\n1,oats,2.5\n2,rye,*\n3,barley,4\n";
-const std::string Crops_Tab = "plot\tkind\tyield\r\n1\toats\t2.5\r\n2\trye\t*\r\n3\tbarley\t4\r\n";
+const std::string Crops_Tab = "plot\tkind\tyield\n1\toats\t2.5\n2\trye\t\n3\tbarley\t4\n";
 
 struct Ran {
     int status = -1;
@@ -80,12 +80,16 @@ TEST_F(Command_Test, Converts)
         {"few.csv m.tab --missing oats --host-losses", "m.tab", "x|1|"},
         {"--force crops.csv old.tab", "old.tab", all},
         {"crops.csv k.tab --keep yield,plot --rename plot=Block --type=plot=factor", "k.tab",
+         "Block\tyield|1\t2.5|2\t|3\t4|"},
+        {"crops.csv h.tab --host-output --keep yield,plot --rename plot=Block --type=plot=factor", "h.tab",
          "Block!\tyield|1\t2.5|2\t*|3\t4|"},
+        {"crops.csv marks.tab --marks --write-missing '' --type=plot=factor,yield=date", "marks.tab",
+         "plot!\tkind\tyield:D|1\toats\t1600-03-02 12:00:00|2\trye\t|3\tbarley\t1600-03-04 00:00:00|"},
         {"crops.csv n.tab --keep=3,1-1 --rows rows.txt", "n.tab", "plot\tyield|1\t2.5|3\t4|"},
         {"crops.csv d.tab --drop 'kind, yield' --type plot=date --rows rows.txt", "d.tab",
-         "plot:D|01/03/1600|03/03/1600|"},
+         "plot|1600-03-01|1600-03-03|"},
         {"- s.tab --rename plot=kind,kind=plot --drop=yield --type plot=text", "s.tab",
-         "kind\tplot|1\toats|2\trye|3\tbarley|"},
+         "kind\tplot|\"1\"\toats|\"2\"\trye|\"3\"\tbarley|"},
     };
     for (const auto& [line, output, text] : cases) {
         const Ran ran = Run(line);
@@ -104,7 +108,7 @@ TEST_F(Command_Test, Leaves_A_List_Of_Columns_To_Fill_In)
     EXPECT_NE(first.err.find("crops.VAR: lists the names"), std::string::npos) << first.err;
     Put("crops.VAR", "3\n\nplant\n*\n");
     EXPECT_EQ(Run("crops.csv out.tab --column-list --force").err, "");
-    EXPECT_EQ(Get("out.tab"), "plot\tplant\r\n1\toats\r\n2\trye\r\n3\tbarley\r\n");
+    EXPECT_EQ(Get("out.tab"), "plot\tplant\n1\toats\n2\trye\n3\tbarley\n");
 }
 
 TEST_F(Command_Test, Adds_Sheets_To_A_Book_And_Lists_Them)
@@ -144,14 +148,14 @@ TEST_F(Command_Test, Joins_Files)
     const std::pair<std::string, std::string> cases[] = {
         {"june.csv all.csv --append", "plot,kind|1,oats|2,rye|7,bean|"},
         {"june.csv all.csv --append=month,june",
-         "plot,kind,month!|1,oats,Original|2,rye,Original|7,bean,june|"},
+         "plot,kind,month|1,oats,Original|2,rye,Original|7,bean,june|"},
         {"heights.csv all.csv --concatenate", "plot,kind,kind1,height|1,oats,a,5|2,rye,b,6|"},
         {"heights.csv all.csv --concatenate=U", "plot,kind,height|1,a,5|2,b,6|"},
-        {"yields.csv all.csv --merge plot", "plot,kind,name,yield|1,oats,,*|2,rye,rye,9|3,,fern,8|"},
+        {"yields.csv all.csv --merge plot", "plot,kind,name,yield|1,oats,,|2,rye,rye,9|3,,fern,8|"},
         {"yields.csv all.csv --merge plot --merge kind=name --merge-rows none",
-         "plot,kind,yield|1,oats,*|2,rye,9|"},
-        {"twice.csv all.csv --merge plot --merge-rows none", "plot,kind,x|1,oats,*|2,rye,8|"},
-        {"- all.csv --merge plot", "plot,kind,x|1,oats,*|2,rye,3|"},
+         "plot,kind,yield|1,oats,|2,rye,9|"},
+        {"twice.csv all.csv --merge plot --merge-rows none", "plot,kind,x|1,oats,|2,rye,8|"},
+        {"- all.csv --merge plot", "plot,kind,x|1,oats,|2,rye,3|"},
     };
     Put("june.csv", "kind,plot\nbean,7\n");
     Put("heights.csv", "kind,height\na,5\nb,6\n");

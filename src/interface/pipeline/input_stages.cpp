@@ -43,16 +43,27 @@ Request_Status Take_Rules_For_People(Request_Run& run)
     return Done;
 }
 
+namespace {
+
 /// A code that nobody knows would be taken for none.
-Request_Status Know_Encoding(Request_Run&)
+bool Encoding_Is_Known(const char* name)
 {
-    if (request.Input_Encoding.empty() || Find_Text_Code(request.Input_Encoding) != nullptr)
-        return Done;
+    if (*name == '\0' || Find_Text_Code(name) != nullptr)
+        return true;
     std::string near;
-    for (const std::string_view name : Nearest_Code_Names(request.Input_Encoding))
-        near.append(near.empty() ? "" : ", ").append(name);
-    return Stop(Request_Status::not_imported, "Error: The encoding %s is not known. The nearest ones: %s.\n",
-                request.Input_Encoding.c_str(), near.c_str());
+    for (const std::string_view other : Nearest_Code_Names(name))
+        near.append(near.empty() ? "" : ", ").append(other);
+    return Fail("Error: The encoding %s is not known. The nearest ones: %s.\n", name, near.c_str());
+}
+
+}  // namespace
+
+Request_Status Know_Encodings(Request_Run&)
+{
+    return Encoding_Is_Known(request.Input_Encoding.c_str())
+                   && Encoding_Is_Known(request.Output_Encoding.c_str())
+               ? Done
+               : Request_Status::not_imported;
 }
 
 Request_Status Fetch_Named_Secondary(Request_Run& run)

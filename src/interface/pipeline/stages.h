@@ -73,7 +73,7 @@ Request_Status Stop(Request_Status status, const char* words, Arguments... argum
 // --- From the two strings to the files they name -------------------------------------------------
 
 Request_Status Take_Rules_For_People(Request_Run& run);
-Request_Status Know_Encoding(Request_Run& run);
+Request_Status Know_Encodings(Request_Run& run);
 Request_Status Expand_Tokens(Request_Run& run);
 Request_Status Fetch_Named_Secondary(Request_Run& run);
 Request_Status Cut_Genotype_Options(Request_Run& run);
