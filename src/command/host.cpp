@@ -5,6 +5,7 @@
 #include "command/selection_lists.h"
 #include "ingester/ingester.h"
 #include "interface/clipboard.h"
+#include "interface/compressed_files.h"
 #include "interface/paths.h"
 #include "interface/people_options.h"
 #include "platform/files.h"
@@ -65,7 +66,7 @@ constexpr Status_Sentence Status_Sentences[] = {
 std::string Packed_Option(const Command_Options& options, std::string_view output)
 {
     constexpr std::string_view packed = "/h";
-    const bool comma_text = Ends_Ignoring_Case(output, ".csv");
+    const bool comma_text = Ends_Ignoring_Case(Name_Inside_Packing(output), ".csv");
     const bool said = options.padded || options.output_options.find(packed) != std::string::npos
                       || options.output_options.find("/rewrite=") != std::string::npos;
     return comma_text && !said ? std::string(packed) : std::string();
@@ -378,7 +379,10 @@ Answer Call_Library(const Conversion& conversion)
 /// one. Empty when a file of that name was there before.
 std::string Unfinished_File(const Sent_Name& output)
 {
-    std::string name = File_Exists(output.request) ? With_Extension(output.request, ".$$$") : output.request;
+    const bool packed = Name_Inside_Packing(output.request) != output.request;
+    std::string name = packed                        ? With_Extension(output.request, ".gz$")
+                       : File_Exists(output.request) ? With_Extension(output.request, ".$$$")
+                                                     : output.request;
     if (File_Exists(name))
         name.clear();
     return name;

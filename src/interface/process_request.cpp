@@ -51,6 +51,7 @@ constexpr Stage Stages[] = {
     Change_By_List,
     Mark_Source,
     Fit_Names_To_Output,
+    Keep_Manner_Of_Output,
     Join_With_Output,
     Keep_Range_Of_Columns,
     Fit_Names_To_Output,
@@ -68,6 +69,7 @@ constexpr Stage Stages[] = {
     Report_Losses,
     Write_Column_List,
     Fill_Clipboard,
+    Pack_Output,
     Replace_Old_Output,
 };
 

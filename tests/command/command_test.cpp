@@ -173,6 +173,67 @@ TEST_F(Command_Test, Joins_Files)
     }
 }
 
+TEST_F(Command_Test, Packs_What_Ends_In_Gz)
+{
+    for (const std::string form : {"csv", "tab", "tsv", "tss", "tbk", "gen"}) {
+        ASSERT_EQ(Run("crops.csv plain." + form).err, "");
+        ASSERT_EQ(Run("crops.csv packed." + form + ".gz").err, "");
+        ASSERT_EQ(std::system(("gzip -dc " + Path("packed." + form + ".gz") + " >" + Path("plain")).c_str()),
+                  0);
+        EXPECT_EQ(Get("plain").size(), Get("plain." + form).size()) << form;
+        if (form != "tss" && form != "tbk") {  // which hold the time of their making
+            EXPECT_EQ(Get("plain"), Get("plain." + form));
+        }
+        if (form == "gen")
+            continue;
+        const std::string joined = form == "tbk" ? " --append --update-sheet Sheet1" : " --append";
+        EXPECT_EQ(Run("crops.csv packed." + form + ".gz" + joined).status, 0) << form;
+        EXPECT_EQ(Run("packed." + form + ".gz - --no-header").out,
+                  "1,oats,2.5\n2,rye,\n3,barley,4\n1,oats,2.5\n2,rye,\n3,barley,4\n")
+            << form;
+    }
+    const std::string files = Files();
+    const std::string old = Get("packed.csv.gz");
+    EXPECT_EQ(Run("crops.csv packed.csv.gz").status, 6);
+    EXPECT_EQ(Run("crops.csv packed.csv.gz --force --type kind=number --strict").status, 6);
+    EXPECT_EQ(Run("crops.csv packed.csv.gz --concatenate=x").status, 105);
+    EXPECT_EQ(Get("packed.csv.gz"), old);
+    EXPECT_EQ(Files(), files);
+}
+
+TEST_F(Command_Test, Joins_Keep_The_Manner_Of_A_Text)
+{
+    const std::tuple<std::string, const char*, std::string> cases[] = {
+        {"a,f!\r\n*,x\r\n", "", "a,f!\r\n*,x\r\n2,y\r\n"},
+        {"a,f\n*,x\n", "", "a,f\n*,x\n2,y\n"},
+        {"\xEF\xBB\xBF"
+         "a,f\n1,x\n",
+         "",
+         "\xEF\xBB\xBF"
+         "a,f\n1,x\n2,y\n"},
+        {"a,f\n1,\xF6\n", "is one in UTF-8 now", "a,f\n1,\xC3\xB6\n2,y\n"},
+        {{"\xFF\xFE"
+          "a\0,\0f\0\n\0"
+          "1\0,\0x\0\n\0",
+          18},
+         "",
+         {"\xFF\xFE"
+          "a\0,\0f\0\n\0"
+          "1\0,\0x\0\n\0"
+          "2\0,\0y\0\n\0",
+          26}},
+    };
+    for (const auto& [before, told, after] : cases) {
+        Put("all.csv", before);
+        const Ran ran = Run("- all.csv --append", "a,f\n2,y\n");
+        EXPECT_NE(ran.err.find(told), std::string::npos) << ran.err;
+        EXPECT_EQ(Get("all.csv"), after) << before;
+    }
+    Put("all.csv", "a,f\n1,\xF6\n");
+    EXPECT_EQ(Run("- all.csv --append --write-encoding latin1", "a,f\n2,y\n").err, "");
+    EXPECT_EQ(Get("all.csv"), "a,f\n1,\xF6\n2,y\n");
+}
+
 TEST_F(Command_Test, Tells_What_It_Would_Send_And_What_It_Can)
 {
     const std::pair<const char*, const char*> cases[] = {

@@ -1,4 +1,5 @@
 // Stages that make the Sheet and bring it into the shape that the output gets.
+#include "interface/compressed_files.h"
 #include "interface/file_detection.h"
 #include "interface/output_joins.h"
 #include "interface/output_sheet.h"
@@ -13,7 +14,10 @@
 #include "model/sheet.h"
 #include "model/source_column.h"
 #include "model/transpose.h"
+#include "platform/file_image.h"
+#include "platform/files.h"
 #include "request/request.h"
+#include "spreadsheet/text/text_manner.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -219,6 +223,23 @@ constexpr Output_Join Output_Joins[] = {
 };
 
 }  // namespace
+
+/// Who joins data onto a text wants it back as it was. What can't be read is told by the join.
+Request_Status Keep_Manner_Of_Output(Request_Run& run)
+{
+    const bool separated = request.CSV_Output || run.output_code == tab_text_file;
+    if (!For_People(People_Rule::plain_texts) || request.Add_Mode == Add_Modes::none || !separated)
+        return Done;
+    std::string plain(request.Add_File_Name.view());
+    const Scratch_File scratch(run.packed ? Decompressed_Name(plain) : std::string());
+    if (run.packed && !Decompress_To(scratch.Name(), plain.c_str()))
+        return Request_Status::input_unreadable;
+    Input_File file;
+    File_Image image;
+    if (file.Open(run.packed ? scratch.Name() : plain) && image.Load(file))
+        Keep_Manner_Of_Text({image.Bytes(), image.Size()}, Native_Path(plain).c_str());
+    return Done;
+}
 
 Request_Status Join_With_Output(Request_Run&)
 {
