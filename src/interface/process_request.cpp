@@ -60,6 +60,7 @@ constexpr Stage Stages[] = {
     Mark_Source,
     Find_Fixed_Decimals,
     Tell_Summary,
+    Show_Sheet,
 
     Make_Output_Form,
     Refuse_Losses,
@@ -101,7 +102,8 @@ Request_Status Process_Request(std::string infile, std::string outfile, std::int
     run.infile = std::move(infile);
     run.outfile = std::move(outfile);
     const Request_Status status = Run_Stages(run);
-    Tell_Losses();
+    if (!run.reported)
+        Tell_Losses();
     if (!run.reported && !request.Loss_Report_Name.empty())
         static_cast<void>(Write_Loss_Report(request.Loss_Report_Name));  // the request has failed already
     rows = Current_Sheet == nullptr ? 0 : Current_Sheet->row_count;

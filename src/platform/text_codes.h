@@ -84,6 +84,9 @@ private:
     std::unique_ptr<Steps> steps_;
 };
 
+/// A text of the request as the world outside knows it.
+[[nodiscard]] std::string In_Utf8(std::string_view text);
+
 /// A converter that can always be had, between UTF-8, UTF-16, UTF-32 and Windows-1252.
 [[nodiscard]] Text_Converter Sure_Converter(Text_Code from, Text_Code to);
 

@@ -1,6 +1,7 @@
 // The globals of one request: what the call asked for, as every floor may read it.
 #pragma once
 
+#include "request/input_facts.h"
 #include "request/losses.h"
 #include "request/people_rules.h"
 #include "request/settings.h"
@@ -74,6 +75,7 @@ struct Request_Globals : Lasting_Globals {
     bool Rows_Were_Selected = false;     ///< the same of the rows
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     Loss_Ledger losses;                  ///< what could not be kept
+    Input_Facts input_facts;             ///< what the reader found of the file's form
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int64_t Column_Wanted_Count = 0;           ///< of the list's lines, as it says; 0 where it doesn't
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place

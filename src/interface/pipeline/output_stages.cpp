@@ -152,6 +152,7 @@ Request_Status Pack_Output(Request_Run& run)
 Request_Status Report_Losses(Request_Run& run)
 {
     run.reported = true;
+    Tell_Losses();
     return request.Loss_Report_Name.empty() || Write_Loss_Report(request.Loss_Report_Name)
                ? Done
                : Request_Status::output_failed;

@@ -125,6 +125,7 @@ Request_Status Drop_Empty_Rows(Request_Run& run);
 Request_Status Find_Fixed_Decimals(Request_Run& run);
 Request_Status Refuse_Losses(Request_Run& run);
 Request_Status Tell_Summary(Request_Run& run);
+Request_Status Show_Sheet(Request_Run& run);
 
 // --- The output ----------------------------------------------------------------------------------
 
@@ -137,7 +138,7 @@ void Begin_Writing(Request_Run& run);
 Request_Status Write_Column_List(Request_Run& run);
 Request_Status Fill_Clipboard(Request_Run& run);
 Request_Status Pack_Output(Request_Run& run);
-/// Writes the report that was asked for, while the old output is there still.
+/// Tells what was lost, and writes the report that was asked for, while the old output is there still.
 Request_Status Report_Losses(Request_Run& run);
 Request_Status Replace_Old_Output(Request_Run& run);
 
