@@ -323,6 +323,60 @@ TEST_F(Command_Test, A_Terminal_Gets_As_Much_As_It_Has_Places_For)
                            "1 more row, 1 more column: remark\n");
 }
 
+/// What two other programs make of a text, without options: types, and cells between bars.
+struct Peer {
+    const char* there;  ///< the shell's line that succeeds where it is installed
+    const char* script;
+    const char* run;
+    const char* told;
+};
+
+constexpr Peer Peers[] = {
+    {"Rscript -e 'library(data.table)'",
+     "for (d in list(read.csv('c.csv', encoding = 'UTF-8'), data.table::fread('c.csv', data.table = FALSE))) "
+     "{\n"
+     "  cat(sapply(d, function(x) class(x)[[1]]), '\\n')\n"
+     "  cat(d$name, format(as.Date(d$day)), sprintf('%.17g', d$x), d$n, sep = '|')\n"
+     "  cat('\\n')\n}\n",
+     "Rscript script",
+     "character character character integer numeric integer \n"
+     "Zo\xC3\xAB|a,b|say "
+     "\"hi\"|2024-03-12|2024-03-13|NA|0.30000000000000004|NA|1.0000000000000001e+300|1|2|3\n"
+     "character IDate character integer numeric integer \n"
+     "Zo\xC3\xAB|a,b|say "
+     "\"\"hi\"\"|2024-03-12|2024-03-13|NA|0.30000000000000004|NA|1.0000000000000001e+300|1|2|3\n"},
+    {"/usr/bin/python3 -c 'import pandas'",
+     "import pandas\n"
+     "d = pandas.read_csv('c.csv', float_precision='round_trip', parse_dates=['day'])\n"
+     "print(*d.dtypes)\n"
+     "print(*d.name, *d.day.dt.date, *d.x, *d.n, sep='|')\n",
+     "/usr/bin/python3 script",
+     "object datetime64[ns] object int64 float64 int64\n"
+     "Zo\xC3\xAB|a,b|say \"hi\"|2024-03-12|2024-03-13|NaT|0.30000000000000004|nan|1e+300|1|2|3\n"},
+};
+
+TEST_F(Command_Test, Other_Programs_Read_Its_Comma_Text)
+{
+    Put("hard.csv", "name,day:D,when:T,code$,x,n\nZo\xC3\xAB,12/03/2024,10:30,007,0.30000000000000004,1\n"
+                    "\"a,b\",13/03/2024,11:30:15,12,*,2\n\"say \"\"hi\"\"\",*,*,13,1e300,3\n");
+    ASSERT_EQ(Run("hard.csv c.csv").err, "");
+    EXPECT_EQ(Get("c.csv"),
+              "name,day,when,code,x,n\nZo\xC3\xAB,2024-03-12,10:30:00,\"007\",0.30000000000000004,1\n"
+              "\"a,b\",2024-03-13,11:30:15,\"12\",,2\n\"say \"\"hi\"\"\",,,\"13\",1e+300,3\n");
+    int there = 0;
+    for (const Peer& peer : Peers) {
+        if (std::system((std::string(peer.there) + " >/dev/null 2>&1").c_str()) != 0)
+            continue;
+        ++there;
+        Put("script", peer.script);
+        const std::string line = "cd '" + Path("") + "' && LC_ALL=C.UTF-8 " + peer.run + " >told";
+        EXPECT_EQ(std::system(line.c_str()), 0);
+        EXPECT_EQ(Get("told"), peer.told) << peer.run;
+    }
+    if (there == 0)
+        GTEST_SKIP() << "no peer is installed";
+}
+
 TEST_F(Command_Test, Documents_Every_Option)
 {
     const std::string man = Run("--make-man").out;
@@ -357,7 +411,7 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
     int examples = 0;
     for (std::string line; std::getline(read_me, line);) {
         const bool runs = line.starts_with("ingester ") || line.find("| ingester ") != std::string::npos;
-        if (!runs || line.find(".csv") == std::string::npos || line.find("https:") != std::string::npos)
+        if (!runs || line.find("https:") != std::string::npos)
             continue;
         ++examples;
         std::filesystem::remove_all(Path("try"));
@@ -368,12 +422,15 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
         Put("try/plots.txt", "1-2\n");
         if (line.find("--force") != std::string::npos)
             Put("try/out.tab", "old");
-        EXPECT_EQ(std::system((begin + "gzip -k crops.csv && (" + line + "\n) >shown 2>&1").c_str()), 0)
+        const std::string made = "gzip -k crops.csv && ingester crops.csv all.tbk && ";
+        const std::string had =
+            line.find(" all.tbk ") != line.npos && line.find("--add") != line.npos ? "rm all.tbk; " : "";
+        EXPECT_EQ(std::system((begin + made + had + "(" + line + "\n) >shown 2>&1").c_str()), 0)
             << line << "\n"
             << Get("try/shown");
         EXPECT_EQ(Get("try/shown").find("was not found"), std::string::npos) << line;
     }
-    EXPECT_GT(examples, 20);
+    EXPECT_GT(examples, 26);
 }
 
 TEST_F(Command_Test, The_Document_Of_Formats_Is_Made_From_Their_Table)
