@@ -23,14 +23,19 @@
  *   /+names          names of columns stand as they are until an output can't hold them
  *   /+losses         what could not be kept is told at the end of the messages
  *   /+vain           options that mean nothing to the input are told
- *   /+endings        outputs are known by further endings
+ *   /+endings        outputs are known by further endings, and packed where they end in .gz
  *   /+types          inputs are recognised by further tests
+ *   /+plain          comma text and tabs are written as other programs take them
  *
  * and beside these rules:
  *
  *   /+strict         anything that can't be kept makes the request fail, and the old output stays
  *   /+report=FILE    what could not be kept is written into a file, as JSON
  *   /+encoding=NAME  the code of the input's texts, as UTF-8, latin1 or 850
+ *   /+marks          of such texts names tell types, and * is missing
+ *   /+crlf           their lines end with CR LF
+ *   /+write-encoding=NAME  the code of texts that are written
+ *   /+bom            they begin with the mark of Unicode
  *   /+secondary=FILE the secondary file, where its record in the pass file holds a list
  *
  * One call at a time in a process; calls may follow each other.

@@ -1,5 +1,6 @@
 #include "command/formats.h"
 
+#include "command/usage.h"
 #include "interface/format_drivers.h"
 
 #include <CLI/CLI.hpp>
@@ -9,9 +10,6 @@
 namespace ingester {
 
 namespace {
-
-constexpr const char* Description = "Lists the formats that are read and written.\n"
-                                    "Inputs are known by their content, outputs by their extension.";
 
 bool Is_Built(const Format_Driver& format)
 {
@@ -76,7 +74,7 @@ void Print_JSON()
 
 int Run_Formats(int argc, const char* const* argv)
 {
-    CLI::App app{Description, "ingester formats"};
+    CLI::App app{std::string(Name_Of(Task::formats).description), "ingester formats"};
     bool json = false;
     bool markdown = false;
     bool all = false;
@@ -86,7 +84,7 @@ int Run_Formats(int argc, const char* const* argv)
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& end) {
-        return app.exit(end);
+        return End_Parsing(app, end);
     }
     if (json)
         Print_JSON();

@@ -1,10 +1,13 @@
 #include "command/host.h"
 
+#include "command/look.h"
 #include "command/progress_line.h"
 #include "command/request_text.h"
 #include "command/selection_lists.h"
+#include "command/usage.h"
 #include "ingester/ingester.h"
 #include "interface/clipboard.h"
+#include "interface/compressed_files.h"
 #include "interface/paths.h"
 #include "interface/people_options.h"
 #include "platform/files.h"
@@ -65,7 +68,7 @@ constexpr Status_Sentence Status_Sentences[] = {
 std::string Packed_Option(const Command_Options& options, std::string_view output)
 {
     constexpr std::string_view packed = "/h";
-    const bool comma_text = Ends_Ignoring_Case(output, ".csv");
+    const bool comma_text = Ends_Ignoring_Case(Name_Inside_Packing(output), ".csv");
     const bool said = options.padded || options.output_options.find(packed) != std::string::npos
                       || options.output_options.find("/rewrite=") != std::string::npos;
     return comma_text && !said ? std::string(packed) : std::string();
@@ -156,6 +159,8 @@ bool Request_Can_Carry(const Conversion& conversion)
 bool Output_Makes_Sense(const Conversion& conversion)
 {
     const char* refusal = nullptr;
+    if (conversion.options.task != Task::convert)
+        return true;
     if (Equal_Ignoring_Case(conversion.options.output, "clipboard"))
         refusal = "as an output the clipboard needs an extension: clipboard.csv, .tab, .txt or .gen; "
                   "a file of this name is ./clipboard";
@@ -187,7 +192,7 @@ bool Output_May_Be_Written(const Conversion& conversion)
     const Command_Options& options = conversion.options;
     const Sent_Name& output = conversion.output;
     const char* refusal = nullptr;
-    if (options.summary || Is_Clipboard_Output(output.request)
+    if (options.task != Task::convert || Is_Clipboard_Output(output.request)
         || (conversion.To_Standard_Output() && !conversion.Joins()))
         return true;
     if (conversion.Joins() && !File_Exists(output.request))
@@ -339,7 +344,7 @@ int Read_Status(const std::string& name)
     Input_File file;
     std::int32_t status = 0;
     const bool read = file.Open(name) && file.Read_Little(status);
-    return read && status >= 0 && status < Wrong_Values ? status : INGESTER_NO_REQUEST;
+    return read && status >= 0 && status < Usage_Error ? status : INGESTER_NO_REQUEST;
 }
 
 std::string Read_Messages(const std::string& name)
@@ -378,7 +383,10 @@ Answer Call_Library(const Conversion& conversion)
 /// one. Empty when a file of that name was there before.
 std::string Unfinished_File(const Sent_Name& output)
 {
-    std::string name = File_Exists(output.request) ? With_Extension(output.request, ".$$$") : output.request;
+    const bool packed = Name_Inside_Packing(output.request) != output.request;
+    std::string name = packed                        ? With_Extension(output.request, ".gz$")
+                       : File_Exists(output.request) ? With_Extension(output.request, ".$$$")
+                                                     : output.request;
     if (File_Exists(name))
         name.clear();
     return name;
@@ -440,19 +448,6 @@ void Hand_Over_Column_List(const Conversion& conversion)
                                  : "the list of columns could not be written");
 }
 
-/// The lines of a text, to standard output.
-bool Print_Lines(const std::string& name)
-{
-    constexpr std::size_t longest = 4096;
-    Input_File file;
-    std::string line;
-    if (!file.Open(name))
-        return false;
-    while (file.Read_Line(line, longest))
-        std::printf("%s\n", line.c_str());
-    return file.Close() && std::fflush(stdout) == 0;
-}
-
 }  // namespace
 
 int Run_Command(const Command_Options& options)
@@ -473,7 +468,7 @@ int Run_Command(const Command_Options& options)
         std::fprintf(stderr, "ingester: %s\nRun with --help for more information.\n", fault.c_str());
     if (!fault.empty() || !Request_Can_Carry(conversion) || !Output_Makes_Sense(conversion)
         || !Change_List_Is_Free(conversion))
-        return Wrong_Values;
+        return Usage_Error;
     if (options.dry_run) {
         Print_Request(conversion);
         return INGESTER_SUCCESS;
@@ -488,13 +483,13 @@ int Run_Command(const Command_Options& options)
         Say(conversion.input.native, "the keys of the merge could not be kept in the temporary folder");
         return INGESTER_MERGE_FAILED;
     }
+    sheet_viewer = Viewer_Of(options);
     const Answer answer = Convert(conversion);
     Tell_Answer(conversion, answer);
     if (answer.Is_Good())
         Hand_Over_Column_List(conversion);
-    if (conversion.To_Standard_Output() && answer.Is_Good()
-        && !(options.lines ? Print_Lines(conversion.output.request)
-                           : Copy_To_Standard_Output(conversion.output.request))) {
+    if (conversion.To_Standard_Output() && answer.Is_Good() && !sheet_viewer
+        && !Copy_To_Standard_Output(conversion.output.request)) {
         Say(conversion.output.native, "could not be written to its end");
         return INGESTER_OUTPUT_FAILED;
     }

@@ -1,48 +1,49 @@
 #include "command/formats.h"
 #include "command/host.h"
+#include "command/option_documents.h"
 #include "command/options.h"
-#include "command/sheets.h"
+#include "command/usage.h"
 
+#include <algorithm>
+#include <cstdio>
 #include <string_view>
-#include <vector>
 
 namespace {
 
-struct Subcommand {
-    std::string_view name;
-    int (*run)(int argc, const char* const* argv);
-};
+using namespace ingester;
 
-/// A conversion into nothing, by which the library tells what the columns hold.
-int Run_Summary(int argc, const char* const* argv)
+int Run_Task(Task task, int argc, const char* const* argv)
 {
-    std::vector<const char*> words = {"ingester"};
-    words.insert(words.end(), argv + 1, argv + argc);
-    words.insert(words.end(), {"/dev/null", "--print-summary"});
-    ingester::Command_Options options;
-    options.summary = true;
-    if (const auto early_end =
-            ingester::Parse_Command_Line(static_cast<int>(words.size()), words.data(), options))
+    Command_Options options;
+    options.task = task;
+    if (const auto early_end = Parse_Command_Line(argc, argv, options))
         return *early_end;
-    return ingester::Run_Command(options);
+    return Run_Command(options);
 }
 
-/// First words that are no names of files. A file of such a name is reached as "./formats".
-constexpr Subcommand Subcommands[] = {
-    {"formats", ingester::Run_Formats},
-    {"sheets", ingester::Run_Sheets},
-    {"summary", Run_Summary},
-};
+/// A word that was misspelt would be taken for the name of a file.
+bool Is_Misspelt_Task(std::string_view word)
+{
+    const std::string_view meant = Probable_Task(word);
+    if (!meant.empty())
+        std::fprintf(stderr, "ingester: there is no file %s; did you mean ingester %s?\n",
+                     std::string(word).c_str(), std::string(meant).c_str());
+    return !meant.empty();
+}
 
 }  // namespace
 
 int main(int argc, char** argv)
 {
-    for (const Subcommand& subcommand : Subcommands)
-        if (argc > 1 && argv[1] == subcommand.name)
-            return subcommand.run(argc - 1, argv + 1);
-    ingester::Command_Options options;
-    if (const auto early_end = ingester::Parse_Command_Line(argc, argv, options))
-        return *early_end;
-    return ingester::Run_Command(options);
+    if (argc < 2)
+        return Print_Usage(), Usage_Error;
+    const std::string_view word = argv[1];
+    if (Print_Option_Document(word))
+        return 0;
+    const auto tasks = Task_Names();
+    const auto task = std::ranges::find(tasks, word, &Task_Name::name);
+    if (task == tasks.end() || word.empty())
+        return Is_Misspelt_Task(word) ? Usage_Error : Run_Task(Task::convert, argc, argv);
+    return task->task == Task::formats ? Run_Formats(argc - 1, argv + 1)
+                                       : Run_Task(task->task, argc - 1, argv + 1);
 }

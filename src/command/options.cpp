@@ -1,9 +1,11 @@
 #include "command/options.h"
 
+#include "command/usage.h"
 #include "interface/paths.h"
 #include "interface/people_options.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <array>
 #include <cstdio>
 
@@ -11,9 +13,21 @@ namespace ingester {
 
 namespace {
 
-constexpr const char* Description = "Converts a table from one file format to another.\n"
-                                    "The input's content decides how it is read, the output's extension how "
-                                    "it is written.";
+constexpr Task_Name Tasks[] = {
+    {Task::convert, "",
+     "Converts a table from one file format to another.\n"
+     "The input's content decides how it is read, the output's extension how it is written."},
+    {Task::info, "info", "Tells what a file is, and what each of its columns holds."},
+    {Task::head, "head",
+     "Shows the first rows of a table: beside each other on a terminal, with tabs between them elsewhere."},
+    {Task::summary, "summary", "Tells the type and statistics of each column."},
+    {Task::sheets, "sheets",
+     "Lists the sheets of a file, a line each, in their order.\n"
+     "A file of a format that holds one table has one sheet."},
+    {Task::formats, "formats",
+     "Lists the formats that are read and written.\n"
+     "Inputs are known by their content, outputs by their extension."},
+};
 
 constexpr const char* Examples = R"(Examples:
   ingester crops.csv crops.tab
@@ -44,19 +58,17 @@ constexpr const char* Examples = R"(Examples:
       the rows of june.csv go beneath those of all.csv
   ingester heights.csv plots.csv --merge plot
       rows are joined by the column plot
+  ingester info crops.csv
+      what the file and each of its columns hold; --json tells it to programs
+  ingester head crops.csv -n 5 --keep plot,yield
+      its first rows
   ingester summary crops.csv
-      what each column holds
+      statistics of each column
   ingester formats
       the formats that are read and written
 
 Exit status: 0 when the output is complete; 1 to 19 when a request failed, as messages on standard
-error say (6: the output; 7: the table has no rows); above 100 when the command line is wrong.)";
-
-/// Merging is told by names of columns; the option language has a list file for them.
-struct Merge_Choice {
-    bool into_equal_names = false;
-    std::string rows = "all";
-};
+error say (6: the output; 7: the table has no rows); 64 when the command line is wrong.)";
 
 std::string Check_Merge_Key(const std::string& key)
 {
@@ -113,7 +125,7 @@ bool Add_Named_Options(Command_Options& options)
     return true;
 }
 
-bool Add_Merge_Option(Command_Options& options, const Merge_Choice& merge)
+bool Add_Merge_Option(Command_Options& options)
 {
     constexpr std::size_t most_keys = 4;
     if (options.merge_keys.empty())
@@ -129,7 +141,7 @@ bool Add_Merge_Option(Command_Options& options, const Merge_Choice& merge)
         std::fprintf(stderr, "ingester: --merge: %s\n", fault);
         return false;
     }
-    options.output_options.insert(0, Merge_Option(options.merge_keys.size(), merge));
+    options.output_options.insert(0, Merge_Option(options.merge_keys.size(), options.merge));
     return true;
 }
 
@@ -148,20 +160,16 @@ void Offer_Host_Rules(CLI::App& app, std::bitset<People_Rule_Count>& host_rules)
             ->group(group);
 }
 
-}  // namespace
-
-std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
+void Offer_Input(CLI::App& app, Command_Options& options)
 {
-    CLI::App app{Description, "ingester"};
-    app.set_version_flag("--version", "ingester " INGESTER_VERSION);
-    app.set_help_flag("-h,--help", "Print this help and exit");
-    app.footer(Examples);
-    app.add_option("INPUT", options.input, "File or URL to read; - is standard input")
+    app.add_option(options.task == Task::convert ? "INPUT" : "FILE", options.input,
+                   "File or URL to read; - is standard input")
         ->required()
         ->check(Check_Not_Empty);
-    app.add_option("OUTPUT", options.output, "File to write; - is comma text on standard output")
-        ->required()
-        ->check(Check_Not_Empty);
+    if (options.task == Task::convert)
+        app.add_option("OUTPUT", options.output, "File to write; - is comma text on standard output")
+            ->required()
+            ->check(Check_Not_Empty);
     app.add_option("--sheet", options.sheet, "Sheet to read, of a file that holds several")
         ->type_name("NAME");
     app.add_option("--range", options.range, "Cells to read; of text files, lines as FIRST:LAST")
@@ -169,40 +177,118 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
     app.add_option("--in-options", options.input_options, "Slash options of the input")
         ->type_name("TEXT")
         ->check(Check_Slash_Options);
-    app.add_option("--out-options", options.output_options,
-                   "Slash options of the output; folders in values take backslashes")
-        ->type_name("TEXT")
-        ->check(Check_Slash_Options);
-    Merge_Choice merge;
+    app.add_flag("-q,--quiet", options.quiet, "Show no progress");
+    Offer_Choices(app, options.chosen);
+    Offer_Host_Rules(app, options.host_rules);
+    const std::array input_tables = {People_Options(), Genotype_Options(), Input_Options()};
+    Offer_Named_Options(app, "Options of the input", input_tables, options.named_input_options);
+}
+
+void Offer_Merge(CLI::App& app, Command_Options& options)
+{
     app.add_option("--merge", options.merge_keys,
                    "Merge with the existing output by this column, or two of different names: of the output "
                    "and of the input; up to four times")
         ->type_name("KEY[=KEY]")
         ->allow_extra_args(false)
         ->check(Check_Merge_Key);
-    app.add_flag("--merge-equal-names", merge.into_equal_names,
+    app.add_flag("--merge-equal-names", options.merge.into_equal_names,
                  "With --merge: columns of equal names are written into those of the output");
-    app.add_option("--merge-rows", merge.rows,
+    app.add_option("--merge-rows", options.merge.rows,
                    "With --merge: input rows that make new ones: all without a partner, copies for keys "
                    "that are there, or none")
         ->check(CLI::IsMember({"all", "copies", "none"}));
+}
+
+void Offer_Output(CLI::App& app, Command_Options& options)
+{
+    app.add_option("--out-options", options.output_options,
+                   "Slash options of the output; folders in values take backslashes")
+        ->type_name("TEXT")
+        ->check(Check_Slash_Options);
+    Offer_Merge(app, options);
     app.add_flag("--padded", options.padded, "Comma text with blanks that keep its columns in line");
     app.add_flag("-f,--force", options.force, "Replace an output that exists");
-    app.add_flag("-q,--quiet", options.quiet, "Show no progress");
     app.add_flag("--dry-run", options.dry_run, "Print the request that would be sent, and stop");
-    Offer_Choices(app, options.chosen);
-    Offer_Host_Rules(app, options.host_rules);
-    const std::array input_tables = {People_Options(), Genotype_Options(), Input_Options()};
     const std::array output_tables = {Output_Options()};
-    Offer_Named_Options(app, "Options of the input", input_tables, options.named_input_options);
     Offer_Named_Options(app, "Options of the output", output_tables, options.named_output_options);
+}
+
+/// Options that only one task has.
+void Offer_Own_Options(CLI::App& app, Command_Options& options)
+{
+    if (options.task == Task::convert)
+        Offer_Output(app, options);
+    if (options.task == Task::info)
+        app.add_flag("--json", options.json, "Print all of it as JSON, for programs");
+    if (options.task == Task::head)
+        app.add_option("-n,--lines", options.rows, "Rows to show, 10 without this option")
+            ->type_name("N")
+            ->check(CLI::NonNegativeNumber);
+}
+
+/// What a task that writes nothing asks of the library. A table is looked at with all that the file holds.
+void Ask_For_Task(Command_Options& options)
+{
+    constexpr std::string_view keep_empty_columns = "/k";
+    const bool looks = options.task == Task::info || options.task == Task::head;
+    if (options.task == Task::summary) {
+        options.output = "/dev/null";
+        options.input_options.insert(0, "/db");
+    } else if (options.task == Task::sheets) {
+        // The list is a table of one column: its cells alone, without names and quotes.
+        options.input_options.insert(0, "/w");
+        options.output_options = "/h/n/-";
+    } else if (looks) {
+        options.output_options = "/e";
+        if (options.input_options.find(keep_empty_columns) == std::string::npos)
+            options.input_options.insert(0, keep_empty_columns);
+    }
+    if (options.task == Task::sheets || looks)
+        options.output = Standard_Stream;
+}
+
+}  // namespace
+
+std::span<const Task_Name> Task_Names()
+{
+    return Tasks;
+}
+
+const Task_Name& Name_Of(Task task)
+{
+    return *std::ranges::find(Tasks, task, &Task_Name::task);
+}
+
+std::string_view Command_Examples()
+{
+    return Examples;
+}
+
+void Offer_Options(CLI::App& app, Command_Options& options)
+{
+    app.set_version_flag("--version", "ingester " INGESTER_VERSION);
+    app.set_help_flag("-h,--help", "Print this help and exit");
+    if (options.task == Task::convert)
+        app.footer(Examples);
+    Offer_Input(app, options);
+    Offer_Own_Options(app, options);
+}
+
+std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
+{
+    const Task_Name& task = Name_Of(options.task);
+    CLI::App app{std::string(task.description),
+                 std::string("ingester").append(task.name.empty() ? "" : " ").append(task.name)};
+    Offer_Options(app, options);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& end) {
-        return app.exit(end);
+        return End_Parsing(app, end);
     }
-    if (!Add_Named_Options(options) || !Add_Merge_Option(options, merge))
-        return Wrong_Values;
+    if (!Add_Named_Options(options) || !Add_Merge_Option(options))
+        return Usage_Error;
+    Ask_For_Task(options);
     return std::nullopt;
 }
 

@@ -38,6 +38,13 @@ bool Decompress(Gzip_File& packed, Output_File& plain, std::uint64_t most)
 
 }  // namespace
 
+std::string_view Name_Inside_Packing(std::string_view file_name)
+{
+    constexpr std::string_view packed = ".gz";
+    return Ends_Ignoring_Case(file_name, packed) ? file_name.substr(0, file_name.size() - packed.size())
+                                                 : file_name;
+}
+
 std::string Decompressed_Name(std::string_view file_name)
 {
     const long pid = Process_Id();

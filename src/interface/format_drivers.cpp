@@ -53,6 +53,8 @@ std::span<const Format_Driver> All_Formats()
 const Format_Driver& Output_Driver_Of(std::string_view file_name)
 {
     const bool further = For_People(People_Rule::further_endings);
+    if (further)
+        file_name = Name_Inside_Packing(file_name);
     for (const Format_Driver& driver : Format_Drivers)
         if (Ends_With_One_Of(file_name, driver.extensions)
             || (further && Ends_With_One_Of(file_name, driver.people_extensions)))

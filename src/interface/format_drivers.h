@@ -16,7 +16,8 @@ namespace ingester {
 /// All formats, by code.
 [[nodiscard]] std::span<const Format_Driver> All_Formats();
 
-/// The format of an output, by the name's extension; fixed-width text for an unknown one.
+/// The format of an output, by the name's extension, for people by the one in front of ".gz"; fixed-width
+/// text for an unknown one.
 [[nodiscard]] const Format_Driver& Output_Driver_Of(std::string_view file_name);
 
 /// The format of a code, of an input or an output; null when there is none.

@@ -36,11 +36,6 @@ std::string Line_Of(const Loss& loss)
     return line + ".\n";
 }
 
-std::string In_Utf8(std::string_view text)
-{
-    return std::string(Sure_Converter(Code_Of_Letters(), Utf_8_Code()).Convert(text));
-}
-
 /// One entry, in an order that people like to read.
 nlohmann::ordered_json Entry_Of(const Loss& loss)
 {

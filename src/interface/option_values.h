@@ -116,6 +116,11 @@ constexpr Named_Option Quoted(std::string_view name, std::string_view value)
     return {name, Value_Form::quoted, value};
 }
 
+constexpr Named_Option Quoted_Or_Empty(std::string_view name, std::string_view value)
+{
+    return {.name = name, .form = Value_Form::quoted, .value = value, .takes_empty = true};
+}
+
 constexpr Named_Option Optional(std::string_view name, std::string_view value, std::string_view join = "=")
 {
     return {name, Value_Form::optional, value, join};

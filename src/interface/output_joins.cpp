@@ -31,7 +31,8 @@ public:
         own.Worksheet_Name = asked_.Update_Sheet_Name;
         own.Names_Kept_As_They_Stand = asked_.Names_Kept_As_They_Stand;
         // As an output of these options was written before:
-        own.Missing_Input_Text = asked_.Missing_Text.view();
+        if (!asked_.Missing_Text.empty())
+            own.Missing_Input_Text = asked_.Missing_Text.view();
         own.No_Names = asked_.Omit_Header;
         own.Names_Given = asked_.Names_Given && !asked_.Omit_Header;
         request = std::move(own);

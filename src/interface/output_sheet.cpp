@@ -56,8 +56,8 @@ bool Find_Output_Sheet(const std::string& output_name)
     if (!File_Exists(output_name))
         return true;
     // Of formats that hold one table nothing is asked: what is wrong with the file is told when it is read.
-    const bool several =
-        Ends_Ignoring_Case(output_name, ".gz") || Output_Driver_Of(output_name).sheet_names != nullptr;
+    const bool hidden = !For_People(People_Rule::further_endings) && Ends_Ignoring_Case(output_name, ".gz");
+    const bool several = hidden || Output_Driver_Of(output_name).sheet_names != nullptr;
     const auto listed = several ? List_Sheet_Names(output_name) : std::vector<std::string>{};
     if (!listed)
         return false;

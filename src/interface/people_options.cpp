@@ -24,6 +24,8 @@ constexpr std::array<People_Rule_Option, People_Rule_Count> Rules = {{
     {People_Rule::kept_levels, "/+levels", "host-levels",
      "joins match Factors by their lists alone, and numbers with the nearest level"},
     {People_Rule::further_dates, "/+dates", "host-dates", "dates are read in the host's forms only"},
+    {People_Rule::plain_texts, "/+plain", "host-output",
+     "comma text and tabs are written as for a host: marks behind names, * for missing, CR LF"},
 }};
 
 constexpr Slash_Option Others[] = {
@@ -35,6 +37,13 @@ constexpr Slash_Option Others[] = {
      {"report", Value_Form::path, "FILE"}},
     {"/+encoding=", Take_Text<&R::Input_Encoding>, "code of the input's letters, as UTF-8, latin1 or 850",
      Bare("encoding", "NAME")},
+    {"/+marks", Set<&R::Write_Marks, true>,
+     "texts get marks behind names, ! for Factors, :D for dates, :T for times, and * for missing",
+     Flag("marks")},
+    {"/+crlf", Set<&R::Write_Crlf, true>, "lines of texts end with CR LF", Flag("crlf")},
+    {"/+write-encoding=", Take_Text<&R::Output_Encoding>, "code of the letters in texts that are written",
+     Bare("write-encoding", "NAME")},
+    {"/+bom", Set<&R::Write_Code_Mark, true>, "texts begin with the mark of Unicode", Flag("bom")},
     {"/+secondary=",
      Take_Text<&R::Named_Secondary_File>,
      "second file that some inputs need",

@@ -13,7 +13,7 @@ namespace {
 /// Every stage, in the order in which they act; the first that doesn't succeed ends the request.
 constexpr Stage Stages[] = {
     Take_Rules_For_People,
-    Know_Encoding,
+    Know_Encodings,
     Expand_Tokens,
     Fetch_Named_Secondary,
     Cut_Genotype_Options,
@@ -51,6 +51,7 @@ constexpr Stage Stages[] = {
     Change_By_List,
     Mark_Source,
     Fit_Names_To_Output,
+    Keep_Manner_Of_Output,
     Join_With_Output,
     Keep_Range_Of_Columns,
     Fit_Names_To_Output,
@@ -59,6 +60,7 @@ constexpr Stage Stages[] = {
     Mark_Source,
     Find_Fixed_Decimals,
     Tell_Summary,
+    Show_Sheet,
 
     Make_Output_Form,
     Refuse_Losses,
@@ -68,6 +70,7 @@ constexpr Stage Stages[] = {
     Report_Losses,
     Write_Column_List,
     Fill_Clipboard,
+    Pack_Output,
     Replace_Old_Output,
 };
 
@@ -99,7 +102,8 @@ Request_Status Process_Request(std::string infile, std::string outfile, std::int
     run.infile = std::move(infile);
     run.outfile = std::move(outfile);
     const Request_Status status = Run_Stages(run);
-    Tell_Losses();
+    if (!run.reported)
+        Tell_Losses();
     if (!run.reported && !request.Loss_Report_Name.empty())
         static_cast<void>(Write_Loss_Report(request.Loss_Report_Name));  // the request has failed already
     rows = Current_Sheet == nullptr ? 0 : Current_Sheet->row_count;

@@ -231,6 +231,7 @@ Taken Take_Missing_Text(std::string_view text, std::size_t at)
 {
     const Option_Value value = Quoted_Or_Bare(text, at, "'", Option_Start);
     request.Missing_Text = value.text;
+    request.Missing_Text_Given = true;
     return value.end;
 }
 
@@ -367,7 +368,7 @@ Taken Take_No_Effect(std::string_view, std::size_t at)
 }
 
 constexpr Slash_Option Output_Table[] = {
-    {"/mv=", Take_Missing_Text, "how a missing value prints", Quoted("write-missing", "TEXT")},
+    {"/mv=", Take_Missing_Text, "how a missing value prints", Quoted_Or_Empty("write-missing", "TEXT")},
     {"/av", Set<&R::Write_Via_Temp, false>, "write over an existing output directly", Flag("write-in-place")},
     {"/*", Set<&R::No_Return, true>, "no RETURN in the script", Flag("no-return")},
     {"/a", Take_Add, "add the sheet to an existing book, under this name", Quoted("add-sheet", "NAME")},

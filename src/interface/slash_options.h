@@ -26,6 +26,7 @@ struct Named_Option {
     Value_Form form = Value_Form::none;
     std::string_view value = {};  ///< the value in the help
     std::string_view join = "=";  ///< between key and value, unless the key ends with it
+    bool takes_empty = false;     ///< no text at all is a value
 };
 
 /// One option. `take` acts on what stands behind the key at `at` and returns the end of what it took.

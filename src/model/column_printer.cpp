@@ -19,11 +19,18 @@ Column_Printer::Kind Kind_Of(const Column& column)
 int Digits_Of(const Column& column, Number_Print numbers, int digits)
 {
     constexpr int all_digits = 15;
-    if (column.format == date_format_mark || numbers == Number_Print::by_format)
+    const bool by_rule = numbers == Number_Print::by_format || numbers == Number_Print::for_others;
+    if (column.format == date_format_mark || by_rule)
         return 0;
     if (numbers == Number_Print::general)
         return digits;
     return column.decimals >= 0 ? 0 : all_digits;
+}
+
+Iso_Form Iso_Form_For(const Column& column, Number_Print numbers)
+{
+    const bool dates = numbers == Number_Print::for_others && column.format == date_format_mark;
+    return dates ? Iso_Form_Of(column) : Iso_Form::number;
 }
 
 char* Print_Level_Value(char* target, const Column& factor, double value, Number_Print rule, int digits)
@@ -50,15 +57,22 @@ std::vector<const char*> Printed_Levels(const Column& factor, Number_Print level
     std::vector<const char*> printed;
     if (factor.factor_kind != factor_with_levels)
         return printed;
+    const Iso_Form iso_form = Iso_Form_For(factor, level_values);
     char text[Number_Text_Room];
-    for (const Level_Node* node = factor.level_values; node != nullptr; node = node->next)
-        printed.push_back(
-            room.Store({text, Print_Level_Value(text, factor, node->value.number, level_values, digits)}));
+    for (const Level_Node* node = factor.level_values; node != nullptr; node = node->next) {
+        const double value = node->value.number;
+        char* const end = level_values == Number_Print::for_others
+                              ? Print_For_Others(text, factor, iso_form, value)
+                              : Print_Level_Value(text, factor, value, level_values, digits);
+        printed.push_back(room.Store({text, end}));
+    }
     return printed;
 }
 
 Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules)
-    : column_(&column), digits_(Digits_Of(column, rules.numbers, rules.digits)), kind_(Kind_Of(column))
+    : column_(&column), digits_(Digits_Of(column, rules.numbers, rules.digits)),
+      for_others_(rules.numbers == Number_Print::for_others), iso_form_(Iso_Form_For(column, rules.numbers)),
+      kind_(Kind_Of(column))
 {
     if (kind_ != Kind::factor)
         return;

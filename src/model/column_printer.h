@@ -1,6 +1,7 @@
 // What the cells of a Column print as, on their way out of the model.
 #pragma once
 
+#include "model/iso_dates.h"
 #include "model/number_format.h"
 #include "model/sheet.h"
 #include "support/number_text.h"
@@ -13,11 +14,12 @@
 
 namespace ingester {
 
-/// How numbers print; dates always print by their Column's format.
+/// How numbers print; dates print by their Column's format but where others are to read them.
 enum class Number_Print : std::uint8_t {
-    general,    ///< with `digits` digits
-    by_format,  ///< by the Column's format and decimals
-    as_said,    ///< the same where the Column says its decimals, else with all digits
+    general,     ///< with `digits` digits
+    by_format,   ///< by the Column's format and decimals
+    as_said,     ///< the same where the Column says its decimals, else with all digits
+    for_others,  ///< as any program reads the same again: all digits that it takes, ISO dates
 };
 
 struct Printing_Rules {
@@ -53,10 +55,13 @@ public:
     [[nodiscard]] std::string_view Print(const Cell_Node& cell, char* room,
                                          const Missing_Prints& missing = {}) const;
 
-    /// Prints a number that is not missing. Returns the end of the text.
+    /// Prints a number that is not missing; nothing for a date that others can't read. Returns the end of the
+    /// text.
     char* Print_Number(char* target, double value) const
     {
-        return digits_ > 0 ? Print_General(target, value, digits_)
+        if (digits_ > 0)
+            return Print_General(target, value, digits_);
+        return for_others_ ? Print_For_Others(target, *column_, iso_form_, value)
                            : Format_Cell_Number(target, *column_, value);
     }
 
@@ -80,7 +85,9 @@ private:
     const Column* column_;
     std::vector<std::string> levels_;  ///< short ones stand in the list itself, so that a look-up is one
     double level_end_ = 0;
-    int digits_ = 0;  ///< 0: by the Column's format
+    int digits_ = 0;  ///< 0: by the Column's format, or for others
+    bool for_others_ = false;
+    Iso_Form iso_form_ = Iso_Form::number;  ///< of dates, for others
     Kind kind_;
 };
 

@@ -123,24 +123,34 @@ bool Deflate(Input_File& source, z_stream& stream, Output_File& target)
     return !source.Failed();
 }
 
-}  // namespace
-
-bool Compress_File(std::string_view from, std::string_view to)
+bool Deflate_Into(Output_File& target, std::string_view from, int level)
 {
     constexpr int usual_memory = 8;
     const auto end = [](z_stream* stream) { deflateEnd(stream); };
     z_stream stream = New_Stream();
-    if (deflateInit2(&stream, Z_BEST_COMPRESSION, Z_DEFLATED, Gzip_Window, usual_memory, Z_DEFAULT_STRATEGY)
-        != Z_OK)
+    if (deflateInit2(&stream, level, Z_DEFLATED, Gzip_Window, usual_memory, Z_DEFAULT_STRATEGY) != Z_OK)
         return false;
     const std::unique_ptr<z_stream, decltype(end)> ending(&stream, end);
-    Scratch_File scratch{std::string(to)};
     Input_File source;
+    return source.Open(from) && Deflate(source, stream, target) && target.Close();
+}
+
+}  // namespace
+
+bool Compress_File(std::string_view from, std::string_view to)
+{
+    Scratch_File scratch{std::string(to)};
     Output_File target;
-    if (!source.Open(from) || !target.Open_Scratch(to) || !Deflate(source, stream, target) || !target.Close())
+    if (!target.Open_Scratch(to) || !Deflate_Into(target, from, Z_BEST_COMPRESSION))
         return false;
     scratch.Keep();
     return true;
+}
+
+bool Pack_File(std::string_view from, std::string_view to)
+{
+    Output_File target;
+    return target.Open(to) && Deflate_Into(target, from, Z_DEFAULT_COMPRESSION);
 }
 
 }  // namespace ingester

@@ -41,4 +41,8 @@ private:
 /// either fails.
 [[nodiscard]] bool Compress_File(std::string_view from, std::string_view to);
 
+/// Packs all bytes of `from` into the new file `to`, quickly. False when either fails; what is written then
+/// is no file in gzip form.
+[[nodiscard]] bool Pack_File(std::string_view from, std::string_view to);
+
 }  // namespace ingester

@@ -483,6 +483,13 @@ Text_Converter Sure_Converter(Text_Code from, Text_Code to)
     return converter;
 }
 
+std::string In_Utf8(std::string_view text)
+{
+    if (Letters_Are_Utf8() || Is_Ascii(text))
+        return std::string(text);
+    return std::string(Sure_Converter(Code_Of_Letters(), Utf_8_Code()).Convert(text));
+}
+
 bool Text_Converter::Open(Text_Code from, Text_Code to)
 {
     auto steps = std::make_unique<Steps>();

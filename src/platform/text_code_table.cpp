@@ -1,11 +1,11 @@
 // The codes by their names.
 #include "platform/text_codes.h"
+#include "support/edit_distance.h"
 #include "support/letters.h"
 #include "support/text.h"
 
 #include <algorithm>
 #include <iterator>
-#include <numeric>
 #include <utility>
 
 namespace ingester {
@@ -118,34 +118,16 @@ bool Has_Alias(std::string_view aliases, std::string_view bare)
     return false;
 }
 
-/// How many letters must be put in, taken out or changed to make one text of the other.
-std::size_t Distance(std::string_view a, std::string_view b)
-{
-    std::vector<std::size_t> costs(b.size() + 1);
-    std::iota(costs.begin(), costs.end(), 0);
-    for (std::size_t i = 1; i <= a.size(); ++i) {
-        std::size_t diagonal = std::exchange(costs[0], i);
-        for (std::size_t j = 1; j <= b.size(); ++j) {
-            const std::size_t changed = diagonal + (a[i - 1] == b[j - 1] ? 0 : 1);
-            diagonal = std::exchange(costs[j], std::min({changed, costs[j] + 1, costs[j - 1] + 1}));
-        }
-    }
-    return costs.back();
-}
-
-}  // namespace
-
-namespace {
-
 /// To the nearest of a code's names.
 std::size_t Least_Distance(const std::string& bare, const Text_Code_Facts& code)
 {
-    std::size_t least = Distance(bare, Bare_Name(code.name));
+    std::size_t least = Edit_Distance(bare, Bare_Name(code.name));
     if (code.page != 0)
-        least = std::min(least, Distance(std::string(Without_Page_Word(bare)), std::to_string(code.page)));
+        least =
+            std::min(least, Edit_Distance(std::string(Without_Page_Word(bare)), std::to_string(code.page)));
     for (std::string_view rest = code.aliases; !rest.empty();) {
         const std::size_t end = std::min(rest.find(' '), rest.size());
-        least = std::min(least, Distance(bare, std::string(rest.substr(0, end))));
+        least = std::min(least, Edit_Distance(bare, std::string(rest.substr(0, end))));
         rest.remove_prefix(std::min(end + 1, rest.size()));
     }
     return least;

@@ -32,6 +32,12 @@ struct Text_Code_Facts {
 /// One of the codes that are offered; null for none.
 using Text_Code = const Text_Code_Facts*;
 
+/// Whether a code has every letter, and a mark that tells it at the head of a file.
+[[nodiscard]] inline bool Is_Unicode(Text_Code code)
+{
+    return code->kind < Code_Kind::one_byte;
+}
+
 /// By a name, as "Latin1" or "ISO_8859-1", or a page, as "cp1252" or "65001": case and signs don't count.
 [[nodiscard]] Text_Code Find_Text_Code(std::string_view name);
 [[nodiscard]] Text_Code Text_Code_Of_Page(std::int32_t page);
@@ -77,6 +83,9 @@ private:
     class Steps;
     std::unique_ptr<Steps> steps_;
 };
+
+/// A text of the request as the world outside knows it.
+[[nodiscard]] std::string In_Utf8(std::string_view text);
 
 /// A converter that can always be had, between UTF-8, UTF-16, UTF-32 and Windows-1252.
 [[nodiscard]] Text_Converter Sure_Converter(Text_Code from, Text_Code to);

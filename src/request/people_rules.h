@@ -16,8 +16,9 @@ enum class People_Rule : std::uint8_t {
     further_types,    ///< inputs are recognised that hosts take for text, or for nothing
     kept_levels,    ///< joins match levels by what they say, add those that are new, and keep labels of units
     further_dates,  ///< dates are read in more of their usual forms
+    plain_texts,    ///< comma text and tabs are written as other programs take them
 };
-constexpr std::size_t People_Rule_Count = 8;
+constexpr std::size_t People_Rule_Count = 9;
 
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);

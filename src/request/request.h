@@ -1,6 +1,7 @@
 // The globals of one request: what the call asked for, as every floor may read it.
 #pragma once
 
+#include "request/input_facts.h"
 #include "request/losses.h"
 #include "request/people_rules.h"
 #include "request/settings.h"
@@ -45,7 +46,11 @@ struct Request_Globals : Lasting_Globals {
     bool Strict = false;                    ///< a loss makes the request fail
     Fixed_Text<Long_Name_Width> Loss_Report_Name;
     Fixed_Text<Long_Name_Width> Named_Secondary_File;  ///< by an option, beside lists of the pass file
-    Fixed_Text<60> Input_Encoding;  ///< the code of the input's letters, as it was declared
+    Fixed_Text<60> Input_Encoding;   ///< the code of the input's letters, as it was declared
+    Fixed_Text<60> Output_Encoding;  ///< the code of texts that are written; empty: that of all letters
+    bool Write_Marks = false;        ///< types are told behind names, and missing is "*"
+    bool Write_Crlf = false;
+    bool Write_Code_Mark = false;  ///< the mark of Unicode comes first
 
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
@@ -71,6 +76,7 @@ struct Request_Globals : Lasting_Globals {
     bool Rows_Were_Selected = false;     ///< the same of the rows
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     Loss_Ledger losses;                  ///< what could not be kept
+    Input_Facts input_facts;             ///< what the reader found of the file's form
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int64_t Column_Wanted_Count = 0;           ///< of the list's lines, as it says; 0 where it doesn't
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place
@@ -122,6 +128,7 @@ struct Request_Globals : Lasting_Globals {
 
     // Output options.
     Fixed_Text<90> Missing_Text = "*";
+    bool Missing_Text_Given = false;
     bool Write_Via_Temp = true;
     bool No_Return = false;
     bool Add_To_Output = false;

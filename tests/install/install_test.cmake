@@ -16,7 +16,9 @@ endfunction()
 
 function(test_prefix)
     run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${prefix})
-    foreach(file ${library} ${prefix}/bin/ingester ${prefix}/include/ingester/ingester.h)
+    foreach(file ${library} ${prefix}/bin/ingester ${prefix}/include/ingester/ingester.h
+            ${prefix}/share/man/man1/ingester.1 ${prefix}/share/bash-completion/completions/ingester
+            ${prefix}/share/zsh/site-functions/_ingester)
         if(NOT EXISTS ${file})
             message(FATAL_ERROR "not installed: ${file}")
         endif()

@@ -50,6 +50,8 @@ inline const Request_Kind Kinds[] = {
     {{"in.csv", "o.tbk/%=1U/!=Second"}, {"in.csv", "in.mrg", "o.tbk"}},
     {{"in.csv/+people", "o.tss"}, {"in.csv", "o.tss"}},
     {{"in.csv/+people/+encoding=932", "o.csv"}, {"in.csv", "o.csv"}},
+    {{"in.csv/+people", "new.csv.gz"}, {"in.csv"}},
+    {{"in.csv/+people", "o.csv.gz/@"}, {"in.csv", "o.csv.gz"}},
     {{"in.csv/+people/+strict", "o.tbk/a=Added"}, {"in.csv", "o.tbk"}},
 };
 

@@ -68,7 +68,7 @@ protected:
         Put("rows", "5\n1\n0\n1\n1\n0\n");
         for (const auto& [input, output] : Made)
             ASSERT_EQ(Convert(input, output).first, 0) << output;
-        for (const char* const name : {"in.csv", "in.tbk", "o.tbk"})
+        for (const char* const name : {"in.csv", "in.tbk", "o.csv", "o.tbk"})
             ASSERT_TRUE(Compress_File(Request_Name(name), Request_Name(name) + ".gz"));
         stock_ = All_Files();
         testing::internal::CaptureStdout();  // summaries of columns go there

@@ -5,8 +5,10 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <bit>
 #include <cerrno>
+#include <charconv>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -116,6 +118,37 @@ TEST(Number_Text, Parses_As_The_C_Library_Does)
         }
     }
     EXPECT_EQ(Parse_Number(nullptr, nullptr).status, Number_Status::none);
+}
+
+/// Without the exponent and the zeros at either end.
+std::size_t Digits_In(std::string text)
+{
+    text.resize(std::min(text.find('e'), text.size()));
+    std::erase_if(text, [](char c) { return !Is_Digit(c); });
+    const std::size_t first = text.find_first_not_of('0');
+    return first == text.npos ? 0 : text.find_last_not_of('0') + 1 - first;
+}
+
+TEST(Number_Text, Prints_No_More_Digits_Than_Are_Read_Back)
+{
+    Random random(3);
+    for (int i = 0; i < 300000; ++i) {
+        double value = std::bit_cast<double>(random());
+        if (i % 3 > 0)  // with few digits, or one step beside such a number
+            value =
+                static_cast<double>(random() % 1000000000) / std::pow(10, static_cast<double>(random() % 12));
+        if (i % 3 > 1)
+            value = std::nextafter(value, 0);
+        if (!std::isfinite(value))
+            continue;
+        char text[Number_Text_Room + 1] = {};
+        char* const end = Print_Exactly(text, value);
+        ASSERT_EQ(std::strtod(text, nullptr), value) << text;
+        char least[Number_Text_Room];
+        const auto shortest = std::to_chars(least, std::end(least), value, std::chars_format::scientific);
+        ASSERT_TRUE(std::fabs(value) >= 1e15 || Digits_In({text, end}) <= Digits_In({least, shortest.ptr}))
+            << text;
+    }
 }
 
 }  // namespace

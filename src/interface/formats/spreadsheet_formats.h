@@ -49,6 +49,7 @@ constexpr Format_Driver Spreadsheet_Formats[] = {
     {.code = tab_text_file,
      .name = "text with tabs",
      .extensions = ".tab",
+     .people_extensions = ".tsv",
      .clipboard_extensions = ".tab",
      .write = Write_Text<true>,
      .names = Held_Names::free_for_people},

@@ -1,5 +1,6 @@
 // Stages that take the two strings apart and find out what they name.
 #include "interface/clipboard.h"
+#include "interface/compressed_files.h"
 #include "interface/file_detection.h"
 #include "interface/output_joins.h"
 #include "interface/paths.h"
@@ -43,16 +44,27 @@ Request_Status Take_Rules_For_People(Request_Run& run)
     return Done;
 }
 
+namespace {
+
 /// A code that nobody knows would be taken for none.
-Request_Status Know_Encoding(Request_Run&)
+bool Encoding_Is_Known(const char* name)
 {
-    if (request.Input_Encoding.empty() || Find_Text_Code(request.Input_Encoding) != nullptr)
-        return Done;
+    if (*name == '\0' || Find_Text_Code(name) != nullptr)
+        return true;
     std::string near;
-    for (const std::string_view name : Nearest_Code_Names(request.Input_Encoding))
-        near.append(near.empty() ? "" : ", ").append(name);
-    return Stop(Request_Status::not_imported, "Error: The encoding %s is not known. The nearest ones: %s.\n",
-                request.Input_Encoding.c_str(), near.c_str());
+    for (const std::string_view other : Nearest_Code_Names(name))
+        near.append(near.empty() ? "" : ", ").append(other);
+    return Fail("Error: The encoding %s is not known. The nearest ones: %s.\n", name, near.c_str());
+}
+
+}  // namespace
+
+Request_Status Know_Encodings(Request_Run&)
+{
+    return Encoding_Is_Known(request.Input_Encoding.c_str())
+                   && Encoding_Is_Known(request.Output_Encoding.c_str())
+               ? Done
+               : Request_Status::not_imported;
 }
 
 Request_Status Fetch_Named_Secondary(Request_Run& run)
@@ -307,6 +319,8 @@ Request_Status Choose_Output(Request_Run& run)
     if (run.clipboard_output && !Ends_With_One_Of(run.outfile, run.output->clipboard_extensions))
         return Stop(Request_Status::output_failed, "Clipboard format not supported.\n");
     run.output_code = run.output->code;
+    run.packed = For_People(People_Rule::further_endings) && !run.clipboard_output
+                 && Name_Inside_Packing(run.outfile) != run.outfile;
     request.CSV_Output = run.output_code == text_file && !Is_Fixed_Width_Text(*run.output);
     request.Max_Columns = static_cast<std::int32_t>(
         std::min<std::int64_t>(std::int64_t{run.output->max_columns} + std::max(request.First_Column - 1, 0),
@@ -411,7 +425,10 @@ struct Missing_Operation {
 
 constexpr Missing_Operation Missing_Operations[] = {
     {[](const Request_Run& run) { return run.genotype; }, "Reading genotype files"},
-    {[](const Request_Run& run) { return Adds_To_Compressed(run.outfile) && run.output_code != book_file; },
+    {[](const Request_Run& run) {
+         const bool rewritten = run.packed && !Is_Fixed_Width_Text(*run.output);
+         return Adds_To_Compressed(run.outfile) && run.output_code != book_file && !rewritten;
+     },
      "Adding to a compressed output"},
     {[](const Request_Run& run) {
          return request.Add_To_Output && run.output->add == nullptr && File_Exists(run.outfile);

@@ -7,6 +7,7 @@
 #include "model/output_forms.h"
 #include "model/sheet.h"
 #include "platform/files.h"
+#include "platform/gzip_file.h"
 #include "request/losses.h"
 #include "request/request.h"
 
@@ -30,6 +31,15 @@ bool Copy_Into(const std::string& from, const std::string& special)
 
 }  // namespace
 
+namespace {
+
+std::string Scratch_Output()
+{
+    return Get_Temp_Folder().append("OUT").append(request.Scratch_Stem).append(".$$$");
+}
+
+}  // namespace
+
 /// An existing output is written beside itself, so that it stays whole until the new one is.
 Request_Status Name_Temporary_Output(Request_Run& run)
 {
@@ -42,9 +52,12 @@ Request_Status Name_Temporary_Output(Request_Run& run)
     const bool special = Is_Special_File(run.outfile);
     request.Write_Via_Temp = (request.Write_Via_Temp || request.Strict) && run.output_was_there && !special;
     run.temp_output = run.outfile;
-    if (special && request.Strict) {  // it gets nothing before it is known that nothing was lost
-        run.held_back = true;
-        run.temp_output = Get_Temp_Folder().append("OUT").append(request.Scratch_Stem).append(".$$$");
+    run.packed = run.packed && !run.Updates_Output();
+    run.held_back = special && request.Strict;  // it gets nothing before it is known that nothing was lost
+    if (run.held_back || run.packed) {
+        request.Write_Via_Temp = run.output_was_there;
+        run.held_back = special;
+        run.temp_output = Scratch_Output();
         return Done;
     }
     if (!request.Write_Via_Temp || run.Updates_Output())
@@ -123,9 +136,23 @@ Request_Status Fill_Clipboard(Request_Run& run)
     return Done;
 }
 
+/// What the writer wrote is packed beside the output, whose place it takes then.
+Request_Status Pack_Output(Request_Run& run)
+{
+    if (!run.packed)
+        return Done;
+    const Scratch_File plain(run.temp_output);
+    run.temp_output = With_Extension(run.held_back ? plain.Name() : run.outfile, ".gz$");
+    Delete_File(run.temp_output);
+    return Pack_File(plain.Name(), run.temp_output)
+               ? Done
+               : Stop(Request_Status::output_failed, "Output file not written.\n");
+}
+
 Request_Status Report_Losses(Request_Run& run)
 {
     run.reported = true;
+    Tell_Losses();
     return request.Loss_Report_Name.empty() || Write_Loss_Report(request.Loss_Report_Name)
                ? Done
                : Request_Status::output_failed;

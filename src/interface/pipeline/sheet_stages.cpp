@@ -1,9 +1,11 @@
 // Stages that make the Sheet and bring it into the shape that the output gets.
+#include "interface/compressed_files.h"
 #include "interface/file_detection.h"
 #include "interface/output_joins.h"
 #include "interface/output_sheet.h"
 #include "interface/pipeline/stages.h"
 #include "interface/selection.h"
+#include "interface/sheet_viewer.h"
 #include "interface/slash_options.h"
 #include "interface/var_file.h"
 #include "model/column_names.h"
@@ -13,7 +15,10 @@
 #include "model/sheet.h"
 #include "model/source_column.h"
 #include "model/transpose.h"
+#include "platform/file_image.h"
+#include "platform/files.h"
 #include "request/request.h"
+#include "spreadsheet/text/text_manner.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -220,6 +225,36 @@ constexpr Output_Join Output_Joins[] = {
 
 }  // namespace
 
+namespace {
+
+/// The bytes of a text that may be packed. False after a message.
+bool Load_Text(const std::string& name, bool packed, File_Image& image)
+{
+    const Scratch_File scratch(packed ? Decompressed_Name(name) : std::string());
+    if (packed && !Decompress_To(scratch.Name(), name.c_str()))
+        return false;
+    Input_File file;
+    return (file.Open(packed ? scratch.Name() : name) && image.Load(file))
+           || Fail("Output file could not be read.\n");
+}
+
+}  // namespace
+
+/// Who joins data onto a text wants it back as it was.
+Request_Status Keep_Manner_Of_Output(Request_Run& run)
+{
+    const bool separated = request.CSV_Output || run.output_code == tab_text_file;
+    const std::string name(request.Add_File_Name);
+    if (!For_People(People_Rule::plain_texts) || request.Add_Mode == Add_Modes::none || !separated
+        || !File_Exists(name))
+        return Done;
+    File_Image image;
+    if (!Load_Text(name, run.packed, image))
+        return Request_Status::input_unreadable;
+    Keep_Manner_Of_Text({image.Bytes(), image.Size()}, Native_Path(name).c_str());
+    return Done;
+}
+
 Request_Status Join_With_Output(Request_Run&)
 {
     for (const Output_Join& way : Output_Joins) {
@@ -309,6 +344,21 @@ Request_Status Tell_Summary(Request_Run& run)
         Print_Column_Summary(Current_Sheet,
                              Is_Special_File(run.outfile) ? Native_Path(run.Source()) : run.outfile);
     return Done;
+}
+
+Sheet_Viewer sheet_viewer;
+
+Request_Status Show_Sheet(Request_Run& run)
+{
+    const Format_Driver* const input = Driver_Of_Code(request.Content_Code);
+    if (!sheet_viewer || input == nullptr)
+        return Done;
+    run.finished = true;
+    const bool packed = run.input_code == compressed_file;
+    const auto names = input->sheet_names == nullptr ? std::nullopt : List_Sheet_Names(run.infile);
+    const bool shown =
+        sheet_viewer({*Current_Sheet, *input, packed, names.value_or(std::vector<std::string>{})});
+    return shown ? Done : Request_Status::output_failed;
 }
 
 }  // namespace ingester

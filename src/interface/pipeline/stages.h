@@ -28,6 +28,7 @@ struct Request_Run {
     bool genotype = false;      ///< the input goes the road of genotype files
     bool host_scratch = false;  ///< the output is a scratch file of the host's own
     bool output_was_there = false;
+    bool packed = false;     ///< the output is to be in gzip form, and the writer's file is a scratch file
     bool held_back = false;  ///< `temp_output` goes into a device or a pipe in the end
     bool reported = false;   ///< what was lost is in the report
     bool writing = false;    ///< `temp_output` is begun and not finished
@@ -73,7 +74,7 @@ Request_Status Stop(Request_Status status, const char* words, Arguments... argum
 // --- From the two strings to the files they name -------------------------------------------------
 
 Request_Status Take_Rules_For_People(Request_Run& run);
-Request_Status Know_Encoding(Request_Run& run);
+Request_Status Know_Encodings(Request_Run& run);
 Request_Status Expand_Tokens(Request_Run& run);
 Request_Status Fetch_Named_Secondary(Request_Run& run);
 Request_Status Cut_Genotype_Options(Request_Run& run);
@@ -116,6 +117,7 @@ Request_Status Change_By_List(Request_Run& run);
 Request_Status Mark_Source(Request_Run& run);
 /// Acts in front of joins, which go by names, and on the result.
 Request_Status Fit_Names_To_Output(Request_Run& run);
+Request_Status Keep_Manner_Of_Output(Request_Run& run);
 Request_Status Join_With_Output(Request_Run& run);
 Request_Status Keep_Range_Of_Columns(Request_Run& run);
 Request_Status Make_Names_Unique(Request_Run& run);
@@ -123,6 +125,7 @@ Request_Status Drop_Empty_Rows(Request_Run& run);
 Request_Status Find_Fixed_Decimals(Request_Run& run);
 Request_Status Refuse_Losses(Request_Run& run);
 Request_Status Tell_Summary(Request_Run& run);
+Request_Status Show_Sheet(Request_Run& run);
 
 // --- The output ----------------------------------------------------------------------------------
 
@@ -134,7 +137,8 @@ Request_Status Write_Output(Request_Run& run);
 void Begin_Writing(Request_Run& run);
 Request_Status Write_Column_List(Request_Run& run);
 Request_Status Fill_Clipboard(Request_Run& run);
-/// Writes the report that was asked for, while the old output is there still.
+Request_Status Pack_Output(Request_Run& run);
+/// Tells what was lost, and writes the report that was asked for, while the old output is there still.
 Request_Status Report_Losses(Request_Run& run);
 Request_Status Replace_Old_Output(Request_Run& run);
 

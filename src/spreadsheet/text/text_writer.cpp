@@ -6,14 +6,17 @@
 #include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "request/text_crossing.h"
 #include "spreadsheet/text/text.h"
 #include "spreadsheet/text/text_format.h"
+#include "spreadsheet/text/text_layout.h"
 #include "support/letters.h"
 #include "support/number_text.h"
 #include "support/progress.h"
 #include "support/text.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -21,27 +24,6 @@
 namespace ingester {
 
 namespace {
-
-constexpr std::size_t Greatest_Written_Line = 65535;
-constexpr std::string_view Line_End = "\r\n";
-
-enum class Layout : std::uint8_t { tabs, commas, fixed };
-
-struct Text_Layout {
-    Layout layout;
-    bool padded;     ///< fields fill their column's width
-    bool quoted;     ///< texts stand in quotes
-    char separator;  ///< between fields, and where a line that is too long is broken
-};
-
-Text_Layout Layout_Of_Request(bool tab_mode)
-{
-    if (tab_mode)
-        return {Layout::tabs, false, false, '\t'};
-    if (request.CSV_Output)
-        return {Layout::commas, !request.Packed_Csv_Output, Get_Settings().csv_quote_text != 0, ','};
-    return {Layout::fixed, true, false, ' '};
-}
 
 using Cell_Kind = Column_Printer::Kind;
 
@@ -52,6 +34,7 @@ struct Column_Writing {
     std::int32_t first_row;  ///< no cells above (Symmetric Matrix)
     std::int32_t width = 0;
     const Cell_Node* cell = nullptr;  ///< of the row being written
+    bool quoted = false;              ///< its texts, which would be read as numbers or dates
 };
 
 /// A line under way; fields are printed straight into it.
@@ -100,18 +83,23 @@ private:
     std::size_t used_ = 0;
 };
 
-Printing_Rules Rules_Of_Request()
+Printing_Rules Rules_Of_Request(bool plain)
 {
-    const Number_Print numbers = request.Use_Formats ? Number_Print::by_format : Number_Print::general;
+    const Number_Print otherwise = plain ? Number_Print::for_others : Number_Print::general;
+    const Number_Print numbers = request.Use_Formats ? Number_Print::by_format : otherwise;
     return {.numbers = numbers, .level_values = numbers, .margins = true};
 }
 
 /// The mark behind a name by which a reader knows the column's type again.
-std::string_view Name_Mark(const Column& column)
+std::string_view Name_Mark(const Column& column, const Text_Layout& layout)
 {
-    if (request.No_Name_Marks)
+    if (!layout.marked)
         return "";
-    return column.type == factor_column ? "!" : column.format == date_format_mark ? ":D" : "";
+    if (column.type == factor_column)
+        return "!";
+    if (column.format != date_format_mark)
+        return "";
+    return layout.plain && Iso_Form_Of(column) == Iso_Form::time ? ":T" : ":D";
 }
 
 /// Whether a field of fixed width is read as one, by the blanks around it; a separator of others, too, would
@@ -128,10 +116,19 @@ bool Keeps_Old_Output()
     return request.Add_Mode != Add_Modes::none && request.Write_Via_Temp;
 }
 
+/// The signs that can't stand in a field of a text without quotes around it.
+std::array<bool, 256> Signs_To_Quote(const Text_Layout& layout)
+{
+    std::array<bool, 256> signs{};
+    for (const char sign : {layout.separator, '"', '\r', '\n'})
+        signs[static_cast<unsigned char>(sign)] = true;
+    return signs;
+}
+
 class Text_Table_Writer {
 public:
     Text_Table_Writer(Sheet& sheet, const Text_Layout& layout, Output_File& file)
-        : sheet_(sheet), layout_(layout), file_(file)
+        : sheet_(sheet), layout_(layout), file_(file), to_quote_(Signs_To_Quote(layout))
     {
         Print_Missing();
         for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
@@ -141,6 +138,8 @@ public:
     /// Whether a reader would find each cell of fixed width in its column.
     [[nodiscard]] bool Cells_Stay() const { return layout_.layout != Layout::fixed || cells_stay_; }
 
+    /// What comes first, and how letters get into the file. False after a message.
+    [[nodiscard]] bool Begin_File();
     void Write_Title(std::string_view name);
     void Write_Names();
     /// False when lines had to be broken that must stay whole.
@@ -153,19 +152,28 @@ private:
     void Put_Level(const Column_Writing& state, std::int32_t level);
     void Put_Cell(const Column_Writing& state, const Cell_Node& cell);
     void Put_Factor(const Column_Writing& state, double value);
-    void Put_Text(std::string_view text);
+    void Put_Number(const Column_Writing& state, double value);
+    void Put_Text(const Column_Writing& state, std::string_view text);
     [[nodiscard]] bool Would_Be_Misread(std::string_view text) const;
+    [[nodiscard]] bool Needs_Quotes(std::string_view text) const;
+    [[nodiscard]] bool Is_First(const Column& column) const { return column.prev == sheet_.first_column; }
+    [[nodiscard]] bool Texts_Look_Like_Data(const Column_Writing& state) const;
     void Put_Quoted(std::string_view text);
     void Put_Field(Column_Writing& state, std::int32_t row);
     void Write_Line();
+    void Write_Bytes(std::string_view text);
+    void Tell_Lost_Letters();
 
     Sheet& sheet_;
     Text_Layout layout_;
     Output_File& file_;
-    Printing_Rules rules_ = Rules_Of_Request();
+    Printing_Rules rules_ = Rules_Of_Request(layout_.plain);
     std::vector<Column_Writing> columns_;
     Line_Buffer line_;
     std::string missing_;  ///< as a missing value prints
+    std::array<bool, 256> to_quote_;
+    Text_Converter converter_;  ///< of the file's code, if it has one of its own
+    std::int64_t row_ = 0;      ///< that is written, from 1
     long broken_lines_ = 0;
     bool cells_stay_ = true;
 };
@@ -173,8 +181,9 @@ private:
 /// The text for missing values may hold a separator, too.
 void Text_Table_Writer::Print_Missing()
 {
-    missing_ = request.Missing_Text.view();
-    if (layout_.layout == Layout::fixed || !Would_Be_Misread(missing_))
+    missing_ = layout_.missing;
+    const bool quoted = layout_.plain ? Needs_Quotes(missing_) : Would_Be_Misread(missing_);
+    if (layout_.layout == Layout::fixed || !quoted)
         return;
     Put_Quoted(missing_);
     missing_ = line_.View();
@@ -188,6 +197,7 @@ void Text_Table_Writer::Start_Column(const Column& column)
     columns_.push_back({Column_Printer(column, rules_), left, First_Row_Of(column)});
     Column_Writing& state = columns_.back();
     state.cell = column.first_cell;
+    state.quoted = layout_.tells_texts && Texts_Look_Like_Data(state);
     if (layout_.padded)
         state.width = Measured_Width(state);
 }
@@ -199,7 +209,7 @@ std::int32_t Text_Table_Writer::Measured_Width(const Column_Writing& state)
     const Column& column = state.printer.Printed();
     const bool factor = state.printer.Kind_Of_Cells() == Cell_Kind::factor;
     const std::int32_t listed = state.printer.Listed_Levels();
-    std::size_t widest = Letter_Count(column.name) + (factor ? 1 : Name_Mark(column).size());
+    std::size_t widest = Letter_Count(column.name) + (factor ? 1 : Name_Mark(column, layout_).size());
     const auto take_printed = [&] {
         if (line_.Size() > widest)
             widest = std::max(widest, Letter_Count(line_.View()));
@@ -247,14 +257,48 @@ void Text_Table_Writer::Put_Quoted(std::string_view text)
     line_.Put('"');
 }
 
-void Text_Table_Writer::Put_Text(std::string_view text)
+/// Whether the reader of another program needs quotes to see the text as it stands.
+bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
 {
     if (text.empty())
+        return false;
+    const auto is_blank = [](char c) { return c == ' ' || c == '\t'; };
+    return text.front() == '\'' || is_blank(text.front()) || is_blank(text.back())
+           || std::ranges::any_of(text, [this](char c) { return to_quote_[static_cast<unsigned char>(c)]; });
+}
+
+/// Whether nothing in a column of texts would tell that it is one.
+bool Text_Table_Writer::Texts_Look_Like_Data(const Column_Writing& state) const
+{
+    const Column& column = state.printer.Printed();
+    if (column.type == factor_column) {
+        const Level_Node* label = column.factor_kind == factor_with_labels ? column.labels : nullptr;
+        const bool listed = label != nullptr;
+        for (; label != nullptr && Looks_Like_Data(label->Text()); label = label->next)
+            ;
+        return listed && label == nullptr;
+    }
+    if (!Is_Text_Like(column.type))
+        return false;
+    const Cell_Node* cell = column.first_cell;
+    for (; cell != nullptr && Looks_Like_Data(cell->Text()); cell = cell->next)
+        ;
+    return cell == nullptr;
+}
+
+void Text_Table_Writer::Put_Text(const Column_Writing& state, std::string_view text)
+{
+    if (layout_.plain) {
+        const bool comment = text.starts_with('#') && Is_First(state.printer.Printed());
+        const bool misleads = layout_.tells_texts && (comment || (!text.empty() && Looks_Missing(text)));
+        state.quoted || misleads || Needs_Quotes(text) ? Put_Quoted(text) : line_.Put(text);
+    } else if (text.empty()) {
         return;
-    if (layout_.layout != Layout::fixed && (layout_.quoted || Would_Be_Misread(text)))
+    } else if (layout_.layout != Layout::fixed && (layout_.quoted || Would_Be_Misread(text))) {
         Put_Quoted(text);
-    else
+    } else {
         line_.Put(text);
+    }
 }
 
 /// A number is printed where it goes.
@@ -265,7 +309,7 @@ void Text_Table_Writer::Put_Level(const Column_Writing& state, std::int32_t leve
     if (text.data() == room)
         line_.Advance_To(room + text.size());
     else if (state.printer.Printed().factor_kind == factor_with_labels)
-        Put_Text(text);
+        Put_Text(state, text);
     else
         line_.Put(text);
 }
@@ -275,8 +319,22 @@ void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
     if (state.printer.Is_Level(value))
         Put_Level(state, static_cast<std::int32_t>(value));
     else
-        line_.Put(state.printer.Printed().factor_kind == factor_with_labels ? std::string_view(" ")
-                                                                            : std::string_view(missing_));
+        line_.Put(state.printer.Printed().factor_kind == factor_with_labels && !layout_.plain
+                      ? std::string_view(" ")
+                      : std::string_view(missing_));
+}
+
+/// A date that nothing else reads is missing.
+void Text_Table_Writer::Put_Number(const Column_Writing& state, double value)
+{
+    char* const room = line_.Reserve(Number_Text_Room);
+    char* const end = state.printer.Print_Number(room, value);
+    line_.Advance_To(end);
+    if (end != room)
+        return;
+    line_.Put(missing_);
+    Note_Loss(Loss_Kind::date_out_of_range, state.printer.Printed().name, row_,
+              Format_Text("day %.15g", value));
 }
 
 inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
@@ -287,10 +345,10 @@ inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_
         if (!(value > sheet_.missing_value))
             line_.Put(missing_);
         else
-            line_.Advance_To(state.printer.Print_Number(line_.Reserve(Number_Text_Room), value));
+            Put_Number(state, value);
         break;
     case Cell_Kind::text:
-        Put_Text(cell.Text());
+        Put_Text(state, cell.Text());
         break;
     case Cell_Kind::factor:
         Put_Factor(state, value);
@@ -313,23 +371,68 @@ inline void Text_Table_Writer::Put_Field(Column_Writing& state, std::int32_t row
         line_.Pad(start, state.width, state.left);
 }
 
+/// Letters that the file's code lacks are told by the columns that have them.
+void Text_Table_Writer::Tell_Lost_Letters()
+{
+    Line_Buffer field;
+    std::swap(field, line_);
+    for (const Column_Writing& state : columns_) {
+        const Column& column = state.printer.Printed();
+        const Cell_Node* const cell = state.cell == nullptr ? column.last_cell : state.cell->prev;
+        line_.Clear();
+        if (row_ == 0)
+            line_.Put(column.name);
+        else if (cell != nullptr)
+            Put_Cell(state, *cell);
+        static_cast<void>(converter_.Convert(line_.View()));
+        if (const std::int64_t lost = converter_.Take_Losses(); lost > 0)
+            Note_Loss(Loss_Kind::letter_replaced, column.name, row_, line_.View(), lost);
+    }
+    std::swap(field, line_);
+}
+
+void Text_Table_Writer::Write_Bytes(std::string_view text)
+{
+    if (layout_.code == nullptr) {
+        file_.Write(text);
+        return;
+    }
+    file_.Write(converter_.Convert(text));
+    if (converter_.Take_Losses() > 0)
+        Tell_Lost_Letters();
+}
+
+bool Text_Table_Writer::Begin_File()
+{
+    constexpr std::string_view mark = "\xEF\xBB\xBF";
+    const Text_Code code = layout_.code != nullptr ? layout_.code : Code_Of_Letters();
+    if (layout_.code != nullptr && !Open_Converter(converter_, Code_Of_Letters(), code))
+        return false;
+    if (layout_.code_mark && !Is_Unicode(code))
+        return Fail("Error: A text in the encoding %s can't begin with the mark of Unicode.\n",
+                    std::string(code->name).c_str());
+    if (layout_.code_mark)
+        file_.Write(Sure_Converter(Utf_8_Code(), code).Convert(mark));
+    return true;
+}
+
 /// Breaks a line that is too long behind the last separator in reach.
 void Text_Table_Writer::Write_Line()
 {
     std::string_view line = line_.View();
-    if (line.size() > Greatest_Written_Line)
+    if (line.size() > layout_.longest_line)
         ++broken_lines_;
-    while (line.size() > Greatest_Written_Line) {
-        const std::size_t found = line.substr(0, Greatest_Written_Line).rfind(layout_.separator);
-        std::size_t taken = found == std::string_view::npos ? Greatest_Written_Line : found + 1;
+    while (line.size() > layout_.longest_line) {
+        const std::size_t found = line.substr(0, layout_.longest_line).rfind(layout_.separator);
+        std::size_t taken = found == std::string_view::npos ? layout_.longest_line : found + 1;
         while (Letters_Are_Utf8() && taken > 1 && Goes_On(line[taken]))
             --taken;
-        file_.Write(line.substr(0, taken));
-        file_.Write(Line_End);
+        Write_Bytes(line.substr(0, taken));
+        Write_Bytes(layout_.line_end);
         line.remove_prefix(taken);
     }
-    file_.Write(line);
-    file_.Write(Line_End);
+    Write_Bytes(line);
+    Write_Bytes(layout_.line_end);
     line_.Clear();
 }
 
@@ -354,14 +457,15 @@ void Text_Table_Writer::Write_Names()
         if (start > 0 && layout_.layout != Layout::fixed)
             line_.Put(layout_.separator);
         const Column& column = state.printer.Printed();
-        const std::string name = std::string(column.name).append(Name_Mark(column));
+        const std::string name = std::string(column.name).append(Name_Mark(column, layout_));
         const bool left = column.justify == left_side;
         if (layout_.layout == Layout::fixed) {
             if (left)
                 line_.Put(' ');
             line_.Put(name);
             line_.Pad(start, state.width, left);
-        } else if (Would_Be_Misread(name)) {
+        } else if (layout_.plain ? Needs_Quotes(name) || Name_Looks_Like_Data(name) || name.starts_with('#')
+                                 : Would_Be_Misread(name)) {
             Put_Quoted(name);
         } else {
             line_.Put(name);
@@ -382,6 +486,9 @@ bool Text_Table_Writer::Write_Rows()
             first = false;
             Put_Field(state, row);
         }
+        if (layout_.plain && line_.Size() == 0)
+            Put_Quoted({});  // most readers pass over empty lines
+        row_ = row + 1;
         Write_Line();
         if (row % progress_step == 0)
             Show_Progress("Writing", row, sheet_.row_count);
@@ -412,10 +519,11 @@ std::string Title_Name(std::string_view file_name)
 
 bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
 {
-    if (sheet == nullptr || sheet->row_count < 1 || sheet->column_count < 1)
+    const Text_Layout layout = Layout_Of_Request(tab_mode);
+    const std::int32_t least_rows = layout.plain ? 0 : 1;
+    if (sheet == nullptr || sheet->row_count < least_rows || sheet->column_count < 1)
         return false;
     const bool real_file = *file_name != '\0';
-    const Text_Layout layout = Layout_Of_Request(tab_mode);
     Output_File file;
     Text_Table_Writer writer(*sheet, layout, file);
     if (request.Add_Mode != Add_Modes::none && !writer.Cells_Stay())
@@ -426,11 +534,15 @@ bool Write_Text_File(Sheet* sheet, const char* file_name, bool tab_mode)
         file.Open_Standard_Output();
     else if (!file.Open(file_name))
         return false;  // silent by design: the pipeline tells that the output was not written
+    if (!writer.Begin_File())
+        return false;
     if (layout.layout == Layout::fixed && Get_Settings().csv_title != 0 && real_file)
         writer.Write_Title(Title_Name(file_name));
     if (!request.Omit_Header)
         writer.Write_Names();
     Note_Dropped_Metadata(*sheet);
+    if (layout.plain)
+        Note_Dropped_Orders(*sheet);
     return writer.Write_Rows() && file.Close();
 }
 

@@ -1,3 +1,4 @@
+#include "model/date_format.h"
 #include "model/told_sheets.h"
 #include "spreadsheet/text/text.h"
 #include "support/text.h"
@@ -67,6 +68,126 @@ TEST_F(Text_Writer, Lays_Out_Every_Kind_Of_Column)
         EXPECT_EQ(Written(Mixed_Sheet(), tab_mode), text) << told;
     }
     EXPECT_EQ(Written(Sheet_Of("t Ta\nb"), true), "t\r\n\"a\nb\"\r\n");
+}
+
+void Plain()
+{
+    Packed();
+    request.people.set(static_cast<std::size_t>(People_Rule::plain_texts));
+    Use_Utf8_Text(true);
+    request.Names_Kept_As_They_Stand = true;
+}
+
+TEST_F(Text_Writer, Writes_For_Other_Programs)
+{
+    const auto marked = [] {
+        Plain();
+        request.Write_Marks = request.Write_Crlf = true;
+    };
+    const auto bare = [] {
+        Plain();
+        Get_Settings().csv_quote_text = 0;
+        request.Missing_Text = "NA";
+        request.Missing_Text_Given = true;
+    };
+    const std::tuple<const char*, void (*)(), const char*, const char*> cases[] = {
+        {"every kind", Plain, "",
+         "number,t,size,dose,plain,day\n1,\"say \"\"hi\"\"\",s,0.5,2,1900-01-03\n"
+         "-0.1,,,1234567.25,1,1900-01-04\n,\"a,b\tc\",\"b\"\"g\",,,1900-01-05\n"},
+        {"with marks", marked, "",
+         "number,t,size!,dose!,plain!,day:D\r\n1,\"say \"\"hi\"\"\",s,0.5,2,1900-01-03\r\n"
+         "-0.1,,*,1234567.25,1,1900-01-04\r\n*,\"a,b\tc\",\"b\"\"g\",*,*,1900-01-05\r\n"},
+        {"no quotes but where fields would fall apart", bare, "t T12|NA; u Ta,b|-; n V1|*",
+         "t,u,n\n12,\"a,b\",1\nNA,-,NA\n"},
+        {"texts that look like data", Plain,
+         "t T007|1e5|; u TNA|x|nan; d T2024-01-05|10:30|1 234; w Tit's|'s|-5",
+         "t,u,d,w\n\"007\",\"NA\",\"2024-01-05\",it's\n\"1e5\",x,\"10:30\",\"'s\"\n"
+         "\"\",\"nan\",\"1 234\",-5\n"},
+        {"comments and names", Plain, "#a T#x|y; 2b T#x|; n T a|b ",
+         "\"#a\",\"2b\",n\n\"#x\",#x,\" a\"\ny,,\"b \"\n"},
+        {"one column", Plain, "n V1|*|2", "n\n1\n\"\"\n2\n"},
+        {"all digits", Plain, "n V0.1|1e23|123456789012345678|0.30000000000000004|-5e-324",
+         "n\n0.1\n1e+23\n123456789012345680\n0.30000000000000004\n-5e-324\n"},
+    };
+    for (const auto& [told, change, sheet, text] : cases) {
+        Start_Request("t");
+        change();
+        EXPECT_EQ(Written(*sheet == '\0' ? Mixed_Sheet() : Sheet_Of(sheet)), text) << told;
+    }
+    Start_Request("t");
+    Plain();
+    Sheet* const mixed = Mixed_Sheet();
+    Put_Levels(*Column_At(mixed, 3), {}, {"s", "b"});
+    for (const double first : {1.0, 2.0}) {
+        Cell_At(Column_At(mixed, 3), 0)->value.number = first;
+        Cell_At(Column_At(mixed, 3), 2)->value.number = 3 - first;
+        static_cast<void>(Written(mixed));
+        EXPECT_EQ(request.losses.Entries().size(), first - 1) << "levels may stand as they are met";
+    }
+    Sheet* const wide = Sheet_Of("t T" + std::string(90, 'x'));
+    for (int i = 0; i < 1000; ++i)
+        Add_Cells(wide, text_column, "u", {std::string(90, 'y')});
+    EXPECT_EQ(std::ranges::count(Written(wide), '\n'), 2) << "no line is broken";
+    Sheet* const empty = New_Sheet();
+    New_Column(empty, variate_column, "v");
+    EXPECT_EQ(Written(empty), "v\n");
+}
+
+TEST_F(Text_Writer, Writes_Dates_So_That_Nothing_Is_Lost)
+{
+    const std::tuple<std::int32_t, std::int16_t, std::vector<double>, const char*> cases[] = {
+        {month_day_year_format, 0, {45363, -1, 2958465}, "d:D|2024-03-12|1899-12-30|9999-12-31|"},
+        {packed_day_name_year_format, 1, {154875, 1}, "d:D|2024-03-12|1600-03-01|"},
+        {day_month_year_format, 0, {45363, 45363.5}, "d:D|2024-03-12 00:00:00|2024-03-12 12:00:00|"},
+        {date_time_format,
+         0,
+         {45363.25, 45363 + 0.001 / 86400},
+         "d:D|2024-03-12 06:00:00|2024-03-12 00:00:00.001|"},
+        {time_format, 0, {0.5, 36000.25 / 86400}, "d:T|12:00:00|10:00:00.250|"},
+        {time_format, 0, {0.5, 45363}, "d:D|1899-12-31 12:00:00|2024-03-12 00:00:00|"},
+        {total_hours_format, 0, {1.5}, "d:T|36:00:00|"},
+        {seconds_format, 0, {1.5}, "d:D|129600|"},
+        {day_month_year_format, 0, {1e9, -2e5, 1}, "d:D|*|*|1900-01-01|"},
+    };
+    for (const auto& [format, form, numbers, text] : cases) {
+        Start_Request("t");
+        Plain();
+        request.Write_Marks = true;
+        Sheet* const sheet = New_Sheet_With_Rows(static_cast<std::int32_t>(numbers.size()));
+        Column* const column = New_Data_Column(sheet, variate_column, "d", sheet->row_count);
+        std::int32_t row = 0;
+        for (const double number : numbers)
+            Cell_At(column, row++)->value.number = number;
+        column->format = date_format_mark;
+        column->date_format = format;
+        column->date_form = form;
+        EXPECT_EQ(On_One_Line(Written(sheet)), text) << format;
+        EXPECT_EQ(request.losses.Entries().size(),
+                  std::string_view(text).find("|*") == std::string::npos ? 0 : 1);
+    }
+}
+
+TEST_F(Text_Writer, Knows_The_Codes_Of_Files)
+{
+    const std::tuple<const char*, bool, std::string, std::string> cases[] = {
+        {"", true, "\xEF\xBB\xBFt,u\n\xC3\xB6,\xCE\xB1\n", ""},
+        {"latin1", false, "t,u\n\xF6,?\n", "u 1 \xCE\xB1"},
+        {"UTF-16", false, {"\xFF\xFEt\0,\0u\0\n\0\xF6\0,\0\xB1\x03\n\0", 18}, ""},
+    };
+    for (const auto& [code, mark, bytes, lost] : cases) {
+        Start_Request("t");
+        Plain();
+        request.Output_Encoding = code;
+        request.Write_Code_Mark = mark;
+        EXPECT_EQ(Written(Sheet_Of("t T\xC3\xB6; u T\xCE\xB1")), bytes) << code;
+        std::string told;
+        for (const Loss& loss : request.losses.Entries())
+            told += loss.column + " " + std::to_string(loss.first_row) + " " + loss.example;
+        EXPECT_EQ(told, lost);
+    }
+    request.Output_Encoding = "latin1";
+    request.Write_Code_Mark = true;
+    EXPECT_FALSE(Write_Text_File(Sheet_Of("t Tx"), Request_Name("none.csv").c_str(), false));
 }
 
 TEST_F(Text_Writer, Justifies_Fixed_Width_Below_A_Title)
