@@ -74,6 +74,8 @@ Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules
       for_others_(rules.numbers == Number_Print::for_others), iso_form_(Iso_Form_For(column, rules.numbers)),
       kind_(Kind_Of(column))
 {
+    if (for_others_ && column.format != date_format_mark)
+        digits_ = Digits_Needed;
     if (kind_ != Kind::factor)
         return;
     const std::int32_t nlevels = std::max(column.nlevels, 0);
@@ -82,6 +84,12 @@ Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules
     for (const char* const level : Printed_Levels(column, rules.level_values, rules.digits, room))
         if (std::ssize(levels_) < nlevels)
             levels_.emplace_back(Text_Arena::View(level));
+}
+
+char* Column_Printer::Print_By_Column(char* target, double value) const
+{
+    return for_others_ ? Print_For_Others(target, *column_, iso_form_, value)
+                       : Format_Cell_Number(target, *column_, value);
 }
 
 std::string_view Column_Printer::Unlisted_Level(std::int32_t level, char* room) const

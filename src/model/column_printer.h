@@ -61,8 +61,7 @@ public:
     {
         if (digits_ > 0)
             return Print_General(target, value, digits_);
-        return for_others_ ? Print_For_Others(target, *column_, iso_form_, value)
-                           : Format_Cell_Number(target, *column_, value);
+        return digits_ == Digits_Needed ? Print_Exactly(target, value) : Print_By_Column(target, value);
     }
 
     /// Whether a Factor's cell holds a level, a margin among them where the rules say so.
@@ -80,12 +79,15 @@ public:
     }
 
 private:
+    static constexpr int Digits_Needed = -1;  ///< to be read as the same number again
+
+    char* Print_By_Column(char* target, double value) const;
     [[nodiscard]] std::string_view Unlisted_Level(std::int32_t level, char* room) const;
 
     const Column* column_;
     std::vector<std::string> levels_;  ///< short ones stand in the list itself, so that a look-up is one
     double level_end_ = 0;
-    int digits_ = 0;  ///< 0: by the Column's format, or for others
+    int digits_ = 0;  ///< 0: by the Column's format, or a date for others
     bool for_others_ = false;
     Iso_Form iso_form_ = Iso_Form::number;  ///< of dates, for others
     Kind kind_;

@@ -16,7 +16,6 @@
 #include "support/text.h"
 
 #include <algorithm>
-#include <array>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -116,19 +115,10 @@ bool Keeps_Old_Output()
     return request.Add_Mode != Add_Modes::none && request.Write_Via_Temp;
 }
 
-/// The signs that can't stand in a field of a text without quotes around it.
-std::array<bool, 256> Signs_To_Quote(const Text_Layout& layout)
-{
-    std::array<bool, 256> signs{};
-    for (const char sign : {layout.separator, '"', '\r', '\n'})
-        signs[static_cast<unsigned char>(sign)] = true;
-    return signs;
-}
-
 class Text_Table_Writer {
 public:
     Text_Table_Writer(Sheet& sheet, const Text_Layout& layout, Output_File& file)
-        : sheet_(sheet), layout_(layout), file_(file), to_quote_(Signs_To_Quote(layout))
+        : sheet_(sheet), layout_(layout), file_(file)
     {
         Print_Missing();
         for (const Column* column = sheet.first_column->next; column != nullptr; column = column->next)
@@ -153,6 +143,7 @@ private:
     void Put_Cell(const Column_Writing& state, const Cell_Node& cell);
     void Put_Factor(const Column_Writing& state, double value);
     void Put_Number(const Column_Writing& state, double value);
+    void Put_Lost_Date(const Column_Writing& state, double value);
     void Put_Text(const Column_Writing& state, std::string_view text);
     [[nodiscard]] bool Would_Be_Misread(std::string_view text) const;
     [[nodiscard]] bool Needs_Quotes(std::string_view text) const;
@@ -162,6 +153,7 @@ private:
     void Put_Field(Column_Writing& state, std::int32_t row);
     void Write_Line();
     void Write_Bytes(std::string_view text);
+    void Write_Converted(std::string_view text);
     void Tell_Lost_Letters();
 
     Sheet& sheet_;
@@ -170,8 +162,7 @@ private:
     Printing_Rules rules_ = Rules_Of_Request(layout_.plain);
     std::vector<Column_Writing> columns_;
     Line_Buffer line_;
-    std::string missing_;  ///< as a missing value prints
-    std::array<bool, 256> to_quote_;
+    std::string missing_;       ///< as a missing value prints
     Text_Converter converter_;  ///< of the file's code, if it has one of its own
     std::int64_t row_ = 0;      ///< that is written, from 1
     long broken_lines_ = 0;
@@ -263,8 +254,9 @@ bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
     if (text.empty())
         return false;
     const auto is_blank = [](char c) { return c == ' ' || c == '\t'; };
-    return text.front() == '\'' || is_blank(text.front()) || is_blank(text.back())
-           || std::ranges::any_of(text, [this](char c) { return to_quote_[static_cast<unsigned char>(c)]; });
+    const auto holds = [text](char c) { return text.find(c) != std::string_view::npos; };
+    return text.front() == '\'' || is_blank(text.front()) || is_blank(text.back()) || holds(layout_.separator)
+           || holds('"') || holds('\n') || holds('\r');
 }
 
 /// Whether nothing in a column of texts would tell that it is one.
@@ -325,16 +317,20 @@ void Text_Table_Writer::Put_Factor(const Column_Writing& state, double value)
 }
 
 /// A date that nothing else reads is missing.
-void Text_Table_Writer::Put_Number(const Column_Writing& state, double value)
+void Text_Table_Writer::Put_Lost_Date(const Column_Writing& state, double value)
+{
+    line_.Put(missing_);
+    Note_Loss(Loss_Kind::date_out_of_range, state.printer.Printed().name, row_,
+              Format_Text("day %.15g", value));
+}
+
+inline void Text_Table_Writer::Put_Number(const Column_Writing& state, double value)
 {
     char* const room = line_.Reserve(Number_Text_Room);
     char* const end = state.printer.Print_Number(room, value);
     line_.Advance_To(end);
-    if (end != room)
-        return;
-    line_.Put(missing_);
-    Note_Loss(Loss_Kind::date_out_of_range, state.printer.Printed().name, row_,
-              Format_Text("day %.15g", value));
+    if (end == room) [[unlikely]]
+        Put_Lost_Date(state, value);
 }
 
 inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_Node& cell)
@@ -391,12 +387,16 @@ void Text_Table_Writer::Tell_Lost_Letters()
     std::swap(field, line_);
 }
 
-void Text_Table_Writer::Write_Bytes(std::string_view text)
+inline void Text_Table_Writer::Write_Bytes(std::string_view text)
 {
-    if (layout_.code == nullptr) {
+    if (layout_.code == nullptr)
         file_.Write(text);
-        return;
-    }
+    else
+        Write_Converted(text);
+}
+
+void Text_Table_Writer::Write_Converted(std::string_view text)
+{
     file_.Write(converter_.Convert(text));
     if (converter_.Take_Losses() > 0)
         Tell_Lost_Letters();
