@@ -107,7 +107,7 @@ std::string Fault_Of(const Given_Options& all, const Given_Option& given)
     const std::string_view value = given.value;
     if (!given.given || !Has_Value(given))
         return {};
-    if (value.empty())
+    if (value.empty() && given.option->key != "/mv=")
         return "the value is empty";
     if (!Is_Quoted(given) && value.find('/') != std::string_view::npos)
         return "this value can't hold a '/', which begins an option";

@@ -14,8 +14,9 @@ enum class People_Rule : std::uint8_t {
     told_options,     ///< an option that means nothing to the input's format is told
     further_endings,  ///< outputs are known by endings that hosts don't use
     further_types,    ///< inputs are recognised that hosts take for text, or for nothing
+    sniffed_texts,    ///< the dialect of a text is found from its lines, and its types as people mean them
 };
-constexpr std::size_t People_Rule_Count = 6;
+constexpr std::size_t People_Rule_Count = 7;
 
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);

@@ -31,12 +31,12 @@ struct Text_Dialect {
 
 /// What the user has told of it, which is never guessed.
 struct Told_Dialect {
-    std::string_view separators;        ///< empty: not told
-    std::optional<char> quote;          ///< NUL: none
-    char decimal = '\0';                ///< NUL: not told
-    std::int32_t names_lines = -1;      ///< below 0: not told
-    bool lines_in_front_told = false;   ///< they are gone already
-    std::string_view file_name;         ///< its ending breaks ties
+    std::string_view separators;       ///< empty: not told
+    std::optional<char> quote;         ///< NUL: none
+    char decimal = '\0';               ///< NUL: not told
+    std::int32_t names_lines = -1;     ///< below 0: not told
+    bool lines_in_front_told = false;  ///< they are gone already
+    std::string_view file_name;        ///< its ending breaks ties
 };
 
 /// A dialect, and the part of the text that is the table.
@@ -55,8 +55,7 @@ struct Found_Table {
 [[nodiscard]] bool Begins_Other_Table(std::string_view text, const Text_Dialect& dialect);
 
 /// Where table number `table` (from 1) of a text begins; beyond the last one the text's size.
-[[nodiscard]] std::size_t Start_Of_Table(std::string_view text, std::int32_t table,
-                                         const Told_Dialect& told);
+[[nodiscard]] std::size_t Start_Of_Table(std::string_view text, std::int32_t table, const Told_Dialect& told);
 
 /// The dialect of the text that the request has read; null where it has read none, or as for a host.
 [[nodiscard]] const Text_Dialect* Found_Dialect();
