@@ -76,6 +76,11 @@ Taken Take_Decimal(std::string_view text, std::size_t at)
     return value.end;
 }
 
+bool Is_Count(std::string_view value)
+{
+    return !value.empty() && std::ranges::all_of(value, Is_Digit);
+}
+
 /// A number of lines, or "none"; left out it is 1. Of a grid it is the row.
 Taken Take_Names_Lines(std::string_view text, std::size_t at)
 {
@@ -86,6 +91,8 @@ Taken Take_Names_Lines(std::string_view text, std::size_t at)
         return at;
     }
     const Option_Value value = Up_To(text, at + 1, Option_Start);
+    if (value.text != "none" && !Is_Count(value.text))
+        return at;
     const long lines = std::clamp(Leading_Integer(value.text), 0L, most_lines);
     request.Names_Given = lines > 0;
     request.No_Names = lines == 0;
@@ -96,6 +103,8 @@ Taken Take_Names_Lines(std::string_view text, std::size_t at)
 template <auto Member> Taken Take_Count(std::string_view text, std::size_t at)
 {
     const Option_Value value = Up_To(text, at, Option_Start);
+    if (!Is_Count(value.text))
+        return at;
     request.*Member = static_cast<std::int32_t>(std::clamp(Leading_Integer(value.text), 0L, 2147483647L));
     return value.end;
 }

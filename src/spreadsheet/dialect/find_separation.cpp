@@ -110,6 +110,18 @@ bool May_Separate(const Tried_Separator& tried, const Score& score, std::string_
            && (score.holds_numbers || (!other && score.steadiness >= 1.0));
 }
 
+/// Whether a quote behind a backslash goes on inside its text.
+bool Is_Escaped_Inside(const Text_Sample& sample, std::string_view escaped)
+{
+    constexpr std::string_view outside = ",;\t|\r\n";
+    for (const std::string_view piece : sample.pieces)
+        for (std::size_t at = piece.find(escaped); at != std::string_view::npos; at = piece.find(escaped, at + 1))
+            if (at + escaped.size() < piece.size()
+                && outside.find(piece[at + escaped.size()]) == std::string_view::npos)
+                return true;
+    return false;
+}
+
 /// The quotes and escapes that are tried with each separator, the plainest first.
 std::vector<Text_Dialect> Quotings(const Text_Sample& sample, const Told_Dialect& told)
 {
@@ -124,9 +136,12 @@ std::vector<Text_Dialect> Quotings(const Text_Sample& sample, const Told_Dialect
         const bool wanted = told.quote ? *told.quote == quote : quote == '"' || sample.Holds("'");
         if (!wanted)
             continue;
-        add(quote, '\0');
         const char escaped[] = {'\\', quote, '\0'};
-        if (sample.Holds(escaped))
+        const bool inside = Is_Escaped_Inside(sample, escaped);
+        if (inside)
+            add(quote, '\\');
+        add(quote, '\0');
+        if (!inside && sample.Holds(escaped))
             add(quote, '\\');
     }
     if (tried.empty())

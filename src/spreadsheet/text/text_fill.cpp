@@ -401,6 +401,8 @@ void Sheet_Filler::Finish_Rows(const char* last_line)
     }
     if (dialect_ != nullptr)
         Settle_Quoted_Columns();
+    if (row_ == 0)
+        return;
     Expect_Rows(&sheet_, static_cast<std::int32_t>(row_));
     for (Column_Filling& state : columns_)
         state.cells.Finish(sheet_.row_count);
@@ -523,7 +525,7 @@ bool Sheet_Filler::Fill()
         Settle_Moments();
         Leave_Out_Last_Columns();
     }
-    return sheet_.row_count > 0;
+    return sheet_.row_count > 0 || Names_Alone();
 }
 
 Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type)

@@ -71,6 +71,7 @@ void Sheet_Filler::Fill_For_People(const Text_Field& field, Column_Filling& stat
     } else if (const Iso_Moment moment = Read_Iso_Moment(text); moment.sense != Field_Sense::text
                                                                 && state.filling == Filling::numbers_so_far
                                                                 && state.gaps == row_) {
+        state.quoted += content.quote != '\0' ? 1 : 0;
         Begin_Moments(state, moment);
     } else {
         if (state.filling == Filling::numbers_so_far)
@@ -117,12 +118,14 @@ void Sheet_Filler::Take_Moment(Column_Filling& state, const Iso_Moment& moment)
 void Sheet_Filler::Fill_Moment(const Text_Field& field, Column_Filling& state)
 {
     state.cells.Append(missing_);
-    const std::string_view text = Trim_Copy(walker_.Content(field).text);
+    const Field_Content content = walker_.Content(field);
+    const std::string_view text = Trim_Copy(content.text);
     if (Says_Nothing(text)) {
         ++state.gaps;
         return;
     }
     const Iso_Moment moment = Read_Iso_Moment(text);
+    state.quoted += content.quote != '\0' ? 1 : 0;
     if (moment.sense == state.sense)
         return Take_Moment(state, moment);
     Turn_To_Text(state);
@@ -299,6 +302,14 @@ void Sheet_Filler::Redo_Spelling(const Text_Field& field, Column_Filling& state)
     char room[Number_Text_Room];
     if (std::string_view(room, Print_Usually(room, *state.column, cell.value.number)) != plain)
         Keep_Spelling(*state.column, cell, plain);
+}
+
+/// For people a table of no rows is one.
+bool Sheet_Filler::Names_Alone() const
+{
+    if (dialect_ != nullptr && shape_.has_names)
+        Report_Message("The text holds names, but no rows.\n");
+    return dialect_ != nullptr && shape_.has_names;
 }
 
 /// Separators at the ends of lines make no column.

@@ -95,6 +95,7 @@ private:
     void Watch_Spelling(std::string_view text, Column_Filling& state);
     void Redo_Spelling(const Text_Field& field, Column_Filling& state);
     void Leave_Out_Last_Columns();
+    [[nodiscard]] bool Names_Alone() const;
     [[nodiscard]] bool Says_Nothing(std::string_view text) const;
 
     Sheet& sheet_;
