@@ -41,34 +41,46 @@ std::vector<Block> Joined(std::span<const Block> blocks, Rows rows)
 {
     std::vector<Block> joined;
     for (const Block& block : blocks) {
-        if (joined.empty() || joined.back().usual.count != block.usual.count) {
+        const bool goes_on =
+            !joined.empty() && block.usual.count > 1
+            && rows[joined.back().last - 1].count == block.usual.count
+            && (joined.back().usual.count == 1 || joined.back().usual.count == block.usual.count);
+        if (!goes_on) {
             joined.push_back(block);
             continue;
         }
         Block& before = joined.back();
+        if (before.usual.count != block.usual.count)  // names behind lines of a title
+            before.first = before.last - 1;
         before.last = block.last;
         before.usual = Find_Usual_Count(rows.subspan(before.first, before.last - before.first));
     }
     return joined;
 }
 
-/// A few pairs in front of a wider and longer table tell of it.
-bool Describes(const Block& block, const Block& next)
+/// A few pairs of a word and a value in front of a wider and longer table tell of it.
+bool Describes(const Block& block, const Block& next, const Sample_Rows& rows)
 {
     constexpr std::int64_t most_pairs = 12;
-    return block.usual.count == 2 && block.usual.all <= most_pairs && next.usual.count > 2
-           && next.usual.all >= block.usual.all;
+    const bool may_be = block.usual.count == 2 && block.usual.all <= most_pairs && next.usual.count > 2
+                        && next.usual.all >= block.usual.all;
+    const auto begins_with_word = [&](const Sample_Row& row) {
+        return row.empty || Sense_Of_Field(rows.Fields(row)[0].text, {}) == Field_Sense::text;
+    };
+    const Rows all(rows.Rows());
+    return may_be
+           && std::ranges::all_of(all.subspan(block.first, block.last - block.first), begins_with_word);
 }
 
 /// The first block that is a table.
-std::optional<Block> First_Table(const std::vector<Block>& blocks)
+std::optional<Block> First_Table(const std::vector<Block>& blocks, const Sample_Rows& rows)
 {
     for (std::size_t i = 0; i < blocks.size(); ++i) {
         if (!blocks[i].Is_Table())
             continue;
         const auto next = std::find_if(blocks.begin() + static_cast<std::ptrdiff_t>(i) + 1, blocks.end(),
                                        [](const Block& block) { return block.Is_Table(); });
-        if (next == blocks.end() || !Describes(blocks[i], *next))
+        if (next == blocks.end() || !Describes(blocks[i], *next, rows))
             return blocks[i];
     }
     return std::nullopt;
@@ -126,12 +138,10 @@ public:
             const Sample_Row& row = Row(i);
             if (row.empty || Is_Comment(row))
                 continue;
-            if (row.count > 1 || columns < 2)
+            if (row.count > 1 || columns < 2 || May_Be_Row(row, columns))
                 break;
-            const bool apart = Row(i - 1).empty || footer == i + 1;
-            if (!apart && !Speaks(row, i))
-                break;
-            footer = i;
+            if (Row(i - 1).empty || Speaks(row, i))
+                footer = i;
         }
         return footer;
     }
@@ -161,6 +171,14 @@ private:
         const bool colon = rows_.Fields(row)[0].text.find(": ") != std::string_view::npos;
         return !colon && (i + 1 == last || Row(i + 1).count == columns)
                && (Holds_Data(row) || (i + 1 < last && Holds_Data(Row(i + 1))));
+    }
+    /// Whether another separator cuts a line of one field into a row.
+    [[nodiscard]] bool May_Be_Row(const Sample_Row& row, std::int32_t columns) const
+    {
+        const std::string_view text = rows_.Fields(row)[0].text;
+        return std::ranges::any_of(std::string_view(",;\t|"), [&](char separator) {
+            return std::ranges::count(text, separator) >= columns - 1;
+        });
     }
     /// Words where the row above has a number, a date or a short text.
     [[nodiscard]] bool Speaks(const Sample_Row& row, std::size_t i) const
@@ -200,7 +218,7 @@ Table_Place Find_Place(const Sample_Rows& rows, const Told_Dialect& told, Text_D
     const Rows head = Rows(all).first(rows.Head_Rows());
     const std::vector<Block> blocks = Joined(Blocks_Of(head), head);
     Table_Place place{0, head.size(), all.size(), false};
-    const std::optional<Block> table = First_Table(blocks);
+    const std::optional<Block> table = First_Table(blocks, rows);
     dialect.columns = table ? table->usual.count : Find_Usual_Count(head).count;
     dialect.comment = Comment_Mark(all, dialect.columns);
     const Place_Finder finder(rows, dialect);

@@ -115,7 +115,8 @@ bool Is_Escaped_Inside(const Text_Sample& sample, std::string_view escaped)
 {
     constexpr std::string_view outside = ",;\t|\r\n";
     for (const std::string_view piece : sample.pieces)
-        for (std::size_t at = piece.find(escaped); at != std::string_view::npos; at = piece.find(escaped, at + 1))
+        for (std::size_t at = piece.find(escaped); at != std::string_view::npos;
+             at = piece.find(escaped, at + 1))
             if (at + escaped.size() < piece.size()
                 && outside.find(piece[at + escaped.size()]) == std::string_view::npos)
                 return true;

@@ -175,8 +175,10 @@ Usual_Count Find_Usual_Count(std::span<const Sample_Row> rows)
 {
     std::map<std::int32_t, std::int64_t> counts;
     Usual_Count usual;
+    const bool only_comments =
+        std::ranges::all_of(rows, [](const Sample_Row& row) { return row.empty || row.comment; });
     for (const Sample_Row& row : rows)
-        if (!row.empty) {
+        if (!row.empty && (only_comments || !row.comment)) {
             ++counts[row.count];
             ++usual.all;
         }

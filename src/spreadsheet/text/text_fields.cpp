@@ -197,7 +197,6 @@ const char* Field_Walker::End_Of_Quoted(const char* first)
 
 bool Field_Walker::Find_Row()
 {
-    passed_empty_ = false;
     while (at_ < text_.last) {
         const char* end = at_;
         while (*end == ' ')

@@ -340,7 +340,7 @@ void Sheet_Filler::Fill_Row()
             columns_[index + Columns_Ahead].cells.Prefetch();
         Column_Filling& state = columns_[index++];
         Text_Field field = walker_.Next();
-        if (index == 1 && dialect_ != nullptr && Rewrite_Line(field)) [[unlikely]]
+        if (index == 1 && (*field.last == '\n' || *field.last == '\r') && Rewrite_Line(field)) [[unlikely]]
             field = walker_.Next();
         if (state.filling < Filling::moments)
             Fill_Number(field, state);
@@ -381,7 +381,7 @@ bool Sheet_Filler::Fill_Rows()
     const char* line = walker_.Place();
     told_ = line;
     ahead_.Come_To(0);
-    for (; walker_.At_Row() && !Ends_Table(); ++row_) {
+    for (; walker_.At_Row() && !(walker_.Passed_Empty_Line() && Ends_Table()); ++row_) {
         line = walker_.Place();
         Fill_Row();
         if (!Row_Is_Acceptable(line))

@@ -166,8 +166,7 @@ void Exchange(char* first, const char* last, char from, const Text_Dialect& dial
 /// that one.
 bool Sheet_Filler::Rewrite_Line(const Text_Field& field)
 {
-    const bool alone = *field.last == '\n' || *field.last == '\r';
-    if (!alone || columns_.size() < 2 || dialect_->runs || field.first == field.last)
+    if (dialect_ == nullptr || columns_.size() < 2 || dialect_->runs || field.first == field.last)
         return false;
     const std::string_view line(field.first, static_cast<std::size_t>(field.last - field.first));
     if (line.size() > Greatest_Line || line.find_first_of("\r\n") != std::string_view::npos)
@@ -192,7 +191,7 @@ bool Sheet_Filler::Rewrite_Line(const Text_Field& field)
 bool Sheet_Filler::Ends_Table()
 {
     constexpr int most_looks = 64;
-    if (!walker_.Passed_Empty_Line() || looks_at_tables_ == most_looks)
+    if (looks_at_tables_ == most_looks)
         return false;
     ++looks_at_tables_;
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
@@ -307,8 +306,6 @@ void Sheet_Filler::Redo_Spelling(const Text_Field& field, Column_Filling& state)
 /// For people a table of no rows is one.
 bool Sheet_Filler::Names_Alone() const
 {
-    if (dialect_ != nullptr && shape_.has_names)
-        Report_Message("The text holds names, but no rows.\n");
     return dialect_ != nullptr && shape_.has_names;
 }
 

@@ -139,7 +139,13 @@ public:
     [[nodiscard]] bool At_Line() const { return at_ < text_.last && *at_ != '\n' && *at_ != '\r'; }
 
     /// The same where empty lines and comments are passed over, which is for people.
-    [[nodiscard]] bool At_Row() { return dialect_ == nullptr ? At_Line() : Find_Row(); }
+    [[nodiscard]] bool At_Row()
+    {
+        passed_empty_ = false;
+        if (at_<text_.last&& * at_> '%') [[likely]]  // neither a line end, a blank nor the mark of a comment
+            return true;
+        return dialect_ == nullptr ? At_Line() : Find_Row();
+    }
 
     /// Whether an empty line was passed over on the way to this row.
     [[nodiscard]] bool Passed_Empty_Line() const { return passed_empty_; }

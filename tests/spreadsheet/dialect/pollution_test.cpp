@@ -49,7 +49,8 @@ std::string Written(const Written_Table& table, std::string text, const std::str
 {
     if (data && table.decimal != '.' && text.size() > 3 && text[text.size() - 3] == '.')
         text[text.size() - 3] = table.decimal;
-    const bool needed = text.find_first_of(",;\t|\n\"'") != std::string::npos || text.find(separator) != text.npos
+    const bool needed = text.find_first_of(",;\t|\n\"'") != std::string::npos
+                        || text.find(separator) != text.npos
                         || (separator == " " && (text.empty() || text.find(' ') != text.npos));
     const bool comma_number = data && table.decimal == ',' && separator != "," && text.find(',') != text.npos
                               && text.find_first_not_of("0123456789,") == text.npos;
@@ -64,8 +65,8 @@ std::string Written(const Written_Table& table, std::string text, const std::str
     return quoted + table.quote;
 }
 
-std::string Line_Of(const Written_Table& table, const std::vector<std::string>& cells, const std::string& separator,
-                    bool data)
+std::string Line_Of(const Written_Table& table, const std::vector<std::string>& cells,
+                    const std::string& separator, bool data)
 {
     std::string line;
     for (std::size_t i = 0; i < cells.size(); ++i)
@@ -96,8 +97,8 @@ std::string Text_Of(const Written_Table& table)
         if (row == table.empty_line)
             put("");
         const bool odd = row == table.odd_row;
-        put(Line_Of(table, table.rows[row], odd && !table.odd_separator.empty() ? table.odd_separator : table.separator,
-                    true)
+        put(Line_Of(table, table.rows[row],
+                    odd && !table.odd_separator.empty() ? table.odd_separator : table.separator, true)
             + (odd ? table.odd_end : ""));
     }
     if (table.last_end.empty())
@@ -145,21 +146,28 @@ constexpr Pollution Pollutions[] = {
     {"an empty line", [](Written_Table& t, std::size_t row) { t.empty_line = row; }, 8},
     {"a title", [](Written_Table& t, std::size_t) { t.front = "Yields of 2024" + t.line_end; }, 9},
     {"a title and an empty line",
-     [](Written_Table& t, std::size_t) { t.front = "Yields of 2024" + t.line_end + "Author: me" + t.line_end + t.line_end; },
+     [](Written_Table& t, std::size_t) {
+         t.front = "Yields of 2024" + t.line_end + "Author: me" + t.line_end + t.line_end;
+     },
      9},
     {"comments",
-     [](Written_Table& t, std::size_t) { t.front = "# made by hand" + t.line_end + "# in 2024" + t.line_end; }, 9},
-    {"a footer", [](Written_Table& t, std::size_t) { t.behind = t.line_end + "Source: the farm" + t.line_end; }, 2},
+     [](Written_Table& t, std::size_t) {
+         t.front = "# made by hand" + t.line_end + "# in 2024" + t.line_end;
+     },
+     9},
+    {"a footer",
+     [](Written_Table& t, std::size_t) { t.behind = t.line_end + "Source: the farm" + t.line_end; }, 2},
     {"a mark of UTF-8", [](Written_Table& t, std::size_t) { t.code = "mark"; }, 10},
     {"UTF-16", [](Written_Table& t, std::size_t) { t.code = "little"; }, 10},
     {"UTF-16, high bytes first", [](Written_Table& t, std::size_t) { t.code = "big"; }, 10},
-    {"a line in a text",
-     [](Written_Table& t, std::size_t row) { t.rows[row][5] = "two\nlines"; }, 11},
+    {"a line in a text", [](Written_Table& t, std::size_t row) { t.rows[row][5] = "two\nlines"; }, 11},
     {"a quote in a text", [](Written_Table& t, std::size_t row) { t.rows[row][1] = "5\" pipe"; }, 11},
     {"a missing word", [](Written_Table& t, std::size_t row) { t.rows[row][2] = "NA"; }, 12},
     {"a name in two lines",
-     [](Written_Table& t, std::size_t) { t.names = {{"plot", "site", "yield", "sown", "code", "note"},
-                                                     {"(no)", "name", "(t/ha)", "(date)", "", ""}}; },
+     [](Written_Table& t, std::size_t) {
+         t.names = {{"plot", "site", "yield", "sown", "code", "note"},
+                    {"(no)", "name", "(t/ha)", "(date)", "", ""}};
+     },
      13},
 };
 
@@ -190,7 +198,8 @@ TEST_F(Pollution_Test, Each_Alone_In_Every_Row)
         for (std::size_t row = 0; row < 20; ++row) {
             Written_Table table = Clean_Table();
             pollution.apply(table, row);
-            ASSERT_EQ(Read(table), Wanted(table)) << pollution.told << ", row " << row << "\n" << Text_Of(table);
+            ASSERT_EQ(Read(table), Wanted(table)) << pollution.told << ", row " << row << "\n"
+                                                  << Text_Of(table);
         }
 }
 
@@ -216,7 +225,9 @@ TEST_F(Pollution_Test, Several_At_Once)
         const bool equal = Read(table) == Wanted(table);
         wrong += equal ? 0 : 1;
         if (!equal && wrong <= 5)
-            ADD_FAILURE() << told << "\n" << Text_Of(table).substr(0, 700) << "\n" << Read(table).substr(0, 600);
+            ADD_FAILURE() << told << "\n"
+                          << Text_Of(table).substr(0, 700) << "\n"
+                          << Read(table).substr(0, 600);
     }
     EXPECT_EQ(wrong, 0) << "of " << tries;
 }
