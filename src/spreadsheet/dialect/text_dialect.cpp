@@ -81,7 +81,7 @@ bool Begins_Other_Table(std::string_view text, const Text_Dialect& dialect)
     last = first + std::min<std::ptrdiff_t>(last - first, most_rows);
     const std::span block(first, last);
     const Usual_Count usual = Find_Usual_Count(block);
-    if (usual.count < 2 || usual.all < 2)
+    if (usual.count < 2 || usual.all < 2 || block[0].count != usual.count)
         return false;
     if (usual.count != dialect.columns)
         return usual.rows == usual.all;
@@ -98,26 +98,41 @@ bool Begins_Other_Table(std::string_view text, const Text_Dialect& dialect)
            && std::ranges::any_of(cut.Fields(block[1]), is_number);
 }
 
+namespace {
+
+/// Behind the next empty line at or behind `at`, and the empty ones that follow it; else the text's size.
+std::size_t Behind_Empty_Line(std::string_view text, std::size_t at)
+{
+    constexpr std::string_view ends = "\r\n";
+    while ((at = text.find_first_of(ends, at)) != std::string_view::npos) {
+        at += text.substr(at, 2) == ends ? 2 : 1;
+        const std::size_t next = std::min(text.find_first_not_of(" \r\n", at), text.size());
+        if (text.substr(at, next - at).find_first_of(ends) != std::string_view::npos)
+            return next;
+    }
+    return text.size();
+}
+
+/// Where another table begins behind the one that was found; else the text's size.
+std::size_t Start_Of_Next(std::string_view text, const Found_Table& found)
+{
+    constexpr int most_looks = 64;
+    std::size_t at = found.first;
+    for (int looks = 0; looks < most_looks; ++looks) {
+        at = Behind_Empty_Line(text, at);
+        if (at == text.size() || Begins_Other_Table(text.substr(at), found.dialect))
+            return at;
+    }
+    return text.size();
+}
+
+}  // namespace
+
 std::size_t Start_Of_Table(std::string_view text, std::int32_t table, const Told_Dialect& told)
 {
     std::size_t start = 0;
-    for (std::int32_t number = 1; number < table && start < text.size(); ++number) {
-        const std::string_view rest = text.substr(start);
-        const Found_Table found = Find_Dialect(rest, told);
-        const Sample_Rows cut({{rest}, true}, found.dialect);
-        std::size_t next = rest.size();
-        bool was_empty = false;
-        for (const Sample_Row& row : cut.Rows()) {
-            const auto at = static_cast<std::size_t>(row.first - rest.data());
-            if (at > found.first && was_empty && !row.empty
-                && Begins_Other_Table(rest.substr(at), found.dialect)) {
-                next = at;
-                break;
-            }
-            was_empty = row.empty;
-        }
-        start += next;
-    }
+    for (std::int32_t number = 1; number < table && start < text.size(); ++number)
+        start += Start_Of_Next(text.substr(start), Find_Dialect(text.substr(start), told));
     return start;
 }
 

@@ -59,7 +59,8 @@ bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& st
     const Text_Code code = declared != nullptr && !of_both_orders ? declared : marked;
     if (const Text_Code pattern = Code_Of_Pattern(bytes);
         code == nullptr && pattern != nullptr && For_People(People_Rule::sniffed_texts))
-        return Convert_Image(bytes, pattern, name, image);
+        return Convert_Image(bytes, state.code = pattern, name, image);
+    state.code = code != nullptr ? code : Utf_8_Code();
     if (code != nullptr && (code != Utf_8_Code() || !Letters_Are_Utf8()))
         return Convert_Image(bytes.substr(mark_length), code, name, image);
     state.head = mark_length;

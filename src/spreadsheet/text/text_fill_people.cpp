@@ -171,12 +171,17 @@ bool Sheet_Filler::Rewrite_Line(const Text_Field& field)
     const std::string_view line(field.first, static_cast<std::size_t>(field.last - field.first));
     if (line.size() > Greatest_Line || line.find_first_of("\r\n") != std::string_view::npos)
         return false;
-    const auto columns = static_cast<std::int32_t>(columns_.size());
+    const auto named =
+        std::ranges::find_if(columns_.rbegin(), columns_.rend(),
+                             [](const Column_Filling& state) { return !state.column->input_name.empty(); });
+    const std::int32_t right_counts[] = {static_cast<std::int32_t>(columns_.size()),
+                                         static_cast<std::int32_t>(columns_.rend() - named)};
     for (const char separator : {',', ';', '\t', '|', ' '}) {
         Text_Dialect other = *dialect_;
         other.separator = separator;
         other.runs = separator == ' ';
-        if (line.find(separator) == std::string_view::npos || Count_Fields(line, other) != columns)
+        if (line.find(separator) == std::string_view::npos
+            || std::ranges::count(right_counts, std::max(Count_Fields(line, other), 2)) == 0)
             continue;
         char* const first = buffer_.first + (field.first - buffer_.first);
         Exchange(first, first + line.size(), separator, *dialect_);

@@ -39,6 +39,7 @@ struct Text_Buffer {
 struct Text_Code_State {
     std::size_t head = 0;           ///< bytes in front of the text that tell its code
     bool watched = false;           ///< taken for UTF-8 until something else is met
+    Text_Code code = nullptr;       ///< as it was found so far; null where nothing was looked for
     Text_Code otherwise = nullptr;  ///< what it is then; malformed UTF-8 where that was told or declared
 };
 

@@ -108,7 +108,7 @@ Text_Scan_Options Options_For_Host(const std::string& name, const Text_Buffer& b
 }
 
 /// Reads a text and, where it was taken for UTF-8 and is none, reads it again as what it is.
-bool Parse_In_Its_Code(const std::string& name, const Text_Scan_Options& options, const Text_Code_State& code,
+bool Parse_In_Its_Code(const std::string& name, const Text_Scan_Options& options, Text_Code_State& code,
                        Text_Buffer& buffer, File_Image& image, bool rewritten)
 {
     const Name_Counters counters = Get_Name_Counters();
@@ -118,6 +118,7 @@ bool Parse_In_Its_Code(const std::string& name, const Text_Scan_Options& options
     } catch (const Text_Malformed&) {
         Set_Name_Counters(counters);
         request.losses = losses;
+        code.code = code.otherwise;
     }
     return Convert_Malformed(name, code, image, buffer) && Parse_Text_Buffer(buffer, options);
 }
@@ -145,6 +146,11 @@ bool Read_CSV(Input_File& file)
         good = Parse_In_Its_Code(file.Name(), options, code, buffer, image, rewritten);
     } catch (const Text_Changed&) {
         changed = true;
+    }
+    if (Found_Dialect() != nullptr && sniffed) {
+        dialect = *Found_Dialect();
+        dialect.code = code.code;
+        Set_Found_Dialect(dialect);
     }
     if (!changed && !image.Changed())
         return good;
