@@ -25,11 +25,14 @@
  *   /+vain           options that mean nothing to the input are told
  *   /+endings        outputs are known by further endings
  *   /+types          inputs are recognised by further tests
+ *   /+dialect        a text is cut and typed as its lines tell, and numbers keep their spelling
  *
  * and beside these rules:
  *
  *   /+strict         anything that can't be kept makes the request fail, and the old output stays
  *   /+report=FILE    what could not be kept is written into a file, as JSON
+ *   /+separator=SIGN, /+quote=SIGN, /+decimal=SIGN, /+header=N, /+skip=N, /+table=N, /+missing=A,B
+ *                    what a text's dialect is, in the place of what its lines tell
  *   /+encoding=NAME  the code of the input's texts, as UTF-8, latin1 or 850
  *   /+secondary=FILE the secondary file, where its record in the pass file holds a list
  *

@@ -29,8 +29,8 @@ struct Number_Spellings {
 struct Spelling_Watch {
     std::int32_t fewest = 400;  ///< decimals
     std::int32_t round = 0;     ///< most decimals of a number that ends with a zero
-    std::int32_t long_numbers = 0;
-    bool strange = false;  ///< some print otherwise than they are spelled
+    std::int32_t sampled = 0;   ///< numbers that only some of were looked at
+    bool strange = false;       ///< some print otherwise than they are spelled
 
     void Take(std::int32_t decimals, char last)
     {
@@ -40,10 +40,10 @@ struct Spelling_Watch {
     }
     /// Of numbers with more digits than are surely exact, most print as they are spelled or few do: some
     /// tell.
-    [[nodiscard]] bool Samples_Long_Number()
+    [[nodiscard]] bool Samples_Number()
     {
         constexpr std::int32_t looked_at = 64;
-        return ++long_numbers <= looked_at || long_numbers % looked_at == 0;
+        return ++sampled <= looked_at || sampled % looked_at == 0;
     }
     /// Whether all print as they are spelled, with the fewest decimals.
     [[nodiscard]] bool All_Are_Usual() const { return !strange && round <= fewest; }

@@ -134,12 +134,17 @@ Text_Field Field_Walker::Next_Quoted()
 Text_Field Field_Walker::Next_Quoted_For_People()
 {
     const char* const first = at_;
+    const char* const window = window_;
+    const std::size_t next = next_;
     if (*first == dialect_->quote && first >= open_until_) {
         if (const char* const end = End_Of_Quoted(first)) {
             at_ = end;
             return {first, at_};
         }
-        Go_To(first);
+        if (window_ == window)
+            next_ = next;
+        else
+            Go_To(first);
     }
     at_ = Next_End(first);
     return {first, at_};

@@ -259,11 +259,14 @@ inline bool Is_Plainly_Spelled(const Text_Field& field, std::int32_t decimals, S
 {
     constexpr std::ptrdiff_t surely_exact = 15;
     const char* const digits = field.first + (*field.first == '-' ? 1 : 0);
-    if (decimals < 0 || *digits == '.' || (*digits == '0' && digits + 1 != field.last && digits[1] != '.')
+    if (*digits == '.' || (*digits == '0' && digits + 1 != field.last && digits[1] != '.')
         || field.last[-1] == '.') [[unlikely]]
         return false;
-    if (field.last - digits > surely_exact && (decimals == 0 || watch.Samples_Long_Number())) [[unlikely]]
+    const bool sampled = decimals < 0 || field.last - digits > surely_exact;
+    if (sampled && (decimals == 0 || watch.Samples_Number())) [[unlikely]]
         return false;
+    if (decimals < 0)
+        return true;
     watch.Take(decimals, field.last[-1]);
     return true;
 }

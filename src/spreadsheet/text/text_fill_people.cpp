@@ -292,7 +292,8 @@ void Sheet_Filler::Watch_Spelling(std::string_view text, Column_Filling& state)
         state.spelling.Take(decimals, plain.back());
     if (printed == Without_Zeros(plain, decimals))
         return;
-    state.spelling.strange = state.spelling.strange || plain.size() > surely_exact;
+    const bool sampled = plain.size() > surely_exact || plain.find_first_of("eE") != std::string_view::npos;
+    state.spelling.strange = state.spelling.strange || sampled;
     Keep_Spelling(*state.column, cell, plain);
 }
 
