@@ -26,11 +26,14 @@
  *   /+endings        outputs are known by further endings, and packed where they end in .gz
  *   /+types          inputs are recognised by further tests
  *   /+plain          comma text and tabs are written as other programs take them
+ *   /+dialect        a text is cut and typed as its lines tell, and numbers keep their spelling
  *
  * and beside these rules:
  *
  *   /+strict         anything that can't be kept makes the request fail, and the old output stays
  *   /+report=FILE    what could not be kept is written into a file, as JSON
+ *   /+separator=SIGN, /+quote=SIGN, /+decimal=SIGN, /+header=N, /+skip=N, /+table=N, /+missing=A,B
+ *                    what a text's dialect is, in the place of what its lines tell
  *   /+encoding=NAME  the code of the input's texts, as UTF-8, latin1 or 850
  *   /+marks          of such texts names tell types, and * is missing
  *   /+crlf           their lines end with CR LF

@@ -43,7 +43,7 @@ void Add_Levels(const Column& column, const Column_Printer& printer, Column_Fact
         facts.levels.push_back({In_Utf8(printer.Level(level, room)), {}, 0});
         if (value == nullptr)
             continue;
-        facts.levels.back().value.assign(room, Print_Exactly(room, value->value.number));
+        facts.levels.back().value.assign(room, Print_Shortest(room, value->value.number));
         value = value->next;
     }
     for (const Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next) {

@@ -145,6 +145,12 @@ bool Holds_No_Controls(const Detection_Head& head)
     });
 }
 
+/// Mostly ASCII letters in UTF-16.
+bool Is_Unmarked_Unicode(const Detection_Head& head)
+{
+    return Code_Of_Pattern(head.Text().substr(0, head.length)) != nullptr;
+}
+
 /// Only texts have a code of letters that a user can declare and no test knows.
 bool Is_Declared_Text(const Detection_Head& /*head*/)
 {
@@ -296,6 +302,7 @@ constexpr Detection_Test Text_Tests[] = {
 /// Behind the text that hosts know.
 constexpr Detection_Test Further_Text_Tests[] = {
     {plain_text_file, {}, "", Holds_No_Controls},
+    {plain_text_file, {}, "", Is_Unmarked_Unicode},
     {plain_text_file, {}, "", Is_Declared_Text},
 };
 

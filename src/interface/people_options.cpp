@@ -3,6 +3,9 @@
 #include "interface/option_values.h"
 #include "request/request.h"
 
+#include "support/text.h"
+
+#include <algorithm>
 #include <array>
 
 namespace ingester {
@@ -26,7 +29,106 @@ constexpr std::array<People_Rule_Option, People_Rule_Count> Rules = {{
     {People_Rule::further_dates, "/+dates", "host-dates", "dates are read in the host's forms only"},
     {People_Rule::plain_texts, "/+plain", "host-output",
      "comma text and tabs are written as for a host: marks behind names, * for missing, CR LF"},
+    {People_Rule::sniffed_texts, "/+dialect", "host-dialect", "texts are cut and typed as the host does"},
 }};
+
+/// What follows a key: a value in quotes, or bare up to the next option.
+Option_Value Value_At(std::string_view text, std::size_t at)
+{
+    return Quoted_Or_Bare(text, at, Quotes_And_Backquote, Option_Start);
+}
+
+/// A character by its own sign or by name.
+struct Named_Sign {
+    std::string_view name;
+    char sign;
+};
+constexpr Named_Sign Named_Signs[] = {
+    {"comma", ','}, {"semicolon", ';'}, {"tab", '\t'},   {"\\t", '\t'},    {"bar", '|'},
+    {"pipe", '|'},  {"blank", ' '},     {"blanks", ' '}, {"space", ' '},   {"colon", ':'},
+    {"point", '.'}, {"none", '\0'},     {"double", '"'}, {"single", '\''},
+};
+
+/// The sign that a value means; its first character where it names none.
+char Sign_Of(std::string_view value)
+{
+    const auto named =
+        std::ranges::find_if(Named_Signs, [&](const Named_Sign& sign) { return sign.name == value; });
+    return named != std::end(Named_Signs) ? named->sign : value.empty() ? '\0' : value.front();
+}
+
+Taken Take_Separator(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Value_At(text, at);
+    const bool named =
+        std::ranges::any_of(Named_Signs, [&](const Named_Sign& sign) { return sign.name == value.text; });
+    const char sign = Sign_Of(value.text);
+    request.Told_Separators = named ? std::string_view(&sign, 1) : value.text;
+    return value.end;
+}
+
+Taken Take_Quote(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Value_At(text, at);
+    request.Told_Quote = Sign_Of(value.text);
+    return value.end;
+}
+
+Taken Take_Decimal(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Value_At(text, at);
+    request.Told_Decimal = Sign_Of(value.text);
+    return value.end;
+}
+
+bool Is_Count(std::string_view value)
+{
+    return !value.empty() && std::ranges::all_of(value, Is_Digit);
+}
+
+/// A number of lines, or "none"; left out it is 1. Of a grid it is the row.
+Taken Take_Names_Lines(std::string_view text, std::size_t at)
+{
+    constexpr long most_lines = 2147483647;
+    if (!Stands_At(text, at, "=")) {
+        request.Names_Given = true;
+        request.Told_Names_Lines = 1;
+        return at;
+    }
+    const Option_Value value = Up_To(text, at + 1, Option_Start);
+    if (value.text != "none" && !Is_Count(value.text))
+        return at;
+    const long lines = std::clamp(Leading_Integer(value.text), 0L, most_lines);
+    request.Names_Given = lines > 0;
+    request.No_Names = lines == 0;
+    request.Told_Names_Lines = request.Names_Row = static_cast<std::int32_t>(lines);
+    return value.end;
+}
+
+template <auto Member> Taken Take_Count(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Up_To(text, at, Option_Start);
+    if (!Is_Count(value.text))
+        return at;
+    request.*Member = static_cast<std::int32_t>(std::clamp(Leading_Integer(value.text), 0L, 2147483647L));
+    return value.end;
+}
+
+/// Words with commas between them.
+Taken Take_Missing_Words(std::string_view text, std::size_t at)
+{
+    const Option_Value value = Value_At(text, at);
+    std::string_view rest = value.text;
+    request.Missing_Words.clear();
+    request.Missing_Input_Text = rest.substr(0, rest.find(','));  // of formats that know one
+    for (;;) {
+        const std::size_t comma = rest.find(',');
+        request.Missing_Words.emplace_back(Trim_Copy(rest.substr(0, comma)));
+        if (comma == std::string_view::npos)
+            return value.end;
+        rest.remove_prefix(comma + 1);
+    }
+}
 
 constexpr Slash_Option Others[] = {
     {"/+strict", Set<&R::Strict, true>, "fail, and leave the old output, where anything could not be kept",
@@ -44,6 +146,17 @@ constexpr Slash_Option Others[] = {
     {"/+write-encoding=", Take_Text<&R::Output_Encoding>, "code of the letters in texts that are written",
      Bare("write-encoding", "NAME")},
     {"/+bom", Set<&R::Write_Code_Mark, true>, "texts begin with the mark of Unicode", Flag("bom")},
+    {"/+separator=", Take_Separator,
+     "between the fields of a text: a sign, or comma, semicolon, tab, bar, blanks",
+     Quoted("separator", "SIGN")},
+    {"/+quote=", Take_Quote, "around texts: a sign, or double, single, none", Quoted("quote", "SIGN")},
+    {"/+decimal=", Take_Decimal, "decimal mark of a text: point or comma", Quoted("decimal", "SIGN")},
+    {"/+header", Take_Names_Lines, "there are names, in one line or several", Optional("names", "N|none")},
+    {"/+skip=", Take_Count<&R::Told_Skipped_Lines>, "lines at the head of a text that are passed over",
+     Bare("skip-lines", "N")},
+    {"/+table=", Take_Count<&R::Told_Table>, "which of the tables of a text, behind empty lines",
+     Bare("table", "N")},
+    {"/+missing=", Take_Missing_Words, "words that mean missing", Quoted("missing", "A,B")},
     {"/+secondary=",
      Take_Text<&R::Named_Secondary_File>,
      "second file that some inputs need",

@@ -14,6 +14,8 @@ bool Delete_Empty_Rows(Sheet* sheet)
     const std::int32_t empty = Find_Empty_Rows(sheet, true);
     if (empty == 0)
         return true;
+    if (For_People(People_Rule::sniffed_texts) && empty < sheet->row_count)
+        Note_Loss(Loss_Kind::input_unread, {}, 0, "empty rows", empty);
     if (empty == sheet->row_count)
         Report_Message("Warning: All rows in the input file are empty.\n"
                        "Use KEEPEMTPY=rows to return the empty rows.\n");

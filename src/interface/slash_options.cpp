@@ -179,10 +179,10 @@ constexpr Slash_Option Genotype_Table[] = {
 };
 
 constexpr Slash_Option Input_Table[] = {
-    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing", Quoted("missing", "TEXT")},
+    {"/x=", Take_Text<&R::Missing_Input_Text>, "text that means missing"},
     {"/g=", Take_Delete_Marker, "version number in the host's scratch names"},
     {"/lt=", Take_Fixed_Lines, "lines to skip in front of one line that is read as a column",
-     Bare("skip-lines", "N"), Of_Some_Readers},
+     Bare("one-record-after", "N"), Of_Some_Readers},
     {"/a", Set<&R::Keep_Probe_Statistics, false>, "leave out statistics of microarray probes",
      Flag("no-probe-statistics"), Of_Some_Readers},
     {"/b", Set_Setting<&Settings::trim_cells, 0>, "texts keep their outer blanks", Flag("keep-blanks")},
@@ -205,8 +205,11 @@ constexpr Slash_Option Input_Table[] = {
     {"/n", Set<&R::No_Names, true>, "there is no row of names", Flag("no-names"), Of_Some_Readers},
     {"/#", Set_Setting<&Settings::bracket_names, 0>, "keep quoted suffixes of names as text",
      Flag("text-suffixes")},
-    {"/y", Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>, "there is a row of names",
-     Optional("names", "ROW"), Of_Some_Readers},
+    {"/y",
+     Take_Flag_And_Number<&R::Names_Given, &R::Names_Row>,
+     "there is a row of names",
+     {},
+     Of_Some_Readers},
     {"/tr", Take_Transpose, "transpose; N: without names", Optional("transpose", "N")},
     {"/t", Take_Text_Number_Mode, "how texts become numbers, 0 to 4", Bare("text-numbers", "MODE")},
     {"/i", Set_Setting<&Settings::ignore_value_case, 1>, "labels differ in more than case",

@@ -61,7 +61,7 @@ public:
     {
         if (digits_ > 0)
             return Print_General(target, value, digits_);
-        return digits_ == Digits_Needed ? Print_Exactly(target, value) : Print_By_Column(target, value);
+        return digits_ == Digits_Needed ? Print_Shortest(target, value) : Print_By_Column(target, value);
     }
 
     /// Whether a Factor's cell holds a level, a margin among them where the rules say so.

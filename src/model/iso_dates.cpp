@@ -144,9 +144,9 @@ char* Print_For_Others(char* target, const Column& column, Iso_Form form, double
 {
     constexpr double thousandths = 1000;
     if (column.format != date_format_mark || column.date_format == plain_format)
-        return Print_Exactly(target, value);
+        return Print_Shortest(target, value);
     if (column.date_format == seconds_format)
-        return Print_Exactly(target, std::round(value * Seconds_A_Day * thousandths) / thousandths);
+        return Print_Shortest(target, std::round(value * Seconds_A_Day * thousandths) / thousandths);
     return Iso_Can_Write(value, column.date_form, form) ? Print_Iso(target, value, column.date_form, form)
                                                         : target;
 }

@@ -6,10 +6,12 @@
 
 #include "model/cells.h"
 #include "model/host_fields.h"
+#include "model/spellings.h"
 #include "request/settings.h"
 #include "support/fixed_text.h"
 
 #include <cstdint>
+#include <memory>
 #include <span>
 #include <string>
 #include <string_view>
@@ -92,9 +94,10 @@ struct Column : Column_Host_Fields {
     std::int32_t type = variate_column;
     Sheet* sheet = nullptr;
     Fixed_Text<Name_Width> name;
-    Fixed_Text<Extra_Width> extra;  ///< the long description
-    Block_Table blocks;             ///< owns the cells
-    Text_Arena texts;               ///< owns the texts of cells and labels
+    Fixed_Text<Extra_Width> extra;                ///< the long description
+    Block_Table blocks;                           ///< owns the cells
+    Text_Arena texts;                             ///< owns the texts of cells and labels
+    std::unique_ptr<Number_Spellings> spellings;  ///< of numbers that came from a text; null: as they print
     std::int32_t changed_display = 0;
     std::int32_t index = 0;        ///< 0 for the `Row` column, then 1, 2, ...
     std::int32_t input_place = 0;  ///< `index` before some columns were left out; 0: none were

@@ -188,6 +188,25 @@ Text_Code Code_Of_Letters()
     return Letters_Are_Utf8() ? Utf_8_Code() : Windows_1252_Code();
 }
 
+Text_Code Code_Of_Pattern(std::string_view bytes)
+{
+    constexpr std::size_t looked_at = 200;
+    constexpr std::size_t fewest = 4;
+    bytes = bytes.substr(0, looked_at);
+    std::size_t letters[] = {0, 0};  // with the other byte 0, by their place
+    const std::size_t units = bytes.size() / 2;
+    for (std::size_t i = 0; i + 1 < bytes.size(); i += 2)
+        for (const std::size_t place : {0, 1}) {
+            const char c = bytes[i + place];
+            const bool text = (c >= ' ' && c < 127) || c == '\t' || c == '\r' || c == '\n';
+            letters[place] += text && bytes[i + 1 - place] == '\0' ? 1 : 0;
+        }
+    for (const std::size_t place : {0, 1})
+        if (units >= fewest && letters[place] * 10 >= units * 8)
+            return Text_Code_Of_Page(place == 0 ? 1200 : 1201);
+    return nullptr;
+}
+
 Text_Code Code_Of_Mark(std::string_view bytes, std::size_t& mark_length)
 {
     struct Mark {

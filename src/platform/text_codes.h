@@ -54,6 +54,9 @@ using Text_Code = const Text_Code_Facts*;
 /// The code that the bytes of a file tell by a mark at their head, which has `mark_length` bytes; else null.
 [[nodiscard]] Text_Code Code_Of_Mark(std::string_view bytes, std::size_t& mark_length);
 
+/// UTF-16 without a mark, as mostly ASCII letters in it look; else null.
+[[nodiscard]] Text_Code Code_Of_Pattern(std::string_view bytes);
+
 /// The code of a file that tells none: what is declared (null for nothing); else, where letters are UTF-8,
 /// what its mark tells, or UTF-8 when all bytes are such and Windows-1252 when not; else that of all letters.
 [[nodiscard]] Text_Code Code_Of_Bytes(std::string_view bytes, Text_Code declared);

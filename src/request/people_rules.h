@@ -17,8 +17,9 @@ enum class People_Rule : std::uint8_t {
     kept_levels,    ///< joins match levels by what they say, add those that are new, and keep labels of units
     further_dates,  ///< dates are read in more of their usual forms
     plain_texts,    ///< comma text and tabs are written as other programs take them
+    sniffed_texts,  ///< the dialect of a text is found from its lines, and its types as people mean them
 };
-constexpr std::size_t People_Rule_Count = 9;
+constexpr std::size_t People_Rule_Count = 10;
 
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);

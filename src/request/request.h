@@ -10,10 +10,14 @@
 #include <array>
 #include <bitset>
 #include <cstdint>
+#include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
 namespace ingester {
+
+struct Text_Dialect;
 
 /// How the result is joined with an existing output.
 enum class Add_Modes : std::int32_t { none = 0, append = 1, concatenate = 2, merge = 3 };
@@ -52,6 +56,15 @@ struct Request_Globals : Lasting_Globals {
     bool Write_Crlf = false;
     bool Write_Code_Mark = false;  ///< the mark of Unicode comes first
 
+    // What people tell of a text, which is found from its lines otherwise.
+    Fixed_Text<20> Told_Separators;          ///< as `Custom_Separators`
+    std::optional<char> Told_Quote;          ///< around texts; NUL: none
+    char Told_Decimal = '\0';                ///< NUL: not told
+    std::int32_t Told_Names_Lines = -1;      ///< below 0: not told
+    std::int64_t Told_Skipped_Lines = -1;    ///< lines at the head that are passed over; below 0: not told
+    std::int32_t Told_Table = 0;             ///< which of several tables; 0: not told
+    std::vector<std::string> Missing_Words;  ///< that mean missing; empty: the usual ones
+
     // From the pass file.
     Fixed_Text<Short_Name_Width> Worksheet_Name;
     Fixed_Text<Short_Name_Width> Cell_Range;
@@ -77,6 +90,7 @@ struct Request_Globals : Lasting_Globals {
     std::int32_t Content_Code = 0;       ///< the type of what was read, inside its compression
     Loss_Ledger losses;                  ///< what could not be kept
     Input_Facts input_facts;             ///< what the reader found of the file's form
+    std::shared_ptr<const Text_Dialect> Found_Text_Dialect;  ///< of the text that was read
     std::vector<std::int32_t> Column_Wanted_Types;  ///< by column: 2 Factor, 4 Variate, 3 Text, 0 any
     std::int64_t Column_Wanted_Count = 0;           ///< of the list's lines, as it says; 0 where it doesn't
     std::vector<std::string> Column_Wanted_Names;   ///< whose types they are; empty: by place

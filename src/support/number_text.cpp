@@ -31,8 +31,8 @@ struct Decimal_Digits {
     char text[32] = {};  ///< the digits stand at the end of the first half
     int count = 0;       ///< without the zeros at the end
     int point = 0;
-    std::uint64_t whole = 0;  ///< the digits as a number, zeros at the end included
-    int scale = 0;            ///< of them behind the point
+    std::uint64_t number = 0;  ///< all digits; it is the value times 10^scale
+    int scale = 0;
 
     [[nodiscard]] const char* Digits(int all) const { return text + sizeof text / 2 - all; }
 };
@@ -116,7 +116,7 @@ bool Round_To_Digits(double value, int wanted, Decimal_Digits& decimal)
     Print_Sixteen_Digits(decimal.text, rounded, zeros);
     decimal.count = wanted - zeros;
     decimal.point = wanted - scale;
-    decimal.whole = rounded;
+    decimal.number = rounded;
     decimal.scale = scale;
     return rounded >= limit / 10;
 }
@@ -125,7 +125,7 @@ bool Round_To_Digits(double value, int wanted, Decimal_Digits& decimal)
 /// does.
 bool Read_Back_As(double value, const Decimal_Digits& decimal)
 {
-    return static_cast<double>(decimal.whole) / Exact_Powers[static_cast<std::size_t>(decimal.scale)]
+    return static_cast<double>(decimal.number) / Exact_Powers[static_cast<std::size_t>(decimal.scale)]
            == value;
 }
 
@@ -343,9 +343,16 @@ bool Convert_Widely(const Decimal_Scan& scan, double& value)
 
 bool Parse_Usual_Number(const char* first, const char* last, double& value)
 {
+    std::int32_t decimals;
+    return Parse_Usual_Number(first, last, value, decimals);
+}
+
+bool Parse_Usual_Number(const char* first, const char* last, double& value, std::int32_t& decimals)
+{
     const bool negative = *first == '-';
     first += negative ? 1 : 0;
     Decimal_Scan scan;
+    const char* const end = last;
     Cut_Exponent(first, last, scan);
     const std::ptrdiff_t length = last - first;
     if (length < 1 || length > static_cast<std::ptrdiff_t>(Most_Safe_Digits) + 1
@@ -355,6 +362,7 @@ bool Parse_Usual_Number(const char* first, const char* last, double& value)
         || !(Convert_Exactly(scan, value) || Convert_Widely(scan, value)))
         return false;
     value = negative ? -value : value;
+    decimals = last == end ? -scan.exponent : -1;
     return true;
 }
 
@@ -398,19 +406,24 @@ char* Print_General(char* target, double value, int digits)
     return Print_By_Library(target, value, std::chars_format::general, digits);
 }
 
-char* Print_Exactly(char* target, double value)
+char* Print_Shortest(char* target, double value)
 {
+    constexpr double least_plain = 1e-4;
+    constexpr double plain_end = 1e17;
     if (Is_Plain_Integer(value, Plain_Integer_Limit))
         return Print_Integer(target, static_cast<std::int64_t>(value));
     Decimal_Digits decimal{};
     const double size = std::fabs(value);
-    if (size >= 1e-4 && Round_To_Digits(size, Most_Quick_Digits, decimal)
+    if (size >= least_plain && Round_To_Digits(size, Most_Quick_Digits, decimal)
         && decimal.point <= Most_Quick_Digits && Read_Back_As(size, decimal)) {
         if (value < 0.0)
             *target++ = '-';
         return Lay_Out_Plain(target, decimal, Most_Quick_Digits);
     }
-    return std::to_chars(target, target + Number_Text_Room, value).ptr;
+    const bool plain = (size >= least_plain && size < plain_end) || size == 0.0;
+    return std::to_chars(target, target + Number_Text_Room, value,
+                         plain ? std::chars_format::fixed : std::chars_format::scientific)
+        .ptr;
 }
 
 char* Print_Exponent(char* target, double value, int decimals)

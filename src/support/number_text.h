@@ -27,6 +27,10 @@ struct Parsed_Number {
 /// among them, an exponent of two. Quicker than `Parse_Number`, which has the last word on what this
 /// refuses. `Readable_Behind` bytes behind `last` may be read, whatever they are.
 [[nodiscard]] bool Parse_Usual_Number(const char* first, const char* last, double& value);
+
+/// The same, and how many decimals it has; below 0 for a number with an exponent.
+[[nodiscard]] bool Parse_Usual_Number(const char* first, const char* last, double& value,
+                                      std::int32_t& decimals);
 constexpr std::size_t Readable_Behind = 16;
 
 /// The number that the whole of `text` is, if it is one.
@@ -43,8 +47,8 @@ constexpr std::size_t Number_Text_Room = 400;
 /// As printf's "%.{digits}g" prints a finite `value`; 1 to 40 digits. Returns the end of the text.
 char* Print_General(char* target, double value, int digits);
 
-/// The fewest digits that are read as just this finite `value` again.
-char* Print_Exactly(char* target, double value);
+/// The shortest text that reads as the same finite `value`: without an exponent from 0.0001 to 10^17.
+char* Print_Shortest(char* target, double value);
 
 /// As printf's "%.{decimals}e" prints it; 0 to 40 decimals.
 char* Print_Exponent(char* target, double value, int decimals);

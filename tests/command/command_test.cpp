@@ -242,7 +242,7 @@ TEST_F(Command_Test, Tells_What_It_Would_Send_And_What_It_Can)
     const std::pair<const char*, const char*> cases[] = {
         {"--dry-run 'my data/crops 1.csv' new.gen --missing \"N'A\" --names=4 --append=a,b --start 'it is' "
          "--map in/a.map --quiet-read --range 2:3",
-         "Infile: my data\\crops 1.csv/+people/map='in\\a.map'/x=\"N'A\"/y=4/s='it is'\n"
+         "Infile: my data\\crops 1.csv/+people/+header=4/+missing=\"N'A\"/map='in\\a.map'/s='it is'\n"
          "Outfile: new.gen/q/@,a,b\nWorksheet: \nCell range: 2:3\n"},
         {"formats", "comma text                           -      yes     .csv\n"},
         {"formats --all", "\nShapefile "},

@@ -142,7 +142,7 @@ TEST(Number_Text, Prints_No_More_Digits_Than_Are_Read_Back)
         if (!std::isfinite(value))
             continue;
         char text[Number_Text_Room + 1] = {};
-        char* const end = Print_Exactly(text, value);
+        char* const end = Print_Shortest(text, value);
         ASSERT_EQ(std::strtod(text, nullptr), value) << text;
         char least[Number_Text_Room];
         const auto shortest = std::to_chars(least, std::end(least), value, std::chars_format::scientific);

@@ -55,6 +55,8 @@ Request_Status Read_Input(Request_Run& run)
     }
     if (Current_Sheet == nullptr)
         return Stop(Request_Status::no_data, "Data could not be read from input file.\n");
+    if (request.Found_Text_Dialect != nullptr && Current_Sheet->row_count < 1)
+        return Stop(Request_Status::no_rows, "The text holds names, but no rows.\n");
     return Done;
 }
 

@@ -36,7 +36,7 @@ Meaning Meaning_Of_Label(std::string_view label, Text_Arena& room)
     if (!Whole_Number_Text(Trim_Copy(label), number))
         return {label, label, std::nan("")};
     char text[Number_Text_Room];
-    return {label, Printed(room, text, Print_Exactly(text, number)), number};
+    return {label, Printed(room, text, Print_Shortest(text, number)), number};
 }
 
 /// Dates say what they print as: that is what labels hold.
@@ -46,7 +46,7 @@ Meaning Meaning_Of_Value(const Column& factor, double value, Text_Arena& room)
     const std::string_view said = Printed(room, text, Format_Cell_Fully(text, factor, value));
     if (factor.format == date_format_mark || !Is_Present(*factor.sheet, value))
         return {said, said, value};
-    return {said, Printed(room, text, Print_Exactly(text, value)), value};
+    return {said, Printed(room, text, Print_Shortest(text, value)), value};
 }
 
 Meaning Meaning_Of_Number(std::int32_t level, Text_Arena& room)

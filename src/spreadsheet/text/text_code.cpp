@@ -1,6 +1,7 @@
 // The code of a text that is read.
 #include "request/losses.h"
 #include "request/messages.h"
+#include "request/people_rules.h"
 #include "request/text_crossing.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/letters.h"
@@ -56,6 +57,10 @@ bool Settle_Code(const std::string& name, File_Image& image, Text_Code_State& st
     if (declared != nullptr && marked != declared && !of_both_orders)
         mark_length = 0;
     const Text_Code code = declared != nullptr && !of_both_orders ? declared : marked;
+    if (const Text_Code pattern = Code_Of_Pattern(bytes);
+        code == nullptr && pattern != nullptr && For_People(People_Rule::sniffed_texts))
+        return Convert_Image(bytes, state.code = pattern, name, image);
+    state.code = code != nullptr ? code : Utf_8_Code();
     if (code != nullptr && (code != Utf_8_Code() || !Letters_Are_Utf8()))
         return Convert_Image(bytes.substr(mark_length), code, name, image);
     state.head = mark_length;

@@ -25,14 +25,18 @@ bool Is_Blank_Or_Tab(char c)
 }  // namespace
 
 Field_Walker::Field_Walker(const Text_Scan_Options& options, const Text_Buffer& buffer)
-    : text_(buffer), quotes_(options.separators_given), places_(Window_Size)
+    : text_(buffer), quotes_(options.separators_given), dialect_(options.dialect), places_(Window_Size)
 {
+    if (dialect_ != nullptr)
+        quotes_ = dialect_->quote != '\0';
     std::string marks = "\n\r";
     marks += options.separators_given ? options.separators.view() : " \t";
     ends_ = Byte_Finder(marks);
     for (const char quote : {'"', '\''})
-        if (quotes_ && !ends_.Holds(quote))
+        if (quotes_ && !ends_.Holds(quote) && (dialect_ == nullptr || dialect_->quote == quote))
             marks += quote;
+    if (dialect_ != nullptr && quotes_ && marks.find(dialect_->quote) == std::string::npos)
+        marks += dialect_->quote;
     marks_ = Byte_Finder(marks);
     Go_To(buffer.first);
 }
@@ -110,6 +114,8 @@ Text_Field Field_Walker::Next_Quoted()
 {
     const char* const first = at_;
     const char quote = *first;
+    if (dialect_ != nullptr)
+        return Next_Quoted_For_People();
     for (const char* mark = first;;) {
         mark = Next_Quote(mark + 1, quote);
         if (*mark != quote) {
@@ -122,6 +128,97 @@ Text_Field Field_Walker::Next_Quoted()
         }
         ++mark;
     }
+}
+
+/// A quote that isn't closed is a letter like others.
+Text_Field Field_Walker::Next_Quoted_For_People()
+{
+    const char* const first = at_;
+    const char* const window = window_;
+    const std::size_t next = next_;
+    if (*first == dialect_->quote && first >= open_until_) {
+        if (const char* const end = End_Of_Quoted(first)) {
+            at_ = end;
+            return {first, at_};
+        }
+        if (window_ == window)
+            next_ = next;
+        else
+            Go_To(first);
+    }
+    at_ = Next_End(first);
+    return {first, at_};
+}
+
+namespace {
+
+/// Whether the quote at `mark` has an odd number of escapes in front of it.
+bool Is_Escaped(const char* first, const char* mark, char escape)
+{
+    std::ptrdiff_t count = 0;
+    while (mark - count - 1 > first && mark[-count - 1] == escape)
+        ++count;
+    return count % 2 == 1;
+}
+
+}  // namespace
+
+/// Over line ends only a quote closes that follows the rules; in its line also one behind stray quotes,
+/// unless another field begins with a quote before. Null for none.
+const char* Field_Walker::End_Of_Quoted(const char* first)
+{
+    const char quote = *first;
+    const char escape = dialect_->escape;
+    bool stray = false;
+    bool lines = false;
+    for (const char* mark = first;;) {
+        mark = Next_Quote(mark + 1, quote);
+        if (*mark != quote) {
+            lines = true;
+            const bool runs_on = static_cast<std::size_t>(mark - first) > Greatest_Line;
+            if (!stray && !runs_on && mark + 1 < text_.last)
+                continue;
+            open_until_ = stray ? open_until_ : mark;
+            return nullptr;
+        }
+        if (escape != '\0' && Is_Escaped(first, mark, escape))
+            continue;
+        const char* end = mark + 1;
+        while (*end == ' ' && !ends_.Holds(' '))
+            ++end;
+        if (ends_.Holds(*end))
+            return Next_End(end);
+        if (escape == '\0' && mark[1] == quote) {
+            ++mark;
+            continue;
+        }
+        if (lines || (stray && ends_.Holds(mark[-1]))) {
+            open_until_ = lines ? mark : open_until_;
+            return nullptr;
+        }
+        stray = true;
+    }
+}
+
+bool Field_Walker::Find_Row()
+{
+    while (at_ < text_.last) {
+        const char* end = at_;
+        while (*end == ' ')
+            ++end;
+        if (*end == '\n' || *end == '\r') {
+            passed_empty_ = true;
+            at_ = end + 1;
+        } else if (*at_ == dialect_->comment && dialect_->comment != '\0') {
+            at_ = std::find_first_of(at_, static_cast<const char*>(text_.last), Line_Ends.begin(),
+                                     Line_Ends.end());
+            at_ += at_ != text_.last ? 1 : 0;
+            at_ += at_ != text_.last && at_[-1] == '\r' && *at_ == '\n' ? 1 : 0;
+        } else {
+            return true;
+        }
+    }
+    return false;
 }
 
 /// Behind a blank or a CR that has been stepped over. Both may stand in front of the line's end.
@@ -159,11 +256,13 @@ const char* Field_Walker::First_Line() const
 Field_Content Field_Walker::Content(const Text_Field& field) const
 {
     std::string_view text(field.first, static_cast<std::size_t>(field.last - field.first));
-    if (!quotes_)
+    if (!quotes_ && dialect_ == nullptr)
         return {text};
     while (!text.empty() && Is_Blank_Or_Tab(text.front()))
         text.remove_prefix(1);
-    if (text.empty() || (text.front() != '"' && text.front() != '\''))
+    const char quote = dialect_ != nullptr ? dialect_->quote : '\0';
+    if (text.empty()
+        || (dialect_ == nullptr ? text.front() != '"' && text.front() != '\'' : text.front() != quote))
         return {text};
     std::string_view bare = text;
     while (Is_Blank_Or_Tab(bare.back()))

@@ -10,6 +10,7 @@
 #include "request/losses.h"
 #include "request/messages.h"
 #include "request/request.h"
+#include "spreadsheet/text/text_filler.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/letters.h"
 #include "support/number_text.h"
@@ -23,22 +24,6 @@ namespace ingester {
 
 namespace {
 
-/// What is done with the fields of a column.
-enum class Filling : std::uint8_t {
-    numbers_so_far,  ///< undecided: numbers until a field says otherwise
-    numbers,         ///< a Variate by its mark: what isn't a number is missing
-    texts,
-    left_out,  ///< a Variate without cells, which goes when the text is read
-};
-
-struct Column_Filling {
-    Column* column;
-    Cell_Appender cells;
-    Filling filling;
-    std::int64_t rows_to_redo = 0;  ///< rows filled with numbers before the column became Text
-    Cell_Node* cell_to_redo = nullptr;
-};
-
 /// One trailing mark of a name has done its work when the scan is over.
 void Cut_Type_Mark(Column& column)
 {
@@ -49,93 +34,37 @@ void Cut_Type_Mark(Column& column)
         column.name = std::string(name.substr(0, name.size() - 1));
 }
 
-constexpr std::int32_t New_Column_Width = 6;
-constexpr std::int64_t Spare_Rows = 8;
-constexpr std::size_t Columns_Ahead = 12;
-
 /// A number that is too great or too small for a cell.
 bool Is_Beyond_Doubles(std::string_view text)
 {
     return Parse_Number(text.data(), text.data() + text.size()).status == Number_Status::out_of_range;
 }
 
-class Sheet_Filler {
-public:
-    Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options, const Text_Buffer& buffer,
-                 File_Image* image)
-        : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells),
-          cells_may_shift_(options.cells_may_shift), buffer_(buffer), image_(image)
-    {
-        missing_.number = sheet.missing_value;
-        empty_.text = Text_Arena::Empty();
-        double number;
-        no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number);
-        Column* column = sheet.first_column->next;
-        for (const Cell_Appender& cells :
-             Make_Appenders(sheet, sheet.first_column->next, Expected_Rows(), &ahead_)) {
-            Start_Column(*column, cells);
-            column = column->next;
-        }
-        Limit_Rows();
+}  // namespace
+
+Sheet_Filler::Sheet_Filler(Sheet& sheet, Text_Shape& shape, const Text_Scan_Options& options,
+                           const Text_Buffer& buffer, File_Image* image)
+    : sheet_(sheet), shape_(shape), walker_(options, buffer), trim_(options.trim_cells),
+      cells_may_shift_(options.cells_may_shift), buffer_(buffer), image_(image), dialect_(options.dialect)
+{
+    missing_.number = sheet.missing_value;
+    empty_.text = Text_Arena::Empty();
+    double number;
+    const auto is_number = [&](const std::string& word) { return Whole_Number_Text(word, number); };
+    no_number_is_missing_ = !Whole_Number_Text(request.Missing_Input_Text, number)
+                            && std::ranges::none_of(request.Missing_Words, is_number);
+    if (dialect_ != nullptr) {
+        marks_ = {dialect_->decimal, dialect_->thousands};
+        no_number_is_missing_ = no_number_is_missing_ && marks_.decimal == '.';
     }
-
-    bool Fill();
-
-    /// Takes out the columns that the request leaves out.
-    void Drop_Left_Out();
-
-private:
-    [[nodiscard]] std::int64_t Expected_Rows() const;
-    void Limit_Rows();
-    void Start_Column(Column& column, const Cell_Appender& cells);
-    void Fill_Names();
-    void Name_Column(std::size_t index, std::string_view text);
-    void Settle_Names();
-    void Leave_Out(std::size_t index);
-    void Leave_Out_Unlisted();
-    void Take_Wanted_Types();
-    bool Fill_Rows();
-    void Finish_Rows(const char* last_line);
-    void Report_Oddities() const;
-    void Report_Cut_Texts() const;
-    void Redo_Rows(const char* first_row);
-    void Redo_Row();
-    void Fill_Row();
-    void Fill_Number(const Text_Field& field, Column_Filling& state);
-    void Fill_Checked(const Text_Field& field, Column_Filling& state);
-    void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
-    void Note_Field(Loss_Kind kind, const Column& column, const Text_Field& field) const;
-    void Append_Blank(Column_Filling& state);
-    void Turn_To_Text(Column_Filling& state);
-    static void Become(Column_Filling& state, std::int32_t type, Filling filling);
-    std::string_view Text_Of(const Field_Content& content);
-    void Refuse_Extra_Columns();
-    bool Add_Late_Column();
-    bool Row_Is_Acceptable(const char* line);
-    void Tell_Progress();
-    void Make_Dates();
-
-    Sheet& sheet_;
-    Text_Shape& shape_;
-    Field_Walker walker_;
-    bool trim_;
-    bool cells_may_shift_;
-    const Text_Buffer& buffer_;
-    File_Image* image_;
-    Cell_Value missing_;
-    Cell_Value empty_;
-    std::vector<Column_Filling> columns_;
-    Memory_Ahead ahead_;
-    std::int64_t row_ = 0;
-    std::int64_t row_limit_ = 0;
-    const char* told_ = nullptr;  ///< how far progress has been told
-    bool columns_full_ = false;
-    std::int64_t uneven_lines_ = 0;  ///< with fewer fields than there are columns
-    long cut_texts_ = 0;
-    Column_Subset subset_;
-    bool no_number_is_missing_;  ///< else one does by `Missing_Input_Text`, and all are looked at
-    std::string undoubled_;
-};
+    Column* column = sheet.first_column->next;
+    for (const Cell_Appender& cells :
+         Make_Appenders(sheet, sheet.first_column->next, Expected_Rows(), &ahead_)) {
+        Start_Column(*column, cells);
+        column = column->next;
+    }
+    Limit_Rows();
+}
 
 /// By the lines that were looked at; where rows turn out to be longer than that, blocks are left unused.
 std::int64_t Sheet_Filler::Expected_Rows() const
@@ -160,7 +89,7 @@ void Sheet_Filler::Start_Column(Column& column, const Cell_Appender& cells)
     const Filling filling = Is_Text_Like(column.type)     ? Filling::texts
                             : scan.type == Undecided_Type ? Filling::numbers_so_far
                                                           : Filling::numbers;
-    columns_.push_back({&column, cells, filling});
+    columns_.push_back(Column_Filling{.column = &column, .cells = cells, .filling = filling, .spelling = {}});
 }
 
 void Sheet_Filler::Name_Column(std::size_t index, std::string_view text)
@@ -251,14 +180,15 @@ void Sheet_Filler::Become(Column_Filling& state, std::int32_t type, Filling fill
 std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
 {
     std::string_view text = content.text;
-    const char pair[] = {content.quote, content.quote};
+    const bool escaped = dialect_ != nullptr && dialect_->escape != '\0';
+    const char pair[] = {escaped ? dialect_->escape : content.quote, content.quote};
     const std::string_view doubled(pair, 2);
     if (content.quote != '\0' && text.find(doubled) != std::string_view::npos) {
         undoubled_.clear();
         for (std::size_t i = 0; i < text.size(); ++i) {
+            const bool pair_here = text.substr(i, 2) == doubled;
+            i += pair_here ? 1 : 0;
             undoubled_ += text[i];
-            if (text.substr(i, 2) == doubled)
-                ++i;
         }
         text = undoubled_;
     }
@@ -271,6 +201,9 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
 {
     const Field_Content content = walker_.Content(field);
     const std::string_view text = Text_Of(content);
+    bare_texts_ = bare_texts_ || (content.quote == '\0' && !text.empty());
+    if (dialect_ != nullptr && !request.Missing_Words.empty() && Says_Nothing(text))
+        return;
     Make_Room_For(column, text);
     if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);
@@ -290,6 +223,8 @@ void Sheet_Filler::Turn_To_Text(Column_Filling& state)
 /// A field that is not simply a number up to its separator; its cell is there, and missing.
 void Sheet_Filler::Fill_Checked(const Text_Field& field, Column_Filling& state)
 {
+    if (dialect_ != nullptr)
+        return Fill_For_People(field, state);
     double value;
     switch (Kind_Of_Field(walker_.Content(field), value)) {
     case Field_Kind::number:
@@ -317,11 +252,34 @@ void Sheet_Filler::Note_Field(Loss_Kind kind, const Column& column, const Text_F
     Note_Loss(kind, column.name, row_ + 1, Trim_Copy(walker_.Content(field).text));
 }
 
+namespace {
+
+/// Whether a number for people is one without a closer look, and prints as it is spelled but for zeros.
+inline bool Is_Plainly_Spelled(const Text_Field& field, std::int32_t decimals, Spelling_Watch& watch)
+{
+    constexpr std::ptrdiff_t surely_exact = 15;
+    const char* const digits = field.first + (*field.first == '-' ? 1 : 0);
+    if (*digits == '.' || (*digits == '0' && digits + 1 != field.last && digits[1] != '.')
+        || field.last[-1] == '.') [[unlikely]]
+        return false;
+    const bool sampled = decimals < 0 || field.last - digits > surely_exact;
+    if (sampled && (decimals == 0 || watch.Samples_Number())) [[unlikely]]
+        return false;
+    if (decimals < 0)
+        return true;
+    watch.Take(decimals, field.last[-1]);
+    return true;
+}
+
+}  // namespace
+
 /// The quick road: a number that fills its field, as most do.
 inline void Sheet_Filler::Fill_Number(const Text_Field& field, Column_Filling& state)
 {
     Cell_Value value;
-    if (no_number_is_missing_ && Parse_Usual_Number(field.first, field.last, value.number)) [[likely]] {
+    std::int32_t decimals;
+    if (no_number_is_missing_ && Parse_Usual_Number(field.first, field.last, value.number, decimals)
+        && (dialect_ == nullptr || Is_Plainly_Spelled(field, decimals, state.spelling))) [[likely]] {
         state.cells.Append(value);
     } else {
         state.cells.Append(missing_);
@@ -333,6 +291,7 @@ inline void Sheet_Filler::Append_Blank(Column_Filling& state)
 {
     if (state.filling == Filling::left_out)
         return;
+    ++state.gaps;
     state.cells.Append_Missing();
 }
 
@@ -366,6 +325,7 @@ bool Sheet_Filler::Add_Late_Column()
         return true;
     }
     columns_.back().cells.Append_Missing(row_);
+    columns_.back().gaps = row_;
     Limit_Rows();
     return row_ < row_limit_;
 }
@@ -382,11 +342,13 @@ void Sheet_Filler::Fill_Row()
         if (index + Columns_Ahead < columns_.size())  // in a wide sheet every cell is far from the last
             columns_[index + Columns_Ahead].cells.Prefetch();
         Column_Filling& state = columns_[index++];
-        const Text_Field field = walker_.Next();
-        if (state.filling < Filling::texts)
+        Text_Field field = walker_.Next();
+        if (index == 1 && (*field.last == '\n' || *field.last == '\r') && Rewrite_Line(field)) [[unlikely]]
+            field = walker_.Next();
+        if (state.filling < Filling::moments)
             Fill_Number(field, state);
-        else if (state.filling == Filling::texts)
-            Fill_Text(field, *state.column, state.cells.Append(empty_));
+        else if (state.filling < Filling::left_out)
+            Fill_Other_Text(field, state);
     } while (walker_.Has_More());
     if (index == columns_.size()) [[likely]]
         return;
@@ -413,7 +375,7 @@ void Sheet_Filler::Tell_Progress()
     told_ = walker_.Place();
     ahead_.Come_To(static_cast<std::size_t>(row_) * sizeof(Cell_Node));
     Show_Progress("Reading", told_ - buffer_.first, buffer_.last - buffer_.first);
-    if (image_ != nullptr && shape_.nuls + walker_.Nuls() == 0)
+    if (image_ != nullptr && !edited_ && shape_.nuls + walker_.Nuls() == 0)
         image_->Release_Before(std::min<const char*>(told_, buffer_.last - 1));  // whose line end may be ours
 }
 
@@ -422,7 +384,7 @@ bool Sheet_Filler::Fill_Rows()
     const char* line = walker_.Place();
     told_ = line;
     ahead_.Come_To(0);
-    for (; walker_.At_Line(); ++row_) {
+    for (; walker_.At_Row() && !(walker_.Passed_Empty_Line() && Ends_Table()); ++row_) {
         line = walker_.Place();
         Fill_Row();
         if (!Row_Is_Acceptable(line))
@@ -436,10 +398,14 @@ bool Sheet_Filler::Fill_Rows()
 /// A blank line at the end is no row.
 void Sheet_Filler::Finish_Rows(const char* last_line)
 {
-    if (row_ > 0 && walker_.Is_Blank_Line(last_line)) {
+    if (dialect_ == nullptr && row_ > 0 && walker_.Is_Blank_Line(last_line)) {
         --row_;
         uneven_lines_ -= columns_.size() > 1 ? 1 : 0;
     }
+    if (dialect_ != nullptr)
+        Settle_Quoted_Columns();
+    if (row_ == 0)
+        return;
     Expect_Rows(&sheet_, static_cast<std::int32_t>(row_));
     for (Column_Filling& state : columns_)
         state.cells.Finish(sheet_.row_count);
@@ -452,7 +418,7 @@ void Sheet_Filler::Report_Oddities() const
         Note_Loss(Loss_Kind::letter_replaced, {}, 0, "NUL", nuls);
     }
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
-    if (rest.find_first_not_of(" \t\r\n") != std::string_view::npos) {
+    if (dialect_ == nullptr && rest.find_first_not_of(" \t\r\n") != std::string_view::npos) {
         Report_Message_Long(
             "Warning: An empty line stands behind row %li, and what follows it was not read.\n",
             sheet_.row_count);
@@ -482,7 +448,10 @@ void Sheet_Filler::Redo_Row()
         Column_Filling& state = columns_[index++];
         if (row_ >= state.rows_to_redo)
             continue;
-        Fill_Text(field, *state.column, *state.cell_to_redo);
+        if (Is_Text_Like(state.column->type))
+            Fill_Text(field, *state.column, *state.cell_to_redo);
+        else
+            Redo_Spelling(field, state);
     } while (walker_.Has_More());
     for (Column_Filling& state : columns_)
         if (row_ < state.rows_to_redo)
@@ -498,7 +467,7 @@ void Sheet_Filler::Redo_Rows(const char* first_row)
         state.cell_to_redo = state.column->first_cell;
     }
     walker_.Go_To(first_row);
-    for (row_ = 0; row_ < rows; ++row_)
+    for (row_ = 0; row_ < rows && walker_.At_Row(); ++row_)
         Redo_Row();
 }
 
@@ -508,7 +477,7 @@ void Sheet_Filler::Make_Dates()
     for (std::size_t index = 0; index < columns_.size(); ++index) {
         const Column_Scan& scan = shape_.types[index];
         Column& column = *columns_[index].column;
-        if (!scan.make_date && !scan.make_time)
+        if ((!scan.make_date && !scan.make_time) || columns_[index].filling == Filling::moments)
             continue;
         if (Text_Column_To_Date(&column, scan.make_time))
             continue;
@@ -538,20 +507,29 @@ void Sheet_Filler::Drop_Left_Out()
 bool Sheet_Filler::Fill()
 {
     walker_.Go_To(walker_.First_Line());
-    if (shape_.has_names)
+    if (dialect_ != nullptr)
+        Fill_Names_In_Lines();
+    else if (shape_.has_names)
         Fill_Names();
     Settle_Names();
     const char* const first_row = walker_.Place();
     if (!Fill_Rows())
         return false;
     Report_Oddities();
+    if (dialect_ != nullptr)
+        Settle_Spellings();
     Redo_Rows(first_row);
+    if (dialect_ != nullptr)
+        for (const Column_Filling& state : columns_)
+            ingester::Settle_Spellings(*state.column);
     Report_Cut_Texts();
     Make_Dates();
-    return sheet_.row_count > 0;
+    if (dialect_ != nullptr) {
+        Settle_Moments();
+        Leave_Out_Last_Columns();
+    }
+    return sheet_.row_count > 0 || Names_Alone();
 }
-
-}  // namespace
 
 Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type)
 {

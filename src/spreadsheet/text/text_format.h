@@ -5,6 +5,7 @@
 #include "platform/file_image.h"
 #include "platform/files.h"
 #include "platform/text_codes.h"
+#include "spreadsheet/dialect/text_dialect.h"
 #include "support/byte_scan.h"
 #include "support/fixed_text.h"
 #include "support/utf8.h"
@@ -38,6 +39,7 @@ struct Text_Buffer {
 struct Text_Code_State {
     std::size_t head = 0;           ///< bytes in front of the text that tell its code
     bool watched = false;           ///< taken for UTF-8 until something else is met
+    Text_Code code = nullptr;       ///< as it was found so far; null where nothing was looked for
     Text_Code otherwise = nullptr;  ///< what it is then; malformed UTF-8 where that was told or declared
 };
 
@@ -70,7 +72,8 @@ struct Text_Scan_Options {
     bool separators_given = false;
     Fixed_Text<20> separators;
     bool trim_cells = true;
-    bool cells_may_shift = false;  ///< nothing stands for an empty text, nor around one with blanks
+    const Text_Dialect* dialect = nullptr;  ///< as it was found for people; null for hosts
+    bool cells_may_shift = false;           ///< nothing stands for an empty text, nor around one with blanks
 };
 
 /// A field between its separators; the blanks in front are not part of it.
@@ -136,6 +139,18 @@ public:
     /// Whether a line stands here that isn't empty: the first empty one ends a text's rows.
     [[nodiscard]] bool At_Line() const { return at_ < text_.last && *at_ != '\n' && *at_ != '\r'; }
 
+    /// The same where empty lines and comments are passed over, which is for people.
+    [[nodiscard]] bool At_Row()
+    {
+        passed_empty_ = false;
+        if (at_<text_.last&& * at_> '%') [[likely]]  // neither a line end, a blank nor the mark of a comment
+            return true;
+        return dialect_ == nullptr ? At_Line() : Find_Row();
+    }
+
+    /// Whether an empty line was passed over on the way to this row.
+    [[nodiscard]] bool Passed_Empty_Line() const { return passed_empty_; }
+
     /// Whether the line that starts at `line` and ends here holds nothing but blanks.
     [[nodiscard]] bool Is_Blank_Line(const char* line) const;
 
@@ -161,6 +176,9 @@ private:
     }
     [[nodiscard]] const char* Next_Quote(const char* from, char quote);
     [[nodiscard]] Text_Field Next_Quoted();
+    [[nodiscard]] Text_Field Next_Quoted_For_People();
+    [[nodiscard]] const char* End_Of_Quoted(const char* first);
+    [[nodiscard]] bool Find_Row();
     [[nodiscard]] bool More_Behind(char end);
     void Look_At_Next_Window();
     void Check_Window();
@@ -170,6 +188,9 @@ private:
     Byte_Finder ends_;   ///< separators, LF and CR
     Byte_Finder marks_;  ///< the same, and quotes
     bool quotes_;        ///< quotes around fields count
+    const Text_Dialect* dialect_;
+    bool passed_empty_ = false;
+    const char* open_until_ = nullptr;  ///< quotes in front of it were not closed
     long nuls_ = 0;
     const char* at_;
     char* window_;
@@ -230,8 +251,13 @@ Sheet* Setup_Text_Sheet(const Text_Shape& shape, std::int32_t default_type);
 bool Fill_Text_Sheet(Sheet* sheet, Text_Shape& shape, const Text_Scan_Options& options,
                      const Text_Buffer& buffer, File_Image* image);
 
+/// How a text is cut as people mean it: finds its `dialect`, and leaves in `buffer` the table alone.
+/// `rewritten` becomes true where the text itself had to be changed.
+[[nodiscard]] Text_Scan_Options Options_For_People(const std::string& name, Text_Buffer& buffer,
+                                                   bool& rewritten, Text_Dialect& dialect);
+
 /// From a text in memory to the `Current_Sheet`, which stays as it is when there is no table.
-bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
+bool Parse_Text_Buffer(const Text_Buffer& buffer, const Text_Scan_Options& options,
                        File_Image* image = nullptr);
 
 /// What a field says of its column's type: nothing, a number, or text.

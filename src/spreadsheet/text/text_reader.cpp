@@ -67,13 +67,8 @@ bool Fill_Unless_Malformed(Sheet* sheet, Text_Shape& shape, const Text_Scan_Opti
 
 }  // namespace
 
-bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, bool blank_separated,
-                       File_Image* image)
+bool Parse_Text_Buffer(const Text_Buffer& buffer, const Text_Scan_Options& options, File_Image* image)
 {
-    Text_Scan_Options options = Options_Of_Settings();
-    options.separators = Separators_Of(buffer, tab_file, csv_file, blank_separated);
-    options.separators_given = !options.separators.empty();
-    options.cells_may_shift = !csv_file && !tab_file;
     Text_Shape shape;
     if (!Scan_Text_Dimensions(shape, options, buffer, Sampled_Lines) || shape.columns < 1)
         return false;
@@ -92,56 +87,70 @@ bool Parse_Text_Buffer(const Text_Buffer& buffer, bool tab_file, bool csv_file, 
 
 namespace {
 
-/// How the fields of a text are separated, as far as its name and its head tell.
-struct Text_Separation {
-    bool tabs = false;
-    bool commas = false;
+/// How a host's text is cut: by its name and its characters.
+Text_Scan_Options Options_For_Host(const std::string& name, const Text_Buffer& buffer)
+{
+    bool commas = Ends_Ignoring_Case(name, ".csv");
+    bool tabs = Ends_Ignoring_Case(name, ".tab");
     bool blanks = false;
-};
+    const bool other = !commas && !tabs;
+    if (!request.Custom_Separators.empty())
+        commas = true;
+    else if (other && !buffer.Holds('\t') && !buffer.Holds(','))
+        blanks = true;
+    else if (other && buffer.Holds('\t'))
+        tabs = true;
+    Text_Scan_Options options = Options_Of_Settings();
+    options.separators = Separators_Of(buffer, tabs, commas, blanks);
+    options.separators_given = !options.separators.empty();
+    options.cells_may_shift = !commas && !tabs;
+    return options;
+}
 
 /// Reads a text and, where it was taken for UTF-8 and is none, reads it again as what it is.
-bool Parse_In_Its_Code(const std::string& name, const Text_Separation& by, const Text_Code_State& code,
+bool Parse_In_Its_Code(const std::string& name, const Text_Scan_Options& options, Text_Code_State& code,
                        Text_Buffer& buffer, File_Image& image, bool rewritten)
 {
     const Name_Counters counters = Get_Name_Counters();
     const Loss_Ledger losses = request.losses;
     try {
-        return Parse_Text_Buffer(buffer, by.tabs, by.commas, by.blanks, rewritten ? nullptr : &image);
+        return Parse_Text_Buffer(buffer, options, rewritten ? nullptr : &image);
     } catch (const Text_Malformed&) {
         Set_Name_Counters(counters);
         request.losses = losses;
+        code.code = code.otherwise;
     }
-    return Convert_Malformed(name, code, image, buffer)
-           && Parse_Text_Buffer(buffer, by.tabs, by.commas, by.blanks);
+    return Convert_Malformed(name, code, image, buffer) && Parse_Text_Buffer(buffer, options);
 }
 
 }  // namespace
 
 bool Read_CSV(Input_File& file)
 {
-    Text_Separation by;
-    by.commas = Ends_Ignoring_Case(file.Name(), ".csv");
-    by.tabs = Ends_Ignoring_Case(file.Name(), ".tab");
-    const bool strip_titles = !by.commas && !by.tabs;
+    const bool sniffed = For_People(People_Rule::sniffed_texts);
+    const bool strip_titles = !sniffed && !Ends_With_One_Of(file.Name(), ".csv .tab");
     bool rewritten;
     File_Image image;
     Text_Buffer buffer;
     Text_Code_State code;
     if (!Load_Text_Image(file, strip_titles, image, buffer, code, rewritten) || buffer.Text().empty())
         return false;
-    if (!request.Custom_Separators.empty())
-        by.commas = true;
-    else if (strip_titles && !buffer.Holds('\t') && !buffer.Holds(','))
-        by.blanks = true;
-    else if (strip_titles && buffer.Holds('\t'))
-        by.tabs = true;
     Sheet* const earlier = Current_Sheet;
     bool good = false;
     bool changed = false;
+    Text_Dialect dialect;
     try {
-        good = Parse_In_Its_Code(file.Name(), by, code, buffer, image, rewritten);
+        const Text_Scan_Options options = sniffed
+                                              ? Options_For_People(file.Name(), buffer, rewritten, dialect)
+                                              : Options_For_Host(file.Name(), buffer);
+        good = Parse_In_Its_Code(file.Name(), options, code, buffer, image, rewritten);
     } catch (const Text_Changed&) {
         changed = true;
+    }
+    if (Found_Dialect() != nullptr && sniffed) {
+        dialect = *Found_Dialect();
+        dialect.code = code.code;
+        Set_Found_Dialect(dialect);
     }
     if (!changed && !image.Changed())
         return good;

@@ -69,9 +69,13 @@ void Take_Name_Mark(std::string_view name, Column_Scan& column)
 }
 
 /// Whether Text has to be Long Text shows when it is kept.
-void Take_Field(const Field_Content& content, Column_Scan& column)
+void Take_Field(const Field_Content& content, Column_Scan& column, bool for_people)
 {
     double value;
+    if (for_people) {  // what the column holds is settled while it is filled
+        column.has_data = column.has_data || !Trim_Copy(content.text).empty();
+        return;
+    }
     if (column.has_data && column.type != Undecided_Type)
         return;
     const Field_Kind kind = Kind_Of_Field(content, value);
@@ -81,9 +85,13 @@ void Take_Field(const Field_Content& content, Column_Scan& column)
 }
 
 /// Looks at the fields of one line; `names` when it is the line of names.
-void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape)
+void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape, const Text_Dialect* dialect)
 {
-    std::int32_t index = 0;
+    std::int32_t index = names && dialect != nullptr && dialect->rows_are_named ? 1 : 0;
+    if (index > shape.columns) {
+        shape.columns = index;
+        shape.types.resize(1);
+    }
     do {
         const Text_Field field = walker.Next();
         if (index >= request.Max_Columns) {  // no Sheet takes more
@@ -98,7 +106,7 @@ void Scan_Line(Field_Walker& walker, bool names, Text_Shape& shape)
         if (names)
             Take_Name_Mark(Trim_Copy(walker.Content(field).text), column);
         else
-            Take_Field(walker.Content(field), column);
+            Take_Field(walker.Content(field), column, dialect != nullptr);
     } while (walker.Has_More());
 }
 
@@ -111,24 +119,27 @@ bool Scan_Text_Dimensions(Text_Shape& shape, const Text_Scan_Options& options, c
     Field_Walker walker(options, buffer);
     const char* const first = walker.First_Line();
     walker.Go_To(first);
-    if (!walker.At_Line())
+    if (!walker.At_Row())
         return true;
-    shape.has_names =
-        options.names_mode == names_given
-        || (options.names_mode == names_decided && Names_Decision(options).Decide({first, buffer.last}));
+    const std::int64_t names_lines = options.dialect != nullptr ? options.dialect->names_lines : 1;
+    shape.has_names = options.dialect != nullptr
+                          ? names_lines > 0
+                          : options.names_mode == names_given
+                                || (options.names_mode == names_decided
+                                    && Names_Decision(options).Decide({first, buffer.last}));
     const char* line = first;
-    for (; walker.At_Line() && shape.rows < lines; ++shape.rows) {
+    for (; walker.At_Row() && shape.rows < lines; ++shape.rows) {
         line = walker.Place();
-        Scan_Line(walker, shape.rows == 0 && shape.has_names, shape);
+        Scan_Line(walker, shape.rows < names_lines && shape.has_names, shape, options.dialect);
         if (!Line_Is_Short_Enough({line, walker.Place()}, buffer.lines_before + shape.rows + 1))
             return false;
     }
     shape.bytes = static_cast<std::size_t>(walker.Place() - first);
     shape.whole = !walker.At_Line();
-    if (shape.whole && walker.Is_Blank_Line(line))
+    if (options.dialect == nullptr && shape.whole && walker.Is_Blank_Line(line))
         --shape.rows;
     shape.nuls = walker.Nuls();
-    if (!shape.whole)
+    if (!shape.whole || options.dialect != nullptr)
         return true;
     for (Column_Scan& column : shape.types)
         if (column.type == Undecided_Type)

@@ -26,11 +26,18 @@ namespace {
 
 using Cell_Kind = Column_Printer::Kind;
 
+bool Keeps_Spelling(const Column& column)
+{
+    return For_People(People_Rule::sniffed_texts) && !request.Use_Formats
+           && column.format != date_format_mark;
+}
+
 /// A column on its way out.
 struct Column_Writing {
     Column_Printer printer;
     bool left;               ///< which side of its width a field stands at
     std::int32_t first_row;  ///< no cells above (Symmetric Matrix)
+    bool as_spelled;         ///< numbers print as a text spelled them, or in their shortest form
     std::int32_t width = 0;
     const Cell_Node* cell = nullptr;  ///< of the row being written
     bool quoted = false;              ///< its texts, which would be read as numbers or dates
@@ -185,7 +192,7 @@ void Text_Table_Writer::Start_Column(const Column& column)
 {
     const bool left =
         column.justify == default_side ? Is_Text_Like(column.type) : column.justify == left_side;
-    columns_.push_back({Column_Printer(column, rules_), left, First_Row_Of(column)});
+    columns_.push_back({Column_Printer(column, rules_), left, First_Row_Of(column), Keeps_Spelling(column)});
     Column_Writing& state = columns_.back();
     state.cell = column.first_cell;
     state.quoted = layout_.tells_texts && Texts_Look_Like_Data(state);
@@ -340,6 +347,9 @@ inline void Text_Table_Writer::Put_Cell(const Column_Writing& state, const Cell_
     case Cell_Kind::number:
         if (!(value > sheet_.missing_value))
             line_.Put(missing_);
+        else if (state.as_spelled)
+            line_.Advance_To(
+                Print_As_Spelled(line_.Reserve(Number_Text_Room), state.printer.Printed(), cell));
         else
             Put_Number(state, value);
         break;

@@ -1,0 +1,121 @@
+// Texts as people write them: how they are cut, what their fields mean, how their numbers are spelled.
+#include "spreadsheet/dialect/text_dialect.h"
+
+#include "model/spellings.h"
+#include "spreadsheet/text/text.h"
+#include "support/number_text.h"
+#include "support/reader_fixture.h"
+
+namespace ingester {
+namespace {
+
+class Dialect_Test : public Reader_Test {
+protected:
+    static Sheet* Read(std::string_view text, const char* name, const Change& change = {})
+    {
+        return Read_Bytes(Read_CSV, text, name, [&] {
+            request.people.set();
+            Use_Utf8_Text(true);
+            if (change)
+                change();
+        });
+    }
+};
+
+TEST_F(Dialect_Test, Tables_Are_Cut_As_They_Were_Meant)
+{
+    const struct {
+        const char *told, *text, *sheet;
+        Change change = {};
+    } cases[] = {
+        {"blanks", "a b c\n1  2 3\n4 \t5 6 \n", "a V1|4; b V2|5; c V3|6"},
+        {"names that begin with digits", "2 rows,3 m\n1,x\n", "%2_rows V1; %3_m Tx"},
+        {"years", ",2019,2020,2021\nFrance,1.5,2,3\nItaly,4,5,6\n", ""},
+        {"numbers only", "1,2\n3,4\n", "C1 V1|3; C2 V2|4"},
+        {"words only, one twice", "m,yes\nf,no\nm,no\n", "C1 Tm|f|m; C2 Tyes|no|no"},
+        {"names in a comment", "# made today\n# a,b\n1,2\n3,4\n", "a V1|3; b V2|4"},
+        {"rows with names", "a,b\nx,1,2\ny,3,4\n", "C1 Tx|y; a V1|3; b V2|4"},
+        {"a quote that stays open", "a,b\n\"x,1\n\"y,2\nz,3\n", "a T\"x|\"y|z; b V1|2|3"},
+        {"a quote inside a text", "a,b\n\"x\"y\",1\n\"x\"y,\"2\"\n", "a Tx\"y|\"x\"y; b V1|2"},
+        {"the first of two tables", "a,b\n1,2\n3,4\n\nx,y,z\n1,2,3\n4,5,6\n", "a V1|3; b V2|4"},
+        {"the second", "a,b\n1,2\n3,4\n\nx,y,z\n1,2,3\n4,5,6\n", "x V1|4; y V2|5; z V3|6",
+         [] { request.Told_Table = 2; }},
+        {"empty lines between all rows", "a,b\n\n1,2\n\n3,4\n", "a V1|3; b V2|4"},
+        {"pairs in front", "Author,Ada\nPlace,Kiel\n\na,b,c\n1,2,3\n4,5,6\n7,8,9\n",
+         "a V1|4|7; b V2|5|8; c V3|6|9"},
+        {"lines to skip", "1,2\n3,4\na,b\n5,6\n", "a V5; b V6", [] { request.Told_Skipped_Lines = 2; }},
+        {"told all", "a;'b;c'\n1,5;'2'\n", "a V1.5; b_c T2",
+         [] {
+             request.Told_Separators = ";";
+             request.Told_Quote = '\'';
+             request.Told_Decimal = ',';
+             request.Told_Names_Lines = 1;
+         }},
+        {"no quotes", "a,b\n\"x,y\"\n", "a T\"x; b Ty\"", [] { request.Told_Quote = '\0'; }},
+    };
+    for (const auto& tried : cases) {
+        Sheet* const sheet = Read(tried.text, "x.txt", tried.change);
+        if (*tried.sheet != '\0')
+            EXPECT_EQ(Render(sheet), tried.sheet) << tried.told;
+        else
+            EXPECT_EQ(sheet->row_count, 2) << tried.told;
+    }
+    ASSERT_NE(Found_Dialect(), nullptr);
+    EXPECT_EQ(Found_Dialect()->separator, ',');
+    EXPECT_EQ(Read("a,b,c\n", "x.csv")->row_count, 0) << "names alone";
+    EXPECT_EQ(Read("", "x.csv"), nullptr);
+}
+
+TEST_F(Dialect_Test, Fields_Mean_What_People_Mean)
+{
+    const struct {
+        const char *told, *text, *sheet;
+        Change change = {};
+    } cases[] = {
+        {"words for missing", "a,b\n1,x\nNA,NA\nN/A,\nNaN,-\nNULL,.\n-,z\n",
+         "a V1|*|*|*|*|*; b Tx|NA||-|.|z"},
+        {"told ones", "a,b\n-9,x\n1,none\n", "a V*|1; b Tx|",
+         [] {
+             request.Missing_Words = {"-9", "none"};
+         }},
+        {"digits that name", "a,b,c\n007,12345678901234567890,0.5\n8,1,-0\n",
+         "a T007|8; b T12345678901234567890|1; c V0.5|-0"},
+        {"beyond doubles", "a\n1e400\n1e-400\n-1e400\n", "a V9.99999e+307|0|*"},
+        {"no star behind a number", "a,b\n5*,1\n", "a T5*; b V1"},
+        {"groups", "a;b\n1.234.567,5;1\n2,5;2\n", "a V1234567.5|2.5; b V1|2"},
+        {"digits in quotes", "a,b\n\"1\",2\n\"3\",4\n", "a T1|3; b V2|4"},
+        {"all in quotes", "\"a\",\"b\"\n\"1\",\"2\"\n", "a V1; b V2"},
+        {"a date among none", "a\n2024-01-01\nsoon\n", "a T2024-01-01|soon"},
+        {"no such day", "a\n2023-02-29\n", "a T2023-02-29"},
+        {"times", "a,b\n12:00,x\n06:00:00,y\n", "a V0.5|0.25; b Tx|y"},
+    };
+    for (const auto& tried : cases)
+        EXPECT_EQ(Render(Read(tried.text, "x.csv", tried.change)), tried.sheet) << tried.told;
+}
+
+TEST_F(Dialect_Test, Numbers_Keep_Their_Spelling)
+{
+    const char* const columns[] = {"5.00|6.50",
+                                   "5.0|5.25|1e-05",
+                                   "+5|.5|5.|1e3|1E+3",
+                                   "5.00|5.5|3|-0",
+                                   "0.1|0.10000000000000001|0.30000000000000004",
+                                   "1e17|100000000000000000|12345678901234568"};
+    for (const std::string_view column : columns) {
+        std::string text = "a\n" + std::string(column) + "\n";
+        std::ranges::replace(text, '|', '\n');
+        const Sheet* const sheet = Read(text, "x.csv");
+        ASSERT_NE(sheet, nullptr);
+        const Column& read = *sheet->first_column->next;
+        std::string printed;
+        char room[Number_Text_Room];
+        for (const Cell_Node* cell = read.first_cell; cell != nullptr; cell = cell->next)
+            printed.append(printed.empty() ? "" : "|").append(room, Print_As_Spelled(room, read, *cell));
+        EXPECT_EQ(printed, column);
+        read.first_cell->value.number = 7.5;
+        EXPECT_EQ(std::string_view(room, Print_As_Spelled(room, read, *read.first_cell)).substr(0, 3), "7.5");
+    }
+}
+
+}  // namespace
+}  // namespace ingester
