@@ -70,7 +70,7 @@ Request_Status Check_Sheet_Name(Request_Status status)
 {
     if (!Another_Sheet_Was_Used())
         return status;
-    Fail("\n***** Warning: An inexact match for the SHEET name occurred. *****\n"
+    Warn("\n***** Warning: An inexact match for the SHEET name occurred. *****\n"
          "Data from %s was used when %s was specified.\n"
          "Note: A closest match algorithm is used and case is ignored.\n",
          request.Used_Sheet_Name.c_str(), request.Worksheet_Name.c_str());

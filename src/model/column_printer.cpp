@@ -15,16 +15,10 @@ Column_Printer::Kind Kind_Of(const Column& column)
     return column.type == factor_column ? Column_Printer::Kind::factor : Column_Printer::Kind::number;
 }
 
-/// The digits of a column's numbers; 0 where its format decides.
-int Digits_Of(const Column& column, Number_Print numbers, int digits)
+/// The digits of a column's numbers; 0 where it decides itself.
+int Digits_Of(const Column& column, const Printing_Rules& rules)
 {
-    constexpr int all_digits = 15;
-    const bool by_rule = numbers == Number_Print::by_format || numbers == Number_Print::for_others;
-    if (column.format == date_format_mark || by_rule)
-        return 0;
-    if (numbers == Number_Print::general)
-        return digits;
-    return column.decimals >= 0 ? 0 : all_digits;
+    return rules.numbers == Number_Print::general && column.format != date_format_mark ? rules.digits : 0;
 }
 
 Iso_Form Iso_Form_For(const Column& column, Number_Print numbers)
@@ -70,11 +64,10 @@ std::vector<const char*> Printed_Levels(const Column& factor, Number_Print level
 }
 
 Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules)
-    : column_(&column), digits_(Digits_Of(column, rules.numbers, rules.digits)),
-      for_others_(rules.numbers == Number_Print::for_others), iso_form_(Iso_Form_For(column, rules.numbers)),
-      kind_(Kind_Of(column))
+    : column_(&column), digits_(Digits_Of(column, rules)), numbers_(rules.numbers),
+      iso_form_(Iso_Form_For(column, rules.numbers)), kind_(Kind_Of(column))
 {
-    if (for_others_ && column.format != date_format_mark)
+    if (numbers_ == Number_Print::for_others && column.format != date_format_mark)
         digits_ = Digits_Needed;
     if (kind_ != Kind::factor)
         return;
@@ -88,8 +81,10 @@ Column_Printer::Column_Printer(const Column& column, const Printing_Rules& rules
 
 char* Column_Printer::Print_By_Column(char* target, double value) const
 {
-    return for_others_ ? Print_For_Others(target, *column_, iso_form_, value)
-                       : Format_Cell_Number(target, *column_, value);
+    if (numbers_ == Number_Print::for_others)
+        return Print_For_Others(target, *column_, iso_form_, value);
+    return numbers_ == Number_Print::as_said ? Format_Cell_Fully(target, *column_, value)
+                                             : Format_Cell_Number(target, *column_, value);
 }
 
 std::string_view Column_Printer::Unlisted_Level(std::int32_t level, char* room) const

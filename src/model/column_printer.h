@@ -87,8 +87,8 @@ private:
     const Column* column_;
     std::vector<std::string> levels_;  ///< short ones stand in the list itself, so that a look-up is one
     double level_end_ = 0;
-    int digits_ = 0;  ///< 0: by the Column's format, or a date for others
-    bool for_others_ = false;
+    int digits_ = 0;  ///< 0: the Column decides
+    Number_Print numbers_ = Number_Print::general;
     Iso_Form iso_form_ = Iso_Form::number;  ///< of dates, for others
     Kind kind_;
 };

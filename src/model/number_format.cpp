@@ -55,10 +55,14 @@ char* Format_Cell_Number(char* target, const Column& column, double value)
 
 char* Format_Cell_Fully(char* target, const Column& column, double value)
 {
-    constexpr int all_digits = 15;
+    constexpr int usual_digits = 15;
     const bool decimals_said = column.decimals >= 0 || column.format == date_format_mark;
-    return decimals_said || !Is_Present(*column.sheet, value) ? Format_Cell_Number(target, column, value)
-                                                              : Print_General(target, value, all_digits);
+    if (decimals_said || !Is_Present(*column.sheet, value))
+        return Format_Cell_Number(target, column, value);
+    char* const end = Print_General(target, value, usual_digits);
+    double back;
+    const bool enough = Whole_Number_Text({target, end}, back) && back == value;
+    return enough ? end : Print_Shortest(target, value);
 }
 
 std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target)

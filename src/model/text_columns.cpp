@@ -9,6 +9,8 @@
 #include "request/messages.h"
 #include "request/people_rules.h"
 #include "request/request.h"
+#include "support/number_text.h"
+#include "support/text.h"
 
 #include <algorithm>
 #include <array>
@@ -236,8 +238,9 @@ bool Read_Date_Cell(const Column& column, long row, std::string_view text, std::
             || Read_By_Other_Formats(text, format, missing, value)))
         return true;
     if (Text_To_Date(text, value, 1, format, missing, false)) {
-        if (whole_first)
-            Note_Loss(Loss_Kind::date_out_of_range, column.name, row, text);
+        double number;
+        if (whole_first && !Whole_Number_Text(Trim_Copy(text), number))
+            Note_Loss(Loss_Kind::date_part_dropped, column.name, row, text);
         return true;
     }
     return !whole_first && Read_By_Other_Formats(text, format, missing, value);
@@ -277,7 +280,7 @@ bool Has_Times(const Column& column)
 std::int32_t Year_First_Format(const Column& column)
 {
     const Cell_Node* cell = column.first_cell;
-    while (cell != nullptr && cell->Text().empty())
+    while (cell != nullptr && cell->Text().find_first_of("0123456789") == std::string_view::npos)
         cell = cell->next;
     const bool dashed = cell != nullptr && cell->Text().find('-') != std::string_view::npos;
     return dashed ? dashed_year_month_day_format : year_month_day_format;

@@ -42,7 +42,7 @@ bool Stands_Between_Digits(std::string_view text, std::size_t place)
 /// "2020-01-05T10:30Z" is "2020-01-05 10:30".
 void Part_At_T(Changing_Text& text)
 {
-    const std::size_t at = text.View().find('T');
+    const std::size_t at = text.View().find_first_of("Tt");
     if (at == std::string_view::npos || !Stands_Between_Digits(text.View(), at)
         || text.View().find(':', at) == std::string_view::npos)
         return;
@@ -86,24 +86,29 @@ void Part_At_Points(Changing_Text& text)
     text.At(first) = text.At(second) = '/';
 }
 
-/// "January 5, 2020" is "Jan 5 2020".
+/// "5, 2020" and "5,2020" are "5 2020".
+void Drop_Comma(Changing_Text& text)
+{
+    const std::size_t comma = text.View().find(',');
+    if (comma == std::string_view::npos || comma == 0 || !Is_Digit(text.View()[comma - 1]))
+        return;
+    const bool parted = text.View().substr(comma + 1).starts_with(' ');
+    text.Replace(comma, 1, parted ? "" : " ");
+}
+
+/// "January 5" and "Sept. 5" are "Jan 5" and "Sep 5".
 void Shorten_Leading_Month(Changing_Text& text)
 {
+    constexpr std::size_t least_letters = 3;
     const Settings& settings = Get_Settings();
-    const std::string_view word = text.View().substr(0, text.View().find(' '));
-    const std::size_t comma = text.View().find(',');
-    if (comma != std::string_view::npos && comma > 0 && Is_Digit(text.View()[comma - 1]))
-        text.Replace(comma, 1, {});
-    for (std::size_t month = 1; month <= 12; ++month)
-        if (Equal_Ignoring_Case(word, settings.month_names[month])) {
-            text.Replace(0, word.size(), settings.month_abbreviations[month]);
+    const std::string_view word = text.View().substr(0, text.View().find_first_of(" ."));
+    for (std::size_t month = 1; month <= 12 && word.size() >= least_letters; ++month)
+        if (Starts_Ignoring_Case(settings.month_names[month], word)) {
+            const bool pointed = text.View().substr(word.size()).starts_with('.');
+            text.Replace(0, word.size() + (pointed ? 1 : 0), settings.month_abbreviations[month]);
             return;
         }
 }
-
-}  // namespace
-
-namespace {
 
 /// Digits and their separators are what the layouts take as they stand.
 bool Holds_Other_Signs(std::string_view text)
@@ -124,6 +129,7 @@ std::string_view Rewritten_Date_Text(std::string_view text, Date_Text_Room& room
         Part_At_Points(changing);
     else
         Shorten_Leading_Month(changing);
+    Drop_Comma(changing);
     return changing.View();
 }
 

@@ -26,6 +26,7 @@ constexpr std::array<Kind_Words, Loss_Kind_Count> Kinds = {{
     {Loss_Kind::number_not_held, "number_not_held", "numbers that can't be held"},
     {Loss_Kind::text_not_number, "text_not_number", "texts that are no numbers or dates"},
     {Loss_Kind::date_out_of_range, "date_out_of_range", "dates out of range"},
+    {Loss_Kind::date_part_dropped, "date_part_dropped", "dates that were not read whole"},
     {Loss_Kind::label_dropped, "label_dropped", "labels dropped or merged"},
     {Loss_Kind::missing_codes_merged, "missing_codes_merged", "missing codes merged"},
     {Loss_Kind::beyond_limit, "beyond_limit", "columns or rows beyond a limit"},

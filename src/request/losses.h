@@ -19,13 +19,14 @@ enum class Loss_Kind : std::uint8_t {
     number_not_held,       ///< a number that the target's form can't hold, or not with all its digits
     text_not_number,       ///< a text among numbers became missing
     date_out_of_range,     ///< a date or time that can't be held
+    date_part_dropped,     ///< what stood behind a date, or a time, and was not understood
     label_dropped,         ///< a label that was left out, or two that became one
     missing_codes_merged,  ///< missing codes that differ became the one missing value
     beyond_limit,          ///< a column or row beyond what can be held
     metadata_dropped,      ///< what a column or table told of itself and the target can't hold
     input_unread,          ///< a part of the input that was not read
 };
-constexpr std::size_t Loss_Kind_Count = 12;
+constexpr std::size_t Loss_Kind_Count = 13;
 
 /// The losses of one kind in one column.
 struct Loss {

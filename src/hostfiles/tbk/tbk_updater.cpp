@@ -321,7 +321,7 @@ bool Update_Book(Input_File& book, const char* file_name, const std::string& sho
         return false;
     if (Replace_File(scratch.Name(), file_name))
         return true;
-    Fail("Error: Temporary file %.100s could not be renamed to %.100s\nDocument is saved in "
+    Warn("Error: Temporary file %.100s could not be renamed to %.100s\nDocument is saved in "
          "Temporary file only.\n",
          scratch.Name().c_str(), shown.c_str());
     scratch.Keep();

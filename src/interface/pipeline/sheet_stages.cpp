@@ -70,7 +70,7 @@ std::string Shown_Option(const Slash_Option& option)
 
 void Tell_Vain(const std::string& option, const Format_Driver& input)
 {
-    Fail("Warning: %s means nothing to this input, %s, and had no effect.\n", option.c_str(),
+    Warn("Warning: %s means nothing to this input, %s, and had no effect.\n", option.c_str(),
          std::string(input.name).c_str());
 }
 

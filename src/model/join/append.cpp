@@ -12,6 +12,7 @@
 #include "model/sort.h"
 #include "model/source_column.h"
 #include "request/losses.h"
+#include "request/messages.h"
 #include "request/people_rules.h"
 #include "support/letters.h"
 #include "support/number_text.h"
@@ -27,16 +28,17 @@ namespace {
 
 bool Can_Be_Appended(const Sheet* target, const Sheet* source)
 {
-    if (Is_Refused({{target == nullptr || source == nullptr || source == target, Nothing_To_Join}}))
-        return false;
-    return !Is_Refused(
-        {{source->row_count < 1, No_Rows_To_Join},
-         {target->type == scalar_sheet,
-          "Scalars have one value each, so that no rows can go beneath them.\n"},
-         {target->type == symmetric_matrix_sheet, "No rows can go beneath those of a symmetric matrix.\n"},
-         {source->type == symmetric_matrix_sheet || source->type == diagonal_matrix_sheet,
-          "The rows of a symmetric or diagonal matrix can't go beneath others.\n"},
-         {target->read_only != 0, Output_Is_Read_Only}});
+    if (target == nullptr || source == nullptr || source == target)
+        return Fail(Nothing_To_Join);
+    if (source->row_count < 1)
+        return Fail(No_Rows_To_Join);
+    if (target->type == scalar_sheet)
+        return Fail("Scalars have one value each, so that no rows can go beneath them.\n");
+    if (target->type == symmetric_matrix_sheet)
+        return Fail("No rows can go beneath those of a symmetric matrix.\n");
+    if (source->type == symmetric_matrix_sheet || source->type == diagonal_matrix_sheet)
+        return Fail("The rows of a symmetric or diagonal matrix can't go beneath others.\n");
+    return target->read_only == 0 || Fail(Output_Is_Read_Only);
 }
 
 /// The Factor that tells where rows came from, and its level for the new ones.
@@ -102,11 +104,20 @@ Column* Make_Source_Column(Sheet& target, const Append_Request& wanted)
     return Add_Column(&target, column, target.column_count + 1, true);
 }
 
+/// Texts of other programs don't say that a column was a Factor.
+void Know_Factor_Again(Column* column)
+{
+    if (column != nullptr && Is_Text_Like(column->type) && column->sheet->type == vector_sheet
+        && For_People(People_Rule::kept_levels))
+        Text_To_Factor(column, false, false, 0);
+}
+
 bool Ready_Source_Column(Sheet& target, const Append_Request& wanted, Source_Mark& mark)
 {
     if (wanted.source_column_name.empty())
         return true;
     mark.column = Find_Source_Column(&target, wanted.source_column_name);
+    Know_Factor_Again(mark.column);
     if (mark.column == nullptr) {
         mark.column = Make_Source_Column(target, wanted);
         mark.level = 2;
@@ -262,7 +273,7 @@ bool Append_Column(Sheet& target, Column_Pair pair, New_Rows rows, Left_Out_List
         return false;
     Cell_Transfer transfer;
     if (pair.target == nullptr || !Make_Room_For_Texts(*pair.target, *pair.source)
-        || !transfer.Prepare(*pair.target, *pair.source, {.all_digits = true})) {
+        || !transfer.Prepare(*pair.target, *pair.source, {.as_appended = true})) {
         Note_Left_Out(*pair.source, left_out);
         return true;
     }

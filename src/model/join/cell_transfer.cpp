@@ -6,7 +6,6 @@
 #include "model/factor_lists.h"
 #include "model/join/column_copies.h"
 #include "model/join/factor_levels.h"
-#include "model/join/label_numbers.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
 #include "request/people_rules.h"
@@ -18,12 +17,6 @@
 #include <utility>
 
 namespace ingester {
-
-namespace {
-
-constexpr int Level_Digits = 15;
-
-}  // namespace
 
 /// Levels are matched with levels: of texts that may name labels, and for people of whatever goes to a
 /// Factor.
@@ -77,20 +70,21 @@ bool Cell_Transfer::Prepare(Column& target, const Column& source, const Transfer
     return true;
 }
 
-/// Numbers taken from a Factor's values from 0 up to this stand as they are, in whatever form dates are.
+/// Hosts append the values of a Factor's levels from 0 up to this as they are, in whatever form dates are.
 double Cell_Transfer::Value_Of_Level(double value) const
 {
     constexpr double no_date = 2000000.0;
     if (!Is_Present(*source_->sheet, value))
         return target_->sheet->missing_value;
-    const bool as_it_is = source_->factor_kind == factor_with_levels && value >= 0.0 && value < no_date;
+    const bool as_it_is = rules_.as_appended && !For_People(People_Rule::kept_levels)
+                          && source_->factor_kind == factor_with_levels && value >= 0.0 && value < no_date;
     return as_it_is ? value : Moved_Date(value);
 }
 
 void Cell_Transfer::Prepare_Printed_Levels()
 {
     way_ = Way::level_to_text;
-    texts_ = Printed_Levels(*source_, Number_Print::as_said, Level_Digits, target_->texts);
+    texts_ = Printed_Levels(*source_, Number_Print::as_said, 0, target_->texts);
     Make_Target_Long(std::ranges::any_of(
         texts_, [](const char* text) { return Has_More_Letters(Text_Arena::View(text), Text_Cell_Width); }));
 }
@@ -197,20 +191,32 @@ double Cell_Transfer::Nearest_Of(double value)
     return level > 0 ? level : target_->sheet->missing_value;
 }
 
+std::int32_t Level_Labelled_As(Level_Finder& levels, const Column& source, double number)
+{
+    char text[Number_Text_Room];
+    const std::int32_t level = levels.Of_Exact_Label({text, Format_Cell_Fully(text, source, number)});
+    return level > 0 ? level : levels.Of_Exact_Label({text, Print_Shortest(text, number)});
+}
+
 /// A label that just is the number, however it is spelled, comes before one that only begins so.
 double Cell_Transfer::Find_Label(double value)
 {
     constexpr int all_digits = 20;
     char room[Number_Text_Room];
-    const std::string_view spelled(room, rules_.all_digits
-                                             ? Print_General(room, Moved_Date(value), all_digits)
-                                             : Format_Cell_Fully(room, *source_, value));
-    if (const std::int32_t level = levels_.Of_Exact_Label(spelled); level > 0)
-        return level;
-    if (const std::int32_t level = Level_Labelled_As(levels_, *source_, value); level > 0)
+    std::string_view spelled;
+    std::int32_t level = 0;
+    if (rules_.as_appended) {
+        spelled = {room, Print_General(room, Moved_Date(value), all_digits)};
+        level = levels_.Of_Exact_Label(spelled);
+    }
+    if (level == 0)
+        level = Level_Labelled_As(levels_, *source_, value);
+    if (level > 0)
         return level;
     lost_ = true;  // a label that only begins so is another one
-    const std::int32_t level = levels_.Of_Label(spelled);
+    if (spelled.empty())
+        spelled = {room, Format_Cell_Fully(room, *source_, value)};
+    level = levels_.Of_Label(spelled);
     return level > 0 ? level : target_->sheet->missing_value;
 }
 
@@ -288,7 +294,7 @@ void Cell_Transfer::Put(Cell_Node& to, const Cell_Value& from)
         if (const char* const text = Of_Level<const char*>(texts_, from.number, nullptr); text != nullptr)
             Set_Text(*target_, to, Text_Arena::View(text));
         else
-            Set_Text(*target_, to, {room, Print_General(room, from.number, Level_Digits)});
+            Set_Text(*target_, to, {room, Print_Shortest(room, from.number)});
         return;
     case Way::print:
         Set_Text(*target_, to, {room, Format_Cell_Fully(room, *source_, from.number)});

@@ -10,10 +10,15 @@
 
 namespace ingester {
 
+/// The level of a Factor with just the label that a present number of `source` prints as, by its Column's
+/// format or with the fewest digits that tell it; 0 for none.
+[[nodiscard]] std::int32_t Level_Labelled_As(Level_Finder& levels, const Column& source, double number);
+
 struct Transfer_Rules {
-    double tolerance = 0.0;        ///< by which level values may differ, as a ratio
-    bool ignore_case = false;      ///< of labels
-    bool all_digits = false;       ///< numbers name labels by "%.20g" before what they print as
+    double tolerance = 0.0;    ///< by which level values may differ, as a ratio
+    bool ignore_case = false;  ///< of labels
+    bool as_appended =
+        false;  ///< numbers name labels by "%.20g" first, and hosts leave dates of levels as they are
     bool words_by_number = false;  ///< among numbers, labels stand for the numbers of their levels
 };
 

@@ -3,6 +3,7 @@
 #include "model/column_rules.h"
 #include "model/join/refusals.h"
 #include "model/names.h"
+#include "request/messages.h"
 #include "request/people_rules.h"
 #include "request/request.h"
 #include "support/letters.h"
@@ -18,15 +19,16 @@ namespace {
 
 bool Fit_Together(const Sheet* target, const Sheet* source)
 {
-    if (Is_Refused({{target == nullptr || source == nullptr || target == source, Nothing_To_Join}}))
-        return false;
+    if (target == nullptr || source == nullptr || target == source)
+        return Fail(Nothing_To_Join);
+    if (target->read_only != 0)
+        return Fail(Output_Is_Read_Only);
     const bool keeps_type =
         source->type == vector_sheet || source->type == scalar_sheet || source->type == matrix_sheet;
-    return !Is_Refused(
-        {{target->read_only != 0, Output_Is_Read_Only},
-         {keeps_type && source->type != target->type, "The table in the output is of another kind.\n"},
-         {target->row_count != source->row_count,
-          "The table in the output has another number of rows than the new data.\n"}});
+    if (keeps_type && source->type != target->type)
+        return Fail("The table in the output is of another kind.\n");
+    return target->row_count == source->row_count
+           || Fail("The table in the output has another number of rows than the new data.\n");
 }
 
 bool Replaces(const Column& column)
@@ -110,12 +112,10 @@ bool Concatenate_Sheets(Sheet* target, Sheet* source, bool replace_equal_names)
     Turn_Units_Into_Data(*source);
     const bool replaces =
         replace_equal_names && (source->type == vector_sheet || source->type == matrix_sheet);
-    if (Is_Refused({{Columns_To_Move(*target, *source, replace_equal_names)
-                         > request.Max_Columns - target->column_count,
-                     "There would be too many columns.\n"},
-                    {First_To_Move(*source) == nullptr && !replaces,
-                     "The new data have no column that could stand beside those of the output.\n"}}))
-        return false;
+    if (Columns_To_Move(*target, *source, replace_equal_names) > request.Max_Columns - target->column_count)
+        return Fail("There would be too many columns.\n");
+    if (First_To_Move(*source) == nullptr && !replaces)
+        return Fail("The new data have no column that could stand beside those of the output.\n");
     Fit_Missing_Values(*source, target->missing_value);
     if (replace_equal_names)
         Replace_Equal_Names(*target, *source);

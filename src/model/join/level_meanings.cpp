@@ -1,18 +1,22 @@
 #include "model/join/level_meanings.h"
 
+#include "model/calendar.h"
 #include "model/factor_lists.h"
 #include "model/join/factor_levels.h"
 #include "model/level_tables.h"
 #include "model/number_format.h"
-#include "request/messages.h"
-#include "support/distinct_keys.h"
+#include "support/letters.h"
 #include "support/number_text.h"
 #include "support/text.h"
 
 #include <algorithm>
 #include <cmath>
+#include <optional>
 #include <string>
 #include <string_view>
+#include <type_traits>
+#include <unordered_map>
+#include <utility>
 
 namespace ingester {
 
@@ -20,9 +24,9 @@ namespace {
 
 /// What one level says.
 struct Meaning {
-    std::string_view said;  ///< as it prints
-    std::string_view key;   ///< the same, but of a number its own spelling
-    double number;          ///< not a number for words
+    std::string_view said;     ///< as it prints
+    std::string_view in_full;  ///< the same, but of a number all its digits
+    double number;             ///< not a number for words
 };
 
 std::string_view Printed(Text_Arena& room, const char* first, const char* last)
@@ -30,22 +34,16 @@ std::string_view Printed(Text_Arena& room, const char* first, const char* last)
     return Text_Arena::View(room.Store({first, static_cast<std::size_t>(last - first)}));
 }
 
-Meaning Meaning_Of_Label(std::string_view label, Text_Arena& room)
+Meaning Meaning_Of_Label(std::string_view label)
 {
     double number;
-    if (!Whole_Number_Text(Trim_Copy(label), number))
-        return {label, label, std::nan("")};
-    char text[Number_Text_Room];
-    return {label, Printed(room, text, Print_Shortest(text, number)), number};
+    return {label, label, Whole_Number_Text(Trim_Copy(label), number) ? number : std::nan("")};
 }
 
-/// Dates say what they print as: that is what labels hold.
 Meaning Meaning_Of_Value(const Column& factor, double value, Text_Arena& room)
 {
     char text[Number_Text_Room];
     const std::string_view said = Printed(room, text, Format_Cell_Fully(text, factor, value));
-    if (factor.format == date_format_mark || !Is_Present(*factor.sheet, value))
-        return {said, said, value};
     return {said, Printed(room, text, Print_Shortest(text, value)), value};
 }
 
@@ -69,7 +67,7 @@ std::vector<Meaning> Meanings_Of(const Column& factor, bool by_value, Text_Arena
         if (label != nullptr && by_value)
             meaning.said = label->Text();
         else if (label != nullptr)
-            meaning = Meaning_Of_Label(label->Text(), room);
+            meaning = Meaning_Of_Label(label->Text());
         meanings.push_back(meaning);
         label = label == nullptr ? nullptr : label->next;
         value = value == nullptr ? nullptr : value->next;
@@ -88,52 +86,87 @@ bool Has_Values(const Column& factor)
     return factor.level_values_count > 0 || !Is_Labelled(factor);
 }
 
-/// Whether the labels of one Factor are words, and all levels of the other, which has none, can be their
-/// numbers.
-bool Words_Meet_Their_Numbers(const Column& labelled, const std::vector<Meaning>& words, const Column& other,
-                              const std::vector<Meaning>& numbers)
+/// Dates of the source in the form of the target's.
+void Move_Dates(const Column& target, const Column& source, std::vector<Meaning>& theirs)
 {
-    return Is_Labelled(labelled) && !Is_Labelled(other)
-           && std::ranges::all_of(words, [](const Meaning& one) { return std::isnan(one.number); })
-           && std::ranges::all_of(numbers, [&](const Meaning& one) {
-                  return Is_Level_Number(one.number) && one.number <= labelled.nlevels;
-              });
+    const bool dates = target.format == date_format_mark && source.format == date_format_mark;
+    if (!dates || target.date_form == source.date_form || source.level_values_count < 1)
+        return;
+    for (Meaning& one : theirs)
+        if (source.date_form == 0)
+            Serial_To_Day_Count(one.number, target.sheet->missing_value);
+        else
+            Day_Count_To_Serial(one.number, target.sheet->missing_value);
 }
 
-/// The numbers of the other are levels of the labelled one.
-void Go_By_Number(const std::vector<Meaning>& words, std::vector<Meaning>& numbers)
+bool Are_Words(const std::vector<Meaning>& labels)
 {
+    return std::ranges::all_of(labels, [](const Meaning& one) { return std::isnan(one.number); });
+}
+
+/// Numbers that can be levels of a Factor whose labels are words stand for these. False where there is none.
+bool Go_By_Number(const std::vector<Meaning>& words, std::vector<Meaning>& numbers)
+{
+    bool any = false;
     for (Meaning& one : numbers)
-        one = words[static_cast<std::size_t>(one.number) - 1];
+        if (Is_Level_Number(one.number) && one.number <= static_cast<double>(words.size())) {
+            one = words[static_cast<std::size_t>(one.number) - 1];
+            any = true;
+        }
+    return any;
 }
 
-template <class Rules> void Match_Keys(const std::vector<Meaning>& target, const std::vector<Meaning>& source,
-                                       std::vector<std::int32_t>& map, std::vector<std::int32_t>& added)
-{
-    Distinct_Keys<std::string_view, Rules> distinct;
-    std::vector<std::int32_t> levels;  // of the target, by key number
-    const auto number_of = [&](const Meaning& meaning) {
-        std::uint32_t number;
-        distinct.Number_Keys_Of(&meaning.key, 1, &number);
-        return number;
-    };
-    std::int32_t level = 0;
-    for (const Meaning& meaning : target) {
-        ++level;
-        if (number_of(meaning) > levels.size())
-            levels.push_back(level);
-    }
-    std::int32_t next = level;
-    level = 0;
-    for (const Meaning& meaning : source) {
-        const std::uint32_t number = number_of(meaning);
-        ++level;
-        if (number > levels.size()) {
-            levels.push_back(++next);
-            added.push_back(level);
+/// Which level of the target each of the source is, 0 for none of them. The closest likeness comes first, and
+/// levels that say different things are never the same one.
+class Level_Match {
+public:
+    Level_Match(const std::vector<Meaning>& ours, const std::vector<Meaning>& theirs)
+        : ours_(ours), theirs_(theirs), map_(theirs.size()), taken_(ours.size())
+    {}
+
+    /// `key_of` gives nothing for a level that has no such likeness. `shared`: those of one key are the same.
+    template <class Key_Of> void Match_By(Key_Of key_of, bool shared = false)
+    {
+        std::unordered_map<std::decay_t<decltype(*key_of(ours_.front()))>, std::size_t> places;
+        for (std::size_t place = 0; place < ours_.size(); ++place)
+            if (const auto key = key_of(ours_[place]); key && !taken_[place])
+                places.try_emplace(*key, place);
+        for (std::size_t level = 0; level < theirs_.size(); ++level) {
+            const auto key = key_of(theirs_[level]);
+            const auto found = key && map_[level] == 0 ? places.find(*key) : places.end();
+            if (found == places.end() || (taken_[found->second] && !shared))
+                continue;
+            taken_[found->second] = true;
+            map_[level] = static_cast<std::int32_t>(found->second) + 1;
         }
-        map.push_back(levels[number - 1]);
     }
+
+    [[nodiscard]] std::vector<std::int32_t> Map() && { return std::move(map_); }
+
+private:
+    const std::vector<Meaning>& ours_;
+    const std::vector<Meaning>& theirs_;
+    std::vector<std::int32_t> map_;
+    std::vector<bool> taken_;
+};
+
+std::optional<double> Number_Of(const Meaning& one)
+{
+    return std::isnan(one.number) ? std::nullopt : std::optional(one.number + 0.0);
+}
+
+std::vector<std::int32_t> Match(const std::vector<Meaning>& ours, const std::vector<Meaning>& theirs,
+                                bool by_value, bool ignore_case)
+{
+    Level_Match match(ours, theirs);
+    if (!by_value) {
+        match.Match_By([](const Meaning& one) { return std::optional(one.said); }, true);
+        match.Match_By([](const Meaning& one) { return std::optional(one.in_full); });
+    }
+    match.Match_By(Number_Of);
+    if (ignore_case && !by_value)
+        match.Match_By([](const Meaning& one) { return std::optional(Folded(one.said)); });
+    return std::move(match).Map();
 }
 
 bool Put_What_Is_Said(Column& factor, const std::vector<Meaning>& all)
@@ -173,8 +206,21 @@ void Take_Labels(std::vector<Meaning>& ours, const std::vector<Meaning>& theirs,
                  const std::vector<std::int32_t>& map)
 {
     for (std::size_t level = 0; level < theirs.size(); ++level)
-        if (const auto at = static_cast<std::size_t>(map[level]) - 1; at < ours.size())
-            ours[at].said = theirs[level].said;
+        if (map[level] > 0)
+            ours[static_cast<std::size_t>(map[level]) - 1].said = theirs[level].said;
+}
+
+/// Puts the levels without a partner behind those of the target.
+void Add_Rest(std::vector<Meaning>& ours, const std::vector<Meaning>& theirs, std::vector<std::int32_t>& map,
+              std::vector<std::int32_t>& added)
+{
+    for (std::size_t level = 0; level < theirs.size(); ++level) {
+        if (map[level] > 0)
+            continue;
+        ours.push_back(theirs[level]);
+        map[level] = static_cast<std::int32_t>(ours.size());
+        added.push_back(static_cast<std::int32_t>(level) + 1);
+    }
 }
 
 }  // namespace
@@ -186,27 +232,23 @@ bool Match_Meanings(Column& target, const Column& source, std::vector<std::int32
     const bool by_value = Has_Values(target) && Has_Values(source);
     std::vector<Meaning> ours = Meanings_Of(target, by_value, room);
     std::vector<Meaning> theirs = Meanings_Of(source, by_value, room);
-    const bool by_our_number = !by_value && Words_Meet_Their_Numbers(target, ours, source, theirs);
-    const bool by_their_number = !by_value && Words_Meet_Their_Numbers(source, theirs, target, ours);
-    if (by_our_number)
-        Go_By_Number(ours, theirs);
-    if (by_their_number)
-        Go_By_Number(theirs, ours);
+    Move_Dates(target, source, theirs);
+    const bool by_our_number =
+        !by_value && Is_Labelled(target) && Are_Words(ours) && Go_By_Number(ours, theirs);
+    const bool by_their_number =
+        !by_value && Is_Labelled(source) && Are_Words(theirs) && Go_By_Number(theirs, ours);
     if (by_our_number || by_their_number)
         Warn_Of_Unlike_Lists(target, source);
-    if (ignore_case)
-        Match_Keys<Case_Free_Keys>(ours, theirs, map, added);
-    else
-        Match_Keys<Exact_Keys>(ours, theirs, map, added);
+    map = Match(ours, theirs, by_value, ignore_case);
     const bool takes_labels = by_value && Is_Labelled(source);
+    if (takes_labels && !Is_Labelled(target))
+        Take_Labels(ours, theirs, map);
+    Add_Rest(ours, theirs, map, added);
     if (added.empty() && !by_their_number && !takes_labels)
         return true;
-    if (takes_labels)
-        Take_Labels(ours, theirs, map);
-    for (const std::int32_t level : added)
-        ours.push_back(theirs[static_cast<std::size_t>(level) - 1]);
-    const bool words = std::ranges::any_of(ours, [](const Meaning& one) { return std::isnan(one.number); });
-    const bool labelled = takes_labels || words || Is_Labelled(target);
+    const bool labelled =
+        takes_labels || Is_Labelled(target)
+        || std::ranges::any_of(ours, [](const Meaning& one) { return std::isnan(one.number); });
     return Put_Meanings(target, ours, labelled, by_value || !labelled);
 }
 

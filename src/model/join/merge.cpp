@@ -8,6 +8,7 @@
 #include "model/names.h"
 #include "model/row_fields.h"
 #include "request/losses.h"
+#include "request/messages.h"
 
 #include <algorithm>
 #include <deque>
@@ -28,15 +29,18 @@ bool Can_Be_Merged(const Merge_Request& wanted)
 {
     const Sheet* const target = wanted.target;
     const Sheet* const source = wanted.source;
-    if (Is_Refused({{target == nullptr || source == nullptr || target == source, Nothing_To_Join}})
-        || Is_Refused(
-            {{target->read_only != 0, Output_Is_Read_Only},
-             {target->type == symmetric_matrix_sheet || source->type == symmetric_matrix_sheet,
-              "The rows of a symmetric matrix can't be merged with others.\n"},
-             {source->row_count < 1, No_Rows_To_Join},
-             {target->row_count < 1, "The table in the output has no rows.\n"},
-             {target->type == scalar_sheet, "You cannot add a column of that type to this spreadsheet.\n"}}))
-        return false;
+    if (target == nullptr || source == nullptr || target == source)
+        return Fail(Nothing_To_Join);
+    if (target->read_only != 0)
+        return Fail(Output_Is_Read_Only);
+    if (target->type == symmetric_matrix_sheet || source->type == symmetric_matrix_sheet)
+        return Fail("The rows of a symmetric matrix can't be merged with others.\n");
+    if (source->row_count < 1)
+        return Fail(No_Rows_To_Join);
+    if (target->row_count < 1)
+        return Fail("The table in the output has no rows.\n");
+    if (target->type == scalar_sheet)
+        return Fail("You cannot add a column of that type to this spreadsheet.\n");
     if (wanted.key_count < 1 || wanted.key_count > static_cast<std::int32_t>(Most_Merge_Keys))
         return false;
     for (std::size_t key = 0; key < static_cast<std::size_t>(wanted.key_count); ++key)

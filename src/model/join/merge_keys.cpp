@@ -5,7 +5,6 @@
 #include "model/factor_lists.h"
 #include "model/factors.h"
 #include "model/join/column_copies.h"
-#include "model/join/label_numbers.h"
 #include "model/level_tables.h"
 #include "request/messages.h"
 #include "request/people_rules.h"
@@ -94,6 +93,8 @@ bool Check_Text_With_Factor(const Column& target, const Column& source, Mixtures
     const bool factor_first = target.type == factor_column;
     const Column& factor = factor_first ? target : source;
     const Column& text = factor_first ? source : target;
+    if (factor_first && For_People(People_Rule::kept_levels))
+        return true;
     if (factor.label_count < 1)
         return Fail("Factor %s does not have labels to match with text column %s.\n", factor.name.c_str(),
                     text.name.c_str());
@@ -181,13 +182,43 @@ const Column* Numbers_As_Level_Numbers(const Column& target, const Column& sourc
     return Turn_Into_Factor(*copy, false) ? copy : nullptr;
 }
 
+/// Dates as they are counted in the target.
+void Count_As(const Column& target, Column& copy)
+{
+    const bool dates = target.format == date_format_mark && copy.format == date_format_mark;
+    if (!dates || target.date_form == copy.date_form)
+        return;
+    for (Cell_Node* cell = copy.first_cell; cell != nullptr; cell = cell->next) {
+        double& number = cell->value.number;
+        if (Is_Present(*copy.sheet, number) && copy.date_form == 0)
+            Serial_To_Day_Count(number, copy.sheet->missing_value);
+        else if (Is_Present(*copy.sheet, number))
+            Day_Count_To_Serial(number, copy.sheet->missing_value);
+    }
+    copy.date_form = target.date_form;
+}
+
+/// Dates of both counts are compared as day counts.
+void Count_From_Days(const Column& column, const Column& other, Sort_Key& key)
+{
+    if (column.format != date_format_mark || other.format != date_format_mark
+        || column.date_form == other.date_form || column.date_form != 0)
+        return;
+    for (double& number : key.numbers)
+        if (Is_Present(*column.sheet, number))
+            Serial_To_Day_Count(number, column.sheet->missing_value);
+}
+
 /// Where the Factor has level values, numbers become values even if 1, 2, ... need no list.
 const Column* Numbers_As_Levels(const Column& target, const Column& source)
 {
     if (target.level_values_count < 1)
         return Numbers_As_Level_Numbers(target, source);
     Column* const copy = Copy_Column_Aside(source);
-    return copy != nullptr && Turn_Into_Factor(*copy, false) ? copy : nullptr;
+    if (copy == nullptr)
+        return nullptr;
+    Count_As(target, *copy);
+    return Turn_Into_Factor(*copy, false) ? copy : nullptr;
 }
 
 /// How the labels of a Factor's levels stand to the numbers of a key column.
@@ -231,16 +262,6 @@ bool Match_Words_With_Numbers(const Column& target, const Column& source, bool& 
     return true;
 }
 
-void Count_From_Days(const Column& column, const Column& other, Sort_Key& key)
-{
-    if (column.format != date_format_mark || other.format != date_format_mark
-        || column.date_form == other.date_form || column.date_form != 0)
-        return;
-    for (double& number : key.numbers)
-        if (Is_Present(*column.sheet, number))
-            Serial_To_Day_Count(number, column.sheet->missing_value);
-}
-
 /// Missing numbers of both Sheets are one key.
 void Unite_Missing(const Column& column, double missing, Sort_Key& key)
 {
@@ -269,9 +290,11 @@ Sort_Key Transferred_Numbers(Cell_Transfer& transfer, std::size_t rows)
 Sort_Key Target_Key(const Column& target, const Column& source, std::size_t rows)
 {
     Sort_Key key = Make_Sort_Key(target, rows, Factor_Mode::level_number);
-    if (target.type == factor_column)
+    if (target.type == factor_column) {
         Unite_Missing(target, 0.0, key);
-    else if (key.texts.empty())
+        return key;
+    }
+    if (key.texts.empty())
         Unite_Missing(target, target.sheet->missing_value, key);
     Count_From_Days(target, source, key);
     return key;
@@ -314,7 +337,8 @@ bool Make_Merge_Keys(const Merge_Request& wanted, Merge_Keys& keys)
             source = Numbers_As_Levels(target, *source);
         if (source == nullptr || !Match_Words_With_Numbers(target, *source, rules.words_by_number))
             return false;
-        // Before the levels of the target grow, which changes nothing in its cells.
+        // Before the levels of the target grow; only cells of margins, which no row is joined by, change with
+        // them.
         keys.target.push_back(Target_Key(target, *source, target_rows));
         if (!keys.transfers[key].Prepare(target, *source, rules))
             return Fail("Column cannot merge factors %s and %s.\n", target.name.c_str(),

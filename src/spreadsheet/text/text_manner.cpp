@@ -72,7 +72,7 @@ void Keep_Manner_Of_Text(std::string_view bytes, const char* name)
     if (Is_Unicode(manner.code))
         request.Output_Encoding = manner.code == Code_Of_Letters() ? std::string_view() : manner.code->name;
     else if (manner.code != Code_Of_Letters())
-        Fail("Note: %.300s was a text in %s and is one in UTF-8 now; a declared code of the output keeps "
+        Warn("Note: %.300s was a text in %s and is one in UTF-8 now; a declared code of the output keeps "
              "it.\n",
              name, std::string(manner.code->name).c_str());
 }

@@ -1,4 +1,5 @@
 // Appends and merges of small random Sheets, held against nested loops over their rows as texts.
+#include "model/calendar.h"
 #include "model/factors.h"
 #include "model/join/append.h"
 #include "model/join/concatenate.h"
@@ -43,6 +44,8 @@ const Vocabulary Vocabularies[] = {
     Counts,
     {{"0.1", "0.25", "0.3"}, {numbers, texts, labels, values}},
     {{"1234567", "1234568", "1234569.5"}, {numbers, texts, labels, values}},
+    {{"1234567890123456", "1234567890123457", "1234567890123458"}, {numbers, texts, labels, values}},
+    {{"01", "1", "1.0"}, {texts, labels}},
     {{"01/02/2020", "02/02/2020", "03/02/2020"}, {numbers, labels, values}, true},
     {{Long_Word('a', 89), Long_Word('b', 91), Long_Word('c', 240)}, {texts, labels, both}},
 };
@@ -113,8 +116,7 @@ Texts Random_Cells(std::minstd_rand& random, std::size_t rows, std::size_t level
     return cells;
 }
 
-/// For people a Factor may lack levels that others have, and words in several forms meet. Words of dates in
-/// their two forms meet as numbers only: those of levels stand as they are.
+/// For people a Factor may lack levels that others have. Hosts leave the dates of levels in their own form.
 TEST_F(Join, Appended_Data_Keep_Their_Meaning_In_Every_Form)
 {
     std::minstd_rand random;
@@ -137,7 +139,7 @@ TEST_F(Join, Appended_Data_Keep_Their_Meaning_In_Every_Form)
                 const std::string name = (paired || by_name ? "c" : "d") + std::to_string(i);
                 const std::size_t levels = people ? 1 + random() % 3 : 3;
                 const Texts cells = Random_Cells(random, rows[side], levels, vocabulary);
-                const Form form = dates_differ ? numbers : forms[random() % forms.size()];
+                const Form form = dates_differ && !people ? numbers : forms[random() % forms.size()];
                 Add_Form(sheets[side], form, name, cells, vocabulary, levels,
                          static_cast<std::int16_t>(!dates_differ || random() % 2 == 0));
                 Texts& all = expected[name];
@@ -264,7 +266,7 @@ TEST_F(Join, Merges_As_Nested_Loops_Do)
         wanted.ignore_case = random() % 4 == 0;
         const bool people = random() % 2 == 0;
         request.people.set(static_cast<std::size_t>(People_Rule::kept_levels), people);
-        const Vocabulary& vocabulary = Vocabularies[random() % 3];
+        const Vocabulary& vocabulary = Vocabularies[random() % 4];
         std::pair<Form, Form> forms[3];
         for (auto& pair : forms)
             do
@@ -455,7 +457,9 @@ TEST_F(Join, People_Lose_No_Level_And_No_Number)
         {"f F1|2", {1, 2}, {}, "f V3|8", {}, {}, "1,2|1|2|2|2", "1,2,3,8|1|2|3|8"},
         {"f F1|2", {}, {}, "f V1.5|70000", {}, {}, "#2|1|2||", "1,2,1.5,70000|1|2|1.5|70000"},
         {"f F1|2", {}, {"A", "B"}, "f V2|1", {}, {}, "A,B|A|B||", "A,B|A|B|B|A"},
-        {"f F1|2", {}, {"A", "B"}, "f V2|3", {}, {}, "A,B|A|B||", "A,B,2,3|A|B|2|3"},
+        {"f F1|2", {}, {"A", "B"}, "f V2|3", {}, {}, "A,B|A|B||", "A,B,3|A|B|B|3"},
+        {"f F1|2", {}, {}, "f F1|2|3", {}, {"ctl", "01", "1"}, "#3|1|2|1|2|3", "1,2,ctl,01|1|2|ctl|01|1"},
+        {"f F1|2", {}, {"01", "1"}, "f V1", {}, {}, "01,1|01|1|1", "01,1|01|1|1"},
         {"f F1|2", {}, {"A", "7"}, "f V7|9", {}, {}, "A,7|A|7|7|", "A,7,9|A|7|7|9"},
         {"f F1|2", {}, {"1.50", "2"}, "f V1.5", {}, {}, "1.50,2|1.50|2|1.50", "1.50,2|1.50|2|1.50"},
         {"f F1|2", {10, 20}, {}, "f F1|2", {}, {"20", "ctl"}, "10,20|10|20|10|20", "10,20,ctl|10|20|20|ctl"},
@@ -484,9 +488,54 @@ TEST_F(Join, People_Lose_No_Level_And_No_Number)
         }
 }
 
+/// A Factor of two dates, as day counts or as serials, and shown by a code of its own.
+Sheet* Dated_Factor(std::int16_t date_form, std::int32_t format, const std::vector<double>& days, bool factor)
+{
+    Sheet* const sheet = Sheet_Of(factor ? "f F1|2" : "f V0|0");
+    Column& column = *sheet->last_column;
+    Look_Like_Dates(column, date_form);
+    column.date_format = format;
+    std::vector<double> values = days;
+    for (double& value : values)
+        value -= date_form == 0 ? Serial_Offset : 0.0;
+    if (factor)
+        Put_Levels(column, values);
+    else
+        for (Cell_Node* cell = column.first_cell; cell != nullptr; cell = cell->next)
+            cell->value.number = values[cell->prev == nullptr ? 0 : 1];
+    return sheet;
+}
+
+TEST_F(Join, Dates_Of_Both_Forms_Are_One_Day_In_Factors_As_Well)
+{
+    for (const bool target_factor : {false, true})
+        for (const bool source_factor : {false, true})
+            for (const std::int16_t form : {0, 1})
+                for (const bool merge : {false, true}) {
+                    Start_Request("t");
+                    request.people.set(static_cast<std::size_t>(People_Rule::kept_levels));
+                    Sheet* const target = Dated_Factor(form, 2, {153388, 153389}, target_factor);
+                    Sheet* const source = Dated_Factor(static_cast<std::int16_t>(1 - form), 27,
+                                                       {153389, 153393}, source_factor);
+                    EXPECT_EQ(merge ? Merge_Sheets(By_First_Column(target, source))
+                                    : Append_Sheet(target, {.source = source}),
+                              true);
+                    const Texts expected =
+                        merge ? Texts{"15/02/2020", "16/02/2020", "20/02/2020"}
+                              : Texts{"15/02/2020", "16/02/2020", "16/02/2020", "20/02/2020"};
+                    EXPECT_EQ(Plain_Cells(*Column_At(target, 1)), expected)
+                        << target_factor << source_factor << form << merge;
+                }
+    // A host compares them so where numbers meet levels.
+    Sheet* const target = Dated_Factor(1, 2, {153388, 153389}, true);
+    ASSERT_TRUE(Merge_Sheets(By_First_Column(target, Dated_Factor(0, 2, {153389, 153393}, false))));
+    EXPECT_EQ(Plain_Cells(*Column_At(target, 1)), (Texts{"15/02/2020", "16/02/2020", "20/02/2020"}));
+}
+
 TEST_F(Join, Keys_Never_Become_Empty)
 {
     const std::string types = "Columns k and k data types do not match.\n:\n";
+    const std::string no_labels = "Factor k does not have labels to match with text column k.\n:\n";
     const struct {
         const char* target;
         Texts labels;
@@ -500,6 +549,7 @@ TEST_F(Join, Keys_Never_Become_Empty)
         {"k F1|2; y V1|2", {"A", "B"}, "k V2|1; w V7|8", {}, "k A|B; w 8|7", "k A|B; w 8|7"},
         {"k F1|2; y V1|2", {}, "k V2|1.5; w V7|8", {}, types, "k 1|2|1.5; w *|7|8"},
         {"k V5|6; y V1|2", {}, "k F1|2; w V7|8", {"6", "A"}, types, types},
+        {"k F1|2; y V1|2", {}, "k TA|2; w V7|8", {}, no_labels, "k 1|2|A; w *|8|7"},
         {"k V5|6; y V1|2", {}, "k F1|2; w V7|8", {"6", "9"}, "k 5|6|9; w *|7|8", "k 5|6|9; w *|7|8"},
         {"k V1|6; y V1|2", {}, "k F1|2; w V7|8", {"x", "A"}, "k 1|6|2; w 7|*|8", "k 1|6|2; w 7|*|8"},
     };
@@ -643,6 +693,12 @@ TEST_F(Join, The_Source_Column_Is_Found_Under_The_Name_That_It_Was_Given)
         target->last_column->name = "my_src";  // as a file gives it back
     }
     EXPECT_EQ(Render(target), "x V1|2|2; my_src F1|2|3");
+    request.people.set(static_cast<std::size_t>(People_Rule::kept_levels));
+    ASSERT_TRUE(Factor_To_Text(target->last_column));  // as a text of other programs has it
+    wanted.source = Sheet_Of("x V2");
+    wanted.new_label = "c";
+    ASSERT_TRUE(Append_Sheet(target, wanted));
+    EXPECT_EQ(Plain_Cells(*target->last_column), (Texts{"Original", "a", "b", "c"}));
 }
 
 TEST_F(Join, Units_Of_New_Data_Stand_Beside_Others_For_People)
