@@ -54,6 +54,7 @@ struct Request_Globals : Lasting_Globals {
     Fixed_Text<60> Output_Encoding;  ///< the code of texts that are written; empty: that of all letters
     bool Write_Marks = false;        ///< types are told behind names, and missing is "*"
     bool Write_Crlf = false;
+    char Write_Separator = '\0';   ///< of comma text that was there before; NUL: a comma
     bool Write_Code_Mark = false;  ///< the mark of Unicode comes first
 
     // What people tell of a text, which is found from its lines otherwise.

@@ -1,9 +1,11 @@
 #include "spreadsheet/dialect/text_dialect.h"
 
+#include "request/input_facts.h"
 #include "request/request.h"
 #include "spreadsheet/dialect/dialect_steps.h"
 
 #include <algorithm>
+#include <string>
 
 namespace ingester {
 
@@ -141,9 +143,61 @@ const Text_Dialect* Found_Dialect()
     return request.Found_Text_Dialect.get();
 }
 
+namespace {
+
+/// Signs that don't show, or that stand between the words about them.
+std::string Words_Of_Sign(char sign)
+{
+    switch (sign) {
+    case ',':
+        return "comma";
+    case ';':
+        return "semicolon";
+    case '\t':
+        return "tab";
+    case ' ':
+        return "blank";
+    case '|':
+        return "bar";
+    case '.':
+        return "point";
+    case '"':
+        return "double";
+    case '\'':
+        return "single";
+    default:
+        return {sign};
+    }
+}
+
+void Note_Sign(std::string_view fact, char sign)
+{
+    if (sign != '\0')
+        Note_Input_Fact(fact, Words_Of_Sign(sign));
+}
+
+/// What those who look at the text are told of it.
+void Note_Facts(const Text_Dialect& dialect)
+{
+    if (dialect.code != nullptr)
+        Note_Input_Fact("encoding", dialect.code->name);
+    Note_Input_Fact("separator", dialect.runs ? "blanks" : Words_Of_Sign(dialect.separator));
+    Note_Sign("quote", dialect.quote);
+    Note_Sign("escape", dialect.escape);
+    Note_Sign("decimal", dialect.decimal);
+    Note_Sign("thousands", dialect.thousands);
+    Note_Sign("comment", dialect.comment);
+    Note_Input_Fact("lines of names", std::to_string(dialect.names_lines));
+    if (dialect.lines_in_front > 0)
+        Note_Input_Fact("lines in front", std::to_string(dialect.lines_in_front));
+}
+
+}  // namespace
+
 void Set_Found_Dialect(const Text_Dialect& dialect)
 {
     request.Found_Text_Dialect = std::make_shared<const Text_Dialect>(dialect);
+    Note_Facts(dialect);
 }
 
 }  // namespace ingester

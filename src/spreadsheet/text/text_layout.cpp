@@ -30,7 +30,11 @@ Text_Layout Host_Layout(bool tab_mode)
 
 void Make_Plain(Text_Layout& layout)
 {
+    constexpr std::string_view known_separators = ";|\t";
     layout.plain = true;
+    if (layout.layout == Layout::commas
+        && known_separators.find(request.Write_Separator) != known_separators.npos)
+        layout.separator = request.Write_Separator;
     layout.quoted = false;
     layout.tells_texts = Get_Settings().csv_quote_text != 0;
     layout.marked = Marks_Are_Wanted(true);

@@ -2,6 +2,7 @@
 
 #include "request/messages.h"
 #include "request/request.h"
+#include "spreadsheet/dialect/text_dialect.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -51,6 +52,7 @@ Text_Manner Manner_Of_Text(std::string_view bytes)
     Text_Converter converter = Sure_Converter(manner.code, Utf_8_Code());
     const std::string_view head = converter.Convert(bytes.substr(mark_length, head_size));
     const std::size_t line = std::min(head.find('\n'), head.size());
+    manner.separator = Find_Dialect(head, {}).dialect.separator;
     manner.crlf = line < head.size() && line > 0 && head[line - 1] == '\r';
     manner.marks = Names_Are_Marked(head.substr(0, line));
     manner.stars = Holds_Star(head.substr(line));
@@ -62,6 +64,7 @@ void Keep_Manner_Of_Text(std::string_view bytes, const char* name)
     const Text_Manner manner = Manner_Of_Text(bytes);
     request.Write_Crlf = request.Write_Crlf || manner.crlf;
     request.Write_Marks = request.Write_Marks || manner.marks;
+    request.Write_Separator = manner.separator;
     if (manner.stars && !request.Missing_Text_Given) {
         request.Missing_Text = "*";
         request.Missing_Text_Given = true;

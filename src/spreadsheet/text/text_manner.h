@@ -10,6 +10,7 @@ namespace ingester {
 struct Text_Manner {
     Text_Code code = nullptr;
     bool code_mark = false;  ///< the mark of Unicode comes first
+    char separator = ',';
     bool crlf = false;
     bool marks = false;  ///< types are told behind names
     bool stars = false;  ///< missing is "*"
