@@ -34,9 +34,10 @@ struct Spelling_Watch {
 
     void Take(std::int32_t decimals, char last)
     {
-        fewest = std::min(fewest, decimals);
-        if (last == '0')
-            round = std::max(round, decimals);
+        if (decimals < fewest) [[unlikely]]
+            fewest = decimals;
+        if (last == '0' && decimals > round) [[unlikely]]
+            round = decimals;
     }
     /// Of numbers with more digits than are surely exact, most print as they are spelled or few do: some
     /// tell.

@@ -177,7 +177,7 @@ void Sheet_Filler::Become(Column_Filling& state, std::int32_t type, Filling fill
 }
 
 /// A field's text, doubled quotes made single, cut and trimmed.
-std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
+inline std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
 {
     std::string_view text = content.text;
     const bool escaped = dialect_ != nullptr && dialect_->escape != '\0';
@@ -197,7 +197,12 @@ std::string_view Sheet_Filler::Text_Of(const Field_Content& content)
     return trim_ ? Trim_Copy(text) : text;
 }
 
-void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell)
+std::string_view Sheet_Filler::Said_By(const Field_Content& content)
+{
+    return Text_Of(content);
+}
+
+inline void Sheet_Filler::Put_Text(const Text_Field& field, Column& column, Cell_Node& cell)
 {
     const Field_Content content = walker_.Content(field);
     const std::string_view text = Text_Of(content);
@@ -207,6 +212,11 @@ void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node&
     Make_Room_For(column, text);
     if (!text.empty() && (content.quote != '\0' || text != "*"))
         Set_Cell_From_Text(column, cell, text);
+}
+
+void Sheet_Filler::Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell)
+{
+    Put_Text(field, column, cell);
 }
 
 /// The column's numbers so far are taken back; their texts are fetched when all rows are in.
@@ -331,7 +341,7 @@ bool Sheet_Filler::Add_Late_Column()
 }
 
 /// Columns without a field in this line get a cell too.
-void Sheet_Filler::Fill_Row()
+inline void Sheet_Filler::Fill_Row()
 {
     std::size_t index = 0;
     do {
@@ -347,8 +357,10 @@ void Sheet_Filler::Fill_Row()
             field = walker_.Next();
         if (state.filling < Filling::moments)
             Fill_Number(field, state);
-        else if (state.filling < Filling::left_out)
-            Fill_Other_Text(field, state);
+        else if (state.filling == Filling::texts)
+            Put_Text(field, *state.column, state.cells.Append(empty_));
+        else if (state.filling == Filling::moments)
+            Fill_Moment(field, state);
     } while (walker_.Has_More());
     if (index == columns_.size()) [[likely]]
         return;
@@ -357,7 +369,7 @@ void Sheet_Filler::Fill_Row()
         Append_Blank(columns_[index]);
 }
 
-bool Sheet_Filler::Row_Is_Acceptable(const char* line)
+inline bool Sheet_Filler::Row_Is_Acceptable(const char* line)
 {
     if (row_ >= row_limit_)
         return Fail("Error: More than %li rows of %li columns are too many for a text of %li characters.\n",
@@ -367,7 +379,7 @@ bool Sheet_Filler::Row_Is_Acceptable(const char* line)
                                 buffer_.lines_before + (shape_.has_names ? 2 : 1) + row_);
 }
 
-void Sheet_Filler::Tell_Progress()
+inline void Sheet_Filler::Tell_Progress()
 {
     constexpr std::ptrdiff_t step = std::ptrdiff_t{1} << 22;
     if (walker_.Place() - told_ < step)

@@ -23,7 +23,7 @@ void Sheet_Filler::Fill_Names_In_Lines()
         std::size_t index = dialect_->rows_are_named ? 1 : 0;
         do {
             const Field_Content content = walker_.Content(walker_.Next());
-            const std::string_view name = Trim_Copy(Text_Of(content));
+            const std::string_view name = Trim_Copy(Said_By(content));
             bare_texts_ = bare_texts_ || (content.quote == '\0' && !name.empty());
             if (index >= columns_.size()) {
                 if (!name.empty())
@@ -130,14 +130,6 @@ void Sheet_Filler::Fill_Moment(const Text_Field& field, Column_Filling& state)
         return Take_Moment(state, moment);
     Turn_To_Text(state);
     Fill_Text(field, *state.column, state.cells.Last());
-}
-
-void Sheet_Filler::Fill_Other_Text(const Text_Field& field, Column_Filling& state)
-{
-    if (state.filling == Filling::moments)
-        Fill_Moment(field, state);
-    else
-        Fill_Text(field, *state.column, state.cells.Append(empty_));
 }
 
 namespace {

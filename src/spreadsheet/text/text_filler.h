@@ -69,11 +69,13 @@ private:
     void Fill_Number(const Text_Field& field, Column_Filling& state);
     void Fill_Checked(const Text_Field& field, Column_Filling& state);
     void Fill_Text(const Text_Field& field, Column& column, Cell_Node& cell);
+    void Put_Text(const Text_Field& field, Column& column, Cell_Node& cell);
     void Note_Field(Loss_Kind kind, const Column& column, const Text_Field& field) const;
     void Append_Blank(Column_Filling& state);
     void Turn_To_Text(Column_Filling& state);
     static void Become(Column_Filling& state, std::int32_t type, Filling filling);
     std::string_view Text_Of(const Field_Content& content);
+    std::string_view Said_By(const Field_Content& content);  ///< the same, for calls from elsewhere
     void Refuse_Extra_Columns();
     bool Add_Late_Column();
     bool Row_Is_Acceptable(const char* line);
@@ -86,7 +88,6 @@ private:
     void Fill_Moment(const Text_Field& field, Column_Filling& state);
     void Begin_Moments(Column_Filling& state, const Iso_Moment& moment);
     void Take_Moment(Column_Filling& state, const Iso_Moment& moment);
-    void Fill_Other_Text(const Text_Field& field, Column_Filling& state);
     bool Rewrite_Line(const Text_Field& field);
     bool Ends_Table();
     void Settle_Quoted_Columns();
