@@ -4,6 +4,7 @@
 #include "model/cell_text.h"
 #include "model/date_format.h"
 #include "model/date_text.h"
+#include "model/factors.h"
 #include "model/text_number.h"
 #include "request/losses.h"
 #include "request/messages.h"
@@ -304,6 +305,18 @@ std::int32_t Wanted_Time_Format(const Column& column, const Date_Counts& counts)
 }
 
 }  // namespace
+
+void Unpack_Dates(Column* column)
+{
+    if (column == nullptr || column->type != variate_column || !For_People(People_Rule::further_dates))
+        return;
+    const double last_day = Max_Date(1);
+    for (const Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
+        if (cell->value.number > last_day) {
+            static_cast<void>(Variate_To_Text(column));
+            return;
+        }
+}
 
 bool Text_Column_To_Date(Column* column, bool time_mode)
 {

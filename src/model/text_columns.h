@@ -21,6 +21,10 @@ struct Date_Format_Search {
 /// are no dates become missing, and are told in the request's messages. False for a column of another type.
 bool Text_Column_To_Date(Column* column, bool time_mode);
 
+/// For people, turns a Variate whose numbers are too great for days back into texts: they are dates without
+/// separators, as 20200105. Nothing happens to other columns.
+void Unpack_Dates(Column* column);
+
 /// Turns a text-like column into a Variate. Texts that don't say their number plainly are told in
 /// the request's messages. False for a column of another type.
 bool Text_Column_To_Number(Column* column);

@@ -301,6 +301,12 @@ TEST_F(Dates, People_Write_Them_In_More_Ways)
             const bool lossy = texts.back() == "x" || texts.back().ends_with("h30");
             EXPECT_EQ(request.losses.Entries().size(), lossy ? 1 : 0) << texts.front();
         }
+    for (const bool people : {false, true}) {
+        request.people.set(static_cast<std::size_t>(People_Rule::further_dates), people);
+        Column* const packed = Lone_Column(variate_column, {"20200105", "*"});
+        Unpack_Dates(packed);
+        EXPECT_EQ(Render(packed->sheet), people ? "x T20200105|" : "x V20200105|*");
+    }
     Column* const early = Lone_Column(text_column, {"1999-01-05", "1998-02-06", "1997-03-04"});
     ASSERT_TRUE(Text_Column_To_Date(early, false));
     EXPECT_EQ(early->date_format, 27) << "years of four digits";

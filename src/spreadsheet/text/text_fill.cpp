@@ -491,6 +491,8 @@ void Sheet_Filler::Make_Dates()
         Column& column = *columns_[index].column;
         if ((!scan.make_date && !scan.make_time) || columns_[index].filling == Filling::moments)
             continue;
+        if (scan.make_date)
+            Unpack_Dates(&column);
         if (Text_Column_To_Date(&column, scan.make_time))
             continue;
         column.format = date_format_mark;

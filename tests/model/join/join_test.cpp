@@ -510,7 +510,7 @@ TEST_F(Join, Dates_Of_Both_Forms_Are_One_Day_In_Factors_As_Well)
 {
     for (const bool target_factor : {false, true})
         for (const bool source_factor : {false, true})
-            for (const std::int16_t form : {0, 1})
+            for (const std::int16_t form : {std::int16_t{0}, std::int16_t{1}})
                 for (const bool merge : {false, true}) {
                     Start_Request("t");
                     request.people.set(static_cast<std::size_t>(People_Rule::kept_levels));
