@@ -25,6 +25,8 @@
  *   /+vain           options that mean nothing to the input are told
  *   /+endings        outputs are known by further endings
  *   /+types          inputs are recognised by further tests
+ *   /+dates          dates of statistics files come and go by the calendar
+ *   /+whole          texts of statistics files stay whole
  *
  * and beside these rules:
  *

@@ -21,6 +21,9 @@ constexpr std::array<People_Rule_Option, People_Rule_Count> Rules = {{
     {People_Rule::further_endings, "/+endings", "host-endings",
      "outputs are known by the host's endings only"},
     {People_Rule::further_types, "/+types", "host-types", "inputs are recognised as the host does"},
+    {People_Rule::calendar_dates, "/+dates", "host-dates",
+     "dates of statistics files are shifted as for the host"},
+    {People_Rule::whole_texts, "/+whole", "host-widths", "texts of statistics files are cut as for the host"},
 }};
 
 constexpr Slash_Option Others[] = {

@@ -14,8 +14,10 @@ enum class People_Rule : std::uint8_t {
     told_options,     ///< an option that means nothing to the input's format is told
     further_endings,  ///< outputs are known by endings that hosts don't use
     further_types,    ///< inputs are recognised that hosts take for text, or for nothing
+    calendar_dates,   ///< dates of statistics files come and go by the calendar, durations as such
+    whole_texts,      ///< texts of statistics files stay whole, and all that they tell of texts acts
 };
-constexpr std::size_t People_Rule_Count = 6;
+constexpr std::size_t People_Rule_Count = 8;
 
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);

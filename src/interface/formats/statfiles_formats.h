@@ -3,6 +3,7 @@
 
 #include "interface/file_detection.h"
 #include "interface/formats/format_driver.h"
+#include "statfiles/spss/spss.h"
 
 namespace ingester {
 
@@ -18,7 +19,11 @@ constexpr Format_Driver Statfiles_Formats[] = {
     {.code = 18, .name = "Gauss data", .extensions = ".fmt"},
     {.code = 20, .name = "MATLAB Level 4 matrix", .extensions = ".mat"},
     {.code = 21, .name = "Systat"},
-    {.code = 22, .name = "SPSS system file", .people_extensions = ".sav .zsav"},
+    {.code = 22,
+     .name = "SPSS system file",
+     .read = Any_Code<Read_Spss_System_File>,
+     .options = "/i /r encoding",
+     .people_extensions = ".sav .zsav"},
     {.code = 23, .name = "Stata data set", .people_extensions = ".dta"},
     {.code = 28, .name = "SAS transport", .extensions = ".tpt", .people_extensions = ".xpt"},
     {.code = 35, .name = "Statistica, first generation"},
