@@ -8,4 +8,7 @@ namespace ingester {
 /// Enters in the ledger the descriptions, the level values behind labels and the title that an output lacks.
 void Note_Dropped_Metadata(const Sheet& sheet);
 
+/// The same without the descriptions, for formats that hold these.
+void Note_Dropped_Level_Values(const Sheet& sheet);
+
 }  // namespace ingester

@@ -3,6 +3,7 @@
 
 #include "interface/file_detection.h"
 #include "interface/formats/format_driver.h"
+#include "statfiles/sas/sas.h"
 #include "statfiles/spss/spss.h"
 
 namespace ingester {
@@ -25,7 +26,17 @@ constexpr Format_Driver Statfiles_Formats[] = {
      .options = "/i /r encoding",
      .people_extensions = ".sav .zsav"},
     {.code = 23, .name = "Stata data set", .people_extensions = ".dta"},
-    {.code = 28, .name = "SAS transport", .extensions = ".tpt", .people_extensions = ".xpt"},
+    {.code = 28,
+     .name = "SAS transport",
+     .read = Any_Code<Read_Sas_Transport>,
+     .options = "encoding",
+     .sheet_names = Read_Sas_Member_Names,
+     .lists_sheets = true,
+     .extensions = ".tpt",
+     .people_extensions = ".xpt",
+     .write = Write_Sas_Transport,
+     .unique_names = true,
+     .max_columns = Default_Max_Columns},
     {.code = 35, .name = "Statistica, first generation"},
     {.code = 36, .name = "Statistica, second generation"},
     {.code = 37, .name = "SAS data set", .extensions = ".ssd .sas7bdat .ssd01"},
