@@ -27,6 +27,17 @@ bool Is_Held(const Sas_Reading& reading, const Sas_Variable& variable)
            && std::int64_t{variable.offset} + variable.length <= reading.row_size;
 }
 
+/// Rows whose variables lie over each other would make more of a file than it holds.
+bool Rows_Hold_All(const Sas_Reading& reading)
+{
+    std::int64_t bytes = 0;
+    for (const Sas_Variable& variable : reading.variables)
+        bytes += variable.length;
+    return bytes <= reading.row_size
+           && std::ranges::all_of(reading.variables,
+                                  [&](const Sas_Variable& variable) { return Is_Held(reading, variable); });
+}
+
 void Tell_Long_Texts(bool& told)
 {
     if (!told && !For_People(People_Rule::whole_texts))
@@ -92,11 +103,12 @@ bool Make_Sas_Columns(Sas_Reading& reading, Fill_Cells fill_numbers, std::vector
         Tell_Columns_Beyond(reading, beyond);
         reading.variables.resize(static_cast<std::size_t>(request.Max_Columns));
     }
+    if (!Rows_Hold_All(reading))
+        return false;
     reading.sheet = New_Sheet_Of_Reader();
     std::int32_t place = 0;
     for (const Sas_Variable& variable : reading.variables) {
-        if (reading.sheet == nullptr || !Is_Held(reading, variable)
-            || !Make_Column(reading, variable, ++place))
+        if (reading.sheet == nullptr || !Make_Column(reading, variable, ++place))
             return false;
         if (variable.type == sas_text && variable.length > static_cast<std::int32_t>(Text_Cell_Width))
             Tell_Long_Texts(told);

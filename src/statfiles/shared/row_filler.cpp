@@ -56,26 +56,47 @@ std::size_t Row_Filler::Keep_Wanted(std::byte* rows, std::size_t count)
     return numbers_.size();
 }
 
+bool Row_Filler::Count(std::size_t rows, std::size_t kept)
+{
+    rows_ += static_cast<std::int64_t>(rows);
+    kept_ += static_cast<std::int64_t>(kept);
+    told_ += rows;
+    if (told_ >= Told_Step) {
+        told_ = 0;
+        ahead_.Come_To(static_cast<std::size_t>(kept_) * sizeof(Cell_Node));
+    }
+    return rows_ <= most_rows_
+           || Fail("Error: More than %li rows of %li columns are too many for this file.\n",
+                   static_cast<long>(most_rows_), static_cast<long>(std::ssize(plan_)));
+}
+
 bool Row_Filler::Take(std::byte* rows, std::size_t count)
 {
     Row_Block block{rows, row_size_, count, rows_ + 1};
-    if (rows_ + static_cast<std::int64_t>(count) > most_rows_)
-        return Fail("Error: More than %li rows of %li columns are too many for this file.\n",
-                    static_cast<long>(most_rows_), static_cast<long>(std::ssize(plan_)));
     if (selection_.active) {
         block.count = Keep_Wanted(rows, count);
         block.numbers = numbers_.data();
     }
     for (Row_Field& field : plan_)
         field.fill(*this, field, block);
-    rows_ += static_cast<std::int64_t>(count);
-    kept_ += static_cast<std::int64_t>(block.count);
-    told_ += count;
-    if (told_ >= Told_Step) {
-        told_ = 0;
-        ahead_.Come_To(static_cast<std::size_t>(kept_) * sizeof(Cell_Node));
-    }
-    return true;
+    return Count(count, block.count);
+}
+
+void Row_Filler::Append_Number(Row_Field& field, double value)
+{
+    const std::int64_t row = rows_ + 1;
+    if (!(value > missing_ && value <= Greatest_Number)) [[unlikely]]
+        value = Unusual_Number(field, nullptr, value, row);
+    else if (field.missing.Holds(value))
+        value = Merged(field, value, row);
+    if (field.dated && value > missing_)
+        value = Dated(field, value, row);
+    Cells_Of(field).Append({.number = value});
+}
+
+bool Row_Filler::End_Row(bool kept)
+{
+    return Count(1, kept ? 1 : 0);
 }
 
 double Row_Filler::Unusual_Number(Row_Field& field, const std::byte* stored, double value, std::int64_t row)

@@ -101,6 +101,18 @@ public:
     /// The next rows of the file, in this memory, which may be changed. False when there are too many.
     [[nodiscard]] bool Take(std::byte* rows, std::size_t count);
 
+    // The same value by value, for files whose rows have no fixed size.
+    [[nodiscard]] std::span<Row_Field> Fields() { return plan_; }
+    [[nodiscard]] bool Keeps_Next_Row() const { return selection_.Keeps(rows_); }
+    void Append_Number(Row_Field& field, double value);
+    void Append_Text(Row_Field& field, std::string_view text)
+    {
+        Go_To(*field.column);
+        Append_Text(field, text, rows_ + 1);
+    }
+    /// Ends a row, of which `kept` tells whether it was filled. False when there are too many.
+    [[nodiscard]] bool End_Row(bool kept);
+
     /// Rows of the file so far.
     [[nodiscard]] std::int64_t Rows() const { return rows_; }
     [[nodiscard]] std::size_t Row_Size() const { return row_size_; }
@@ -136,6 +148,7 @@ private:
     }
     static void Set_Whole_Text(Row_Field& field, Cell_Node& cell, std::string_view text, std::int64_t row);
     [[nodiscard]] std::size_t Keep_Wanted(std::byte* rows, std::size_t count);
+    [[nodiscard]] bool Count(std::size_t rows, std::size_t kept);
     void Note_Losses() const;
 
     Sheet& sheet_;

@@ -56,15 +56,18 @@ void Show_As_Date(Column& column, const Spss_Date_Format& date)
     column.date_format = in_hours ? total_hours_format : date.display;
 }
 
-void Limit_Variables(Spss_Dictionary& dictionary)
+/// How many of the variables become Columns.
+std::size_t Limited_Variables(const Spss_Dictionary& dictionary)
 {
-    const std::int64_t beyond = std::ssize(dictionary.variables) - request.Max_Columns;
-    if (beyond <= 0)
-        return;
+    const auto limit = static_cast<std::size_t>(request.Max_Columns);
+    const std::size_t count = dictionary.variables.size();
+    if (count <= limit)
+        return count;
     Report_Message_Long("Warning Columns above %li NOT transfered.\n", request.Max_Columns);
-    Note_Loss(Loss_Kind::beyond_limit, {}, 0, "columns beyond the greatest number", beyond);
+    Note_Loss(Loss_Kind::beyond_limit, {}, 0, "columns beyond the greatest number",
+              static_cast<std::int64_t>(count - limit));
     request.losses.Bar_Replacing("columns beyond the greatest number would be lost");
-    dictionary.variables.resize(static_cast<std::size_t>(request.Max_Columns));
+    return limit;
 }
 
 constexpr std::int32_t Beside_Name = 2;
@@ -111,13 +114,15 @@ bool Texts_Are_Whole()
 
 bool Make_Spss_Columns(Spss_Reading& reading)
 {
-    Limit_Variables(reading.dictionary);
+    const std::vector<Spss_Variable>& variables = reading.dictionary.variables;
+    const std::size_t count = Limited_Variables(reading.dictionary);
     reading.sheet = New_Sheet_Of_Reader();
-    for (const Spss_Variable& variable : reading.dictionary.variables)
-        if (reading.sheet == nullptr || !Make_Column(reading, variable))
+    for (std::size_t i = 0; i < count; ++i)
+        if (reading.sheet == nullptr || !Make_Column(reading, variables[i]))
             return false;
     Make_Column_Names_Unique(reading.sheet);
     reading.columns = Narrow_Columns(*reading.sheet);
+    reading.columns.resize(variables.size());
     return true;
 }
 

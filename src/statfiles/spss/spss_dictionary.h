@@ -53,7 +53,7 @@ struct Spss_Dictionary {
 struct Spss_Reading {
     Sheet* sheet = nullptr;
     Spss_Dictionary dictionary = {};
-    std::vector<Column*> columns = {};  ///< by variable, null for one that is left out
+    std::vector<Column*> columns = {};  ///< by variable, null for those left out
     Text_Crossing crossing = {};        ///< from the file's code
     bool labels_by_case_free = false;
     bool formats_are_kept = true;  ///< decimals and widths of formats reach the Columns
@@ -63,7 +63,7 @@ struct Spss_Reading {
 [[nodiscard]] bool Epoch_Of_Format(const Spss_Format& format, Epoch& epoch);
 
 /// Takes a new Sheet, with a Column for each variable that the request keeps. Variables beyond the greatest
-/// number are told and go. False for want of memory.
+/// number are told, and have none. False for want of memory.
 [[nodiscard]] bool Make_Spss_Columns(Spss_Reading& reading);
 
 /// The plan by which cases become cells, with numbers filled by `fill_numbers`.

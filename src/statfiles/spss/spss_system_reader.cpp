@@ -118,10 +118,11 @@ bool Read_Coded_Cases(Spss_System_Reading& reading, Row_Filler& filler)
 
 bool Read_Cases(Spss_System_Reading& reading)
 {
+    constexpr std::int64_t most_in_packed_byte = 32;
     Spss_Reading& common = reading.common;
     Row_Filler filler(*common.sheet, common.dictionary.case_size,
                       Plan_Of_Cases(common, Fill_Doubles(reading.source.order)), Texts_Of_Cases(common),
-                      reading.source.File().Size());
+                      reading.source.File().Size() * (reading.packed ? most_in_packed_byte : 1));
     const bool plain = reading.head.compression == plain_cases;
     const bool read = plain ? Read_Plain_Cases(reading, filler) : Read_Coded_Cases(reading, filler);
     if (!read || !filler.Finish())
