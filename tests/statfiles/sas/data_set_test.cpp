@@ -37,7 +37,7 @@ std::string Short_File(const std::string& version = "6.04")
     number.replace(8, 5, "YIELD").replace(16, 5, "Label");
     Put_At(text, 0, std::int16_t{2});
     Put_At(text, 4, std::int16_t{5});
-    return head + number + text + Short_Double(2.5, 4) + " abc " + Short_Double(-1e307, 4) + "\0    "s;
+    return head + number + text + Short_Double(2.5, 4) + " abc " + Short_Double(-1e308, 4) + "\0    "s;
 }
 
 /// Two pages: the first describes two variables and holds a row, the second holds two.
@@ -53,7 +53,7 @@ std::string Paged_File(std::int32_t rows = 3)
         Put_At(page, 20 + static_cast<std::size_t>(i) * 12, length);
     };
     place(0, 480, 28);
-    place(1, 400, 72);
+    place(1, 64, 72);
     place(2, 320, 72);
     Put_At(page, 480 + 8, std::int32_t{2});
     Put_At(page, 480 + 20, std::int32_t{11});
@@ -66,7 +66,7 @@ std::string Paged_File(std::int32_t rows = 3)
         Put_At(page, at + 68, length);
         Put_At(page, at + 70, number);
     };
-    variable(400, "T", 2, 3, 8, 2);
+    variable(64, "T", 2, 3, 8, 2);
     variable(320, "", 1, 8, 0, 1);
     const std::string row = Little_Bytes(7.25) + "xyz";
     page.replace(52, row.size(), row);

@@ -156,7 +156,8 @@ TEST_F(Sas_Transport, Members_By_Name_And_Number)
     const std::string two =
         Library + Member({{1, 8, "A"}}, Ibm(1), "FIRST") + Member({{1, 8, "B"}}, Ibm(2), "SECONDLY");
     const auto choose = [&](const std::string& name) {
-        return Render(Read(two, [&] { request.Worksheet_Name = name; })) + "," + Messages();
+        const std::string sheet = Render(Read(two, [&] { request.Worksheet_Name = name; }));
+        return sheet + "," + Messages();
     };
     const auto inexact = [](const std::string& found, const std::string& asked) {
         return "Warning: inexact match on sheet name: '" + found + "' selected for '" + asked + "'.\n:\n";
@@ -176,7 +177,7 @@ TEST_F(Sas_Transport, Members_By_Name_And_Number)
 TEST_F(Sas_Transport, Padding_Is_No_Data_But_Blank_Rows_Are)
 {
     const auto file = [](const std::string& data) { return Library + Member({{2, 8, "T"}}, data); };
-    EXPECT_EQ(Render(Read(file(Padded("a", 8) + Padded("", 8) + Padded("b", 8)))), "T Ta|");
+    EXPECT_EQ(Render(Read(file(Padded("a", 8) + Padded("", 8) + Padded("b", 8)))), "T Ta");
     EXPECT_EQ(Render(Read(file(Padded("", 80) + Padded("b", 8)))), "T T||||||||||b");
     EXPECT_EQ(Render(Read(file(Padded("", 72) + Padded("b", 8)))), "");
     EXPECT_EQ(Messages(), "All SAS Transport records are blank.\n:\n");

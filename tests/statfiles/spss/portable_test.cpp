@@ -95,8 +95,9 @@ TEST_F(Spss_Portable, Numbers_Are_Rounded_Once)
         double exact = 1;
         for (int digit = 0; digit < power; ++digit)
             exact *= 30;  // has no more than 53 bits up to here
-        if (mantissa < std::uint64_t{1} << 53)
+        if (mantissa < std::uint64_t{1} << 53) {
             ASSERT_EQ(Portable_Number(mantissa, -power), static_cast<double>(mantissa) / exact);
+        }
         // The same number spelt with more digits.
         ASSERT_EQ(Portable_Number(Portable_Mantissa{mantissa} * 810000, -power - 4),
                   Portable_Number(mantissa, -power));
@@ -162,7 +163,7 @@ TEST_F(Spss_Portable, Missing_Values_Labels_And_Dates)
     EXPECT_EQ(Levels_Of(Current_Sheet), "a Beta");
     EXPECT_EQ(Cells(Begin(1) + Variable(0, "D", "K/B/0/") + "F0/"), "D V-6347");
     EXPECT_EQ(Column_At(Current_Sheet, 1)->date_format, 1);
-    EXPECT_EQ(Cells(Begin(1) + Variable(0, "X") + "F1+6R/"), "X V9.99999e+307");
+    EXPECT_EQ(Cells(Begin(1) + Variable(0, "X") + "F6+6S/"), "X V9.99999e+307");
     EXPECT_EQ(Messages(), "Numbers in greater than9.99999E+307 have been set to this value.\n:\n");
 }
 
