@@ -8,6 +8,8 @@
 
 namespace ingester {
 
+constexpr std::string_view Sas_Transport_Instead = "SAS transport (.xpt)";
+
 constexpr Format_Driver Statfiles_Formats[] = {
     {.code = 3, .name = "dBase table", .extensions = ".dbf", .max_columns = 511},
     {.code = 7, .name = "Minitab worksheet"},
@@ -27,7 +29,8 @@ constexpr Format_Driver Statfiles_Formats[] = {
      .name = "SPSS system file",
      .read = Any_Code<Read_Spss_System_File>,
      .options = "/i /r encoding",
-     .people_extensions = ".sav .zsav"},
+     .people_extensions = ".sav .zsav",
+     .instead = Sas_Transport_Instead},
     {.code = 23, .name = "Stata data set", .people_extensions = ".dta"},
     {.code = 28,
      .name = "SAS transport",
@@ -38,8 +41,7 @@ constexpr Format_Driver Statfiles_Formats[] = {
      .extensions = ".tpt",
      .people_extensions = ".xpt",
      .write = Write_Sas_Transport,
-     .unique_names = true,
-     .max_columns = Default_Max_Columns},
+     .unique_names = true},
     {.code = 35, .name = "Statistica, first generation"},
     {.code = 36, .name = "Statistica, second generation"},
     {.code = 37, .name = "SAS data set", .extensions = ".ssd .sas7bdat .ssd01"},
@@ -60,7 +62,8 @@ constexpr Format_Driver Statfiles_Formats[] = {
      .name = "SPSS portable",
      .read = Any_Code<Read_Spss_Portable>,
      .options = "/i /r encoding",
-     .people_extensions = ".por"},
+     .people_extensions = ".por",
+     .instead = Sas_Transport_Instead},
     {.code = 46, .name = "data set read through the bridge"},
     {.code = 47, .name = "data set read through the bridge"},
     {.code = 68, .name = "Statistica, third generation"},

@@ -28,7 +28,7 @@ public:
         return Greatest_Number;
     }
 
-    /// `words`, with a "%s" for the greatest number, once all is read; nothing where none was cut.
+    /// `words`, with or without a "%s" for the greatest number, once all is read; nothing where none was cut.
     void Report(const char* words) const
     {
         if (any_)

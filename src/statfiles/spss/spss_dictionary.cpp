@@ -98,6 +98,13 @@ bool Make_Column(Spss_Reading& reading, const Spss_Variable& variable)
 
 }  // namespace
 
+std::string Name_Key(std::string_view name)
+{
+    std::string key(Without_Blanks(name, false));
+    std::ranges::transform(key, key.begin(), To_Upper);
+    return key;
+}
+
 bool Epoch_Of_Format(const Spss_Format& format, Epoch& epoch)
 {
     const Spss_Date_Format* const date = Find_Date_Format(format.code);
@@ -175,7 +182,7 @@ void Label_Spss_Columns(Spss_Reading& reading)
 {
     Label_Terms terms{.trim_front = Get_Settings().trim_cells != 0,
                       .by_case_free = reading.labels_by_case_free && Get_Settings().ignore_value_case != 0,
-                      .add_unused = request.Reverse_Labels,
+                      .add_unused = request.Add_Unused_Labels,
                       .crossing = &reading.crossing};
     if (Texts_Are_Whole())
         terms.width = Long_Label_Width;

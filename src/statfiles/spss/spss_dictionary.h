@@ -10,6 +10,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace ingester {
@@ -58,6 +59,9 @@ struct Spss_Reading {
     bool labels_by_case_free = false;
     bool formats_are_kept = true;  ///< decimals and widths of formats reach the Columns
 };
+
+/// By what a name is found: without case, and without the blanks at its end.
+[[nodiscard]] std::string Name_Key(std::string_view name);
 
 /// How far a variable's numbers lie from the day counts of its dates; false for one that holds none.
 [[nodiscard]] bool Epoch_Of_Format(const Spss_Format& format, Epoch& epoch);

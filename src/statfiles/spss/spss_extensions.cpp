@@ -14,18 +14,11 @@ namespace {
 
 using Variables_By_Name = std::unordered_map<std::string, std::size_t>;
 
-std::string Upper(std::string_view text)
-{
-    std::string upper(text);
-    std::ranges::transform(upper, upper.begin(), To_Upper);
-    return upper;
-}
-
 Variables_By_Name By_Short_Name(const Spss_Dictionary& dictionary)
 {
     Variables_By_Name found;
     for (std::size_t i = 0; i < dictionary.variables.size(); ++i)
-        found.try_emplace(Upper(dictionary.variables[i].name), i);
+        found.try_emplace(Name_Key(dictionary.variables[i].name), i);
     return found;
 }
 
@@ -45,7 +38,7 @@ void Take_Long_Names(Spss_Dictionary& dictionary, std::string_view list)
 {
     const Variables_By_Name by_name = By_Short_Name(dictionary);
     For_Pairs(list, [&](std::string_view name, std::string_view long_name) {
-        const auto found = by_name.find(Upper(Without_Blanks(name, false)));
+        const auto found = by_name.find(Name_Key(name));
         if (found != by_name.end())
             dictionary.variables[found->second].long_name = Without_Blanks(long_name, false);
     });
@@ -72,7 +65,7 @@ void Join_Pieces(Spss_Dictionary& dictionary, std::string_view list)
     const Variables_By_Name by_name = By_Short_Name(dictionary);
     std::vector<bool> dropped(dictionary.variables.size());
     For_Pairs(list, [&](std::string_view name, std::string_view width_text) {
-        const auto found = by_name.find(Upper(Without_Blanks(name, false)));
+        const auto found = by_name.find(Name_Key(name));
         const long width = Leading_Integer(width_text);
         constexpr long longest = 32767;
         if (found == by_name.end() || width <= static_cast<long>(Piece_Length) || width > longest)
@@ -129,13 +122,13 @@ Variables_By_Name By_Full_Name(const Spss_Dictionary& dictionary)
 {
     Variables_By_Name found = By_Short_Name(dictionary);
     for (std::size_t i = 0; i < dictionary.variables.size(); ++i)
-        found.insert_or_assign(Upper(dictionary.variables[i].Full_Name()), i);
+        found.insert_or_assign(Name_Key(dictionary.variables[i].Full_Name()), i);
     return found;
 }
 
 Spss_Variable* Find_Text(Spss_Dictionary& dictionary, const Variables_By_Name& by_name, std::string_view name)
 {
-    const auto found = by_name.find(Upper(Without_Blanks(name, false)));
+    const auto found = by_name.find(Name_Key(name));
     Spss_Variable* const variable = found == by_name.end() ? nullptr : &dictionary.variables[found->second];
     return variable != nullptr && variable->Is_Text() ? variable : nullptr;
 }

@@ -45,13 +45,6 @@ bool Told(std::string_view words)
     return Cannot_Read();
 }
 
-std::string Upper(std::string_view text)
-{
-    std::string upper(text);
-    std::ranges::transform(upper, upper.begin(), To_Upper);
-    return upper;
-}
-
 // --- The head ----------------------------------------------------------------------------------------
 
 constexpr std::size_t Splash_Length = 200;
@@ -125,7 +118,7 @@ bool Read_Variable(Portable_Reading& reading)
     if (!reading.source.Portable_String(variable.name, Kept_Name)
         || !Read_Format(reading.source, print_format) || !Read_Format(reading.source, variable.format))
         return Cannot_Read();
-    reading.by_name.try_emplace(Upper(Without_Blanks(variable.name, false)), variables.size());
+    reading.by_name.try_emplace(Name_Key(variable.name), variables.size());
     variables.push_back(std::move(variable));
     return true;
 }
@@ -180,7 +173,7 @@ bool Read_Labelled_Variables(Portable_Reading& reading, std::int32_t count, bool
         std::string name;
         if (!reading.source.Portable_String(name, Kept_Name))
             return false;
-        const auto found = reading.by_name.find(Upper(Without_Blanks(name, false)));
+        const auto found = reading.by_name.find(Name_Key(name));
         if (found == reading.by_name.end())
             continue;
         Spss_Variable& variable = dictionary.variables[found->second];
@@ -353,7 +346,7 @@ bool Fill_Sheet(Portable_Reading& reading)
         return false;
     if (!filler.Finish())
         return Fail("SPSS Portable file contains no data records.\n");
-    filler.Held().Report("Numbers in greater than%s have been set to this value.\n");
+    filler.Held().Report("Numbers in greater than9.99999E+307 have been set to this value.\n");
     return true;
 }
 

@@ -74,8 +74,9 @@ TEST_F(Spss_Pc, Variables_Labels_And_Cases)
         EXPECT_EQ(Levels_Of(Current_Sheet), "one");
         EXPECT_EQ(Column_At(Current_Sheet, 1)->extra, "Label");
     }
-    EXPECT_EQ(Read(Bytes({.data = Three_Cases(std::endian::little)}), [] { request.Reverse_Labels = true; }),
-              "N F1|*|1; %T Tabcdefghij|short|");
+    EXPECT_EQ(
+        Read(Bytes({.data = Three_Cases(std::endian::little)}), [] { request.Add_Unused_Labels = true; }),
+        "N F1|*|1; %T Tabcdefghij|short|");
     EXPECT_EQ(Levels_Of(Current_Sheet), "1=one 2=two");
     EXPECT_EQ(
         Read(Bytes({.data = Three_Cases(std::endian::little)}), [] { Get_Settings().ignore_value_case = 1; }),

@@ -86,7 +86,7 @@ TEST_F(Spss_System, Labelled_Numbers_Become_Factors)
     EXPECT_EQ(Column_At(Current_Sheet, 1)->extra, "How many?");
     EXPECT_EQ(Column_At(Current_Sheet, 1)->factor_kind, factor_with_labels);
     EXPECT_EQ(Column_At(Current_Sheet, 1)->width, 8);
-    Read(items, [] { request.Reverse_Labels = true; });
+    Read(items, [] { request.Add_Unused_Labels = true; });
     EXPECT_EQ(Levels_Of(Current_Sheet), "10=ten 20=twenty 25=25 9=refused 30=thirty");
     EXPECT_EQ(Render(Read(items, [] { Get_Settings().ignore_value_case = 1; })), "Q F2|4|1|3");
     EXPECT_EQ(Levels_Of(Current_Sheet), "9=refused 10=ten 20=twenty 25=25");
@@ -104,7 +104,7 @@ TEST_F(Spss_System, Labels_Of_Other_Columns)
         Read(Of(Head(1, 0, -1), variable, set, 4, 1, 1, End, cases), change);
         return Render(Current_Sheet, false) + ", " + Levels_Of(Current_Sheet);
     };
-    const auto add_unused = [] { request.Reverse_Labels = true; };
+    const auto add_unused = [] { request.Add_Unused_Labels = true; };
     const Items texts = Of(3, 2, One_Label(Raw{"  b     "}, "Beta"), One_Label(Raw{"zz      "}, "Zeta"));
     const Items text_cases = Of(Raw{"a       "}, Raw{"  b     "});
     EXPECT_EQ(levels_of(Variable(8, "t"), texts, text_cases), "F1|2, a Beta");
