@@ -110,7 +110,7 @@ void Fill(Case& one, const Order& order, long row, std::mt19937_64& random)
         Add(one, &number, literal);
     }
     for (long i = 0; i < order.texts; ++i) {
-        char text[16];
+        char text[32];
         std::snprintf(text, sizeof text, "%08ld", row);
         Add(one, i % 2 == 0 ? words[random() % 4].data() : text, literal);
         Add(one, "        ", 254);

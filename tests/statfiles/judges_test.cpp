@@ -29,8 +29,7 @@ struct Judge {
     std::string name, found, command;
 };
 
-const std::string Print_X =
-    "cat(ifelse(is.na(d[[1]]),\"*\",sprintf(\"%.17g\",d[[1]])),sep=\"\\n\");cat(\"\\n\")'";
+const std::string Print_X = "writeLines(ifelse(is.na(d[[1]]),\"*\",sprintf(\"%.17g\",d[[1]])))'";
 
 const Judge Judges[] = {
     {"haven", "Rscript -e 'cat(requireNamespace(\"haven\"))'",
@@ -75,7 +74,7 @@ TEST_F(Stat_Judges, Read_What_Is_Written)
     for (const Judge& judge : Judges)
         if (Is_There(judge.found)) {
             any = true;
-            EXPECT_EQ(In_Folder(judge.command), expected) << judge.name;
+            EXPECT_TRUE(In_Folder(judge.command) == expected) << judge.name;
         } else {
             std::printf("%s is not installed, and was not asked\n", judge.name.c_str());
         }
@@ -97,12 +96,12 @@ TEST_F(Stat_Judges, Write_What_Is_Read)
               "");
     for (const char* const name : {"a.sav", "b.sav", "c.sav"}) {
         EXPECT_EQ(Render(Read_Bytes(Read_Spss_System, Get(name), name, All_For_People)),
-                  "x V0.1|*|-3e+70; t Lab||300 characters; d V131428|154861|*; l F1|2|*");
+                  "x V0.1|*|-3e+70; t Lab||300 characters; d V131428|154863|*; l F1|2|*");
         EXPECT_EQ(Levels_Of(Current_Sheet, 4), "one two");
     }
     for (const char* const name : {"a.xpt", "b.xpt"})
         EXPECT_EQ(Render(Read_Bytes(Read_Sas_Transport, Get(name), name, All_For_People)),
-                  "x V0.1|*|-3e+70; t Tab||" + std::string(80, 'y') + "; d V131428|154861|*; l V1|2|*");
+                  "x V0.1|*|-3e+70; t Tab||" + std::string(80, 'y') + "; d V131428|154863|*; l V1|2|*");
 }
 
 TEST_F(Stat_Judges, Portable_Files_Hold_The_Same)

@@ -118,6 +118,8 @@ bool Find_Sas_Members(Input_File& file, std::vector<Sas_Member>& members)
             members.push_back({offset, Member_Name(walk.Next())});
         behind_header = Has_Header(record, Sas_Member_Header, Sas_Member_Header_8);
     }
+    if (file.Failed())
+        return Fail_To_Read(file.Name());
     return !members.empty() || Fail("The file is not a SAS transport file.\n");
 }
 

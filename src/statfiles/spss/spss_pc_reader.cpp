@@ -267,7 +267,7 @@ bool Fill_Cases(Pc_Reading& reading, Row_Filler& filler)
     while (filler.Rows() < reading.cases && decoder.Read_Case(row.data(), reading.is_text))
         if (!filler.Take(row.data(), 1))
             return false;
-    return filler.Finish();
+    return !reading.source.File().Failed() && filler.Finish();
 }
 
 bool Read_Cases(Pc_Reading& reading)

@@ -91,7 +91,7 @@ bool Decode_Cases(Case_Decoder& decoder, Row_Filler& filler, std::int64_t most, 
             return false;
         Show_Progress("Reading", file.Position(), file.Size());
     }
-    return true;
+    return !file.Failed();
 }
 
 /// Packed cases tell behind the dictionary where their blocks end.
