@@ -176,6 +176,8 @@ bool Take_Missing_Texts(Extension_Bytes& bytes, Spss_Dictionary& dictionary, con
 template <class Take>
 void Take_All(Spss_System_Reading& reading, std::int32_t extension, const Take& take_one)
 {
+    if (reading.extensions[extension].empty())
+        return;
     Spss_Dictionary& dictionary = reading.common.dictionary;
     const Variables_By_Name by_name = By_Full_Name(dictionary);
     Extension_Bytes bytes(reading.extensions[extension], reading.source.order);
