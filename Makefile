@@ -34,6 +34,7 @@ bench: $(RELEASE)
 	@tools/set_up.sh bench
 	@cmake --build build/release --target ingester_command make_data time_text time_factor time_dates time_joins
 	@python3 bench/run_bench.py --build build/release $(BENCH_OPTIONS)
+	@python3 bench/run_stat.py --build build/release
 
 fuzz:
 	@tools/fuzz.sh $(READER) $(SECONDS)

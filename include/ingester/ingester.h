@@ -25,8 +25,12 @@
  *   /+vain           options that mean nothing to the input are told
  *   /+endings        outputs are known by further endings, and packed where they end in .gz
  *   /+types          inputs are recognised by further tests
+ *   /+levels         joins match levels by what they say, and add those that are new
+ *   /+dates          dates are read in more of their usual forms
  *   /+plain          comma text and tabs are written as other programs take them
  *   /+dialect        a text is cut and typed as its lines tell, and numbers keep their spelling
+ *   /+calendar       dates of statistics files come and go by the calendar
+ *   /+whole          texts of statistics files stay whole
  *
  * and beside these rules:
  *

@@ -27,7 +27,9 @@ std::string Help_Of(const Slash_Option& option)
 void Offer(CLI::App& app, const char* group, Given_Option& given)
 {
     const Named_Option& named = given.option->named;
-    const std::string name = "--" + std::string(named.name);
+    std::string name = "--" + std::string(named.name);
+    if (!named.other_name.empty())
+        name.append(",--").append(named.other_name);
     const std::string help = Help_Of(*given.option);
     const bool flag = named.form == Value_Form::none || named.form == Value_Form::optional;
     CLI::Option* const offered =

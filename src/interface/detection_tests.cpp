@@ -293,6 +293,8 @@ constexpr Detection_Test Further_Tests[] = {
     {plain_text_file, {Bytes(0, "\xFF\xFE"sv)}},
     {plain_text_file, {Bytes(0, "\xFE\xFF"sv)}},
     {plain_text_file, {Bytes(0, "\0\0\xFE\xFF"sv)}},
+    {22, {Bytes(0, "$FL3")}},
+    {28, {Words(0, "HEADER RECORD*******LIBV8   HEADER RECORD!!!!!!!00")}},
 };
 
 constexpr Detection_Test Text_Tests[] = {

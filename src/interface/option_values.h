@@ -96,6 +96,11 @@ using R = Request_Globals;
 
 // How the command line offers an option.
 
+constexpr Named_Option Flag_Of_Two_Names(std::string_view name, std::string_view other_name)
+{
+    return {.name = name, .other_name = other_name};
+}
+
 constexpr Named_Option Flag(std::string_view name)
 {
     return {name};

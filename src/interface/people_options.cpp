@@ -30,6 +30,9 @@ constexpr std::array<People_Rule_Option, People_Rule_Count> Rules = {{
     {People_Rule::plain_texts, "/+plain", "host-output",
      "comma text and tabs are written as for a host: marks behind names, * for missing, CR LF"},
     {People_Rule::sniffed_texts, "/+dialect", "host-dialect", "texts are cut and typed as the host does"},
+    {People_Rule::calendar_dates, "/+calendar", "host-calendar",
+     "dates of statistics files are shifted as for the host"},
+    {People_Rule::whole_texts, "/+whole", "host-widths", "texts of statistics files are cut as for the host"},
 }};
 
 /// What follows a key: a value in quotes, or bare up to the next option.

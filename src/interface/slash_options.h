@@ -24,9 +24,10 @@ enum class Value_Form : std::uint8_t {
 struct Named_Option {
     std::string_view name = {};
     Value_Form form = Value_Form::none;
-    std::string_view value = {};  ///< the value in the help
-    std::string_view join = "=";  ///< between key and value, unless the key ends with it
-    bool takes_empty = false;     ///< no text at all is a value
+    std::string_view value = {};       ///< the value in the help
+    std::string_view join = "=";       ///< between key and value, unless the key ends with it
+    std::string_view other_name = {};  ///< a second one, where the key does two things
+    bool takes_empty = false;          ///< no text at all is a value
 };
 
 /// One option. `take` acts on what stands behind the key at `at` and returns the end of what it took.

@@ -12,4 +12,7 @@ void Note_Dropped_Metadata(const Sheet& sheet);
 /// hold these alone.
 void Note_Dropped_Orders(const Sheet& sheet);
 
+/// The same without the descriptions, for formats that hold these.
+void Note_Dropped_Level_Values(const Sheet& sheet);
+
 }  // namespace ingester

@@ -27,12 +27,12 @@ std::string_view words_of_fault;
 
 constexpr std::string_view End_Mark = ":\n";
 
+}  // namespace
+
 std::string Message_File_Name()
 {
     return Get_Temp_Folder().append(request.Scratch_Stem).append(".ERR");
 }
-
-}  // namespace
 
 void Start_Message_File()
 {

@@ -34,6 +34,9 @@ template <class First, class... Rest> void Warn(const char* format, First first,
 /// Reports that a file, or a list, could not be read to its end. Always false.
 bool Fail_To_Read(const std::string& file_name);
 
+/// What the message file is called.
+[[nodiscard]] std::string Message_File_Name();
+
 /// Ends the request's messages: closes the file, behind the mark the host looks for.
 void Close_Message_File();
 

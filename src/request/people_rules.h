@@ -14,12 +14,14 @@ enum class People_Rule : std::uint8_t {
     told_options,     ///< an option that means nothing to the input's format is told
     further_endings,  ///< outputs are known by endings that hosts don't use
     further_types,    ///< inputs are recognised that hosts take for text, or for nothing
-    kept_levels,    ///< joins match levels by what they say, add those that are new, and keep labels of units
-    further_dates,  ///< dates are read in more of their usual forms
-    plain_texts,    ///< comma text and tabs are written as other programs take them
-    sniffed_texts,  ///< the dialect of a text is found from its lines, and its types as people mean them
+    kept_levels,      ///< joins match levels by what they say and add new ones; labels of units are kept
+    further_dates,    ///< dates are read in more of their usual forms
+    plain_texts,      ///< comma text and tabs are written as other programs take them
+    sniffed_texts,    ///< the dialect of a text is found from its lines, and its types as people mean them
+    calendar_dates,   ///< dates of statistics files come and go by the calendar, durations as such
+    whole_texts,      ///< texts of statistics files stay whole, and all that they tell of texts acts
 };
-constexpr std::size_t People_Rule_Count = 10;
+constexpr std::size_t People_Rule_Count = 12;
 
 /// Whether the request that runs asks for a rule.
 [[nodiscard]] bool For_People(People_Rule rule);

@@ -130,7 +130,7 @@ struct Request_Globals : Lasting_Globals {
     std::int32_t Names_Row = 0;
     bool Transpose = false;
     bool Transpose_Names = true;
-    bool Reverse_Labels = false;
+    bool Add_Unused_Labels = false;
     bool Use_Var_File = false;
     Fixed_Text<Long_Name_Width> Var_File_Name;
     bool List_Sheets_Only = false;

@@ -48,11 +48,26 @@ inline const Request_Kind Kinds[] = {
     {{"in.csv", "o.csv/%=1"}, {"in.csv", "in.mrg", "o.csv"}},
     {{"in.csv", "o.tss/%=1"}, {"in.csv", "in.mrg", "o.tss"}},
     {{"in.csv", "o.tbk/%=1U/!=Second"}, {"in.csv", "in.mrg", "o.tbk"}},
+    {{"in.csv", "new.tpt"}, {"in.csv"}},
+    {{"in.csv", "o.tpt"}, {"in.csv", "o.tpt"}},
+    {{"in.tpt", "o.csv"}, {"in.tpt", "o.csv"}},
+    {{"in.tpt/w", "o.csv"}, {"in.tpt", "o.csv"}},
+    {{"long.tpt/+calendar", "o.csv"}, {"long.tpt", "o.csv"}},
+    {{"in.sav", "o.csv"}, {"in.sav", "o.csv"}},
+    {{"in.zsav/+types", "o.csv"}, {"in.zsav", "o.csv"}},
+    {{"in.por/+types", "o.csv"}, {"in.por", "o.csv"}},
     {{"in.csv/+people", "o.tss"}, {"in.csv", "o.tss"}},
     {{"in.csv/+people/+encoding=932", "o.csv"}, {"in.csv", "o.csv"}},
     {{"in.csv/+people", "new.csv.gz"}, {"in.csv"}},
     {{"in.csv/+people", "o.csv.gz/@"}, {"in.csv", "o.csv.gz"}},
     {{"in.csv/+people/+strict", "o.tbk/a=Added"}, {"in.csv", "o.tbk"}},
+};
+
+/// Inputs that nothing here writes: seeds of fuzz targets, behind the two characters that choose options.
+inline constexpr std::pair<const char*, const char*> Taken_Seeds[] = {
+    {"spss_system/plain", "in.sav"},
+    {"spss_system/packed", "in.zsav"},
+    {"spss_portable/cases", "in.por"},
 };
 
 /// What is converted to have the files that are there before; in this order.
@@ -64,6 +79,9 @@ constexpr std::pair<const char*, const char*> Made[] = {
     {"o.csv", "o.tbk/a=First"},
     {"o.csv", "o.tbk/a=Second"},
     {"o.csv", "o.tbk/a=Third"},
+    {"in.csv", "in.tpt"},
+    {"o.csv", "o.tpt"},
+    {"long.csv", "long.tpt"},
     {"long.csv", "long.tss"},
     {"long.csv", "long.tbk/a=First"},
     {"in.csv", "long.tbk/a=Last"},

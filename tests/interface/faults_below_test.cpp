@@ -49,6 +49,13 @@ bool Holds(const Files_And_Bytes& files, const Files_And_Bytes::value_type& one)
     return found != files.end() && found->second == one.second;
 }
 
+std::string Seed(const std::string& name)
+{
+    constexpr std::size_t choices = 2;
+    std::ifstream file(std::string(INGESTER_PROJECT "/fuzz/seeds/") + name, std::ios::binary);
+    return std::string(std::istreambuf_iterator<char>(file), {}).substr(choices);
+}
+
 class Faults_Below : public Host_Test, public testing::WithParamInterface<Request_Kind> {
 protected:
     void SetUp() override
@@ -66,6 +73,8 @@ protected:
         Put("in.mrg", "1\nplot\n");
         Put("columns", "2\nV\nplot\nyield\n");
         Put("rows", "5\n1\n0\n1\n1\n0\n");
+        for (const auto& [seed, name] : Taken_Seeds)
+            Put(name, Seed(seed));
         for (const auto& [input, output] : Made)
             ASSERT_EQ(Convert(input, output).first, 0) << output;
         for (const char* const name : {"in.csv", "in.tbk", "o.csv", "o.tbk"})

@@ -161,8 +161,10 @@ TEST_F(People_Options, Know_Further_Endings_And_Types)
 {
     Put("a.csv", "k,v\n1,5\n");
     EXPECT_EQ(Convert("a.csv", "a.sav").first, 0) << "fixed-width text for hosts";
-    EXPECT_EQ(Convert("a.csv/+endings", "b.sav").second,
-              "Writing SPSS system file is not available in this version.\n:\n");
+    EXPECT_EQ(
+        Convert("a.csv/+endings", "b.sav").second,
+        "Writing SPSS system file is not available in this version; SAS transport (.xpt) is, which most "
+        "programs read.\n:\n");
     Put("accents", "\xC3\xA9t\xC3\xA9,n\nx,1\n");
     Put("short", "a");
     for (const char* const name : {"accents", "short"}) {

@@ -35,7 +35,7 @@ protected:
 TEST_F(Slash_Options_Test, Input)
 {
     const Case genotype[] = {
-        {"a.loc/rqtl", "a.loc", [](const R& r) { return r.Qtl_Request && !r.Reverse_Labels; }},
+        {"a.loc/rqtl", "a.loc", [](const R& r) { return r.Qtl_Request && !r.Add_Unused_Labels; }},
         {"a.loc/n/map", "a.loc/n", [](const R& r) { return r.Qtl_Map_File == "a.map" && !r.No_Names; }},
         {"a.loc/map='b/c.map'", "a.loc", [](const R& r) { return r.Qtl_Map_File == "b/c.map"; }},
     };

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "interface/host_fixture.h"
+#include "platform/files.h"
 #include "support/cell_lists.h"
 #include "support/check_sheet.h"
 

@@ -6,6 +6,7 @@
 #include "hostfiles/tbk/tbk.h"
 #include "model/names.h"
 #include "model/row_fields.h"
+#include "model/sheet_list.h"
 #include "request/messages.h"
 #include "request/request.h"
 #include "support/letters.h"
@@ -510,16 +511,7 @@ bool List_Sheets_Of(Input_File& file, const std::string& shown)
     Current_Sheet = nullptr;
     if (!List_Pages(file, offsets, names))
         return Fail("Unable to get Pagenames from Tabulon Book file %.200s.\n", shown.c_str());
-    Sheet* const list = New_Sheet_With_Rows(static_cast<std::int32_t>(names.size()));
-    Column* const column =
-        New_Data_Column(list, text_column, "Worksheets", static_cast<std::int32_t>(names.size()));
-    if (column == nullptr)
-        return false;
-    const std::string* name = names.data();
-    for (Cell_Node* cell = column->first_cell; cell != nullptr; cell = cell->next)
-        Set_Text(*column, *cell, *name++);
-    Compute_Column_Width(column);
-    return true;
+    return Make_Sheet_List(names);
 }
 
 }  // namespace

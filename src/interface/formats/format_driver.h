@@ -51,6 +51,7 @@ struct Format_Driver {
     std::string_view people_extensions = {};     ///< those that only people mean by them
     std::string_view clipboard_extensions = {};  ///< of "clipboard.EXTENSION"
     Writer write = nullptr;
+    std::string_view instead = {};  ///< of formats that people ask for and that can't be written: what can
     Sheets_Writer write_sheets = nullptr;
     Sheet_Adder add = nullptr;  ///< of formats that can be added to; `replace` comes with it
     Sheet_Replacer replace = nullptr;

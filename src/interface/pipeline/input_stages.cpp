@@ -325,6 +325,10 @@ Request_Status Choose_Output(Request_Run& run)
     request.Max_Columns = static_cast<std::int32_t>(
         std::min<std::int64_t>(std::int64_t{run.output->max_columns} + std::max(request.First_Column - 1, 0),
                                std::numeric_limits<std::int32_t>::max()));
+    if (run.output->write == nullptr && !run.output->instead.empty())
+        return Stop(Request_Status::output_failed,
+                    "Writing %s is not available in this version; %s is, which most programs read.\n",
+                    std::string(run.output->name).c_str(), std::string(run.output->instead).c_str());
     if (run.output->write == nullptr)
         return Stop(Request_Status::output_failed, "Writing %s is not available in this version.\n",
                     std::string(run.output->name).c_str());

@@ -13,6 +13,7 @@
 #include "model/names.h"
 #include "model/output_forms.h"
 #include "model/sheet.h"
+#include "model/sheet_list.h"
 #include "model/source_column.h"
 #include "model/transpose.h"
 #include "platform/file_image.h"
@@ -124,13 +125,7 @@ Request_Status List_Sheets(Request_Run&)
     if (!request.List_Sheets_Only || (input != nullptr && input->lists_sheets))
         return Done;
     const std::string name(Current_Sheet->sheet_name.empty() ? "Sheet1" : Current_Sheet->sheet_name.view());
-    Sheet* const list = New_Sheet_With_Rows(1);
-    Column* const column = New_Data_Column(list, text_column, "Worksheets", 1);
-    if (column == nullptr)
-        return Request_Status::no_data;
-    Set_Text(*column, *column->first_cell, name);
-    Compute_Column_Width(column);
-    return Done;
+    return Make_Sheet_List({name}) ? Done : Request_Status::no_data;
 }
 
 /// What is joined with an output takes the place of the sheet that it was joined with.
