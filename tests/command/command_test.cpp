@@ -365,7 +365,7 @@ TEST_F(Command_Test, Other_Programs_Read_Its_Comma_Text)
     ASSERT_EQ(Run("hard.csv c.csv").err, "");
     EXPECT_EQ(Get("c.csv"),
               "name,day,when,code,x,n\nZo\xC3\xAB,2024-03-12,10:30:00,\"007\",0.30000000000000004,1\n"
-              "\"a,b\",2024-03-13,11:30:15,\"12\",,2\n\"say \"\"hi\"\"\",,,\"13\",1e+300,3\n");
+              "\"a,b\",2024-03-13,11:30:15,\"12\",,2\n\"say \"\"hi\"\"\",,,\"13\",1e300,3\n");
     int there = 0;
     for (const Peer& peer : Peers) {
         if (std::system((std::string(peer.there) + " >/dev/null 2>&1").c_str()) != 0)
@@ -425,7 +425,9 @@ TEST_F(Command_Test, The_Examples_Of_The_Read_Me_Work)
         Put("try/plots.txt", "1-2\n");
         if (line.find("--force") != std::string::npos)
             Put("try/out.tab", "old");
-        const std::string made = "gzip -k crops.csv && ingester crops.csv all.tbk && ";
+        std::filesystem::copy(INGESTER_PROJECT "/examples/survey.sav", Path("try/survey.sav"));
+        const std::string made =
+            "gzip -k crops.csv && ingester crops.csv all.tbk && ingester crops.csv study.xpt && ";
         const std::string had =
             line.find(" all.tbk ") != line.npos && line.find("--add") != line.npos ? "rm all.tbk; " : "";
         EXPECT_EQ(std::system((begin + made + had + "(" + line + "\n) >shown 2>&1").c_str()), 0)
@@ -467,8 +469,8 @@ TEST_F(Command_Test, Fails_With_A_Reason_In_Native_Names_And_Touches_Nothing)
         {wrong, "OUTPUT", "crops.csv"},
         {wrong, "info FILE", ""},
         {wrong, "there is no option --mising; did you mean --missing?", "crops.csv out.tab --mising NA"},
-        {wrong, "there is no option --separator; did you mean --separators?",
-         "crops.csv out.tab --separator=x"},
+        {wrong, "there is no option --separater; did you mean --separator?",
+         "crops.csv out.tab --separater=x"},
         {wrong, "there is no option --zzzzzzz\n", "crops.csv out.tab --zzzzzzz"},
         {wrong, "did you mean --json?", "info crops.csv --jsn"},
         {wrong, "did you mean --markdown?", "formats --markdwn"},
