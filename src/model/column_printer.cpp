@@ -30,7 +30,7 @@ Iso_Form Iso_Form_For(const Column& column, Number_Print numbers)
 char* Print_Level_Value(char* target, const Column& factor, double value, Number_Print rule, int digits)
 {
     if (rule == Number_Print::as_said)
-        return Format_Cell_Fully(target, factor, value);
+        return Format_Level_Value(target, factor, value);
     return rule == Number_Print::by_format || factor.format == date_format_mark
                ? Format_Cell_Number(target, factor, value)
                : Print_General(target, value, digits);

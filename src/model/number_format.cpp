@@ -1,6 +1,7 @@
 #include "model/number_format.h"
 
 #include "model/date_format.h"
+#include "request/people_rules.h"
 #include "request/request.h"
 #include "support/number_text.h"
 
@@ -53,16 +54,38 @@ char* Format_Cell_Number(char* target, const Column& column, double value)
     return Format_Number(target, value, column.format, column.decimals, column.sheet->missing_value);
 }
 
-char* Format_Cell_Fully(char* target, const Column& column, double value)
+namespace {
+
+constexpr int Usual_Digits = 15;
+
+/// All digits that tell a number from others, where fifteen don't.
+char* Print_In_Full(char* target, double value)
 {
-    constexpr int usual_digits = 15;
-    const bool decimals_said = column.decimals >= 0 || column.format == date_format_mark;
-    if (decimals_said || !Is_Present(*column.sheet, value))
-        return Format_Cell_Number(target, column, value);
-    char* const end = Print_General(target, value, usual_digits);
+    char* const end = Print_General(target, value, Usual_Digits);
     double back;
     const bool enough = Whole_Number_Text({target, end}, back) && back == value;
     return enough ? end : Print_Shortest(target, value);
+}
+
+bool Decides_Itself(const Column& column, double value)
+{
+    return column.decimals >= 0 || column.format == date_format_mark || !Is_Present(*column.sheet, value);
+}
+
+}  // namespace
+
+char* Format_Cell_Fully(char* target, const Column& column, double value)
+{
+    if (Decides_Itself(column, value))
+        return Format_Cell_Number(target, column, value);
+    return For_People(People_Rule::kept_levels) ? Print_In_Full(target, value)
+                                                : Print_General(target, value, Usual_Digits);
+}
+
+char* Format_Level_Value(char* target, const Column& factor, double value)
+{
+    return Decides_Itself(factor, value) ? Format_Cell_Number(target, factor, value)
+                                         : Print_In_Full(target, value);
 }
 
 std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target)
@@ -74,7 +97,7 @@ std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level,
         node = node->next;
     if (node != nullptr && column.factor_kind == factor_with_labels)
         return node->Text();
-    char* const end = node != nullptr ? Format_Cell_Fully(target, column, node->value.number)
+    char* const end = node != nullptr ? Format_Level_Value(target, column, node->value.number)
                                       : Print_Integer(target, level);
     return {target, static_cast<std::size_t>(end - target)};
 }

@@ -21,11 +21,15 @@ char* Format_Cell_Number(char* target, const Column& column, double value);
 /// decimals keeps all its digits. Valid until `target` (of `Number_Text_Room`) changes.
 [[nodiscard]] std::string_view Format_Cell(const Column& column, const Cell_Node& cell, char* target);
 
-/// The same of a present or missing number.
+/// The same of a present or missing number: fifteen digits, for people as many as it needs.
 char* Format_Cell_Fully(char* target, const Column& column, double value);
 
-/// What level `level` (from 1) of a Factor prints as: its label, its level value as a cell of that value
-/// would, or its number. Valid until `target` (of `Number_Text_Room`) changes.
+/// What a level value prints as: its Factor's decimals say how, or it keeps all digits that tell it from
+/// others.
+char* Format_Level_Value(char* target, const Column& factor, double value);
+
+/// What level `level` (from 1) of a Factor prints as: its label, its level value or its number. Valid until
+/// `target` (of `Number_Text_Room`) changes.
 [[nodiscard]] std::string_view Factor_Label_Or_Level(const Column& column, std::int32_t level, char* target);
 
 }  // namespace ingester

@@ -43,7 +43,7 @@ Meaning Meaning_Of_Label(std::string_view label)
 Meaning Meaning_Of_Value(const Column& factor, double value, Text_Arena& room)
 {
     char text[Number_Text_Room];
-    const std::string_view said = Printed(room, text, Format_Cell_Fully(text, factor, value));
+    const std::string_view said = Printed(room, text, Format_Level_Value(text, factor, value));
     return {said, Printed(room, text, Print_Shortest(text, value)), value};
 }
 
