@@ -488,7 +488,8 @@ int Run_Command(const Command_Options& options)
     Tell_Answer(conversion, answer);
     if (answer.Is_Good())
         Hand_Over_Column_List(conversion);
-    if (conversion.To_Standard_Output() && answer.Is_Good() && !sheet_viewer
+    const bool written = answer.status == INGESTER_SUCCESS || File_Exists(conversion.output.request);
+    if (conversion.To_Standard_Output() && answer.Is_Good() && written && !sheet_viewer
         && !Copy_To_Standard_Output(conversion.output.request)) {
         Say(conversion.output.native, "could not be written to its end");
         return INGESTER_OUTPUT_FAILED;

@@ -134,11 +134,24 @@ Json Json_Of(const Column_Facts& facts)
     return column;
 }
 
+/// Words of a name are joined in a key.
+std::string Json_Key(std::string name)
+{
+    std::ranges::replace(name, ' ', '_');
+    return name;
+}
+
+Json Json_Fact(const std::string& value)
+{
+    const bool number = !value.empty() && value.find_first_not_of("0123456789") == std::string::npos;
+    return number ? Json::parse(value) : Json(In_Utf8(value));
+}
+
 bool Print_Info_As_Json(const Viewed_Sheet& viewed, const std::string& file)
 {
     Json info = {{"file", file}, {"format", viewed.format.name}, {"packed", viewed.packed}};
     for (const auto& [name, value] : request.input_facts)
-        info[name] = In_Utf8(value);
+        info[Json_Key(name)] = Json_Fact(value);
     if (!viewed.all_sheets.empty())
         for (const std::string& name : viewed.all_sheets)
             info["sheets"].push_back(In_Utf8(name));

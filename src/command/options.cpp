@@ -214,6 +214,13 @@ void Offer_Output(CLI::App& app, Command_Options& options)
     Offer_Named_Options(app, "Options of the output", output_tables, options.named_output_options);
 }
 
+std::string Check_Row_Count(const std::string& text)
+{
+    constexpr std::size_t most_digits = 9;
+    const bool number = !text.empty() && text.find_first_not_of("0123456789") == std::string::npos;
+    return number && text.size() <= most_digits ? "" : "give a number of rows, as 20";
+}
+
 /// Options that only one task has.
 void Offer_Own_Options(CLI::App& app, Command_Options& options)
 {
@@ -224,7 +231,7 @@ void Offer_Own_Options(CLI::App& app, Command_Options& options)
     if (options.task == Task::head)
         app.add_option("-n,--lines", options.rows, "Rows to show, 10 without this option")
             ->type_name("N")
-            ->check(CLI::NonNegativeNumber);
+            ->check(Check_Row_Count);
 }
 
 /// What a task that writes nothing asks of the library. A table is looked at with all that the file holds.
@@ -275,6 +282,28 @@ void Offer_Options(CLI::App& app, Command_Options& options)
     Offer_Own_Options(app, options);
 }
 
+namespace {
+
+/// The words of a command line, backwards as their parser takes them. The value of --names may be a word of
+/// its own, though the option needs none.
+std::vector<std::string> Words_To_Parse(int argc, const char* const* argv)
+{
+    constexpr std::string_view with_value = "--names";
+    std::vector<std::string> words;
+    for (int i = 1; i < argc; ++i) {
+        const std::string_view word = argv[i];
+        const bool count = !word.empty() && word.find_first_not_of("0123456789") == std::string_view::npos;
+        if (!words.empty() && words.back() == with_value && (count || word == "none"))
+            words.back().append("=").append(word);
+        else
+            words.emplace_back(word);
+    }
+    std::ranges::reverse(words);
+    return words;
+}
+
+}  // namespace
+
 std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command_Options& options)
 {
     const Task_Name& task = Name_Of(options.task);
@@ -282,7 +311,7 @@ std::optional<int> Parse_Command_Line(int argc, const char* const* argv, Command
                  std::string("ingester").append(task.name.empty() ? "" : " ").append(task.name)};
     Offer_Options(app, options);
     try {
-        app.parse(argc, argv);
+        app.parse(Words_To_Parse(argc, argv));
     } catch (const CLI::ParseError& end) {
         return End_Parsing(app, end);
     }

@@ -2,11 +2,11 @@
 
 #include "interface/option_values.h"
 #include "request/request.h"
-
 #include "support/text.h"
 
 #include <algorithm>
 #include <array>
+#include <optional>
 
 namespace ingester {
 
@@ -52,35 +52,49 @@ constexpr Named_Sign Named_Signs[] = {
     {"point", '.'}, {"none", '\0'},     {"double", '"'}, {"single", '\''},
 };
 
-/// The sign that a value means; its first character where it names none.
-char Sign_Of(std::string_view value)
+bool Is_Word_Character(char c)
 {
-    const auto named =
-        std::ranges::find_if(Named_Signs, [&](const Named_Sign& sign) { return sign.name == value; });
-    return named != std::end(Named_Signs) ? named->sign : value.empty() ? '\0' : value.front();
+    return Is_Letter(c) || Is_Digit(c);
 }
 
+/// The sign that a value means, by its name or by itself; a letter or a digit is none.
+std::optional<char> Sign_Of(std::string_view value)
+{
+    const auto named = std::ranges::find(Named_Signs, value, &Named_Sign::name);
+    if (named != std::end(Named_Signs))
+        return named->sign;
+    const bool sign = value.size() == 1 && !Is_Word_Character(value.front());
+    return sign ? std::optional(value.front()) : std::nullopt;
+}
+
+/// One sign, or several of which each separates.
 Taken Take_Separator(std::string_view text, std::size_t at)
 {
     const Option_Value value = Value_At(text, at);
-    const bool named =
-        std::ranges::any_of(Named_Signs, [&](const Named_Sign& sign) { return sign.name == value.text; });
-    const char sign = Sign_Of(value.text);
-    request.Told_Separators = named ? std::string_view(&sign, 1) : value.text;
+    const std::optional<char> sign = Sign_Of(value.text);
+    if (!sign && (value.text.empty() || std::ranges::any_of(value.text, Is_Word_Character)))
+        return at;
+    request.Told_Separators = sign ? std::string_view(&*sign, 1) : value.text;
     return value.end;
 }
 
 Taken Take_Quote(std::string_view text, std::size_t at)
 {
     const Option_Value value = Value_At(text, at);
-    request.Told_Quote = Sign_Of(value.text);
+    const std::optional<char> sign = Sign_Of(value.text);
+    if (!sign)
+        return at;
+    request.Told_Quote = sign;
     return value.end;
 }
 
 Taken Take_Decimal(std::string_view text, std::size_t at)
 {
     const Option_Value value = Value_At(text, at);
-    request.Told_Decimal = Sign_Of(value.text);
+    const std::optional<char> sign = Sign_Of(value.text);
+    if (sign != '.' && sign != ',')
+        return at;
+    request.Told_Decimal = *sign;
     return value.end;
 }
 
@@ -108,10 +122,10 @@ Taken Take_Names_Lines(std::string_view text, std::size_t at)
     return value.end;
 }
 
-template <auto Member> Taken Take_Count(std::string_view text, std::size_t at)
+template <auto Member, long Least> Taken Take_Count(std::string_view text, std::size_t at)
 {
     const Option_Value value = Up_To(text, at, Option_Start);
-    if (!Is_Count(value.text))
+    if (!Is_Count(value.text) || Leading_Integer(value.text) < Least)
         return at;
     request.*Member = static_cast<std::int32_t>(std::clamp(Leading_Integer(value.text), 0L, 2147483647L));
     return value.end;
@@ -155,9 +169,9 @@ constexpr Slash_Option Others[] = {
     {"/+quote=", Take_Quote, "around texts: a sign, or double, single, none", Quoted("quote", "SIGN")},
     {"/+decimal=", Take_Decimal, "decimal mark of a text: point or comma", Quoted("decimal", "SIGN")},
     {"/+header", Take_Names_Lines, "there are names, in one line or several", Optional("names", "N|none")},
-    {"/+skip=", Take_Count<&R::Told_Skipped_Lines>, "lines at the head of a text that are passed over",
+    {"/+skip=", Take_Count<&R::Told_Skipped_Lines, 0>, "lines at the head of a text that are passed over",
      Bare("skip-lines", "N")},
-    {"/+table=", Take_Count<&R::Told_Table>, "which of the tables of a text, behind empty lines",
+    {"/+table=", Take_Count<&R::Told_Table, 1>, "which of the tables of a text, behind empty lines",
      Bare("table", "N")},
     {"/+missing=", Take_Missing_Words, "words that mean missing", Quoted("missing", "A,B")},
     {"/+secondary=",
