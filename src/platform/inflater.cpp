@@ -41,18 +41,18 @@ bool Inflater::Fill(Input_File& file, std::int64_t end)
 
 std::size_t Inflater::Read(Input_File& file, std::int64_t end, void* target, std::size_t count)
 {
-    if (stopped_ || !Start())
+    if (damaged_ || !Start())
         return 0;
     stream_->next_out = static_cast<Bytef*>(target);
     stream_->avail_out = static_cast<uInt>(count);
-    while (stream_->avail_out > 0 && !stopped_) {
+    while (stream_->avail_out > 0 && !damaged_) {
         if (stream_->avail_in == 0 && !Fill(file, end))
             break;
         const int result = inflate(stream_.get(), Z_NO_FLUSH);
         if (result == Z_STREAM_END)
-            stopped_ = inflateReset(stream_.get()) != Z_OK;
+            damaged_ = inflateReset(stream_.get()) != Z_OK;
         else
-            stopped_ = result != Z_OK && result != Z_BUF_ERROR;
+            damaged_ = result != Z_OK && result != Z_BUF_ERROR;
     }
     return count - stream_->avail_out;
 }

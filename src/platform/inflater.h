@@ -17,6 +17,9 @@ public:
     /// where a stream is damaged.
     [[nodiscard]] std::size_t Read(Input_File& file, std::int64_t end, void* target, std::size_t count);
 
+    /// Whether a stream could not be inflated; what it held in front of the damage has been read.
+    [[nodiscard]] bool Is_Damaged() const { return damaged_; }
+
 private:
     struct End_Stream {
         void operator()(z_stream_s* stream) const;
@@ -26,7 +29,7 @@ private:
 
     std::unique_ptr<unsigned char[]> packed_;
     std::unique_ptr<z_stream_s, End_Stream> stream_;
-    bool stopped_ = false;
+    bool damaged_ = false;
 };
 
 }  // namespace ingester

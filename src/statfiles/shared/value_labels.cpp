@@ -10,7 +10,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <numeric>
-#include <optional>
+#include <span>
 
 namespace ingester {
 
@@ -108,7 +108,7 @@ private:
 struct Labelling {
     Column& column;
     const Label_Set& set;
-    const Label_Terms& terms;
+    Label_Terms& terms;
     std::vector<const char*> labels = {};  ///< of the levels, in the column's arena
     std::vector<bool> used = std::vector<bool>(set.labels.size());
 
@@ -131,6 +131,9 @@ struct Labelling {
         labels.push_back(Stored_Label(entry));
         used[entry] = true;
     }
+
+    /// Whether one more label that no cell has may be taken.
+    [[nodiscard]] bool May_Take_Unused() { return terms.unused_left-- > 0; }
 };
 
 /// The values of the set as the cells hold them.
@@ -199,15 +202,32 @@ void Label_Texts(Labelling& work)
 }
 
 /// Level values of the levels that there are, and of those to come.
-bool Lengthen_Values(Labelling& work, const std::vector<double>& values)
+bool Lengthen_Values(Labelling& work, const std::vector<double>& values,
+                     const std::vector<std::size_t>& unused)
 {
     std::vector<double> all = Level_Table(work.column);
     for (auto level = static_cast<std::int32_t>(all.size()); level < work.column.nlevels; ++level)
         all.push_back(level + 1);
-    for (std::size_t entry = 0; entry < values.size(); ++entry)
-        if (!work.used[entry])
-            all.push_back(values[entry]);
+    for (const std::size_t entry : unused)
+        all.push_back(values[entry]);
     return Put_Level_Values(work.column, all);
+}
+
+/// The labels that no level has yet, as far as they may be taken.
+std::vector<std::size_t> Unused_Labels(Labelling& work)
+{
+    std::vector<std::size_t> unused;
+    for (std::size_t entry = 0; entry < work.used.size(); ++entry) {
+        if (work.used[entry])
+            continue;
+        if (!work.May_Take_Unused()) {
+            Note_Loss(Loss_Kind::label_dropped, work.column.name, 0,
+                      "labels that no cell has, beyond a limit");
+            break;
+        }
+        unused.push_back(entry);
+    }
+    return unused;
 }
 
 /// Adds the labels that no level has; of numbers with their `values`.
@@ -215,11 +235,11 @@ bool Add_Unused(Labelling& work, const std::vector<double>* values)
 {
     if (!work.terms.add_unused || std::ranges::find(work.used, false) == work.used.end())
         return true;
-    if (values != nullptr && !Lengthen_Values(work, *values))
+    const std::vector<std::size_t> unused = Unused_Labels(work);
+    if (values != nullptr && !Lengthen_Values(work, *values, unused))
         return false;
-    for (std::size_t entry = 0; entry < work.used.size(); ++entry)
-        if (!work.used[entry])
-            work.Take(entry);
+    for (const std::size_t entry : unused)
+        work.Take(entry);
     work.column.nlevels = static_cast<std::int32_t>(work.labels.size());
     return true;
 }
@@ -244,10 +264,11 @@ bool Put_Label_List(Labelling& work)
 
 bool Label_Whole_Set(Labelling& work, const std::vector<double>& values)
 {
-    work.column.nlevels = static_cast<std::int32_t>(values.size());
-    for (std::size_t entry = 0; entry < values.size(); ++entry)
+    const std::vector<std::size_t> all = Unused_Labels(work);
+    work.column.nlevels = std::max(static_cast<std::int32_t>(all.size()), 1);
+    for (const std::size_t entry : all)
         work.Take(entry);
-    return Put_Level_Values(work.column, values);
+    return Put_Level_Values(work.column, std::span(values).first(all.size()));
 }
 
 bool Label_Variate(Labelling& work)
@@ -273,7 +294,7 @@ bool Label_Text(Labelling& work)
 
 }  // namespace
 
-void Apply_Value_Labels(Column& column, const Label_Set& set, const Label_Terms& terms)
+void Apply_Value_Labels(Column& column, const Label_Set& set, Label_Terms& terms)
 {
     if (set.labels.empty())
         return;

@@ -7,6 +7,7 @@
 #include "support/arena.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -40,10 +41,14 @@ struct Label_Terms {
     bool add_unused = false;    ///< labels that no cell has become levels as well
     std::size_t width = Value_Label_Width;
     Text_Crossing* crossing = nullptr;  ///< into the request's code
+    /// Labels of no cell that all columns may still have together: a set of many may be that of many
+    /// variables.
+    std::int64_t unused_left = 500'000;
 };
 
 /// Makes a Factor of a Variate or a Text column, whose levels take the labels of their values. A column of
-/// too many distinct values stays what it is, after a message.
-void Apply_Value_Labels(Column& column, const Label_Set& set, const Label_Terms& terms);
+/// too many distinct values stays what it is, after a message. Labels beyond `unused_left` are entered in the
+/// ledger.
+void Apply_Value_Labels(Column& column, const Label_Set& set, Label_Terms& terms);
 
 }  // namespace ingester

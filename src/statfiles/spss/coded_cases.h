@@ -27,6 +27,9 @@ public:
         return buffer_.data() + at_ - eight;
     }
 
+    /// Whether packed blocks ended where they could not be unpacked.
+    [[nodiscard]] bool Is_Damaged() const { return inflater_.Is_Damaged(); }
+
 private:
     static constexpr std::size_t eight = 8;
     [[nodiscard]] bool Fill();

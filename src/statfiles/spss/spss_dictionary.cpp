@@ -36,7 +36,7 @@ constexpr Spss_Date_Format Date_Formats[] = {
     {39, year_month_day_format},        // SDATE
 };
 
-/// For people durations aren't shifted, and those of days are shown in hours.
+/// For people durations aren't shifted, and are shown in hours of all their days.
 bool Is_Plain_Duration(const Spss_Date_Format& date)
 {
     return date.is_duration && For_People(People_Rule::calendar_dates);
@@ -52,8 +52,7 @@ void Show_As_Date(Column& column, const Spss_Date_Format& date)
 {
     column.format = date_format_mark;
     column.date_form = 1;
-    const bool in_hours = date.display == date_time_format && Is_Plain_Duration(date);
-    column.date_format = in_hours ? total_hours_format : date.display;
+    column.date_format = Is_Plain_Duration(date) ? total_hours_format : date.display;
 }
 
 /// How many of the variables become Columns.

@@ -27,6 +27,9 @@ struct Spss_Format {
     }
 };
 
+/// Missing values of a variable that act; files may list more.
+constexpr std::size_t Most_Missing_Values = 3;
+
 /// Texts are in the file's code.
 struct Spss_Variable {
     std::string name = {};       ///< the short one, without blanks at its end

@@ -167,7 +167,7 @@ bool Take_Missing_Texts(Extension_Bytes& bytes, Spss_Dictionary& dictionary, con
         std::string_view text;
         if (!bytes.Take_Text(width, text))
             return false;
-        if (variable != nullptr)
+        if (variable != nullptr && variable->missing_texts.size() < Most_Missing_Values)
             variable->missing_texts.emplace_back(text);
     }
     return true;

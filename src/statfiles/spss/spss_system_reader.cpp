@@ -3,6 +3,7 @@
 
 #include "request/messages.h"
 #include "request/people_rules.h"
+#include "request/request.h"
 #include "statfiles/spss/coded_cases.h"
 #include "statfiles/spss/spss.h"
 #include "support/progress.h"
@@ -102,6 +103,13 @@ bool Read_Packed_Head(Spss_System_Reading& reading, std::int64_t& end)
     return reading.source.Read(head_place, end, tail_length) && end >= reading.source.Position();
 }
 
+/// What follows a damaged block can't be unpacked.
+void Tell_Damage(const Case_Bytes& bytes)
+{
+    if (bytes.Is_Damaged())
+        request.losses.Note_Unread("cases behind a damaged block");
+}
+
 bool Read_Coded_Cases(Spss_System_Reading& reading, Row_Filler& filler)
 {
     Input_File& file = reading.source.File();
@@ -113,7 +121,16 @@ bool Read_Coded_Cases(Spss_System_Reading& reading, Row_Filler& filler)
                            left / static_cast<std::int64_t>(filler.Row_Size() / Slot_Size)));
     Case_Bytes bytes(file, packed_end);
     Case_Decoder decoder(bytes, reading.head.bias, reading.source.order);
-    return Decode_Cases(decoder, filler, Claimed_Cases(reading.head), file);
+    const bool read = Decode_Cases(decoder, filler, Claimed_Cases(reading.head), file);
+    Tell_Damage(bytes);
+    return read;
+}
+
+/// A file that was cut short holds fewer cases than its head says.
+void Tell_Lacking_Cases(const Spss_Head& head, std::int64_t rows)
+{
+    if (head.cases > rows)
+        request.losses.Note_Unread("cases that its head counts and it doesn't hold", head.cases - rows);
 }
 
 bool Read_Cases(Spss_System_Reading& reading)
@@ -127,6 +144,7 @@ bool Read_Cases(Spss_System_Reading& reading)
     const bool read = plain ? Read_Plain_Cases(reading, filler) : Read_Coded_Cases(reading, filler);
     if (!read || !filler.Finish())
         return false;
+    Tell_Lacking_Cases(reading.head, filler.Rows());
     filler.Held().Report(Greater_Numbers_Were_Set);
     return true;
 }
