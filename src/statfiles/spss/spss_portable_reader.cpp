@@ -321,12 +321,13 @@ bool Read_Cases(Portable_Reading& reading, Row_Filler& filler)
     while (filler.Rows() < Most_Cases) {
         const bool kept = filler.Keeps_Next_Row();
         if (!Read_Case(reading, filler, kept))
-            break;
+            return reading.source.Ended() || Cannot_Read();
         if (!filler.End_Row(kept))
             return Cannot_Read();
         if (filler.Rows() % told_step == 0)
             Show_Progress("Reading", reading.file.Position(), reading.file.Size());
     }
+    request.losses.Note_Unread("cases beyond the greatest number");
     return true;
 }
 

@@ -229,6 +229,7 @@ TEST_F(Spss_Portable, What_Is_Refused)
         {"no data", File(x), "", {}, "SPSS Portable file contains no data records.\n"},
         {"a text without end", File(x + "CTTTTTT/abc"), "", {}, cannot},
         {"a text below 0", File(x + "C-1/"), "", {}, cannot},
+        {"a fault in a number", File(x + "F1/2?/3/Z"), "", {}, cannot},
         {"half a case", File(Begin(2) + Variable(0, "X") + Variable(0, "Y") + "F1/2/3/"), "X V1; Y V2"},
         {"columns beyond", File(Begin(2) + Variable(0, "X") + Variable(0, "Y") + "F1/2/3/4/"), "X V1|3",
          [] { request.Max_Columns = 1; }, "Warning Columns above 1 NOT transfered.\n"},
