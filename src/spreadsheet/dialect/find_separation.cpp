@@ -53,9 +53,15 @@ bool Is_Number(const Sample_Field& field)
 /// What speaks for a way of cutting.
 struct Score {
     double value = 0;
-    double steadiness = 0;       ///< how many rows have the usual number of fields, 0 to 1
-    bool holds_numbers = false;  ///< a column is mostly numbers
-    std::int32_t columns = 0;
+    double share = 0;          ///< of the rows that have the usual number of fields
+    double steadiness = 0;     ///< the same, and half of those with a field more or less
+    double odd = 0;            ///< fields with a stray quote, for each row
+    std::int32_t columns = 0;  ///< as most rows have
+    std::int32_t first = 0;    ///< as the first row has
+    std::int32_t numbers = 0;  ///< columns that are mostly numbers
+    bool last_is_number = false;
+    bool spaced = true;  ///< a blank stands behind each separator, as in prose
+    bool even_block = false;
 };
 
 std::vector<Sample_Row> Without_Comments(const std::vector<Sample_Row>& rows)
@@ -63,6 +69,31 @@ std::vector<Sample_Row> Without_Comments(const std::vector<Sample_Row>& rows)
     std::vector<Sample_Row> kept;
     std::ranges::copy_if(rows, std::back_inserter(kept), [](const Sample_Row& row) { return !row.comment; });
     return kept.empty() ? rows : kept;
+}
+
+/// Whether lines between empty ones are all cut alike, or at least three at their end are.
+bool Has_Even_Block(std::span<const Sample_Row> rows)
+{
+    constexpr std::ptrdiff_t surely_even = 3;
+    const auto is_empty = [](const Sample_Row& row) { return row.empty; };
+    for (auto first = rows.begin(); first != rows.end();) {
+        first = std::find_if_not(first, rows.end(), is_empty);
+        const auto last = std::find_if(first, rows.end(), is_empty);
+        std::ptrdiff_t alike = 0;
+        while (alike < last - first && last[-1 - alike].count == last[-1].count)
+            ++alike;
+        if (alike > 1 && last[-1].count > 1 && (alike == last - first || alike >= surely_even))
+            return true;
+        first = last;
+    }
+    return false;
+}
+
+bool Is_Spaced(std::span<const Sample_Field> fields)
+{
+    return std::ranges::all_of(fields.subspan(1), [](const Sample_Field& field) {
+        return !field.quoted && !field.text.empty() && field.text.data()[-1] == ' ';
+    });
 }
 
 Score Score_Of(const Text_Sample& sample, const Text_Dialect& dialect)
@@ -75,39 +106,89 @@ Score Score_Of(const Text_Sample& sample, const Text_Dialect& dialect)
     if (usual.all == 0)
         return score;
     score.columns = usual.count;
+    score.first = std::ranges::find_if(rows, [](const Sample_Row& row) { return !row.empty; })->count;
+    score.even_block = usual.count > 1 || Has_Even_Block(rows);
+    const auto all = static_cast<double>(usual.all);
     const auto near = usual.count > 2 ? static_cast<double>(usual.near_rows) / 2.0 : 0.0;
-    score.steadiness = (static_cast<double>(usual.rows) + near) / static_cast<double>(usual.all);
+    score.share = static_cast<double>(usual.rows) / all;
+    score.steadiness = score.share + near / all;
     double sound = 0;
-    std::int64_t fields = 0;
+    std::int64_t odd = 0;
     std::vector<std::int64_t> numbers(static_cast<std::size_t>(usual.count));
     for (const Sample_Row& row : rows) {
-        if (row.empty || row.count != usual.count)
+        if (row.empty)
             continue;
-        std::size_t place = 0;
-        for (const Sample_Field& field : cut.Fields(row)) {
-            sound += Soundness(field);
-            ++fields;
-            if (dialect.runs)
-                numbers[place] += Is_Number(field) ? 1 : 0;
-            ++place;
+        const auto fields = cut.Fields(row);
+        score.spaced = score.spaced && Is_Spaced(fields);
+        if (row.count != usual.count)
+            continue;
+        for (std::size_t place = 0; place < fields.size(); ++place) {
+            sound += Soundness(fields[place]);
+            odd += fields[place].odd ? 1 : 0;
+            if (dialect.runs || score.first == 1)
+                numbers[place] += Is_Number(fields[place]) ? 1 : 0;
         }
     }
-    score.holds_numbers = std::ranges::any_of(
-        numbers, [&](std::int64_t count) { return count * 5 >= usual.rows * 4 - 5 && count > 0; });
+    const auto is_number = [&](std::int64_t count) { return count * 5 >= usual.rows * 4 - 5 && count > 0; };
+    score.numbers = static_cast<std::int32_t>(std::ranges::count_if(numbers, is_number));
+    score.last_is_number = is_number(numbers.back());
     const double width = usual.count > 1 ? 1.0 - 1.0 / usual.count : single_column;
-    score.value = score.steadiness * width * sound / static_cast<double>(fields);
+    score.odd = static_cast<double>(odd) / static_cast<double>(usual.rows);
+    score.value = score.steadiness * width * sound / static_cast<double>(usual.rows * usual.count);
     return score;
 }
 
-/// Words of a text have blanks between them, too: blanks separate only where all else agrees.
-bool May_Separate(const Tried_Separator& tried, const Score& score, std::string_view name)
+/// Below a name of its own every line is a number with a decimal comma.
+bool Are_Decimals_Below_A_Name(const Text_Sample& sample)
+{
+    Text_Dialect whole;
+    whole.separator = No_Separator;
+    const Sample_Rows cut(sample, whole);
+    bool name = true;
+    for (const Sample_Row& row : cut.Rows()) {
+        const std::string_view text = cut.Fields(row)[0].text;
+        Field_Number number;
+        if (row.empty || row.comment)
+            continue;
+        if (Read_Number(text, {',', '\0'}, number) == name || (!name && cut.Fields(row)[0].quoted))
+            return false;
+        name = false;
+    }
+    return !name;
+}
+
+/// Whether the sign stands in the texts of a single column: some of its lines have it and others don't, or it
+/// is the comma of prose or of numbers below a name that has none.
+bool Stands_In_Texts(const Tried_Separator& tried, const Score& score, const Text_Sample& sample)
+{
+    if (score.columns == 1)
+        return !score.even_block && (score.first == 1 || score.spaced);
+    if (score.first > 1)
+        return false;
+    return (score.spaced && score.numbers == 0)
+           || (tried.separator == ',' && score.columns == 2 && Are_Decimals_Below_A_Name(sample));
+}
+
+/// Words of a text have blanks between them, too: blanks separate only where all else agrees, and no plainer
+/// sign, which cuts `plainer` of the rows alike, does as well.
+bool May_Blanks_Separate(const Score& score, double plainer, std::string_view name)
 {
     constexpr double steady = 0.8;
-    if (!tried.runs)
-        return true;
-    const bool other = Ends_With_One_Of(name, ".csv .tsv .tab .psv");
-    return score.steadiness >= steady && score.columns > 1
-           && (score.holds_numbers || (!other && score.steadiness >= 1.0));
+    const bool comma_file = Ends_With_One_Of(name, ".csv .tsv .tab .psv");
+    if (score.columns < 2 || score.steadiness < steady || score.share <= plainer)
+        return false;
+    const bool lone_name = score.first == 1;
+    if (lone_name
+        && (comma_file || score.numbers * 2 < score.columns || (score.columns == 2 && !score.last_is_number)))
+        return false;
+    return score.numbers > 0 || (!comma_file && score.steadiness >= 1.0);
+}
+
+/// The share of rows that a sign other than a blank cuts alike, as far as its fields look like such.
+double Share_Of_Plainer(const Score& score)
+{
+    constexpr double few = 0.25;
+    return score.columns > 1 && score.odd < few ? score.share : 0.0;
 }
 
 /// Whether a quote behind a backslash goes on inside its text.
@@ -168,6 +249,7 @@ Text_Dialect Find_Separation(const Text_Sample& sample, const Told_Dialect& told
         separators = {Told_Separator(sample, told.separators)};
     Text_Dialect best;
     double best_value = -1;
+    double plainer = 0;
     for (Text_Dialect dialect : Quotings(sample, told))
         for (const Tried_Separator& tried : separators) {
             dialect.separator = tried.separator;
@@ -175,8 +257,12 @@ Text_Dialect Find_Separation(const Text_Sample& sample, const Told_Dialect& told
             if (!sample.Holds({&tried.separator, 1}) && separators.size() > 1)
                 continue;
             const Score score = Score_Of(sample, dialect);
-            if (separators.size() > 1 && !May_Separate(tried, score, told.file_name))
+            const bool may = tried.runs ? May_Blanks_Separate(score, plainer, told.file_name)
+                                        : !Stands_In_Texts(tried, score, sample);
+            if (separators.size() > 1 && !may)
                 continue;
+            if (!tried.runs)
+                plainer = std::max(plainer, Share_Of_Plainer(score));
             const double value =
                 Ends_With_One_Of(told.file_name, tried.endings) ? score.value * Ending_Tells : score.value;
             if (value > best_value * Clearly_Better) {
@@ -186,8 +272,8 @@ Text_Dialect Find_Separation(const Text_Sample& sample, const Told_Dialect& told
         }
     if (best_value < 0) {  // one column
         best = Quotings(sample, told).front();
-        best.separator = separators.front().separator;
-        best.runs = separators.front().runs;
+        best.separator = separators.size() > 1 ? No_Separator : separators.front().separator;
+        best.runs = separators.size() == 1 && separators.front().runs;
     }
     return best;
 }

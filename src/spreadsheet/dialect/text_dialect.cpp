@@ -159,6 +159,8 @@ std::string Words_Of_Sign(char sign)
         return "blank";
     case '|':
         return "bar";
+    case No_Separator:
+        return "none";
     case '.':
         return "point";
     case '"':

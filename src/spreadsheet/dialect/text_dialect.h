@@ -11,6 +11,9 @@
 
 namespace ingester {
 
+/// The separator of a single column, whose texts may hold any sign: it ends fields where lines end.
+constexpr char No_Separator = '\n';
+
 /// The dialect of a text table. Lines count from 1, as the file has them.
 struct Text_Dialect {
     Text_Code code = nullptr;         ///< of its letters, in the file

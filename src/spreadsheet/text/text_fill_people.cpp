@@ -155,10 +155,12 @@ void Exchange(char* first, const char* last, char from, const Text_Dialect& dial
 }  // namespace
 
 /// A line that is one field by the text's separator, and has the right number of them by another, is taken by
-/// that one.
+/// that one. In narrow tables, and by blanks, too many texts would be cut that only hold such a sign.
 bool Sheet_Filler::Rewrite_Line(const Text_Field& field)
 {
-    if (dialect_ == nullptr || columns_.size() < 2 || dialect_->runs || field.first == field.last)
+    constexpr std::size_t fewest_columns = 3;
+    if (dialect_ == nullptr || columns_.size() < fewest_columns || dialect_->runs || field.first == field.last
+        || !request.Told_Separators.empty() || !request.Custom_Separators.empty())
         return false;
     const std::string_view line(field.first, static_cast<std::size_t>(field.last - field.first));
     if (line.size() > Greatest_Line || line.find_first_of("\r\n") != std::string_view::npos)
@@ -166,15 +168,16 @@ bool Sheet_Filler::Rewrite_Line(const Text_Field& field)
     const auto named =
         std::ranges::find_if(columns_.rbegin(), columns_.rend(),
                              [](const Column_Filling& state) { return !state.column->input_name.empty(); });
+    const auto wanted = static_cast<std::int32_t>(columns_.rend() - named);
     const std::int32_t right_counts[] = {static_cast<std::int32_t>(columns_.size()),
-                                         static_cast<std::int32_t>(columns_.rend() - named)};
-    for (const char separator : {',', ';', '\t', '|', ' '}) {
+                                         std::max(wanted, static_cast<std::int32_t>(fewest_columns))};
+    for (const char separator : {',', ';', '\t', '|'}) {
         Text_Dialect other = *dialect_;
         other.separator = separator;
-        other.runs = separator == ' ';
         if (line.find(separator) == std::string_view::npos
-            || std::ranges::count(right_counts, std::max(Count_Fields(line, other), 2)) == 0)
+            || std::ranges::count(right_counts, Count_Fields(line, other)) == 0)
             continue;
+        Note_Loss(Loss_Kind::input_unread, {}, row_ + 1, "separators of a line that no other line has");
         char* const first = buffer_.first + (field.first - buffer_.first);
         Exchange(first, first + line.size(), separator, *dialect_);
         edited_ = true;

@@ -66,6 +66,75 @@ TEST_F(Dialect_Test, Tables_Are_Cut_As_They_Were_Meant)
     EXPECT_EQ(Read("", "x.csv"), nullptr);
 }
 
+std::string Times(int times, std::string_view head, std::string_view line)
+{
+    std::string text(head);
+    for (int i = 0; i < times; ++i)
+        text += line;
+    return text;
+}
+
+TEST_F(Dialect_Test, Blanks_Yield_To_Plainer_Signs)
+{
+    const char* const towns = "n V1|2; city TNew York|Los Angeles";
+    for (const char* const name : {"x.csv", "x.tsv", "x.tab", "x.txt"}) {
+        EXPECT_EQ(Render(Read("n\tcity\n1\tNew York\n2\tLos Angeles\n", name)), towns) << name;
+        EXPECT_EQ(Render(Read("n,city\n1,New York\n2,Los Angeles\n", name)), towns) << name;
+        for (const std::string& text :
+             {Times(30, "id,desc\n", "0,5 mm long bolt\n"), Times(30, "address,n\n", "12 Old Main St,7\n"),
+              Times(30, "address;n\n", "12 Old Main St;7\n")}) {
+            const Sheet* const sheet = Read(text, name);
+            EXPECT_TRUE(sheet->column_count == 2 && sheet->row_count == 30) << name << "\n" << text;
+        }
+    }
+    EXPECT_EQ(Render(Read("\"Smith, John\" 5\n\"Doe, Jane\" 6\n", "x.txt")),
+              "C1 TSmith, John|Doe, Jane; C2 V5|6");
+}
+
+TEST_F(Dialect_Test, Signs_In_A_Single_Column_Are_Letters)
+{
+    const struct {
+        std::string_view text, sheet;
+    } cases[] = {
+        {"name\na;b\nx\nfoo\n", "name Ta;b|x|foo"},
+        {"name\nx y\nfoo\na;b\nbar\n", "name Tx y|foo|a;b|bar"},
+        {"comment\nHello, world\nfine\nok then\n", "comment THello, world|fine|ok then"},
+        {"comment\nHello, world\nBye, now\nok then\n", "comment THello, world|Bye, now|ok then"},
+        {"x\n1,5\n2,5\n3,75\n", "x V1.5|2.5|3.75"},
+        {"size\n5 mm\n7 mm\n9 mm\n8 mm\n12 mm\n", "size T5 mm|7 mm|9 mm|8 mm|12 mm"},
+        {"n\n\"a\nb, c\"\nNew York\n", "n Ta%b, c|New York"},
+        {"Report\nby me\n2024\n\na,b\n1,2\n", "a V1; b V2"},
+    };
+    for (const auto& [text, sheet] : cases)
+        for (const char* const name : {"x.csv", "x.txt"}) {
+            std::string read = Render(Read(text, name));
+            std::ranges::replace(read, '\n', '%');
+            EXPECT_EQ(read, sheet) << name;
+        }
+    const Sheet* const bolts = Read(Times(30, "desc\n", "bolt no. 3, grey\n"), "x.csv");
+    EXPECT_TRUE(bolts->column_count == 1 && bolts->row_count == 30);
+}
+
+TEST_F(Dialect_Test, Short_Lines_Keep_What_They_Have)
+{
+    const struct {
+        const char *text, *sheet;
+        std::size_t losses = 0;
+        Change change = {};
+    } cases[] = {
+        {"name;note\nA;x\nSmith, John\nB;y\n", "name TA|Smith, John|B; note Tx||y"},
+        {"name\tval\nNew York\t1\nLos Angeles\nX\t2\n", "name TNew York|Los Angeles|X; val V1|*|2"},
+        {"a,b,c\nx,y,z\none two three\nk,l,m\n", "a Tx|one two three|k; b Ty||l; c Tz||m"},
+        {"a,b,c\nx,y,z\nk;l;m\n", "a Tx|k; b Ty|l; c Tz|m", 1},
+        {"a,b,c\nx,y,z\nk;l\n", "a Tx|k;l; b Ty|; c Tz|"},
+        {"a,b,c\nx,y,z\nk;l;m\n", "a Tx|k;l;m; b Ty|; c Tz|", 0, [] { request.Told_Separators = ","; }},
+    };
+    for (const auto& tried : cases) {
+        EXPECT_EQ(Render(Read(tried.text, "x.csv", tried.change)), tried.sheet);
+        EXPECT_EQ(request.losses.Entries().size(), tried.losses) << tried.text;
+    }
+}
+
 TEST_F(Dialect_Test, Fields_Mean_What_People_Mean)
 {
     const struct {
