@@ -117,5 +117,35 @@ TEST_F(Dialect_Test, Numbers_Keep_Their_Spelling)
     }
 }
 
+/// Quoted texts of many lines reach over the ends of the parts that are looked at, and begin in front of
+/// them.
+TEST_F(Dialect_Test, Quotes_Hold_However_Long_Their_Texts_Are)
+{
+    const auto table = [](int rows, int lines) {
+        std::string text = "id,abstract,n\n";
+        for (int row = 1; row <= rows; ++row) {
+            text += std::to_string(row) + ",\"";
+            for (int line = 0; line < lines; ++line)
+                text += std::string(static_cast<std::size_t>(line * 7 % 40), 'l')
+                            .append(static_cast<std::size_t>(line % 3), ' ')
+                        + "and, so on\n";
+            text += "end\"," + std::to_string(row * 2) + "\n";
+        }
+        return text;
+    };
+    for (const auto& [rows, lines] : {std::pair(100, 60), std::pair(40, 400), std::pair(3, 5000)}) {
+        Sheet* const sheet = Read(table(rows, lines), "x.csv");
+        ASSERT_NE(sheet, nullptr);
+        EXPECT_EQ(sheet->row_count, rows);
+        EXPECT_EQ(sheet->column_count, 3);
+        EXPECT_EQ(Column_At(sheet, 3)->name, "n");
+        EXPECT_EQ(Column_At(sheet, 3)->type, variate_column);
+    }
+    EXPECT_EQ(Read("a,b\n1,\"" + std::string(300000, 'x') + "\n\"\n2,y\n", "x.csv"), nullptr);
+    EXPECT_EQ(Messages(), "Error: Line 2 has more than 262140 characters.\n:\n");
+    EXPECT_EQ(Render(Read("a,b\n1,\"x\n2,y\n", "x.csv")), "a V1|2; b T\"x|y");
+    EXPECT_EQ(Messages(), "Warning: 1 quotes that nothing closes were read as letters.\n:\n");
+}
+
 }  // namespace
 }  // namespace ingester
