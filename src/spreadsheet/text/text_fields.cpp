@@ -154,6 +154,20 @@ const char* Field_Walker::Behind_Quotes(const char* first)
     return first;
 }
 
+/// With as many fields as a row has a line is none, whatever it begins with.
+bool Field_Walker::Is_Comment() const
+{
+    const char mark = dialect_->late_comments ? '#' : dialect_->comment;
+    if (*at_ != mark || mark == '\0' || dialect_->columns < 2)
+        return false;
+    std::int32_t fields = 1;
+    for (const char* at = at_; *at != '\n' && *at != '\r'; ++at)
+        fields += ends_.Holds(*at) && !(dialect_->runs && at[1] == ' ') ? 1 : 0;
+    if (dialect_->late_comments)
+        return fields == 1;
+    return dialect_->runs ? fields != dialect_->columns : fields < dialect_->columns;
+}
+
 bool Field_Walker::Find_Row()
 {
     while (at_ < text_.last) {
@@ -163,7 +177,8 @@ bool Field_Walker::Find_Row()
         if (*end == '\n' || *end == '\r') {
             passed_empty_ = true;
             at_ = end + 1;
-        } else if (*at_ == dialect_->comment && dialect_->comment != '\0') {
+        } else if (Is_Comment()) {
+            ++comments_;
             at_ = std::find_first_of(at_, static_cast<const char*>(text_.last), Line_Ends.begin(),
                                      Line_Ends.end());
             at_ += at_ != text_.last ? 1 : 0;
