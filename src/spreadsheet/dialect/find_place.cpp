@@ -86,27 +86,38 @@ std::optional<Block> First_Table(const std::vector<Block>& blocks, const Sample_
     return std::nullopt;
 }
 
+/// At the head, too, a line is a row whose first field is the sign alone, or a number behind it.
+bool Is_Row_At_Head(std::span<const Sample_Field> fields, const Text_Dialect& dialect)
+{
+    const std::string_view first = fields.front().text;
+    if (static_cast<std::int32_t>(fields.size()) != dialect.columns)
+        return false;
+    return first.size() == 1 ? !dialect.runs : Sense_Of_Field(first.substr(1), {}) == Field_Sense::number;
+}
+
 /// Lines that begin with "#" or "%" are comments where the others don't, and where they don't have the
-/// fields of a row.
-char Comment_Mark(Rows rows, std::int32_t columns)
+/// fields of a row. Among rows of one field there are none.
+void Find_Comments(const Sample_Rows& rows, Text_Dialect& dialect)
 {
     std::int64_t marked = 0;
     std::int64_t rowlike = 0;
     std::int64_t others = 0;
-    bool at_head = true;
     char mark = '\0';
-    for (const Sample_Row& row : rows) {
+    for (const Sample_Row& row : rows.Rows()) {
         if (row.empty)
             continue;
         others += row.comment ? 0 : 1;
-        at_head = at_head && row.comment;
-        if (!row.comment)
+        const bool at_head = others == 0;
+        if (!row.comment || (!at_head && dialect.columns == 1))
             continue;
         ++marked;
         mark = mark == '\0' ? *row.first : mark;
-        rowlike += !at_head && row.count == columns && columns > 1 ? 1 : 0;
+        rowlike += at_head ? Is_Row_At_Head(rows.Fields(row), dialect) : row.count == dialect.columns;
     }
-    return marked > 0 && others > 0 && rowlike == 0 ? mark : '\0';
+    const bool sign_is_name =
+        dialect.columns > 1 || marked == 1;  // in one column it may also frame a comment
+    dialect.comment = marked > 0 && others > 0 && (rowlike == 0 || !sign_is_name) ? mark : '\0';
+    dialect.late_comments = marked == 0 && dialect.columns > 1 && !dialect.runs;
 }
 
 class Place_Finder {
@@ -194,20 +205,30 @@ private:
     const Text_Dialect& dialect_;
 };
 
-/// The comment in front of a row of data may name its columns.
+bool Is_All_Text(std::span<const Sample_Field> fields)
+{
+    return std::ranges::all_of(fields, [](const Sample_Field& field) {
+        return Sense_Of_Field(field.text, {}) == Field_Sense::text;
+    });
+}
+
+/// The comment in front of a row of data may name its columns; in front of texts only where its sign touches
+/// a word as long as names are, and no names follow.
 bool Names_In_Comment(const Sample_Rows& rows, std::size_t first, const Text_Dialect& dialect)
 {
     if (first == 0 || dialect.comment == '\0' || dialect.columns < 2)
         return false;
-    const Sample_Row& comment = rows.Rows()[first - 1];
-    if (*comment.first != dialect.comment || comment.count < dialect.columns)
+    const std::span<const Sample_Row> all(rows.Rows());
+    const Sample_Row& comment = all[first - 1];
+    if (*comment.first != dialect.comment || comment.count < dialect.columns
+        || comment.count > dialect.columns + (dialect.runs ? 1 : 0) || !Is_All_Text(rows.Fields(comment)))
         return false;
-    const auto is_text = [](const Sample_Field& field) {
-        return Sense_Of_Field(field.text, {}) == Field_Sense::text;
-    };
-    return std::ranges::all_of(rows.Fields(comment), is_text)
-           && !std::ranges::all_of(rows.Fields(rows.Rows()[first]), is_text)
-           && comment.count <= dialect.columns + (dialect.runs ? 1 : 0);
+    if (!Is_All_Text(rows.Fields(all[first])))
+        return true;
+    const bool touches = rows.Fields(comment)[0].text.find(' ') == std::string_view::npos && !dialect.runs;
+    return touches && std::ranges::all_of(all.subspan(first), [&](const Sample_Row& row) {
+               return row.empty || Is_All_Text(rows.Fields(row));
+           });
 }
 
 }  // namespace
@@ -220,7 +241,7 @@ Table_Place Find_Place(const Sample_Rows& rows, const Told_Dialect& told, Text_D
     Table_Place place{0, head.size(), all.size(), false};
     const std::optional<Block> table = First_Table(blocks, rows);
     dialect.columns = table ? table->usual.count : Find_Usual_Count(head).count;
-    dialect.comment = Comment_Mark(all, dialect.columns);
+    Find_Comments(rows, dialect);
     const Place_Finder finder(rows, dialect);
     if (blocks.empty())
         return place;

@@ -1,5 +1,7 @@
 #include "spreadsheet/dialect/sample_rows.h"
 
+#include "spreadsheet/dialect/quote_rules.h"
+
 #include <algorithm>
 #include <map>
 
@@ -34,7 +36,7 @@ Text_Sample Take_Sample(std::string_view text)
 {
     if (text.size() <= Whole_Size)
         return {{text}, true};
-    Text_Sample sample;
+    Text_Sample sample{{}, false, text.data() + text.size()};
     const std::size_t head = text.substr(0, Head_Size).find_last_of(Line_Ends);
     sample.pieces.push_back(text.substr(0, head == std::string_view::npos ? Whole_Size : head + 1));
     for (const std::size_t at : {text.size() / 2, text.size() - Other_Size}) {
@@ -60,6 +62,7 @@ bool Is_Line_End(char c)
 /// Cuts fields of one line.
 struct Field_Cutter {
     const char* last;
+    const char* reach;  ///< how far quotes are looked for
     char separator;
     bool runs;
     char quote;
@@ -68,50 +71,31 @@ struct Field_Cutter {
     [[nodiscard]] bool Separates(char c) const { return c == separator || (runs && c == '\t'); }
     [[nodiscard]] bool Is_Blank(char c) const { return (c == ' ' || c == '\t') && (runs || c != separator); }
     [[nodiscard]] bool Ends(const char* at) const { return at == last || Is_Line_End(*at) || Separates(*at); }
+    [[nodiscard]] const char* Close_Of(const char* open) const;
     [[nodiscard]] const char* Skip_Blanks(const char* at) const
     {
         while (at != last && Is_Blank(*at))
             ++at;
         return at;
     }
-    [[nodiscard]] const char* Close_Of(const char* open) const;
-    Sample_Field Next(const char*& at) const;
+    Sample_Field Next(const char*& at);
 };
 
-/// The quote that closes a field; null when none does. Over line ends only a quote that follows the rules
-/// does; in its line also one behind stray quotes.
+/// The quote that closes a field, be it behind the piece; null when none does.
 const char* Field_Cutter::Close_Of(const char* open) const
 {
-    bool stray = false;
-    bool lines = false;
-    for (const char* at = open + 1; at < last; ++at) {
-        if (escape != '\0' && *at == escape) {
-            ++at;
-            continue;
-        }
-        lines = lines || Is_Line_End(*at);
-        if (lines && stray)
-            return nullptr;
-        if (*at != quote)
-            continue;
-        const bool doubled = escape == '\0' && at + 1 < last && at[1] == quote;
-        const bool closes = Ends(runs ? at + 1 : Skip_Blanks(at + 1));
-        if (closes)
-            return at;
-        if (doubled)
-            ++at;
-        else
-            stray = true;
-    }
-    return nullptr;
+    const auto ends = [this](const char* at) { return at == reach || Is_Line_End(*at) || Separates(*at); };
+    return Quote_Rules(quote, escape, ends).Find_Close(open, reach).quote;
 }
 
-Sample_Field Field_Cutter::Next(const char*& at) const
+Sample_Field Field_Cutter::Next(const char*& at)
 {
     at = Skip_Blanks(at);
     const char* const first = at;
     if (quote != '\0' && at != last && *at == quote) {
         if (const char* const close = Close_Of(at)) {
+            if (close >= last)  // the piece ends inside the quotes
+                last = reach;
             at = Skip_Blanks(close + 1);
             if (runs)
                 at = close + 1;
@@ -133,30 +117,56 @@ Sample_Field Field_Cutter::Next(const char*& at) const
 
 Sample_Rows::Sample_Rows(const Text_Sample& sample, const Text_Dialect& dialect)
 {
+    constexpr std::ptrdiff_t most_behind = 1 << 20;
     for (const std::string_view piece : sample.pieces) {
+        const char* const end = piece.data() + piece.size();
         tail_start_ = rows_.size();
-        Cut_Piece(piece, dialect);
+        Cut_Piece(piece, sample.last == nullptr ? end : end + std::min(sample.last - end, most_behind),
+                  dialect);
         if (head_rows_ == 0)
             head_rows_ = rows_.size();
+        else if (dialect.quote != '\0')
+            Drop_Inside_Of_Quotes(tail_start_, dialect.quote);
     }
 }
 
-void Sample_Rows::Cut_Piece(std::string_view piece, const Text_Dialect& dialect)
+void Sample_Rows::Cut_Piece(std::string_view piece, const char* reach, const Text_Dialect& dialect)
 {
     const char* at = piece.data();
     const char* const last = at + piece.size();
     while (at < last)
-        Cut_Row(at, last, dialect);
+        Cut_Row(at, last, reach, dialect);
 }
 
-void Sample_Rows::Cut_Row(const char*& at, const char* last, const Text_Dialect& dialect)
+/// A piece may begin inside a text in quotes: then the first quote at a field's edge closes. Without any, all
+/// of it may be inside.
+void Sample_Rows::Drop_Inside_Of_Quotes(std::size_t first, char quote)
 {
-    const Field_Cutter cutter{last, dialect.separator, dialect.runs, dialect.quote, dialect.escape};
+    const auto begin = rows_.begin() + static_cast<std::ptrdiff_t>(first);
+    for (auto row = begin; row != rows_.end(); ++row)
+        for (const Sample_Field& field : Fields(*row)) {
+            if (field.quoted)
+                return;
+            if (!field.text.empty() && (field.text.front() == quote || field.text.back() == quote)) {
+                rows_.erase(begin, row + 1);
+                return;
+            }
+        }
+    const std::int32_t usual = rows_[head_rows_ - 1].count;
+    const bool is_usual =
+        std::any_of(begin, rows_.end(), [usual](const Sample_Row& row) { return row.count == usual; });
+    if (reads_on_ && !is_usual)
+        rows_.erase(begin, rows_.end());
+}
+
+void Sample_Rows::Cut_Row(const char*& at, const char* last, const char* reach, const Text_Dialect& dialect)
+{
+    Field_Cutter cutter{last, reach, dialect.separator, dialect.runs, dialect.quote, dialect.escape};
     Sample_Row row{at, fields_.size(), 0, true, *at == '#' || *at == '%'};
     for (;;) {
         const bool first = row.count == 0;
         const Sample_Field field = cutter.Next(at);
-        const bool ends = at == last || Is_Line_End(*at);
+        const bool ends = at == cutter.last || Is_Line_End(*at);
         if (first || !ends || !dialect.runs || !field.text.empty()) {  // blanks at a line's end
             fields_.push_back(field);
             ++row.count;
@@ -166,8 +176,9 @@ void Sample_Rows::Cut_Row(const char*& at, const char* last, const Text_Dialect&
             break;
         ++at;
     }
-    if (at != last)
-        at += *at == '\r' && at + 1 != last && at[1] == '\n' ? 2 : 1;
+    reads_on_ = reads_on_ || cutter.last != last;
+    if (at != cutter.last)
+        at += *at == '\r' && at + 1 != cutter.last && at[1] == '\n' ? 2 : 1;
     rows_.push_back(row);
 }
 

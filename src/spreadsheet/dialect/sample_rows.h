@@ -14,7 +14,8 @@ namespace ingester {
 /// Pieces of a text, which begin and end with lines.
 struct Text_Sample {
     std::vector<std::string_view> pieces;
-    bool whole = false;  ///< one piece is all of it
+    bool whole = false;          ///< one piece is all of it
+    const char* last = nullptr;  ///< of the text, where it goes on behind its pieces; else null
 
     [[nodiscard]] bool Holds(std::string_view found) const;
 };
@@ -52,13 +53,15 @@ public:
     [[nodiscard]] std::size_t Tail_Start() const { return tail_start_; }
 
 private:
-    void Cut_Piece(std::string_view piece, const Text_Dialect& dialect);
-    void Cut_Row(const char*& at, const char* last, const Text_Dialect& dialect);
+    void Cut_Piece(std::string_view piece, const char* reach, const Text_Dialect& dialect);
+    void Cut_Row(const char*& at, const char* last, const char* reach, const Text_Dialect& dialect);
+    void Drop_Inside_Of_Quotes(std::size_t first, char quote);
 
     std::vector<Sample_Field> fields_;
     std::vector<Sample_Row> rows_;
     std::size_t head_rows_ = 0;
     std::size_t tail_start_ = 0;
+    bool reads_on_ = false;  ///< a text in quotes goes on behind its piece
 };
 
 /// The field count that most rows with content have, and how many have it.

@@ -24,6 +24,7 @@ struct Text_Dialect {
     char decimal = '.';               ///< between whole and fraction
     char thousands = '\0';            ///< between groups of three digits; NUL: none
     char comment = '\0';              ///< lines that begin with it are passed over; NUL: none
+    bool late_comments = false;       ///< none was met, but may be: lines of one field behind "#"
     std::int64_t lines_in_front = 0;  ///< titles and the like that are passed over
     std::int32_t names_lines = 1;     ///< 0: the columns have no names
     bool rows_are_named = false;      ///< the line of names has none for the first column

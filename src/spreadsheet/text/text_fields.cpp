@@ -1,5 +1,6 @@
 // How a line is cut into fields, and what a field says.
 #include "request/request.h"
+#include "spreadsheet/dialect/quote_rules.h"
 #include "spreadsheet/text/text_format.h"
 #include "support/letters.h"
 #include "support/number_text.h"
@@ -134,70 +135,37 @@ Text_Field Field_Walker::Next_Quoted()
 Text_Field Field_Walker::Next_Quoted_For_People()
 {
     const char* const first = at_;
-    const char* const window = window_;
-    const std::size_t next = next_;
-    if (*first == dialect_->quote && first >= open_until_) {
-        if (const char* const end = End_Of_Quoted(first)) {
-            at_ = end;
-            return {first, at_};
-        }
-        if (window_ == window)
-            next_ = next;
-        else
-            Go_To(first);
-    }
-    at_ = Next_End(first);
+    at_ = Next_End(*first == dialect_->quote ? Behind_Quotes(first) : first);
     return {first, at_};
 }
 
-namespace {
-
-/// Whether the quote at `mark` has an odd number of escapes in front of it.
-bool Is_Escaped(const char* first, const char* mark, char escape)
+/// However long the text in quotes is, its line is not torn, but found too long.
+const char* Field_Walker::Behind_Quotes(const char* first)
 {
-    std::ptrdiff_t count = 0;
-    while (mark - count - 1 > first && mark[-count - 1] == escape)
-        ++count;
-    return count % 2 == 1;
+    const auto ends = [this](const char* at) { return ends_.Holds(*at); };
+    if (first >= open_until_) {
+        const Quote_Rules rules(dialect_->quote, dialect_->escape, ends);
+        const Quote_Close close = rules.Find_Close(first, text_.last);
+        if (close.quote != nullptr)
+            return close.quote + 1;
+        open_until_ = std::max(open_until_, close.open_until);
+    }
+    ++open_quotes_;
+    return first;
 }
 
-}  // namespace
-
-/// Over line ends only a quote closes that follows the rules; in its line also one behind stray quotes,
-/// unless another field begins with a quote before. Null for none.
-const char* Field_Walker::End_Of_Quoted(const char* first)
+/// With as many fields as a row has a line is none, whatever it begins with.
+bool Field_Walker::Is_Comment() const
 {
-    const char quote = *first;
-    const char escape = dialect_->escape;
-    bool stray = false;
-    bool lines = false;
-    for (const char* mark = first;;) {
-        mark = Next_Quote(mark + 1, quote);
-        if (*mark != quote) {
-            lines = true;
-            const bool runs_on = static_cast<std::size_t>(mark - first) > Greatest_Line;
-            if (!stray && !runs_on && mark + 1 < text_.last)
-                continue;
-            open_until_ = stray ? open_until_ : mark;
-            return nullptr;
-        }
-        if (escape != '\0' && Is_Escaped(first, mark, escape))
-            continue;
-        const char* end = mark + 1;
-        while (*end == ' ' && !ends_.Holds(' '))
-            ++end;
-        if (ends_.Holds(*end))
-            return Next_End(end);
-        if (escape == '\0' && mark[1] == quote) {
-            ++mark;
-            continue;
-        }
-        if (lines || (stray && ends_.Holds(mark[-1]))) {
-            open_until_ = lines ? mark : open_until_;
-            return nullptr;
-        }
-        stray = true;
-    }
+    const char mark = dialect_->late_comments ? '#' : dialect_->comment;
+    if (*at_ != mark || mark == '\0' || dialect_->columns < 2)
+        return false;
+    std::int32_t fields = 1;
+    for (const char* at = at_; *at != '\n' && *at != '\r'; ++at)
+        fields += ends_.Holds(*at) && !(dialect_->runs && at[1] == ' ') ? 1 : 0;
+    if (dialect_->late_comments)
+        return fields == 1;
+    return dialect_->runs ? fields != dialect_->columns : fields < dialect_->columns;
 }
 
 bool Field_Walker::Find_Row()
@@ -209,7 +177,8 @@ bool Field_Walker::Find_Row()
         if (*end == '\n' || *end == '\r') {
             passed_empty_ = true;
             at_ = end + 1;
-        } else if (*at_ == dialect_->comment && dialect_->comment != '\0') {
+        } else if (Is_Comment()) {
+            ++comments_;
             at_ = std::find_first_of(at_, static_cast<const char*>(text_.last), Line_Ends.begin(),
                                      Line_Ends.end());
             at_ += at_ != text_.last ? 1 : 0;

@@ -429,6 +429,10 @@ void Sheet_Filler::Report_Oddities() const
         Report_Message_Long("Warning: %li NUL characters in the text were read as blanks.\n", nuls);
         Note_Loss(Loss_Kind::letter_replaced, {}, 0, "NUL", nuls);
     }
+    if (const long quotes = walker_.Open_Quotes(); quotes > 0)
+        Report_Message_Long("Warning: %li quotes that nothing closes were read as letters.\n", quotes);
+    if (walker_.Comments() > 0)
+        request.losses.Note_Unread("comments among its rows", walker_.Comments());
     const std::string_view rest(walker_.Place(), static_cast<std::size_t>(buffer_.last - walker_.Place()));
     if (dialect_ == nullptr && rest.find_first_not_of(" \t\r\n") != std::string_view::npos) {
         Report_Message_Long(

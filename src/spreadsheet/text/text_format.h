@@ -157,6 +157,12 @@ public:
     /// NULs found so far.
     [[nodiscard]] long Nuls() const { return nuls_; }
 
+    /// Quotes at the start of fields that none closes, for people.
+    [[nodiscard]] long Open_Quotes() const { return open_quotes_; }
+
+    /// Comments that were passed over.
+    [[nodiscard]] std::int64_t Comments() const { return comments_; }
+
     [[nodiscard]] const char* Place() const { return at_; }
 
     /// What a field of this text says.
@@ -177,7 +183,8 @@ private:
     [[nodiscard]] const char* Next_Quote(const char* from, char quote);
     [[nodiscard]] Text_Field Next_Quoted();
     [[nodiscard]] Text_Field Next_Quoted_For_People();
-    [[nodiscard]] const char* End_Of_Quoted(const char* first);
+    [[nodiscard]] const char* Behind_Quotes(const char* first);
+    [[nodiscard]] bool Is_Comment() const;
     [[nodiscard]] bool Find_Row();
     [[nodiscard]] bool More_Behind(char end);
     void Look_At_Next_Window();
@@ -191,6 +198,8 @@ private:
     const Text_Dialect* dialect_;
     bool passed_empty_ = false;
     const char* open_until_ = nullptr;  ///< quotes in front of it were not closed
+    long open_quotes_ = 0;
+    std::int64_t comments_ = 0;
     long nuls_ = 0;
     const char* at_;
     char* window_;

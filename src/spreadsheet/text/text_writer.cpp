@@ -255,6 +255,12 @@ void Text_Table_Writer::Put_Quoted(std::string_view text)
     line_.Put('"');
 }
 
+/// Whether a line that begins so may be taken for a comment.
+bool Begins_Comment(std::string_view text)
+{
+    return text.starts_with('#') || text.starts_with('%');
+}
+
 /// Whether the reader of another program needs quotes to see the text as it stands.
 bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
 {
@@ -288,7 +294,7 @@ bool Text_Table_Writer::Texts_Look_Like_Data(const Column_Writing& state) const
 void Text_Table_Writer::Put_Text(const Column_Writing& state, std::string_view text)
 {
     if (layout_.plain) {
-        const bool comment = text.starts_with('#') && Is_First(state.printer.Printed());
+        const bool comment = Begins_Comment(text) && Is_First(state.printer.Printed());
         const bool misleads = layout_.tells_texts && (comment || (!text.empty() && Looks_Missing(text)));
         state.quoted || misleads || Needs_Quotes(text) ? Put_Quoted(text) : line_.Put(text);
     } else if (text.empty()) {
@@ -474,7 +480,7 @@ void Text_Table_Writer::Write_Names()
                 line_.Put(' ');
             line_.Put(name);
             line_.Pad(start, state.width, left);
-        } else if (layout_.plain ? Needs_Quotes(name) || Name_Looks_Like_Data(name) || name.starts_with('#')
+        } else if (layout_.plain ? Needs_Quotes(name) || Name_Looks_Like_Data(name) || Begins_Comment(name)
                                  : Would_Be_Misread(name)) {
             Put_Quoted(name);
         } else {

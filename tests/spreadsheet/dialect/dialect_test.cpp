@@ -186,5 +186,72 @@ TEST_F(Dialect_Test, Numbers_Keep_Their_Spelling)
     }
 }
 
+/// Quoted texts of many lines reach over the ends of the parts that are looked at, and begin in front of
+/// them.
+TEST_F(Dialect_Test, Quotes_Hold_However_Long_Their_Texts_Are)
+{
+    const auto table = [](int rows, int lines) {
+        std::string text = "id,abstract,n\n";
+        for (int row = 1; row <= rows; ++row) {
+            text += std::to_string(row) + ",\"";
+            for (int line = 0; line < lines; ++line)
+                text += std::string(static_cast<std::size_t>(line * 7 % 40), 'l')
+                            .append(static_cast<std::size_t>(line % 3), ' ')
+                        + "and, so on\n";
+            text += "end\"," + std::to_string(row * 2) + "\n";
+        }
+        return text;
+    };
+    for (const auto& [rows, lines] : {std::pair(100, 60), std::pair(40, 400), std::pair(3, 5000)}) {
+        Sheet* const sheet = Read(table(rows, lines), "x.csv");
+        ASSERT_NE(sheet, nullptr);
+        EXPECT_EQ(sheet->row_count, rows);
+        EXPECT_EQ(sheet->column_count, 3);
+        EXPECT_EQ(Column_At(sheet, 3)->name, "n");
+        EXPECT_EQ(Column_At(sheet, 3)->type, variate_column);
+    }
+    EXPECT_EQ(Read("a,b\n1,\"" + std::string(300000, 'x') + "\n\"\n2,y\n", "x.csv"), nullptr);
+    EXPECT_EQ(Messages(), "Error: Line 2 has more than 262140 characters.\n:\n");
+    EXPECT_EQ(Render(Read("a,b\n1,\"x\n2,y\n", "x.csv")), "a V1|2; b T\"x|y");
+    EXPECT_EQ(Messages(), "Warning: 1 quotes that nothing closes were read as letters.\n:\n");
+}
+
+TEST_F(Dialect_Test, Comments_Are_Told_From_Rows)
+{
+    const Change named = [] { request.Told_Names_Lines = 1; };
+    const struct {
+        const char *told, *text, *sheet;
+        std::int64_t passed_over;
+        Change change = {};
+    } cases[] = {
+        {"one column", "tag\n#a\nb\n#c\n", "tag T#a|b|#c", 0},
+        {"one column below a comment", "# by hand\ntag\n#a\nb\n", "tag T#a|b", 1},
+        {"fewer fields", "id,v\nw,1\n# remark\nx,2\n", "id Tw|x; v V1|2", 1},
+        {"all fields", "id,v\n#1,1\nx,2\n#3,3\n", "id T#1|x|#3; v V1|2|3", 0},
+        {"a sign for a name", "%,name,score\n1,ann,2\n2,bob,3\n", "% V1|2; name Tann|bob; score V2|3", 0,
+         named},
+        {"a sign over no names", "#,,y\n1,2,3\n4,5,6\n", "% V1|4; C2 V2|5; y V3|6", 0, named},
+        {"a sign alone", "%\n1\n2\n", "% V1|2", 0},
+        {"a number behind it", "#1,2\n3,4\n", "C1 T#1|3; C2 V2|4", 0},
+        {"names behind it", "#id,who\nx,ann\ny,bob\n", "id Tx|y; who Tann|bob", 0},
+        {"a title behind it", "#made by x, today\nid,v\n1,2\n3,4\n", "id V1|3; v V2|4", 1},
+    };
+    for (const auto& tried : cases) {
+        EXPECT_EQ(Render(Read(tried.text, "x.csv", tried.change)), tried.sheet) << tried.told;
+        std::int64_t told = 0;
+        for (const Loss& loss : request.losses.Entries())
+            told += loss.kind == Loss_Kind::input_unread ? loss.count : 0;
+        EXPECT_EQ(told, tried.passed_over) << tried.told;
+    }
+    std::string text = "# made by x\nid,v\n";
+    for (int row = 1; row <= 30000; ++row)
+        text += (row == 20000 ? "#" : "") + std::to_string(row) + ",5\n" + (row == 20001 ? "# remark\n" : "");
+    for (const std::string_view large : {std::string_view(text), std::string_view(text).substr(12)}) {
+        EXPECT_EQ(Read(large, "x.csv")->row_count, 30000);
+        ASSERT_EQ(request.losses.Entries().size(), 1U);
+        EXPECT_EQ(request.losses.Entries()[0].count, large.size() == text.size() ? 2 : 1);
+    }
+}
+
 }  // namespace
 }  // namespace ingester

@@ -103,8 +103,8 @@ TEST_F(Text_Writer, Writes_For_Other_Programs)
          "t T007|1e5|; u TNA|x|nan; d T2024-01-05|10:30|1 234; w Tit's|'s|-5",
          "t,u,d,w\n\"007\",\"NA\",\"2024-01-05\",it's\n\"1e5\",x,\"10:30\",\"'s\"\n"
          "\"\",\"nan\",\"1 234\",-5\n"},
-        {"comments and names", Plain, "#a T#x|y; 2b T#x|; n T a|b ",
-         "\"#a\",\"2b\",n\n\"#x\",#x,\" a\"\ny,,\"b \"\n"},
+        {"comments and names", Plain, "#a T#x|%y; 2b T#x|; n T a|b ",
+         "\"#a\",\"2b\",n\n\"#x\",#x,\" a\"\n\"%y\",,\"b \"\n"},
         {"one column", Plain, "n V1|*|2", "n\n1\n\"\"\n2\n"},
         {"all digits", Plain, "n V0.1|1e23|123456789012345678|0.30000000000000004|-5e-324",
          "n\n0.1\n1e+23\n1.2345678901234568e+17\n0.30000000000000004\n-5e-324\n"},
