@@ -173,6 +173,7 @@ TEST_F(Dialect_Test, Comments_Are_Told_From_Rows)
         {"a sign alone", "%\n1\n2\n", "% V1|2", 0},
         {"a number behind it", "#1,2\n3,4\n", "C1 T#1|3; C2 V2|4", 0},
         {"names behind it", "#id,who\nx,ann\ny,bob\n", "id Tx|y; who Tann|bob", 0},
+        {"between blanks", "x y\n# remark by me\n1 2\n# again\n3 4\n", "x V1|3; y V2|4", 2},
         {"a title behind it", "#made by x, today\nid,v\n1,2\n3,4\n", "id V1|3; v V2|4", 1},
     };
     for (const auto& tried : cases) {
