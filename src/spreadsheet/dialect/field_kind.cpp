@@ -69,11 +69,17 @@ bool Is_Number_By_Name(std::string_view text)
     return std::string_view(room, Print_Fixed(room, value, 0)) != text;
 }
 
-/// Beyond doubles: too great, or so near to 0 that it is 0.
+/// Beyond doubles: too great, or so near to 0 that it is 0. By the place of its first digit that isn't 0.
 bool Is_Too_Great(std::string_view text)
 {
-    const std::size_t exponent = text.find_first_of("eE");
-    return exponent == std::string_view::npos || text.find('-', exponent) == std::string_view::npos;
+    const std::size_t exponent = std::min(text.find_first_of("eE"), text.size());
+    const std::string_view digits = text.substr(0, exponent);
+    const std::size_t point = std::min(digits.find('.'), digits.size());
+    const std::size_t first = std::min(digits.find_first_of("123456789"), digits.size());
+    double shift = 0;
+    if (exponent < text.size() && !Whole_Number_Text(text.substr(exponent + 1), shift))
+        return text[exponent + 1] != '-';  // an exponent that is beyond doubles itself
+    return shift + static_cast<double>(point) > static_cast<double>(first);
 }
 
 }  // namespace
@@ -113,9 +119,9 @@ std::string_view Plain_Number(std::string_view text, Number_Marks marks, std::st
 
 bool Is_Missing_Word(std::string_view text)
 {
-    constexpr std::string_view words[] = {"", "NA", "N/A", "NaN", "NULL", "null", "-", "."};
     constexpr std::size_t longest = 4;
-    return text.size() <= longest && std::ranges::find(words, text) != std::end(words);
+    return text.empty()
+           || (text.size() <= longest && std::ranges::find(Missing_Words, text) != std::end(Missing_Words));
 }
 
 namespace {
@@ -157,8 +163,26 @@ bool Read_Day(std::string_view text, double& day)
     return back.year == year && back.month == month && back.day == number;
 }
 
+/// "25" of "23:59:59.25", as seconds.
+bool Read_Fraction(std::string_view digits, double& seconds, Iso_Moment& moment)
+{
+    constexpr std::size_t held = 3;
+    if (digits.empty() || !std::ranges::all_of(digits, Is_Digit))
+        return false;
+    double unit = 1;
+    double thousandths = 0;
+    for (const char digit : digits.substr(0, held)) {
+        thousandths = thousandths * 10 + (digit - '0');
+        unit *= 10;
+    }
+    seconds += thousandths / unit;
+    moment.fraction = thousandths != 0;
+    moment.finer = digits.size() > held && digits.find_first_not_of('0', held) != std::string_view::npos;
+    return true;
+}
+
 /// "23:59", "23:59:59" or "23:59:59.25", as seconds.
-bool Read_Time(std::string_view text, double& seconds, bool& fraction)
+bool Read_Time(std::string_view text, double& seconds, Iso_Moment& moment)
 {
     const std::int32_t hour = Digits_At(text, 0, 2);
     const std::int32_t minute = Digits_At(text, 3, 2);
@@ -167,16 +191,8 @@ bool Read_Time(std::string_view text, double& seconds, bool& fraction)
         || second > 59 || (text.size() > 5 && text[5] != ':'))
         return false;
     seconds = hour * 3600.0 + minute * 60.0 + second;
-    fraction = text.size() > 8;
-    if (!fraction)
-        return true;
-    double rest;
-    if (text[8] != '.' || text.size() < 10 || !Is_Digit(text[9]) || !Whole_Number_Text(text.substr(8), rest)
-        || text.find_first_of("eE") != std::string_view::npos)
-        return false;
-    seconds += rest;
-    fraction = rest != 0;
-    return true;
+    return text.size() == 5 || text.size() == 8
+           || (text[8] == '.' && Read_Fraction(text.substr(9), seconds, moment));
 }
 
 }  // namespace
@@ -192,18 +208,22 @@ Iso_Moment Read_Iso_Moment(std::string_view text)
     Iso_Moment moment;
     double seconds = 0;
     if (text[2] == ':') {
-        if (!Read_Time(text, seconds, moment.fraction))
+        if (!Read_Time(text, seconds, moment))
             return {};
-        return {Field_Sense::time, seconds / Seconds_A_Day, moment.fraction};
+        moment.sense = Field_Sense::time;
+        moment.value = seconds / Seconds_A_Day;
+        return moment;
     }
     double day;
     if (text.size() == day_width)
-        return Read_Day(text, day) ? Iso_Moment{Field_Sense::date, day, false} : Iso_Moment{};
+        return Read_Day(text, day) ? Iso_Moment{Field_Sense::date, day} : Iso_Moment{};
     if (text.size() < day_width || (text[day_width] != 'T' && text[day_width] != ' ')
         || !Read_Day(text.substr(0, day_width), day)
-        || !Read_Time(text.substr(day_width + 1), seconds, moment.fraction))
+        || !Read_Time(text.substr(day_width + 1), seconds, moment))
         return {};
-    return {Field_Sense::date_time, day + seconds / Seconds_A_Day, moment.fraction};
+    moment.sense = Field_Sense::date_time;
+    moment.value = day + seconds / Seconds_A_Day;
+    return moment;
 }
 
 Field_Sense Sense_Of_Field(std::string_view text, Number_Marks marks)

@@ -30,7 +30,10 @@ struct Field_Number {
 /// A number with a point and without groups; `room` holds it where it is spelled otherwise.
 [[nodiscard]] std::string_view Plain_Number(std::string_view text, Number_Marks marks, std::string& room);
 
-/// A word for missing values: NA, N/A, NaN, NULL, null, "-", "." or nothing.
+/// Words for missing values.
+inline constexpr std::string_view Missing_Words[] = {"NA", "N/A", "NaN", "NULL", "null", "-", "."};
+
+/// Whether `text` is one of them, or nothing.
 [[nodiscard]] bool Is_Missing_Word(std::string_view text);
 
 /// A date, time of day or both, as ISO 8601 writes them with dashes and colons: days since the end of
@@ -38,7 +41,8 @@ struct Field_Number {
 struct Iso_Moment {
     Field_Sense sense = Field_Sense::text;
     double value = 0;
-    bool fraction = false;  ///< it tells fractions of a second
+    bool fraction = false;  ///< it tells thousandths of a second
+    bool finer = false;     ///< and less, which is left out
 };
 [[nodiscard]] Iso_Moment Read_Iso_Moment(std::string_view text);
 

@@ -86,13 +86,16 @@ std::optional<Block> First_Table(const std::vector<Block>& blocks, const Sample_
     return std::nullopt;
 }
 
-/// At the head, too, a line is a row whose first field is the sign alone, or a number behind it.
-bool Is_Row_At_Head(std::span<const Sample_Field> fields, const Text_Dialect& dialect)
+/// Whether a line behind the sign has the fields of a row. At the head only where the sign alone is its first
+/// field, or has a number behind it.
+bool Is_Marked_Row(std::span<const Sample_Field> fields, bool at_head, const Text_Dialect& dialect)
 {
     const std::string_view first = fields.front().text;
     if (static_cast<std::int32_t>(fields.size()) != dialect.columns)
         return false;
-    return first.size() == 1 ? !dialect.runs : Sense_Of_Field(first.substr(1), {}) == Field_Sense::number;
+    if (first.size() == 1)
+        return !dialect.runs;
+    return !at_head || Sense_Of_Field(first.substr(1), {}) == Field_Sense::number;
 }
 
 /// Lines that begin with "#" or "%" are comments where the others don't, and where they don't have the
@@ -112,7 +115,7 @@ void Find_Comments(const Sample_Rows& rows, Text_Dialect& dialect)
             continue;
         ++marked;
         mark = mark == '\0' ? *row.first : mark;
-        rowlike += at_head ? Is_Row_At_Head(rows.Fields(row), dialect) : row.count == dialect.columns;
+        rowlike += Is_Marked_Row(rows.Fields(row), at_head, dialect) ? 1 : 0;
     }
     const bool sign_is_name =
         dialect.columns > 1 || marked == 1;  // in one column it may also frame a comment

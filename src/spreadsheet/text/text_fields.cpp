@@ -165,7 +165,7 @@ bool Field_Walker::Is_Comment() const
         fields += ends_.Holds(*at) && !(dialect_->runs && at[1] == ' ') ? 1 : 0;
     if (dialect_->late_comments)
         return fields == 1;
-    return dialect_->runs ? fields != dialect_->columns : fields < dialect_->columns;
+    return dialect_->runs ? at_[1] == ' ' || fields != dialect_->columns : fields < dialect_->columns;
 }
 
 bool Field_Walker::Find_Row()

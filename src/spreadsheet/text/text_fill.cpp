@@ -228,6 +228,7 @@ void Sheet_Filler::Turn_To_Text(Column_Filling& state)
     state.rows_to_redo = row_;
     request.losses.Withdraw(Loss_Kind::number_not_held, state.column->name);  // as texts they can be held
     request.losses.Withdraw(Loss_Kind::number_clipped, state.column->name);
+    request.losses.Withdraw(Loss_Kind::date_part_dropped, state.column->name);
 }
 
 /// A field that is not simply a number up to its separator; its cell is there, and missing.

@@ -110,9 +110,10 @@ void Sheet_Filler::Begin_Moments(Column_Filling& state, const Iso_Moment& moment
 void Sheet_Filler::Take_Moment(Column_Filling& state, const Iso_Moment& moment)
 {
     state.cells.Last().value.number = moment.value;
-    if (moment.fraction && state.fractions++ == 0 && moment.sense == Field_Sense::time)
-        Note_Loss(Loss_Kind::number_not_held, state.column->name, row_ + 1,
-                  "fractions of a second don't show");
+    state.fractions += moment.fraction ? 1 : 0;
+    if (moment.finer)
+        Note_Loss(Loss_Kind::date_part_dropped, state.column->name, row_ + 1,
+                  "less than a thousandth of a second");
 }
 
 void Sheet_Filler::Fill_Moment(const Text_Field& field, Column_Filling& state)
@@ -206,16 +207,17 @@ bool Sheet_Filler::Ends_Table()
     return true;
 }
 
-/// Digits that all stand in quotes, where other fields don't, are texts.
+/// Digits and dates that all stand in quotes, where other fields don't, are texts.
 void Sheet_Filler::Settle_Quoted_Columns()
 {
-    const auto bare_numbers = [this](const Column_Filling& state) {
+    const auto bare_data = [this](const Column_Filling& state) {
         return state.filling < Filling::texts && state.quoted + state.gaps < row_;
     };
-    if (!bare_texts_ && std::ranges::none_of(columns_, bare_numbers))
+    if (!bare_texts_ && std::ranges::none_of(columns_, bare_data))
         return;
     for (Column_Filling& state : columns_)
-        if (state.filling == Filling::numbers_so_far && state.quoted > 0 && !bare_numbers(state))
+        if ((state.filling == Filling::numbers_so_far || state.filling == Filling::moments)
+            && state.quoted > 0 && !bare_data(state))
             Turn_To_Text(state);
 }
 

@@ -33,8 +33,8 @@ struct Column_Filling {
 
     // For people only.
     std::int64_t gaps = 0;                     ///< rows in which no field says anything
-    std::int64_t quoted = 0;                   ///< numbers in quotes
-    std::int64_t fractions = 0;                ///< moments with fractions of a second
+    std::int64_t quoted = 0;                   ///< numbers and moments in quotes
+    std::int64_t fractions = 0;                ///< moments with thousandths of a second
     Field_Sense sense = Field_Sense::nothing;  ///< of moments
     Spelling_Watch spelling;
 };

@@ -1,6 +1,7 @@
 #include "spreadsheet/text/text_layout.h"
 
 #include "request/request.h"
+#include "spreadsheet/dialect/field_kind.h"
 #include "support/text.h"
 
 #include <algorithm>
@@ -65,13 +66,13 @@ Text_Layout Layout_Of_Request(bool tab_mode)
 
 bool Looks_Missing(std::string_view text)
 {
-    constexpr std::string_view words[] = {"*",   "-",    ".",    "NA",  "N/A", "#N/A",
-                                          "NaN", "NULL", "None", "Inf", "-Inf"};
+    constexpr std::string_view words_of_others[] = {"*", "#N/A", "None", "Inf", "-Inf"};
     constexpr std::size_t longest = 4;
+    const auto is_text = [text](std::string_view word) { return Equal_Ignoring_Case(word, text); };
     return text.empty()
-           || (text.size() <= longest && std::ranges::any_of(words, [text](std::string_view word) {
-                   return Equal_Ignoring_Case(word, text);
-               }));
+           || (text.size() <= longest
+               && (std::ranges::any_of(Missing_Words, is_text)
+                   || std::ranges::any_of(words_of_others, is_text)));
 }
 
 bool Looks_Like_Data(std::string_view text)

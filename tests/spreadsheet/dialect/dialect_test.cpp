@@ -6,6 +6,8 @@
 #include "support/number_text.h"
 #include "support/reader_fixture.h"
 
+#include <cmath>
+
 namespace ingester {
 namespace {
 
@@ -137,6 +139,9 @@ TEST_F(Dialect_Test, Short_Lines_Keep_What_They_Have)
 
 TEST_F(Dialect_Test, Fields_Mean_What_People_Mean)
 {
+    const std::string zeros(350, '0');
+    const std::string many_zeros =
+        "a\n0." + zeros + "1\n-0.0" + zeros + "1e9\n1" + zeros + ".5e-20\n1e-99999999999999999999\n";
     const struct {
         const char *told, *text, *sheet;
         Change change = {};
@@ -151,8 +156,11 @@ TEST_F(Dialect_Test, Fields_Mean_What_People_Mean)
          "a T007|8; b T12345678901234567890|1; c V0.5|-0"},
         {"beyond doubles", "a\n1e400\n1e-400\n-1e400\n", "a V9.99999e+307|0|*"},
         {"no star behind a number", "a,b\n5*,1\n", "a T5*; b V1"},
+        {"many zeros", many_zeros.c_str(), "a V0|0|9.99999e+307|0"},
         {"groups", "a;b\n1.234.567,5;1\n2,5;2\n", "a V1234567.5|2.5; b V1|2"},
         {"digits in quotes", "a,b\n\"1\",2\n\"3\",4\n", "a T1|3; b V2|4"},
+        {"dates in quotes", "a,b,c\n1,\"2024-01-01\",\"\"\n2,\"\",\"10:00\"\n",
+         "a V1|2; b T2024-01-01|; c T|10:00"},
         {"all in quotes", "\"a\",\"b\"\n\"1\",\"2\"\n", "a V1; b V2"},
         {"a date among none", "a\n2024-01-01\nsoon\n", "a T2024-01-01|soon"},
         {"no such day", "a\n2023-02-29\n", "a T2023-02-29"},
@@ -234,6 +242,7 @@ TEST_F(Dialect_Test, Comments_Are_Told_From_Rows)
         {"a sign alone", "%\n1\n2\n", "% V1|2", 0},
         {"a number behind it", "#1,2\n3,4\n", "C1 T#1|3; C2 V2|4", 0},
         {"names behind it", "#id,who\nx,ann\ny,bob\n", "id Tx|y; who Tann|bob", 0},
+        {"between blanks", "x y\n# remark by me\n1 2\n# again\n3 4\n", "x V1|3; y V2|4", 2},
         {"a title behind it", "#made by x, today\nid,v\n1,2\n3,4\n", "id V1|3; v V2|4", 1},
     };
     for (const auto& tried : cases) {
@@ -251,6 +260,25 @@ TEST_F(Dialect_Test, Comments_Are_Told_From_Rows)
         ASSERT_EQ(request.losses.Entries().size(), 1U);
         EXPECT_EQ(request.losses.Entries()[0].count, large.size() == text.size() ? 2 : 1);
     }
+}
+
+TEST_F(Dialect_Test, Thousandths_Of_A_Second_Are_Held)
+{
+    const std::tuple<const char*, double, std::size_t> cases[] = {
+        {"00:00:10.5", 10.5, 0},      {"00:00:10.123000", 10.123, 0}, {"00:00:10.123456", 10.123, 1},
+        {"00:00:59.9999", 59.999, 1}, {"00:01:00.000", 60, 0},
+    };
+    for (const auto& [time, seconds, lost] : cases)
+        for (const std::string day : {"", "2024-03-02 "}) {
+            Sheet* const sheet = Read("a\n" + day + time + "\n", "x.csv");
+            const double value = Column_At(sheet, 1)->first_cell->value.number;
+            EXPECT_NEAR((value - std::floor(value)) * 86400, seconds, 1e-5) << time;
+            ASSERT_EQ(request.losses.Entries().size(), lost) << time;
+            for (const Loss& loss : request.losses.Entries())
+                EXPECT_EQ(loss.kind, Loss_Kind::date_part_dropped);
+        }
+    static_cast<void>(Read("a\n10:00:00.123456\nsoon\n", "x.csv"));
+    EXPECT_TRUE(request.losses.Entries().empty()) << "as a text it is kept whole";
 }
 
 }  // namespace
