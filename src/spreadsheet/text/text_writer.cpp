@@ -61,7 +61,7 @@ public:
     }
     void Put(std::string_view text)
     {
-        std::memcpy(Reserve(text.size()), text.data(), text.size());
+        std::ranges::copy(text, Reserve(text.size()));
         used_ += text.size();
     }
     [[nodiscard]] std::size_t Size() const { return used_; }

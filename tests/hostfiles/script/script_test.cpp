@@ -306,7 +306,7 @@ TEST_F(Script, Every_Structure_Comes_Back)
     EXPECT_NE(Heard(dated).find("levels=!(154512,154513)] col; extra='across'; drep=2|"), std::string::npos);
     Sheet* const cut = Matrix_Of(symmetric_matrix_sheet, 0, {"1", "2", "3"});
     while (cut->column_count > 2)
-        Unlink_Column(cut->last_column);
+        Delete_Column(cut->last_column, false);
     EXPECT_NE(Heard(cut).find("READ m|109517 109518 1 109519 * * :|"), std::string::npos) << Heard(cut);
     EXPECT_NE(Messages().find("The matrix m lacks 1 of its columns"), std::string::npos);
     request.Pointer_Name = "p";
