@@ -12,6 +12,9 @@ namespace ingester {
 /// Separator, quote and escape: the steadiest count of fields that look like such.
 [[nodiscard]] Text_Dialect Find_Separation(const Text_Sample& sample, const Told_Dialect& told);
 
+/// Whether a blank stands behind each separator of a row, as behind commas in prose.
+[[nodiscard]] bool Is_Spaced(std::span<const Sample_Field> fields);
+
 /// Where in a sample the table is, by row.
 struct Table_Place {
     std::size_t first = 0;   ///< its names, or first row

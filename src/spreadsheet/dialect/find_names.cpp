@@ -2,6 +2,8 @@
 #include "support/text.h"
 
 #include <algorithm>
+#include <cmath>
+#include <functional>
 #include <string_view>
 #include <vector>
 
@@ -35,9 +37,14 @@ void Find_Marks(const Sample_Rows& rows, std::span<const Sample_Row> table, cons
                   || (points == 0 && dialect.separator != ',' && seen.Of(Mark_Evidence::comma_or_groups) > 0)
             : false;
     dialect.decimal = told.decimal != '\0' ? told.decimal : comma ? ',' : '.';
-    if (dialect.decimal == '.' && seen.Of(Mark_Evidence::comma_groups) > 0 && commas == 0)
+    // beside numbers that show which mark is the decimal one, the other can only part groups
+    const std::int64_t comma_groups =
+        seen.Of(Mark_Evidence::comma_groups) + (points > 0 ? seen.Of(Mark_Evidence::comma_or_groups) : 0);
+    const std::int64_t point_groups =
+        seen.Of(Mark_Evidence::point_groups) + (commas > 0 ? seen.Of(Mark_Evidence::point_or_groups) : 0);
+    if (dialect.decimal == '.' && comma_groups > 0 && commas == 0)
         dialect.thousands = ',';
-    if (dialect.decimal == ',' && seen.Of(Mark_Evidence::point_groups) > 0 && points == 0)
+    if (dialect.decimal == ',' && point_groups > 0 && points == 0)
         dialect.thousands = '.';
 }
 
@@ -69,6 +76,7 @@ private:
     {
         return Sense_Of_Field(field.text, Marks_Of(dialect_));
     }
+    [[nodiscard]] bool Is_Name_Over_Data(const Sample_Field& field, std::size_t place, bool first) const;
     void Find_Data_Columns();
     [[nodiscard]] bool Is_One_Line_Of_Names() const;
     [[nodiscard]] bool Names_Stand_Over_Data(std::size_t row) const;
@@ -79,9 +87,36 @@ private:
     const Sample_Rows& cut_;
     const Text_Dialect& dialect_;
     Rows rows_;
-    std::vector<bool> data_;  ///< columns of numbers, dates or times
+    std::vector<bool> data_;     ///< columns of numbers, dates or times
+    std::vector<bool> numbers_;  ///< columns of numbers alone
+    std::vector<bool> moments_;  ///< columns of dates or times alone
+    std::vector<bool> bare_;     ///< columns of data without quotes
     std::int64_t data_columns_ = 0;
 };
+
+namespace {
+
+/// What the fields of a column hold, by count.
+struct Column_Count {
+    std::int64_t numbers = 0;
+    std::int64_t moments = 0;
+    std::int64_t texts = 0;
+    std::int64_t quoted = 0;
+
+    void Take(Field_Sense sense, bool in_quotes)
+    {
+        numbers += sense == Field_Sense::number ? 1 : 0;
+        texts += sense == Field_Sense::text ? 1 : 0;
+        moments += Is_Moment(sense) ? 1 : 0;
+        quoted += in_quotes ? 1 : 0;
+    }
+    static bool Is_Moment(Field_Sense sense)
+    {
+        return sense == Field_Sense::date || sense == Field_Sense::time || sense == Field_Sense::date_time;
+    }
+};
+
+}  // namespace
 
 /// By the lines that can't be names, if there are such.
 void Names_Finder::Find_Data_Columns()
@@ -89,43 +124,49 @@ void Names_Finder::Find_Data_Columns()
     constexpr std::int64_t of_ten = 8;
     if (rows_.size() < 2)
         return;
-    std::vector<std::int64_t> data;
-    std::vector<std::int64_t> texts;
+    std::vector<Column_Count> columns;
     for (std::size_t i = std::min(Most_Names_Lines, rows_.size() - 1); i < rows_.size(); ++i) {
-        std::size_t place = 0;
-        for (const Sample_Field& field : Fields(i)) {
-            if (place == data.size()) {
-                data.push_back(0);
-                texts.push_back(0);
-            }
-            const Field_Sense sense = Sense(field);
-            data[place] += sense != Field_Sense::nothing && sense != Field_Sense::text ? 1 : 0;
-            texts[place] += sense == Field_Sense::text ? 1 : 0;
-            ++place;
-        }
+        const auto fields = Fields(i);
+        columns.resize(std::max(columns.size(), fields.size()));
+        for (std::size_t place = 0; place < fields.size(); ++place)
+            columns[place].Take(Sense(fields[place]), fields[place].quoted);
     }
-    for (std::size_t i = 0; i < data.size(); ++i) {
-        data_.push_back(data[i] > 0 && data[i] * 10 >= (data[i] + texts[i]) * of_ten);
+    for (const Column_Count& column : columns) {
+        const std::int64_t data = column.numbers + column.moments;
+        data_.push_back(data > 0 && data * 10 >= (data + column.texts) * of_ten);
         data_columns_ += data_.back() ? 1 : 0;
+        numbers_.push_back(column.numbers > 0 && column.moments + column.texts == 0);
+        moments_.push_back(column.moments > 0 && column.numbers + column.texts == 0);
+        bare_.push_back(column.quoted == 0);
     }
 }
 
-/// No datum stands over data, and some word does.
+/// A text, a date over numbers or a number over dates; in the first line also what stands in quotes over a
+/// column without any.
+bool Names_Finder::Is_Name_Over_Data(const Sample_Field& field, std::size_t place, bool first) const
+{
+    const Field_Sense sense = Sense(field);
+    if (sense == Field_Sense::text || sense == Field_Sense::nothing
+        || (first && field.quoted && bare_[place]))
+        return true;
+    return first && (Column_Count::Is_Moment(sense) ? numbers_[place] : moments_[place]);
+}
+
+/// No datum stands over data, and some name does.
 bool Names_Finder::Names_Stand_Over_Data(std::size_t row) const
 {
-    bool word = false;
+    bool name = false;
     std::size_t place = 0;
     for (const Sample_Field& field : Fields(row)) {
         const bool over_data = place < data_.size() && data_[place];
-        ++place;
+        const std::size_t column = place++;
         if (!over_data)
             continue;
-        const Field_Sense sense = Sense(field);
-        if (sense != Field_Sense::text && sense != Field_Sense::nothing)
+        if (!Is_Name_Over_Data(field, column, row == 0))
             return false;
-        word = word || sense == Field_Sense::text;
+        name = name || Sense(field) != Field_Sense::nothing;
     }
-    return word;
+    return name;
 }
 
 /// A text of the first line stands below in its column once more, as a name wouldn't.
@@ -141,7 +182,24 @@ bool Names_Finder::Comes_Again() const
     return false;
 }
 
-/// Numbers in equal steps, as years are, over data, and a word or an empty corner in front of them.
+namespace {
+
+/// Numbers in equal steps, or years that go up.
+bool Go_Up(std::span<const double> numbers)
+{
+    constexpr double first_year = 1500;
+    constexpr double last_year = 2200;
+    const auto is_year = [](double a) { return a >= first_year && a <= last_year && a == std::floor(a); };
+    if (numbers.size() < 2 || std::ranges::adjacent_find(numbers, std::greater_equal()) != numbers.end())
+        return false;
+    const auto uneven = [&](double a, double b) { return b - a != numbers[1] - numbers[0]; };
+    return std::ranges::all_of(numbers, is_year)
+           || std::ranges::adjacent_find(numbers, uneven) == numbers.end();
+}
+
+}  // namespace
+
+/// Numbers in equal steps, or years, over data, and a word or an empty corner in front of them.
 bool Names_Finder::Counts_Up() const
 {
     std::vector<double> numbers;
@@ -158,17 +216,15 @@ bool Names_Finder::Counts_Up() const
             word = true;
         ++place;
     }
-    if (!word || numbers.size() < 2 || numbers[1] <= numbers[0])
-        return false;
-    const auto uneven = [&](double a, double b) { return b - a != numbers[1] - numbers[0]; };
-    return std::ranges::adjacent_find(numbers, uneven) == numbers.end();
+    return word && Go_Up(numbers);
 }
 
 bool Names_Finder::Is_One_Line_Of_Names() const
 {
     const auto is_text = [this](const Sample_Field& field) { return Sense(field) == Field_Sense::text; };
+    const auto may_name = [&](const Sample_Field& field) { return field.quoted || is_text(field); };
     if (rows_.size() == 1)
-        return std::ranges::all_of(Fields(0), is_text);
+        return std::ranges::all_of(Fields(0), may_name) && std::ranges::any_of(Fields(0), is_text);
     if (data_columns_ > 0 && Names_Stand_Over_Data(0))
         return true;
     const auto senses = Fields(0);

@@ -133,7 +133,7 @@ public:
     {
         for (std::size_t i = block.first; i < block.last; ++i) {
             const Sample_Row& row = Row(i);
-            if (Is_Comment(row))
+            if (Is_Comment(row) || Is_Title(i, block.last, columns))
                 continue;
             if (row.count == columns || Begins_Unevenly(i, block.last, columns))
                 return i;
@@ -176,6 +176,23 @@ private:
             const Field_Sense sense = Sense(field);
             return sense != Field_Sense::text && sense != Field_Sense::nothing;
         });
+    }
+    /// Prose that happens to have the commas of a row: names without blanks, and data, follow it.
+    [[nodiscard]] bool Is_Title(std::size_t i, std::size_t last, std::int32_t columns) const
+    {
+        if (Row(i).count != columns || columns < 2 || !Is_Spaced(rows_.Fields(Row(i))))
+            return false;
+        std::size_t names = i + 1;
+        while (names < last && Row(names).count != columns)
+            ++names;
+        if (names + 1 >= last || Row(names + 1).count != columns || (names == i + 1 && !Holds_Data(Row(i))))
+            return false;
+        return !Is_Spaced(rows_.Fields(Row(names))) && Are_Words(Row(names)) && Holds_Data(Row(names + 1));
+    }
+    [[nodiscard]] bool Are_Words(const Sample_Row& row) const
+    {
+        return std::ranges::all_of(
+            rows_.Fields(row), [&](const Sample_Field& field) { return Sense(field) == Field_Sense::text; });
     }
     [[nodiscard]] bool Begins_Unevenly(std::size_t i, std::size_t last, std::int32_t columns) const
     {

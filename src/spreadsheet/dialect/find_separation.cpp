@@ -89,13 +89,6 @@ bool Has_Even_Block(std::span<const Sample_Row> rows)
     return false;
 }
 
-bool Is_Spaced(std::span<const Sample_Field> fields)
-{
-    return std::ranges::all_of(fields.subspan(1), [](const Sample_Field& field) {
-        return !field.quoted && !field.text.empty() && field.text.data()[-1] == ' ';
-    });
-}
-
 Score Score_Of(const Text_Sample& sample, const Text_Dialect& dialect)
 {
     constexpr double single_column = 0.001;
@@ -241,6 +234,13 @@ Tried_Separator Told_Separator(const Text_Sample& sample, std::string_view told)
 }
 
 }  // namespace
+
+bool Is_Spaced(std::span<const Sample_Field> fields)
+{
+    return std::ranges::all_of(fields.subspan(1), [](const Sample_Field& field) {
+        return !field.quoted && !field.text.empty() && field.text.data()[-1] == ' ';
+    });
+}
 
 Text_Dialect Find_Separation(const Text_Sample& sample, const Told_Dialect& told)
 {

@@ -38,7 +38,31 @@ const char* Behind_Mark(const Sample_Row& comment)
 
 }  // namespace
 
-Found_Table Find_Dialect(std::string_view text, const Told_Dialect& told)
+namespace {
+
+constexpr std::string_view Separator_Words[] = {"sep=", "\"sep="};
+
+}  // namespace
+
+std::size_t Separator_Line(std::string_view text)
+{
+    constexpr std::string_view signs = ",;\t|: ";
+    for (const std::string_view words : Separator_Words) {
+        if (!text.starts_with(words))
+            continue;
+        const std::string_view rest = text.substr(words.size());
+        const std::size_t sign_and_quote = words.front() == '"' ? 2 : 1;
+        const std::size_t end = std::min(rest.find_first_of("\r\n"), rest.size());
+        const bool quoted = sign_and_quote == 1 || rest.substr(1, 1) == "\"";
+        if (end == sign_and_quote && quoted && signs.find(rest.front()) != std::string_view::npos)
+            return std::min(words.size() + end + (rest.substr(end, 2) == "\r\n" ? 2 : 1), text.size());
+    }
+    return 0;
+}
+
+namespace {
+
+Found_Table Find_By_Sample(std::string_view text, const Told_Dialect& told)
 {
     const Text_Sample sample = Take_Sample(text);
     Found_Table found;
@@ -66,6 +90,23 @@ Found_Table Find_Dialect(std::string_view text, const Told_Dialect& told)
         found.last = static_cast<std::size_t>(all[place.footer].first - text.data());
         found.lines_behind = static_cast<std::size_t>(Count_Lines(text.substr(found.last)));
     }
+    return found;
+}
+
+}  // namespace
+
+Found_Table Find_Dialect(std::string_view text, const Told_Dialect& told)
+{
+    const std::size_t line = Separator_Line(text);
+    if (line == 0)
+        return Find_By_Sample(text, told);
+    Told_Dialect by_line = told;
+    if (told.separators.empty())
+        by_line.separators = text.substr(text.find('=') + 1, 1);
+    Found_Table found = Find_By_Sample(text.substr(line), by_line);
+    found.first += line;
+    found.last += line;
+    ++found.dialect.lines_in_front;
     return found;
 }
 

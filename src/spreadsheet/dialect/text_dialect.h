@@ -51,6 +51,9 @@ struct Found_Table {
     std::size_t lines_behind = 0;  ///< lines of the footer that stands there
 };
 
+/// The length of a first line as "sep=;", which tells the separator and belongs to no table; 0 for none.
+[[nodiscard]] std::size_t Separator_Line(std::string_view text);
+
 /// Finds the dialect of a text by samples from its start, middle and end; a short one is looked at whole.
 [[nodiscard]] Found_Table Find_Dialect(std::string_view text, const Told_Dialect& told);
 

@@ -40,10 +40,15 @@ void Skip_Lines(Text_Buffer& buffer, std::int64_t lines)
 /// Tells what stands around the table and isn't read. A title of our own says nothing.
 void Tell_Rest(const Text_Buffer& buffer, const Found_Table& found)
 {
-    const std::string_view front = buffer.Text().substr(0, found.first);
-    const bool own = front.find(Title_Words) != std::string_view::npos && found.dialect.lines_in_front == 1;
-    if (found.dialect.lines_in_front > 0 && !own && !Trim_Copy(front).empty())
-        request.losses.Note_Unread("lines in front of its table", found.dialect.lines_in_front);
+    std::string_view front = buffer.Text().substr(0, found.first);
+    std::int64_t lines = found.dialect.lines_in_front;
+    if (const std::size_t line = Separator_Line(front); line > 0) {
+        front.remove_prefix(line);
+        --lines;
+    }
+    const bool own = front.find(Title_Words) != std::string_view::npos && lines == 1;
+    if (lines > 0 && !own && !Trim_Copy(front).empty())
+        request.losses.Note_Unread("lines in front of its table", lines);
     if (found.lines_behind > 0)
         request.losses.Note_Unread("lines behind its table", static_cast<std::int64_t>(found.lines_behind));
 }
