@@ -268,8 +268,10 @@ bool Text_Table_Writer::Needs_Quotes(std::string_view text) const
         return false;
     const auto is_blank = [](char c) { return c == ' ' || c == '\t'; };
     const auto holds = [text](char c) { return text.find(c) != std::string_view::npos; };
-    return text.front() == '\'' || is_blank(text.front()) || is_blank(text.back()) || holds(layout_.separator)
-           || holds('"') || holds('\n') || holds('\r');
+    // Nothing but the signs in its texts would tell how a single column is separated.
+    const bool misleads = sheet_.column_count == 1 && text.find_first_of(",;|\t") != std::string_view::npos;
+    return misleads || text.front() == '\'' || is_blank(text.front()) || is_blank(text.back())
+           || holds(layout_.separator) || holds('"') || holds('\n') || holds('\r');
 }
 
 /// Whether nothing in a column of texts would tell that it is one.

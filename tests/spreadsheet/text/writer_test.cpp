@@ -106,6 +106,7 @@ TEST_F(Text_Writer, Writes_For_Other_Programs)
         {"comments and names", Plain, "#a T#x|%y; 2b T#x|; n T a|b ",
          "\"#a\",\"2b\",n\n\"#x\",#x,\" a\"\n\"%y\",,\"b \"\n"},
         {"one column", Plain, "n V1|*|2", "n\n1\n\"\"\n2\n"},
+        {"one column with signs", Plain, "n Tx;y|x", "n\n\"x;y\"\nx\n"},
         {"all digits", Plain, "n V0.1|1e23|123456789012345678|0.30000000000000004|-5e-324",
          "n\n0.1\n1e+23\n1.2345678901234568e+17\n0.30000000000000004\n-5e-324\n"},
     };
