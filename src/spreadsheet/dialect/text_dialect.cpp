@@ -53,8 +53,10 @@ std::size_t Separator_Line(std::string_view text)
         const std::string_view rest = text.substr(words.size());
         const std::size_t sign_and_quote = words.front() == '"' ? 2 : 1;
         const std::size_t end = std::min(rest.find_first_of("\r\n"), rest.size());
-        const bool quoted = sign_and_quote == 1 || rest.substr(1, 1) == "\"";
-        if (end == sign_and_quote && quoted && signs.find(rest.front()) != std::string_view::npos)
+        if (end != sign_and_quote)
+            continue;
+        const bool quoted = sign_and_quote == 1 || rest[1] == '"';
+        if (quoted && signs.find(rest.front()) != std::string_view::npos)
             return std::min(words.size() + end + (rest.substr(end, 2) == "\r\n" ? 2 : 1), text.size());
     }
     return 0;

@@ -296,5 +296,11 @@ TEST_F(Dialect_Test, Thousandths_Of_A_Second_Are_Held)
     EXPECT_TRUE(request.losses.Entries().empty()) << "as a text it is kept whole";
 }
 
+TEST_F(Dialect_Test, Lines_That_Tell_No_Separator_Are_Text)
+{
+    for (const std::string_view text : {"sep=", "\"sep=", "\"sep=;", "sep=\n", "\"sep=\"", "sep=;;\na"})
+        EXPECT_EQ(Separator_Line(text), 0) << text;
+}
+
 }  // namespace
 }  // namespace ingester
