@@ -18,9 +18,12 @@ void Try_Function(std::string_view head, std::string_view text)
     Must(strictly || strict == Missing_Value, "no date has a value");
     Must(!strictly || (loosely && loose == strict), "a strict date reads otherwise");
     Must(loose <= Greatest_Number && loose >= Missing_Value, "a date is beyond all numbers");
-    const Strict_Readings readings = Read_By_All_Layouts(text);
+    const Strict_Readings readings =
+        Read_By_All_Layouts(text);  // in day counts, which end later than serials
     const std::size_t layout = Date_Layout_Of(format);
-    Must(readings.blank || layout == No_Layout || (readings.good >> layout & 1) == (strictly ? 1 : 0),
+    double counted;
+    const bool as_count = Text_To_Date(text, counted, 1, format, Missing_Value, true);
+    Must(readings.blank || layout == No_Layout || (readings.good >> layout & 1) == (as_count ? 1 : 0),
          "all layouts at once say otherwise");
     char shown[Number_Text_Room];
     Must(Format_Date_Time(shown, loose, form, format) <= shown + sizeof shown, "a date is too long");
